@@ -1,0 +1,59 @@
+#include "lumenkey/foundation/BXLocks.h"
+
+#include <mutex>
+#include <thread>
+#include <vector>
+
+#include <gtest/gtest.h>
+
+TEST(BXSpinLock, ThreadsExcludeEachOther) {
+    BXSpinLock lock;
+    constexpr int turns = 100000;
+    // Plain variables: the thread sanitizer must see the lock as what orders them.
+    long count = 0;
+    long other = 0;
+    std::vector<std::thread> threads;
+    for (int thread = 0; thread < 4; ++thread) {
+        threads.emplace_back([&, thread] {
+            for (int i = 0; i < turns; ++i) {
+                if (thread == 0) {
+                    while (!lock.tryLock()) {
+                        std::this_thread::yield();
+                    }
+                    ++count;
+                    --other;
+                    lock.unlock();
+                } else {
+                    BXLockSentry const sentry(lock);
+                    ++count;
+                    --other;
+                }
+            }
+        });
+    }
+    for (std::thread& thread : threads) {
+        thread.join();
+    }
+    EXPECT_EQ(count, 4L * turns);
+    EXPECT_EQ(other, -4L * turns);
+}
+
+TEST(BXSpinLock, SentriesHoldForAScope) {
+    BXSpinLock lock;
+    {
+        BXLockSentry sentry(&lock);
+        EXPECT_FALSE(lock.tryLock());
+        sentry.release();
+        EXPECT_TRUE(lock.tryLock());
+        sentry.release();
+        EXPECT_FALSE(lock.tryLock()) << "a second release leaves the lock alone";
+        lock.unlock();
+    }
+    {
+        BXLockSentry<BXSpinLock> const nothing(nullptr);
+        std::lock_guard const guard(lock);
+        EXPECT_FALSE(lock.try_lock());
+    }
+    EXPECT_TRUE(lock.tryLock());
+    lock.unlock();
+}

@@ -1,0 +1,63 @@
+#include "lumenkey/foundation/BXSingleton.h"
+
+#include <atomic>
+#include <cstdlib>
+#include <iostream>
+#include <thread>
+#include <vector>
+
+#include <gtest/gtest.h>
+
+namespace {
+
+template <char Name, int Rank> class Reporting : public BXSingleton {
+public:
+    Reporting() : BXSingleton(Rank) {}
+    ~Reporting() override { std::cerr << Name; }
+};
+
+/// Makes another singleton while it is destroyed, and one more of a higher rank.
+class Late : public BXSingleton {
+public:
+    Late() : BXSingleton(1) {}
+    ~Late() override {
+        std::cerr << 'L';
+        BXSingletonInstance<Reporting<'y', -9>>();
+        BXSingletonInstance<Reporting<'x', 9>>();
+    }
+};
+
+class Counted : public BXSingleton {
+public:
+    Counted() : BXSingleton(0) { ++made; }
+    static inline std::atomic<int> made = 0;
+};
+
+[[noreturn]] void makeSeveralAndExit() {
+    BXSingletonInstance<Reporting<'a', 0>>();
+    BXSingletonInstance<Reporting<'b', 5>>();
+    BXSingletonInstance<Late>();
+    BXSingletonInstance<Reporting<'c', 5>>();
+    BXSingletonInstance<Reporting<'d', -2>>();
+    BXSingletonInstance<Reporting<'b', 5>>();
+    std::exit(0);
+}
+
+} // namespace
+
+TEST(BXSingletonDeathTest, TearsDownByRank) {
+    EXPECT_EXIT(makeSeveralAndExit(), ::testing::ExitedWithCode(0), "^cbLxady$");
+}
+
+TEST(BXSingleton, ThreadsShareOneInstance) {
+    std::vector<BXSingleton*> seen(4);
+    std::vector<std::thread> threads;
+    for (BXSingleton*& place : seen) {
+        threads.emplace_back([&place] { place = &BXSingletonInstance<Counted>(); });
+    }
+    for (std::thread& thread : threads) {
+        thread.join();
+    }
+    EXPECT_EQ(Counted::made, 1);
+    EXPECT_EQ(seen, std::vector<BXSingleton*>(4, &BXSingletonInstance<Counted>()));
+}

@@ -1,0 +1,7 @@
+#include "lumenkey/lumenkey.h"
+
+double versionNumberSeenFromOtherSource();
+
+double versionNumberSeenFromOtherSource() {
+    return LumenkeyVersionNumber;
+}

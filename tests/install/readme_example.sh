@@ -1,0 +1,5 @@
+#!/bin/sh
+# readme_example.sh SOURCE_DIR: the program in README.md is the example that the tests build and run.
+set -eu
+cd "$1"
+sed -n '/^```cpp$/,/^```$/p' README.md | sed '1d;$d' | diff -u - examples/spline_host.cpp
