@@ -1,0 +1,3 @@
+#include "lumenkey/splines/KFSplineOwner.h"
+
+KFSplineOwner::~KFSplineOwner() = default;

@@ -1,0 +1,54 @@
+// Two slower truths about the value of a curve: the rules of evaluation as a plain walk over the vertices, and cubic
+// segments by de Casteljau's construction and bisection. Neither searches, caches, or knows of an index.
+#pragma once
+
+#include "tests/splines/museum.h"
+
+/// Walks all vertices from the first one; draws with the strategies and the extrapolation of the spline.
+double walkedValue(KFSpline& spline, Tempus const& u);
+double walkedSlope(KFSpline& spline, Tempus const& u);
+
+inline bool isWholeCurveType(std::uint32_t type) { return type == 10 || type == 12; }
+/// Every number without a shape of its own draws as Bezier.
+bool isCubicType(std::uint32_t type);
+
+/// Neighbours of the valid vertices, the second strictly after the first.
+struct Segment {
+    KFVertex* a;
+    KFVertex* b;
+};
+std::vector<Segment> segmentsOf(KFSpline& spline);
+
+/// A cubic segment from the tangents of its ends, or of its neighbours, in long double.
+class LongCubic {
+public:
+    LongCubic(KFSpline& spline, Segment const& segment);
+
+    /// U turns back on the way, which only unsanitized segments do.
+    bool folds() const;
+    /// The lowest and highest value that the curve may have at `u`, which lies inside the segment. They differ by the
+    /// rounding of U and V: where U hardly moves with the parameter, a rounding of U is a stretch of the curve, and
+    /// any value on it is right.
+    struct Bounds {
+        double low, high;
+    };
+    Bounds at(Tempus const& u) const;
+    /// `u` lies where the curve turns back, so near that the roundings decide which branch is read.
+    bool isAtTurn(Tempus const& u) const;
+
+private:
+    void readTangents(KFSpline& spline, Segment const& segment);
+    void readNeighbours(KFSpline& spline, Segment const& segment);
+    void sanitize();
+    long double fractionOf(Tempus const& u) const;
+    long double parameterAt(long double fraction) const;
+    long double curveU(long double parameter) const;
+
+    bool _parametric;
+    Tempus _start;
+    Tempus _end;
+    long double _u[4];
+    long double _v[4];
+    /// Of U as a polynomial.
+    long double _c1, _c2, _c3;
+};

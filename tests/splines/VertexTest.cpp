@@ -1,0 +1,250 @@
+// The keypoint by itself.
+
+#include "lumenkey/splines/KFStaticVertex.h"
+
+#include "tests/splines/slots.h"
+
+#include <gtest/gtest.h>
+
+#include <cmath>
+#include <limits>
+#include <memory>
+#include <string>
+#include <typeinfo>
+
+namespace {
+
+Tempus const kAny = TempusMake(7, 3);
+
+/// A vertex none of whose fields has its default.
+KFStaticVertex unusual() {
+    KFStaticVertex vertex(TempusMake(1, 2), 3.0);
+    vertex.setBias(0.25, kAny);
+    vertex.setInputTangents(-1.0, 2.0, kAny);
+    vertex.setOutputTangents(3.0, 4.0, kAny);
+    vertex.setNormal(5.0, kAny);
+    vertex.setInterpolation(13);
+    vertex.setFlags(0x40000091);
+    return vertex;
+}
+
+struct Pair {
+    double u, v;
+    bool operator==(Pair const&) const = default;
+};
+
+Pair inputOf(KFVertex const& vertex) {
+    Pair pair{};
+    vertex.getInputTangents(&pair.u, &pair.v, kAny);
+    return pair;
+}
+
+Pair outputOf(KFVertex const& vertex) {
+    Pair pair{};
+    vertex.getOutputTangents(&pair.u, &pair.v, kAny);
+    return pair;
+}
+
+struct Setter {
+    char const* name;
+    void (*apply)(KFStaticVertex&);
+    bool writesLocked;
+    bool writesDisabled;
+};
+
+Setter const kSetters[] = {
+    {"setValueU", [](KFStaticVertex& v) { v.setValueU(TempusMake(9, 1)); }, false, true},
+    {"setValueV", [](KFStaticVertex& v) { v.setValueV(9.0, kAny); }, false, true},
+    {"setBias", [](KFStaticVertex& v) { v.setBias(1.5, kAny); }, false, true},
+    {"setInputTangents, u", [](KFStaticVertex& v) { v.setInputTangents(-9.0, 2.0, kAny); }, false, false},
+    {"setInputTangents, v", [](KFStaticVertex& v) { v.setInputTangents(-1.0, 9.0, kAny); }, false, false},
+    {"setOutputTangents, u", [](KFStaticVertex& v) { v.setOutputTangents(9.0, 4.0, kAny); }, false, false},
+    {"setOutputTangents, v", [](KFStaticVertex& v) { v.setOutputTangents(3.0, 9.0, kAny); }, false, false},
+    {"flattenTangents", [](KFStaticVertex& v) { v.flattenTangents(kAny); }, false, false},
+    {"resetTangents", [](KFStaticVertex& v) { v.resetTangents(); }, false, false},
+    {"setNormal", [](KFStaticVertex& v) { v.setNormal(9.0, kAny); }, true, true},
+    {"swapTangents", [](KFStaticVertex& v) { v.swapTangents(); }, true, true},
+    {"setEnabled", [](KFStaticVertex& v) { v.setEnabled(!v.isEnabled(kAny), kAny); }, true, true},
+    {"setFlag", [](KFStaticVertex& v) { v.setFlag(0x104); }, true, true},
+    {"resetFlag", [](KFStaticVertex& v) { v.resetFlag(0x81); }, true, true},
+    {"setFlags", [](KFStaticVertex& v) { v.setFlags(0x20); }, true, true},
+    {"setInterpolation", [](KFStaticVertex& v) { v.setInterpolation(100); }, true, true},
+    {"offsetVertexInTime", [](KFStaticVertex& v) { v.offsetVertexInTime(TempusMake(1, 3)); }, true, true},
+};
+
+/// A vertex whose attributes follow the time at which they are read.
+class MovingVertex : public KFVertex {
+public:
+    MovingVertex() : KFVertex(TempusMake(5, 4)) {}
+
+    double getValueV(Tempus const& t) const override { return TempusGetSeconds(t); }
+    void setValueV(double, Tempus const&) override {}
+    double getBias(Tempus const& t) const override { return TempusGetSeconds(t) / 10.0; }
+    void setBias(double, Tempus const&) override {}
+    void getInputTangents(double* u, double* v, Tempus const& t) const override { give(u, v, -1.0, TempusGetSeconds(t)); }
+    void getOutputTangents(double* u, double* v, Tempus const& t) const override { give(u, v, TempusGetSeconds(t), 1.0); }
+    void setInputTangents(double, double, Tempus const&) override {}
+    void setOutputTangents(double, double, Tempus const&) override {}
+    void flattenTangents(Tempus const&) override {}
+    void resetTangents() override {}
+    void swapTangents() override {}
+    void setEnabled(bool, Tempus const&) override {}
+    bool isEnabled(Tempus const&) const override { return false; }
+    bool isFlat() const override { return false; }
+    KFVertex* clone() const override { return new MovingVertex(*this); }
+    void offsetVertexInTime(Tempus const&) override {}
+
+private:
+    static void give(double* u, double* v, double givenU, double givenV) {
+        *u = givenU;
+        *v = givenV;
+    }
+};
+
+} // namespace
+
+TEST(KFStaticVertex, StartsPlain) {
+    KFStaticVertex const vertex(TempusMake(1, 2), 3.0);
+    EXPECT_EQ(vertex.getValueU(), TempusMake(1, 2));
+    EXPECT_EQ(vertex.getValueV(kAny), 3.0);
+    EXPECT_EQ(vertex.getFlags(), 0u);
+    EXPECT_EQ(vertex.getInterpolation(), 1u);
+    EXPECT_EQ(vertex.getBias(kAny), 1.0);
+    EXPECT_EQ(vertex.getNormal(kAny), 0.0);
+    EXPECT_TRUE(vertex.isEnabled(kAny));
+    EXPECT_EQ(inputOf(vertex), (Pair{0.0, 0.0}));
+    EXPECT_EQ(outputOf(vertex), (Pair{0.0, 0.0}));
+}
+
+// Each setter changes one thing that equality sees, or, where a vertex is guarded, nothing at all.
+TEST(KFStaticVertex, GuardsWhatALockedOrDisabledVertexKeeps) {
+    for (Setter const& setter : kSetters) {
+        for (bool const locked : {false, true}) {
+            for (bool const enabled : {false, true}) {
+                KFStaticVertex vertex = unusual();
+                vertex.setFlag(locked ? 0x2 : 0);
+                vertex.setEnabled(enabled, kAny);
+                KFStaticVertex const before(vertex);
+                EXPECT_TRUE(vertex == before && before == vertex);
+                std::uint32_t const revision = vertex.getRevision();
+                setter.apply(vertex);
+                bool const writes = (!locked || setter.writesLocked) && (enabled || setter.writesDisabled);
+                EXPECT_EQ(vertex == before, !writes) << setter.name << ", locked " << locked << ", enabled " << enabled;
+                bool const isRead = std::string(setter.name).find("Flag") == std::string::npos &&
+                                    std::string(setter.name) != "setNormal";
+                if (writes && isRead) {
+                    EXPECT_NE(vertex.getRevision(), revision) << setter.name;
+                }
+            }
+        }
+    }
+}
+
+TEST(KFStaticVertex, KeepsTangentsOnTheirSides) {
+    KFStaticVertex vertex = unusual();
+    vertex.setInputTangents(0.5, 2.0, kAny);
+    vertex.setOutputTangents(-0.5, 2.5, kAny);
+    EXPECT_EQ(inputOf(vertex), (Pair{0.0, 2.0}));
+    EXPECT_EQ(outputOf(vertex), (Pair{0.0, 2.5}));
+    double const nan = std::numeric_limits<double>::quiet_NaN();
+    vertex.setInputTangents(nan, 2.0, kAny);
+    vertex.setOutputTangents(nan, 2.5, kAny);
+    EXPECT_TRUE(std::isnan(inputOf(vertex).u));
+    EXPECT_TRUE(std::isnan(outputOf(vertex).u));
+
+    // Swapping looks at no side.
+    vertex = unusual();
+    vertex.swapTangents();
+    EXPECT_EQ(inputOf(vertex), (Pair{3.0, 4.0}));
+    EXPECT_EQ(outputOf(vertex), (Pair{-1.0, 2.0}));
+
+    vertex.flattenTangents(kAny);
+    EXPECT_EQ(inputOf(vertex), (Pair{0.0, 0.0}));
+    EXPECT_EQ(outputOf(vertex), (Pair{0.0, 0.0}));
+    EXPECT_EQ(vertex.getFlags(), 0x40000090u);
+
+    // Null targets are skipped.
+    double v = 0.0;
+    vertex = unusual();
+    vertex.getInputTangents(nullptr, &v, kAny);
+    EXPECT_EQ(v, 2.0);
+    vertex.getOutputTangents(&v, nullptr, kAny);
+    EXPECT_EQ(v, 3.0);
+    vertex.getValue(nullptr, &v, kAny);
+    EXPECT_EQ(v, 3.0);
+}
+
+TEST(KFStaticVertex, IsFlatBelowATenMillionth) {
+    for (int component = 0; component < 4; ++component) {
+        for (double const size : {0.9e-7, 1e-7}) {
+            double t[4] = {-0.9e-7, 0.9e-7, 0.9e-7, -0.9e-7};
+            t[component] = std::copysign(size, t[component]);
+            KFStaticVertex vertex(kTempusZero, 0.0);
+            vertex.setInputTangents(t[0], t[1], kAny);
+            vertex.setOutputTangents(t[2], t[3], kAny);
+            EXPECT_EQ(vertex.isFlat(), size < 1e-7) << component;
+        }
+    }
+}
+
+TEST(KFStaticVertex, StandsAtAnExactTime) {
+    KFStaticVertex vertex(TempusMake(1, 2), 0.0);
+    vertex.setValueU(TempusMake(2, 4)); // where it is
+    EXPECT_EQ(vertex.getValueU().timescale, 2);
+    vertex.offsetVertexInTime(TempusMake(1, 3));
+    EXPECT_EQ(vertex.getValueU(), TempusMake(5, 6));
+    KFStaticVertex const later(TempusMake(5001, 6000), 0.0);
+    EXPECT_TRUE(vertex < later);
+    EXPECT_FALSE(later < vertex);
+    EXPECT_FALSE(vertex < vertex);
+
+    // Equality looks at the time, not at how it is written; every other field counts as it is.
+    KFStaticVertex const one(TempusMake(1, 2), 1.0);
+    EXPECT_TRUE(one == KFStaticVertex(TempusMake(2, 4), 1.0));
+    EXPECT_FALSE(one.isEqual(nullptr));
+    EXPECT_FALSE(one == MovingVertex());
+}
+
+TEST(KFStaticVertex, IsCopiedWholeAndSnapshotInPart) {
+    KFStaticVertex const original = unusual();
+    std::unique_ptr<KFVertex> const clone(original.clone());
+    EXPECT_TRUE(*clone == original);
+    KFVertex const& cloned = *clone;
+    EXPECT_EQ(typeid(cloned), typeid(KFStaticVertex));
+    KFStaticVertex assigned(kTempusZero, 0.0);
+    assigned = original;
+    EXPECT_TRUE(assigned == original);
+
+    MovingVertex moving;
+    moving.setFlags(0x93);
+    moving.setNormal(4.0, kAny);
+    moving.setInterpolation(6);
+    KFStaticVertex const snapshot(&moving, TempusMake(8, 1));
+    KFStaticVertex expected(TempusMake(5, 4), 8.0);
+    expected.setBias(0.8, kAny);
+    expected.setInputTangents(-1.0, 8.0, kAny);
+    expected.setOutputTangents(8.0, 1.0, kAny);
+    expected.setInterpolation(6);
+    EXPECT_TRUE(snapshot == expected);
+}
+
+#ifdef LUMENKEY_KNOWS_SLOTS
+// Hosts derive from vertices: the slots of the virtual operations are the interface. Two belong to the destructor.
+TEST(KFVertex, KeepsTheSlotsOfItsOperations) {
+    using V = KFVertex;
+    std::size_t const order[] = {
+        slotOf(&V::setValueU), slotOf(&V::getValueV), slotOf(&V::setValueV), slotOf(&V::getBias), slotOf(&V::setBias),
+        slotOf(&V::getInputTangents), slotOf(&V::getOutputTangents), slotOf(&V::setInputTangents),
+        slotOf(&V::setOutputTangents), slotOf(&V::flattenTangents), slotOf(&V::resetTangents), slotOf(&V::setNormal),
+        slotOf(&V::getNormal), slotOf(&V::swapTangents), slotOf(&V::setEnabled), slotOf(&V::isEnabled),
+        slotOf(&V::isFlat), slotOf(&V::setFlag), slotOf(&V::resetFlag), slotOf(&V::getFlags), slotOf(&V::setFlags),
+        slotOf(&V::testFlag), slotOf(&V::setDefaultAtCurrentTime), slotOf(&V::setInterpolation),
+        slotOf(&V::getInterpolation), slotOf(&V::clone), slotOf(&V::updateBias), slotOf(&V::enableBehavior),
+        slotOf(&V::enabledBehavior), slotOf(&V::offsetVertexInTime), slotOf(&V::isEqual), slotOf(&KFStaticVertex::getValue)};
+    std::size_t slot = 2;
+    for (std::size_t const actual : order) {
+        EXPECT_EQ(actual, slot);
+        ++slot;
+    }
+}
+#endif

@@ -1,0 +1,59 @@
+// Named curves, each there for a reason. Properties run over all of them, so that a new exhibit tests everything.
+#pragma once
+
+#include "lumenkey/splines/KFSpline.h"
+#include "lumenkey/splines/KFSplineState.h"
+#include "lumenkey/splines/KFVertex.h"
+
+#include <cstring>
+#include <functional>
+#include <memory>
+#include <string>
+#include <vector>
+
+/// A spline with the state that it needs, so that both can be handed around. Its state derives no tangents unless
+/// the exhibit says otherwise.
+struct MuseumSpline {
+    std::unique_ptr<KFSplineState> state;
+    std::unique_ptr<KFSpline> spline;
+
+    MuseumSpline();
+    /// A deep copy with a state of its own.
+    explicit MuseumSpline(MuseumSpline const& other);
+    MuseumSpline(MuseumSpline&&) = default;
+
+    KFSpline* operator->() const { return spline.get(); }
+    KFSpline& operator*() const { return *spline; }
+    double at(Tempus const& u, bool lock = true) const { return spline->getVertexValue(u, kTempusZero, lock); }
+    double slopeAt(Tempus const& u, bool lock = true) const {
+        return spline->getDerivativeValue(u, kTempusZero, lock);
+    }
+};
+
+struct Exhibit {
+    std::string name;
+    std::string why;
+    std::function<void(MuseumSpline&)> fill;
+
+    MuseumSpline build() const;
+};
+
+std::vector<Exhibit> const& museum();
+
+/// Every type that draws segments, an unknown number among them.
+std::vector<std::uint32_t> const& museumSegmentTypes();
+
+/// In their order.
+std::vector<KFVertex*> museumVertices(KFSpline& spline);
+
+/// Where an exhibit is looked at, in ascending order: at its vertices, just beside them, inside each segment (of a
+/// long spline, of some) and far outside, in many timescales.
+std::vector<Tempus> museumPositions(KFSpline& spline);
+
+/// The same bits, or both not a number.
+inline bool isSameDouble(double a, double b) {
+    return std::memcmp(&a, &b, sizeof a) == 0 || (a != a && b != b);
+}
+
+/// For messages: VALUE/TIMESCALE.
+std::string museumText(Tempus const& t);
