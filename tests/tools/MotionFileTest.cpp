@@ -1,0 +1,187 @@
+#include "tools/import/MotionFile.h"
+#include "tests/tools/MotionSamples.h"
+#include "tests/tools/TestFolder.h"
+
+#include <gtest/gtest.h>
+#include <sys/resource.h>
+
+namespace lumenkey::tools {
+namespace {
+
+using samples::kSmallMotion;
+using samples::replaced;
+
+/// What the reader says about a text; `LINE:COLUMN: what`, or nothing when it takes it.
+std::string faultOf(std::string_view text) {
+    try {
+        readMotionText(text, "f.bvh");
+        return "";
+    } catch (InputError const& error) {
+        EXPECT_EQ(error.file, "f.bvh");
+        return std::to_string(error.line) + ":" + std::to_string(error.column) + ": " + error.what;
+    }
+}
+
+std::string faultWith(std::string_view what, std::string_view by) {
+    return faultOf(replaced(kSmallMotion, what, by));
+}
+
+TEST(MotionFile, ReadsEverythingAFileHolds) {
+    Motion const motion = readMotionText(kSmallMotion, "f.bvh");
+    ASSERT_EQ(motion.joints.size(), 2U);
+    EXPECT_EQ(motion.joints[0].name, "Hips");
+    EXPECT_EQ(motion.joints[0].parent, MotionJoint::kNoParent);
+    EXPECT_EQ(motion.joints[0].offset, (std::array{0.0, 1.5, -2.0}));
+    EXPECT_EQ(motion.joints[1].name, "LeftLeg");
+    EXPECT_EQ(motion.joints[1].parent, 0U);
+    EXPECT_EQ(motion.joints[1].firstChannel, 6U);
+    EXPECT_EQ(motion.joints[1].channelCount, 3U);
+    ASSERT_EQ(motion.endSites.size(), 1U);
+    EXPECT_EQ(motion.endSites[0].joint, 1U);
+    EXPECT_EQ(motion.endSites[0].offset, (std::array{0.0, -10.0, 0.0}));
+    ASSERT_EQ(motion.channels.size(), 9U);
+    EXPECT_EQ(motion.channels[3].kind, MotionChannelKind::Zrotation);
+    EXPECT_EQ(motion.channels[4].kind, MotionChannelKind::Xrotation);
+    EXPECT_EQ(motion.frameCount, 3U);
+    EXPECT_EQ(motion.frameTimeText, ".0083333");
+    EXPECT_EQ(motion.value(0, 0), 0);
+    EXPECT_EQ(motion.value(1, 1), 91.5);
+    EXPECT_EQ(motion.value(2, 8), 180);
+    EXPECT_EQ(motion.timeOfFrame(2), TempusMake(1, 60));
+}
+
+TEST(MotionFile, TakesCommonDepartures) {
+    std::string carriageReturns;
+    for (char const c : kSmallMotion) {
+        carriageReturns += c == '\n' ? "\r\n" : std::string(1, c);
+    }
+    struct {
+        char const* what;
+        std::string text;
+    } const cases[] = {
+        {"carriage returns", carriageReturns},
+        {"byte-order mark", "\xEF\xBB\xBF" + std::string(kSmallMotion)},
+        {"lower case", replaced(replaced(kSmallMotion, "HIERARCHY", "hierarchy"), "End Site", "end site")},
+        {"kinds in another case", replaced(kSmallMotion, "Xposition", "XPOSITION")},
+        {"brace behind the name", replaced(kSmallMotion, "ROOT Hips\n{", "ROOT Hips {")},
+        {"no space before braces", replaced(kSmallMotion, "OFFSET 0 -10 0\n\t\t}", "OFFSET 0 -10 0}")},
+        {"space before the colon", replaced(kSmallMotion, "Frames:", "frames :")},
+        {"blank lines", replaced(kSmallMotion, "0 90", "\n \t\n0 90") + "\n \n"},
+        {"plus signs", replaced(kSmallMotion, "1 91.5", "+1 +91.5")},
+        {"exponents", replaced(kSmallMotion, "91.5", "9.15e1")},
+        {"a second root", replaced(kSmallMotion, "MOTION", "ROOT Prop { OFFSET 0 0 0 }\nMOTION")},
+    };
+    Motion const plain = readMotionText(kSmallMotion, "f.bvh");
+    for (auto const& each : cases) {
+        SCOPED_TRACE(each.what);
+        ASSERT_EQ(faultOf(each.text), "");
+        Motion const motion = readMotionText(each.text, "f.bvh");
+        EXPECT_EQ(motion.values, plain.values);
+        EXPECT_EQ(motion.frameDuration, plain.frameDuration);
+        EXPECT_EQ(motion.joints[1].name, "LeftLeg");
+    }
+    EXPECT_EQ(readMotionText(replaced(kSmallMotion, "ROOT Hips", "ROOT Bip 01 Pelvis "), "f").joints[0].name,
+              "Bip 01 Pelvis");
+}
+
+TEST(MotionFile, TellsWhereTheHierarchyIsAtFault) {
+    EXPECT_EQ(faultOf(""), "1:1: the file is empty");
+    EXPECT_EQ(faultOf(" \n"), "2:1: the file ends where HIERARCHY belongs");
+    EXPECT_EQ(faultOf("\x89PNG"), "1:1: '\x89PNG' stands where HIERARCHY belongs");
+    EXPECT_EQ(faultOf(std::string("HIER\0ARCHY", 10)), "1:5: a zero byte: this is no text");
+    EXPECT_EQ(faultWith("ROOT", "TRUNK"), "2:1: 'TRUNK' stands where ROOT belongs");
+    EXPECT_EQ(faultWith("ROOT Hips", "ROOT"), "2:5: the name of the joint is missing");
+    EXPECT_EQ(faultWith("LeftLeg\n\t{", "LeftLeg\n\t"), "8:3: 'OFFSET' stands where { belongs");
+    EXPECT_EQ(faultWith("3.5", "three"), "8:10: 'three' is not a number");
+    EXPECT_EQ(faultWith("\t\tOFFSET 3.5 0 0\n", ""), "13:2: joint 'LeftLeg' has no OFFSET");
+    EXPECT_EQ(faultWith("OFFSET 3.5 0 0", "OFFSET 3.5 0 0 0"),
+              "8:18: '0' is unknown inside joint 'LeftLeg' of line 6");
+    EXPECT_EQ(faultWith("OFFSET 3.5 0 0", "OFFSET 3.5 0"), "9:3: 'CHANNELS' is not a number");
+    EXPECT_EQ(faultWith("}\nMOTION", "MOTION"),
+              "15:1: MOTION comes before the brace that closes joint 'Hips' of line 2");
+    EXPECT_EQ(faultWith("}\nMOTION", "}}\nMOTION"), "15:2: this brace closes nothing");
+    EXPECT_EQ(faultWith("End Site", "End Place"), "10:7: 'Place' stands where Site belongs");
+}
+
+TEST(MotionFile, TellsWhereChannelsAreAtFault) {
+    EXPECT_EQ(faultWith("CHANNELS 3", "CHANNELS 4"), "10:3: CHANNELS says 4, but 3 names follow");
+    EXPECT_EQ(faultWith("CHANNELS 3", "CHANNELS 2"),
+              "9:34: 'Yrotation' is one more channel than CHANNELS says");
+    EXPECT_EQ(faultWith("CHANNELS 3", "CHANNELS -3"), "9:12: '-3' is not a count of channels");
+    EXPECT_EQ(faultWith("CHANNELS 3", "CHANNELS 4000000000"), "9:12: a joint has at most 6 channels");
+    EXPECT_EQ(faultWith("CHANNELS 3", "CHANNELS 99999999999999999999"),
+              "9:12: '99999999999999999999' is not a count of channels");
+    EXPECT_EQ(faultWith("Zposition", "Wposition"), "5:33: 'Wposition' is no channel of a joint");
+    EXPECT_EQ(faultWith("Zposition", "Xposition"), "5:33: 'Xposition' stands twice in one joint");
+}
+
+TEST(MotionFile, TellsWhereFramesAreAtFault) {
+    EXPECT_EQ(faultWith("1 91.5 2", "1 2"), "20:22: frame 1 has 9 numbers, but 8 are there");
+    EXPECT_EQ(faultWith("1 91.5 2", "1 91.5 2 2"), "20:27: frame 1 has 9 numbers, but more stand here");
+    EXPECT_EQ(faultWith("91.5", "high"), "20:3: 'high' is not a number");
+    EXPECT_EQ(faultWith("91.5", "91,5"), "20:3: '91,5' is not a number");
+    for (char const* const text : {"nan", "-inf", "infinity", "0x10", "1e", "--1", "+-1", "-", "."}) {
+        EXPECT_EQ(faultWith("91.5", text), "20:3: '" + std::string(text) + "' is not a number");
+    }
+    EXPECT_EQ(faultWith("91.5", "1e400"), "20:3: '1e400' is out of the range of numbers");
+    EXPECT_EQ(faultWith("Frames: 3", "Frames: 4"), "22:1: the file ends after 3 of 4 frames");
+    EXPECT_EQ(faultWith("Frames: 3", "Frames: 2"), "21:1: more stands here, after the last of 2 frames");
+    EXPECT_EQ(faultWith("Frames: 3", "Frames: many"), "17:9: 'many' is not a count of frames");
+    EXPECT_EQ(faultWith("Frames: 3", "Frames: -3"), "17:9: '-3' is not a count of frames");
+    EXPECT_EQ(faultWith("Frames: 3", "Frames: 3 4"), "17:11: more stands here, after the count of frames");
+    EXPECT_EQ(faultWith("Frames: 3", "Frames 3"), "17:1: 'Frames' stands where 'Frames:' belongs");
+    EXPECT_EQ(faultWith(".0083333", "fast"), "18:13: 'fast' is not a number of seconds");
+    EXPECT_EQ(faultWith(".0083333", "0.0"), "18:13: a frame must last longer than 0 seconds");
+    EXPECT_EQ(faultWith(".0083333", ""), "18:13: the time of a frame is missing");
+    EXPECT_EQ(faultOf(std::string(kSmallMotion) + "end\n"),
+              "22:1: more stands here, after the last of 3 frames");
+}
+
+TEST(MotionFile, RefusesEveryCutOffFile) {
+    for (std::size_t length = 0; length < kSmallMotion.size(); ++length) {
+        EXPECT_NE(faultOf(kSmallMotion.substr(0, length)), "") << "cut at byte " << length;
+    }
+    EXPECT_EQ(faultOf(kSmallMotion), "");
+}
+
+TEST(MotionFile, AsksForNoMemoryOnTheWordOfACount) {
+    for (char const* const count : {"1000000000", "18446744073709551615", "99999999999999999999", "300"}) {
+        EXPECT_EQ(faultWith("Frames: 3", "Frames: " + std::string(count)),
+                  "17:9: the file is too short for that many frames");
+    }
+    // Without channels a frame has no numbers, and so no size.
+    EXPECT_EQ(faultOf("HIERARCHY ROOT A { OFFSET 0 0 0 } MOTION\nFrames: 1000000000\nFrame Time: 1\n"),
+              "2:9: the file is too short for that many frames");
+}
+
+TEST(MotionFile, RefusesEndlessNestingWithoutRecursing) {
+    std::string deep = "HIERARCHY\nROOT A {\n";
+    for (int i = 0; i < 1'000'000; ++i) {
+        deep += "JOINT A {\n";
+    }
+    EXPECT_EQ(faultOf(deep), "1002:1: joints stand more than 1000 deep");
+    EXPECT_EQ(faultOf("HIERARCHY\nROOT " + std::string(256, 'x') + "\n{"),
+              "2:6: the name of the joint has more than 255 bytes");
+}
+
+TEST(MotionFile, RefusesWhatIsNoReadableFile) {
+    TestFolder const folder;
+    auto const faultOfFile = [](std::string const& file) -> std::string {
+        try {
+            readMotionFile(file);
+            return "";
+        } catch (InputError const& error) {
+            return error.text();
+        }
+    };
+    std::string const missing = folder.file("none.bvh");
+    EXPECT_EQ(faultOfFile(missing), missing + ":1:1: No such file or directory");
+    EXPECT_EQ(faultOfFile(folder.path().string()), folder.path().string() + ":1:1: Is a directory");
+    EXPECT_EQ(faultOfFile("/dev/zero"), "/dev/zero:1:1: a zero byte: this is no text");
+    EXPECT_EQ(faultOfFile("a\nb"), "a\\x0ab:1:1: No such file or directory");
+    std::string const whole = folder.write("whole.bvh", kSmallMotion);
+    EXPECT_EQ(readMotionFile(whole).values.size(), 27U);
+}
+
+} // namespace
+} // namespace lumenkey::tools

@@ -1,0 +1,213 @@
+#include "tests/tools/TestFolder.h"
+#include "tools/output/CsvWriter.h"
+#include "tools/output/JsonWriter.h"
+#include "tools/output/SafeOutputFile.h"
+#include "tools/output/Table.h"
+#include "tools/output/TextForms.h"
+
+#include <charconv>
+#include <cmath>
+#include <csignal>
+#include <gtest/gtest.h>
+#include <limits>
+#include <nlohmann/json.hpp>
+#include <random>
+#include <sys/resource.h>
+#include <sys/stat.h>
+
+namespace lumenkey::tools {
+namespace {
+
+namespace fs = std::filesystem;
+
+TEST(TextForms, ShortestTextReadsBackTheSameBits) {
+    std::mt19937_64 random(20);
+    for (int i = 0; i < 20'000; ++i) {
+        double const value = std::bit_cast<double>(random());
+        if (!std::isfinite(value)) {
+            continue;
+        }
+        std::string const text = shortestText(value);
+        double back = 0;
+        std::from_chars(text.data(), text.data() + text.size(), back);
+        ASSERT_EQ(std::bit_cast<std::uint64_t>(back), std::bit_cast<std::uint64_t>(value)) << text;
+    }
+    EXPECT_EQ(shortestText(0.1), "0.1");
+    EXPECT_EQ(shortestText(5e-324), "5e-324");
+    EXPECT_EQ(shortestText(-std::nan("")), "nan");
+}
+
+TEST(TextForms, WritesTimesInLowestTerms) {
+    EXPECT_EQ(timeText(TempusMake(48, 96)), "1/2");
+    EXPECT_EQ(timeText(TempusMake(0, 600)), "0/1");
+    EXPECT_EQ(timeText(TempusMake(-10, 4)), "-5/2");
+    EXPECT_EQ(timeText(TempusMake(std::numeric_limits<int64_t>::min(), 2)), "-4611686018427387904/1");
+    EXPECT_EQ(timeText({3, 6, kTempusFlagValid | kTempusFlagHasBeenRounded, -7}), "1/2@-7~");
+    EXPECT_EQ(timeText(kTempusNegativeInfinity), "-infinity");
+    EXPECT_EQ(timeText(kTempusInvalid), "invalid");
+}
+
+TEST(TextForms, TablesShowNumbersOfAllSizes) {
+    EXPECT_EQ(tableText(1.5), "1.500000");
+    EXPECT_EQ(tableText(0), "0.000000");
+    EXPECT_EQ(tableText(1.25e-7), "1.25e-07");
+    EXPECT_EQ(tableText(-1e300), "-1e+300");
+}
+
+TEST(Table, AlignsColumnsByCharacters) {
+    std::string const cells[2][2] = {{"H\u00FCfte", "1.5"}, {"a\tb", "-10.25"}};
+    Table table;
+    table.columns = {{"joint"}, {"value", Align::Right}};
+    table.rowCount = 2;
+    table.cell = [&](std::size_t row, std::size_t column) { return cells[row][column]; };
+    StringSink out;
+    table.write(out);
+    EXPECT_EQ(out.text(), "joint    value\n"
+                          "H\u00FCfte      1.5\n"
+                          "a\\x09b  -10.25\n");
+}
+
+TEST(JsonWriter, WritesWhatAnIndependentReaderTakesBack) {
+    StringSink out;
+    JsonWriter json(out);
+    json.beginObject();
+    json.key("numbers");
+    json.beginArray();
+    for (double const value : {0.1, -1.0 / 3, 5e-324, 1.7976931348623157e308}) {
+        json.number(value);
+    }
+    json.number(std::numeric_limits<double>::infinity());
+    json.endArray();
+    json.key("nothing");
+    json.beginArray();
+    json.endArray();
+    json.key("inline");
+    json.beginObject(JsonLayout::Inline);
+    json.key("text \"\n");
+    json.string("\x01\\ \xC3\xBC \xFF");
+    json.key("count");
+    json.integer(std::numeric_limits<std::uint64_t>::max());
+    json.key("yes");
+    json.boolean(true);
+    json.endObject();
+    json.endObject();
+    json.finish();
+
+    nlohmann::json const read = nlohmann::json::parse(out.text());
+    EXPECT_EQ(read["numbers"][0].get<double>(), 0.1);
+    EXPECT_EQ(read["numbers"][1].get<double>(), -1.0 / 3);
+    EXPECT_EQ(read["numbers"][2].get<double>(), 5e-324);
+    EXPECT_EQ(read["numbers"][3].get<double>(), 1.7976931348623157e308);
+    EXPECT_TRUE(read["numbers"][4].is_null());
+    EXPECT_TRUE(read["nothing"].empty());
+    EXPECT_EQ(read["inline"]["text \"\n"].get<std::string>(), "\x01\\ \xC3\xBC \xEF\xBF\xBD");
+    EXPECT_EQ(read["inline"]["count"].get<std::uint64_t>(), std::numeric_limits<std::uint64_t>::max());
+    EXPECT_TRUE(read["inline"]["yes"].get<bool>());
+}
+
+TEST(CsvWriter, QuotesOnlyWhatNeedsIt) {
+    StringSink out;
+    CsvWriter csv(out);
+    for (char const* const field : {"plain name", "a,b", "say \"hi\"", "two\nlines", ""}) {
+        csv.field(field);
+    }
+    csv.endRow();
+    csv.field("next");
+    csv.endRow();
+    EXPECT_EQ(out.text(), "plain name,\"a,b\",\"say \"\"hi\"\"\",\"two\nlines\",\nnext\n");
+}
+
+class SafeOutputFileTest : public ::testing::Test {
+protected:
+    TestFolder const _folder;
+    std::string const _target = _folder.write("out.txt", "old");
+
+    /// Writes the file anew; what is at fault, or nothing.
+    static std::string faultOfWriting(std::string const& file, std::string const& content = "new") {
+        try {
+            SafeOutputFile out(file);
+            out.write(content);
+            out.close();
+            return "";
+        } catch (OutputError const& error) {
+            EXPECT_EQ(error.target, file);
+            return error.what;
+        }
+    }
+};
+
+TEST_F(SafeOutputFileTest, ReplacesTheTargetOnlyWhenClosed) {
+    {
+        SafeOutputFile out(_target);
+        out.write("half");
+        EXPECT_EQ(contentOf(_target), "old");
+    }
+    {
+        SafeOutputFile out(_target);
+        out.write("half");
+        out.discard();
+    }
+    EXPECT_EQ(contentOf(_target), "old");
+    EXPECT_EQ(_folder.entryCount(), 1U) << "a temporary was left behind";
+    EXPECT_EQ(faultOfWriting(_target), "");
+    EXPECT_EQ(contentOf(_target), "new");
+    EXPECT_EQ(_folder.entryCount(), 1U) << "a temporary was left behind";
+}
+
+TEST_F(SafeOutputFileTest, KeepsPermissionsAndLinks) {
+    fs::permissions(_target, fs::perms::owner_read | fs::perms::owner_write | fs::perms::group_read);
+    fs::create_symlink("out.txt", _folder.file("link"));
+    fs::create_symlink("link", _folder.file("linkToLink"));
+    EXPECT_EQ(faultOfWriting(_folder.file("linkToLink")), "");
+    EXPECT_TRUE(fs::is_symlink(_folder.file("linkToLink")));
+    EXPECT_TRUE(fs::is_symlink(_folder.file("link")));
+    EXPECT_EQ(contentOf(_target), "new");
+    EXPECT_EQ(fs::status(_target).permissions(),
+              fs::perms::owner_read | fs::perms::owner_write | fs::perms::group_read);
+
+    fs::create_symlink("born.txt", _folder.file("dangling"));
+    EXPECT_EQ(faultOfWriting(_folder.file("dangling")), "");
+    EXPECT_EQ(contentOf(_folder.file("born.txt")), "new");
+
+    mode_t const mask = ::umask(027);
+    EXPECT_EQ(faultOfWriting(_folder.file("fresh.txt")), "");
+    ::umask(mask);
+    EXPECT_EQ(static_cast<unsigned>(fs::status(_folder.file("fresh.txt")).permissions()), 0640U);
+}
+
+TEST_F(SafeOutputFileTest, RefusesTargetsThatAreNoFiles) {
+    EXPECT_EQ(faultOfWriting(_folder.file("missing/out.txt")), "No such file or directory");
+    EXPECT_EQ(faultOfWriting(_folder.path().string()), "Is a directory");
+    ASSERT_EQ(::mkfifo(_folder.file("pipe").c_str(), 0600), 0);
+    EXPECT_EQ(faultOfWriting(_folder.file("pipe")), "Invalid argument");
+    fs::create_symlink("round", _folder.file("round"));
+    EXPECT_EQ(faultOfWriting(_folder.file("round")), "Too many levels of symbolic links");
+}
+
+TEST_F(SafeOutputFileTest, LeavesTheTargetWhenItsFolderCannotBeWritten) {
+    // Nothing keeps the superuser from writing into a folder; a virtual file system does.
+    EXPECT_NE(faultOfWriting("/proc/lumenkey-test.txt"), "");
+    if (::geteuid() != 0) {
+        fs::permissions(_folder.path(), fs::perms::owner_read | fs::perms::owner_exec);
+        EXPECT_EQ(faultOfWriting(_target), "Permission denied");
+        EXPECT_EQ(contentOf(_target), "old");
+    }
+}
+
+TEST_F(SafeOutputFileTest, LeavesTheTargetWhenTheDiskIsFull) {
+    // A limit on the size of files stands in for a full disk.
+    rlimit before{};
+    ASSERT_EQ(::getrlimit(RLIMIT_FSIZE, &before), 0);
+    auto const previous = std::signal(SIGXFSZ, SIG_IGN);
+    rlimit const small{10'000, before.rlim_max};
+    ASSERT_EQ(::setrlimit(RLIMIT_FSIZE, &small), 0);
+    std::string const fault = faultOfWriting(_target, std::string(20'000, 'x'));
+    ::setrlimit(RLIMIT_FSIZE, &before);
+    std::signal(SIGXFSZ, previous);
+    EXPECT_EQ(fault, "File too large");
+    EXPECT_EQ(contentOf(_target), "old");
+    EXPECT_EQ(_folder.entryCount(), 1U) << "a temporary was left behind";
+}
+
+} // namespace
+} // namespace lumenkey::tools

@@ -1,0 +1,344 @@
+// The real program, from its arguments to its exit code.
+
+#include "tests/tools/MotionSamples.h"
+#include "tests/tools/RunProgram.h"
+#include "tests/tools/TestFolder.h"
+
+#include <gtest/gtest.h>
+#include <nlohmann/json.hpp>
+#include <numbers>
+#include <sys/stat.h>
+
+namespace lumenkey::tools {
+namespace {
+
+using Json = nlohmann::json;
+using samples::kSmallMotion;
+using samples::replaced;
+
+class ProgramTest : public ::testing::Test {
+protected:
+    TestFolder const _folder;
+    std::string const _file = _folder.write("small.bvh", kSmallMotion);
+
+    static Json jsonOf(std::vector<std::string> const& arguments) {
+        Outcome const outcome = runLumenkey(arguments);
+        EXPECT_EQ(outcome.exit, 0) << outcome.err;
+        EXPECT_EQ(outcome.err, "");
+        return Json::parse(outcome.out, nullptr, false);
+    }
+
+    /// Exit code 2, the complaint, the usage of the verb, and nothing on standard output.
+    static void expectWrongArguments(std::vector<std::string> const& arguments,
+                                     std::string const& complaint) {
+        Outcome const outcome = runLumenkey(arguments);
+        EXPECT_EQ(outcome.exit, 2) << outcome.err;
+        EXPECT_EQ(outcome.out, "");
+        EXPECT_NE(outcome.err.find(complaint), std::string::npos) << outcome.err;
+        EXPECT_NE(outcome.err.find("\nusage: lumenkey "), std::string::npos) << outcome.err;
+    }
+};
+
+TEST_F(ProgramTest, InfoTellsWhatAFileHolds) {
+    Json const info = jsonOf({"info", _file, "--json"});
+    EXPECT_EQ(info["format"], "BVH");
+    EXPECT_EQ(info["channels"], 9);
+    EXPECT_EQ(info["keypoints"], 27);
+    EXPECT_EQ(info["start"], "0/1");
+    EXPECT_EQ(info["duration"], "1/40");
+    EXPECT_EQ(info["frameDuration"], "1/120");
+    EXPECT_EQ(info["channelNames"][4], "Hips.Xrotation");
+
+    Outcome const table = runLumenkey({"info", _file});
+    EXPECT_EQ(table.exit, 0);
+    EXPECT_NE(table.out.find("\nHips.Yposition     units  90.000000  92.000000\n"), std::string::npos)
+        << table.out;
+}
+
+TEST_F(ProgramTest, KeysListsKeypoints) {
+    Json const keys = jsonOf({"keys", _file, "LeftLeg.Xrotation", "--json"});
+    EXPECT_EQ(keys["channel"], "LeftLeg.Xrotation");
+    ASSERT_EQ(keys["keypoints"].size(), 3U);
+    Json const& key = keys["keypoints"][1];
+    EXPECT_EQ(key["time"], "1/120");
+    EXPECT_EQ(key["seconds"].get<double>(), 1.0 / 120);
+    EXPECT_EQ(key["value"].get<double>(), -40 * (std::numbers::pi / 180));
+    EXPECT_EQ(key["interpolation"], 1);
+    EXPECT_EQ(key["in"], (Json{0.0, 0.0}));
+    EXPECT_EQ(key["out"], (Json{0.0, 0.0}));
+    EXPECT_EQ(key["enabled"], true);
+    EXPECT_EQ(key["flags"], 0);
+
+    Outcome const table = runLumenkey({"keys", _file, "Hips.Xposition"});
+    EXPECT_EQ(table.exit, 0);
+    EXPECT_NE(table.out.find("1/120  0.008333       1.000000  linear"), std::string::npos) << table.out;
+}
+
+TEST_F(ProgramTest, SampleReadsAtExactTimes) {
+    Json const at = jsonOf({"sample", _file, "Hips.Xposition", "LeftLeg.Zrotation", "--at", "1/240,0.0125,2f",
+                            "--slope", "--json"});
+    ASSERT_EQ(at["series"].size(), 2U);
+    EXPECT_EQ(at["series"][1]["channel"], "LeftLeg.Zrotation");
+    Json const& points = at["series"][0]["points"];
+    ASSERT_EQ(points.size(), 3U);
+    EXPECT_EQ(points[0]["time"], "1/240");
+    EXPECT_EQ(points[1]["time"], "1/80");
+    EXPECT_EQ(points[2]["time"], "1/60");
+    EXPECT_DOUBLE_EQ(points[0]["value"].get<double>(), 0.5);
+    EXPECT_DOUBLE_EQ(points[1]["value"].get<double>(), 2.5);
+    EXPECT_EQ(points[2]["value"].get<double>(), 4);
+    EXPECT_NEAR(points[1]["slope"].get<double>(), 360, 1e-6);
+
+    // All of the file at 24 frames a second from 120, and beyond its end.
+    Json const step = jsonOf({"sample", _file, "Hips.Xposition", "--to", "0.1", "--step", "1/24", "--json"});
+    ASSERT_EQ(step["series"][0]["points"].size(), 3U);
+    EXPECT_EQ(step["series"][0]["points"][2]["time"], "1/12");
+    EXPECT_FALSE(step["series"][0]["points"][2].contains("slope"));
+
+    Json const count = jsonOf({"sample", _file, "Hips.Xposition", "--count", "5", "--json"});
+    ASSERT_EQ(count["series"][0]["points"].size(), 5U);
+    EXPECT_EQ(count["series"][0]["points"][4]["time"], "1/60");
+    Json const negative =
+        jsonOf({"sample", _file, "Hips.Xposition", "--from", "-1/2", "--count", "1", "--json"});
+    EXPECT_EQ(negative["series"][0]["points"][0]["time"], "-1/2");
+}
+
+TEST_F(ProgramTest, SampleWritesTheSameNumbersInEveryForm) {
+    std::string const quoted = _folder.write("quoted.bvh", replaced(kSmallMotion, "Hips", "Hips, \"big\""));
+    std::vector<std::string> const arguments{
+        "sample", quoted, "Hips, \"big\".Yposition", "LeftLeg.Yrotation", "--step", "1/600", "--slope"};
+    std::vector<std::string> asCsv = arguments;
+    asCsv.emplace_back("--csv");
+    std::vector<std::string> asJson = arguments;
+    asJson.emplace_back("--json");
+    Json const json = jsonOf(asJson);
+    Outcome const csv = runLumenkey(asCsv);
+    ASSERT_EQ(csv.exit, 0) << csv.err;
+    std::istringstream lines(csv.out);
+    std::string line;
+    std::getline(lines, line);
+    EXPECT_EQ(line, "time,seconds,\"Hips, \"\"big\"\".Yposition\",\"Hips, \"\"big\"\".Yposition slope\","
+                    "LeftLeg.Yrotation,LeftLeg.Yrotation slope");
+    for (std::size_t i = 0; i < 11; ++i) {
+        Json const& first = json["series"][0]["points"][i];
+        Json const& second = json["series"][1]["points"][i];
+        std::getline(lines, line);
+        EXPECT_EQ(Json::parse("[\"" + line.insert(line.find(','), "\"") + "]"),
+                  (Json{first["time"], first["seconds"], first["value"], first["slope"], second["value"],
+                        second["slope"]}));
+    }
+    EXPECT_FALSE(std::getline(lines, line));
+}
+
+TEST_F(ProgramTest, PlotAndGalleryWritePictures) {
+    struct {
+        char const* name;
+        char const* start;
+    } const pictures[] = {{"p.svg", "<?xml"}, {"p.png", "\x89PNG"}, {"p.pdf", "%PDF"}};
+    for (auto const& picture : pictures) {
+        std::string const file = _folder.file(picture.name);
+        Outcome const plot = runLumenkey(
+            {"plot", _file, "Hips.Yposition", "Hips.Xrotation", "-o", file, "--from", "-0.01", "--to", "6f"});
+        EXPECT_EQ(plot.exit, 0) << plot.err;
+        EXPECT_EQ(plot.out + plot.err, "");
+        EXPECT_TRUE(contentOf(file).starts_with(picture.start));
+        Outcome const gallery = runLumenkey({"gallery", "-o", file});
+        EXPECT_EQ(gallery.exit, 0) << gallery.err;
+        EXPECT_TRUE(contentOf(file).starts_with(picture.start));
+        EXPECT_GT(contentOf(file).size(), 10'000U);
+    }
+    EXPECT_EQ(_folder.entryCount(), 4U) << "a temporary was left behind";
+}
+
+TEST_F(ProgramTest, PlotDrawsAnySoundFile) {
+    std::string const picture = _folder.file("p.svg");
+    struct {
+        char const* what;
+        std::string text;
+    } const cases[] = {
+        {"no frames", std::string(kSmallMotion).substr(0, kSmallMotion.find("Frames: 3")) +
+                          "Frames: 0\nFrame Time: 0.04\n"},
+        {"one frame", replaced(std::string(kSmallMotion).substr(0, kSmallMotion.find("1 91.5")), "Frames: 3",
+                               "Frames: 1")},
+        {"huge numbers", replaced(replaced(kSmallMotion, "91.5", "1.7e308"), "92", "-1.7e308")},
+        {"a name that is no UTF-8", replaced(kSmallMotion, "LeftLeg", "Left\xFFLeg\x01")},
+    };
+    for (auto const& each : cases) {
+        SCOPED_TRACE(each.what);
+        std::string const file = _folder.write("odd\xFF.bvh", each.text);
+        Outcome const plot = runLumenkey({"plot", file, "Hips.Yposition", "-o", picture});
+        EXPECT_EQ(plot.exit, 0) << plot.err;
+        Json const json = jsonOf({"sample", file, "Hips.Yposition", "--count", "7", "--json"});
+        EXPECT_EQ(json["series"][0]["points"].size(), 7U);
+    }
+}
+
+TEST_F(ProgramTest, FaultyFilesExitWithOneAndOneLine) {
+    std::string const picture = _folder.file("p.svg");
+    std::string const faulty = _folder.write("faulty.bvh", replaced(kSmallMotion, "91.5", "high"));
+    std::string const line = "lumenkey: " + faulty + ":20:3: 'high' is not a number\n";
+    std::vector<std::vector<std::string>> const calls{
+        {"info", faulty},
+        {"info", faulty, "--json"},
+        {"keys", faulty, "Hips.Xposition"},
+        {"sample", faulty, "Hips.Xposition", "--count", "2", "--csv"},
+        {"plot", faulty, "Hips.Xposition", "-o", picture},
+    };
+    for (auto const& arguments : calls) {
+        Outcome const outcome = runLumenkey(arguments);
+        EXPECT_EQ(outcome.exit, 1) << arguments[0];
+        EXPECT_EQ(outcome.err, line);
+        EXPECT_EQ(outcome.out, "");
+    }
+    EXPECT_FALSE(std::filesystem::exists(picture));
+
+    for (std::size_t length = 0; length < kSmallMotion.size(); length += 40) {
+        std::string const cut = _folder.write("cut.bvh", kSmallMotion.substr(0, length));
+        Outcome const outcome = runLumenkey({"info", cut});
+        EXPECT_EQ(outcome.exit, 1) << length;
+        EXPECT_TRUE(outcome.err.starts_with("lumenkey: " + cut + ":")) << outcome.err;
+        EXPECT_EQ(std::count(outcome.err.begin(), outcome.err.end(), '\n'), 1);
+        EXPECT_EQ(outcome.out, "");
+    }
+    EXPECT_EQ(runLumenkey({"info", _folder.file("none.bvh")}).err,
+              "lumenkey: " + _folder.file("none.bvh") + ":1:1: No such file or directory\n");
+}
+
+TEST_F(ProgramTest, WrongArgumentsExitWithTwoAndTheUsage) {
+    expectWrongArguments({}, "subcommand is required");
+    expectWrongArguments({"dance"}, "there is no verb 'dance'");
+    expectWrongArguments({"smaple", _file}, "did you mean 'sample'?");
+    expectWrongArguments({"info"}, "FILE is required");
+    expectWrongArguments({"info", _file, "--loud"}, "--loud");
+    expectWrongArguments({"keys", _file, "hips.xposition"}, "there is no channel 'hips.xposition' in " +
+                                                                _file + "; did you mean 'Hips.Xposition'?");
+    std::vector<std::string> const sample{"sample", _file, "Hips.Xposition"};
+    auto const with = [&sample](std::vector<std::string> const& more) {
+        std::vector<std::string> arguments = sample;
+        arguments.insert(arguments.end(), more.begin(), more.end());
+        return arguments;
+    };
+    expectWrongArguments(sample, "say at which times");
+    expectWrongArguments(with({"--at", "soon"}), "'soon' is no time");
+    expectWrongArguments(with({"--at", "0,,1"}), "'' is no time");
+    expectWrongArguments(with({"--at", "0", "--step", "1"}), "--at");
+    expectWrongArguments(with({"--step", "1", "--count", "3"}), "--step");
+    expectWrongArguments(with({"--step", "0"}), "--step must be above 0");
+    expectWrongArguments(with({"--step", "-1/24"}), "--step must be above 0");
+    expectWrongArguments(with({"--count", "0"}), "--count");
+    expectWrongArguments(with({"--count", "-3"}), "--count");
+    expectWrongArguments(with({"--from", "2", "--to", "1", "--count", "2"}), "--to lies before --from");
+    expectWrongArguments(with({"--step", "1/1000000000"}), "more than 10000000 values");
+    expectWrongArguments(with({"--to", "9000000000000000000", "--step", "1/1000000000"}),
+                         "more than 10000000 values");
+    expectWrongArguments(with({"--count", "18446744073709551615"}), "more than 10000000 values");
+    expectWrongArguments(with({"--count", "2", "--csv", "--json"}), "--csv");
+    expectWrongArguments({"plot", _file, "Hips.Xposition", "-o", "p.bmp"}, "must end in .svg, .png or .pdf");
+    expectWrongArguments({"plot", _file, "Hips.Xposition", "-o", "p.svg", "--width", "1"}, "--width");
+    expectWrongArguments({"plot", _file, "Hips.Xposition", "-o", "p.svg", "--from", "1", "--to", "1"},
+                         "--to must lie");
+    expectWrongArguments({"gallery"}, "--output is required");
+}
+
+TEST_F(ProgramTest, FailuresToWriteExitWithOne) {
+    Outcome const full = runLumenkey({"info", _file}, "/dev/full");
+    EXPECT_EQ(full.exit, 1);
+    EXPECT_EQ(full.err, "lumenkey: standard output: No space left on device\n");
+
+    std::string const nowhere = _folder.file("missing/p.svg");
+    Outcome const plot = runLumenkey({"gallery", "-o", nowhere});
+    EXPECT_EQ(plot.exit, 1);
+    EXPECT_EQ(plot.err, "lumenkey: " + nowhere + ": No such file or directory\n");
+
+    std::string const script = "'" + programPath() + "' info '" + _file + "'";
+    Outcome const closed =
+        runProgramFile("/bin/sh", {"-c", "(sleep 0.2; " + script + "; echo \"exit $?\" >&2) | true"});
+    EXPECT_EQ(closed.err, "lumenkey: standard output: Broken pipe\nexit 1\n");
+}
+
+TEST_F(ProgramTest, EveryVerbHelpsWithAnExample) {
+    for (char const* const verb : {"info", "keys", "sample", "plot", "gallery"}) {
+        Outcome const help = runLumenkey({verb, "--help"});
+        EXPECT_EQ(help.exit, 0);
+        EXPECT_NE(help.out.find("Usage: lumenkey " + std::string(verb)), std::string::npos) << help.out;
+        EXPECT_NE(help.out.find("Example: lumenkey " + std::string(verb)), std::string::npos) << help.out;
+        EXPECT_EQ(help.err, "");
+    }
+    EXPECT_NE(runLumenkey({"--help"}).out.find("sample"), std::string::npos);
+    EXPECT_TRUE(runLumenkey({"--version"}).out.starts_with("lumenkey "));
+}
+
+TEST_F(ProgramTest, WorksOnMotionThatItsGeneratorMakes) {
+    std::string const first = _folder.file("first.bvh");
+    std::string const second = _folder.file("second.bvh");
+    for (std::string const& file : {first, second}) {
+        Outcome const made = runProgramFile(LUMENKEY_MAKE_MOTION, {file, "--frames", "60", "--seed", "3"});
+        ASSERT_EQ(made.exit, 0) << made.err;
+    }
+    EXPECT_EQ(contentOf(first), contentOf(second));
+    Json const info = jsonOf({"info", first, "--json"});
+    EXPECT_EQ(info["frameDuration"], "1/120");
+    EXPECT_EQ(info["duration"], "1/2");
+    EXPECT_EQ(info["channels"], 54);
+    std::string const large = _folder.file("large.bvh");
+    Outcome const made =
+        runProgramFile(LUMENKEY_MAKE_MOTION, {large, "--frames", "30", "--joints", "200", "--rate", "25"});
+    ASSERT_EQ(made.exit, 0) << made.err;
+    EXPECT_EQ(jsonOf({"info", large, "--json"})["channels"], 603);
+    // However many keypoints there are, a picture has only so many pixels.
+    std::string const dense = _folder.file("dense.bvh");
+    runProgramFile(LUMENKEY_MAKE_MOTION, {dense, "--frames", "30000", "--joints", "1"});
+    EXPECT_EQ(runLumenkey({"plot", dense, "Hips.Yposition", "-o", _folder.file("dense.svg")}).exit, 0);
+    EXPECT_LT(std::filesystem::file_size(_folder.file("dense.svg")), 300'000U);
+    EXPECT_EQ(runProgramFile(LUMENKEY_MAKE_MOTION, {"--frames"}).exit, 2);
+    EXPECT_EQ(runProgramFile(LUMENKEY_MAKE_MOTION, {_folder.file("missing/m.bvh")}).exit, 1);
+}
+
+/// A motion capture of a person, where it is at hand; it never becomes part of the project.
+std::string capturedWalk() {
+    char const* const folder = std::getenv("LUMENKEY_SHARED_DATA");
+    std::filesystem::path const data =
+        folder != nullptr ? std::filesystem::path(folder)
+                          : std::filesystem::path(LUMENKEY_TEST_SOURCE_DIR).parent_path() / "shared" / "data";
+    return (data / "walk.bvh").string();
+}
+
+TEST_F(ProgramTest, WorksOnACapturedWalk) {
+    std::string const walk = capturedWalk();
+    if (!std::filesystem::exists(walk)) {
+        GTEST_SKIP() << "there is no " << walk;
+    }
+    Json const info = jsonOf({"info", walk, "--json"});
+    EXPECT_EQ(info["channels"], 96);
+    EXPECT_EQ(info["keypoints"], 96 * 524);
+    EXPECT_EQ(info["frameDuration"], "1/120");
+    EXPECT_EQ(info["duration"], "131/30");
+    // Every fifth of 120 frames a second is one of 24; linear keypoints give the file's own numbers there.
+    Json const sampled =
+        jsonOf({"sample", walk, "Hips.Xposition", "Hips.Zrotation", "--step", "1/24", "--json"});
+    std::istringstream frames(contentOf(walk).substr(contentOf(walk).find("Frame Time")));
+    std::string line;
+    std::getline(frames, line);
+    std::size_t compared = 0;
+    for (std::size_t frame = 0; std::getline(frames, line); ++frame) {
+        if (frame % 5 != 0) {
+            continue;
+        }
+        std::istringstream numbers(line);
+        numbers.imbue(std::locale::classic());
+        double x = 0;
+        double y = 0;
+        double z = 0;
+        double degrees = 0;
+        numbers >> x >> y >> z >> degrees;
+        EXPECT_EQ(sampled["series"][0]["points"][frame / 5]["value"].get<double>(), x);
+        EXPECT_DOUBLE_EQ(sampled["series"][1]["points"][frame / 5]["value"].get<double>(),
+                         degrees * std::numbers::pi / 180);
+        ++compared;
+    }
+    EXPECT_EQ(compared, 105U);
+    EXPECT_EQ(sampled["series"][0]["points"].size(), 105U);
+}
+
+} // namespace
+} // namespace lumenkey::tools

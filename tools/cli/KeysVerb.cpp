@@ -1,0 +1,135 @@
+#include "tools/cli/Verbs.h"
+
+#include "tools/cli/MotionInput.h"
+#include "tools/cli/Progress.h"
+#include "tools/curve/Keypoint.h"
+#include "tools/output/JsonWriter.h"
+#include "tools/output/Table.h"
+#include "tools/output/TextForms.h"
+
+#include <CLI/CLI.hpp>
+#include <memory>
+
+namespace lumenkey::tools {
+
+namespace {
+
+struct KeysOptions {
+    std::string file;
+    std::string channel;
+    bool json = false;
+};
+
+void writeHandle(JsonWriter& json, std::string_view name, KeypointHandle const& handle) {
+    json.key(name);
+    json.beginArray();
+    json.number(handle.seconds);
+    json.number(handle.value);
+    json.endArray();
+}
+
+void writeKeypoint(JsonWriter& json, Keypoint const& key) {
+    json.beginObject(JsonLayout::Inline);
+    json.key("time");
+    json.string(timeText(key.time));
+    json.key("seconds");
+    json.number(TempusGetSeconds(key.time));
+    json.key("value");
+    json.number(key.value);
+    json.key("interpolation");
+    json.integer(key.interpolation);
+    writeHandle(json, "in", key.in);
+    writeHandle(json, "out", key.out);
+    json.key("enabled");
+    json.boolean(key.enabled);
+    json.key("flags");
+    json.integer(key.flags);
+    json.endObject();
+}
+
+void writeJson(std::string const& channel, KFSpline& spline, OutputSink& out) {
+    JsonWriter json(out);
+    json.beginObject();
+    json.key("channel");
+    json.string(channel);
+    json.key("keypoints");
+    json.beginArray();
+    Progress bar("writing", ProgressOf::Output);
+    std::vector<void*> const handles = keypointHandles(spline);
+    for (std::size_t i = 0; i < handles.size(); ++i) {
+        writeKeypoint(json, readKeypoint(spline, handles[i]));
+        bar.update(static_cast<double>(i) / static_cast<double>(handles.size()));
+    }
+    json.endArray();
+    json.endObject();
+    json.finish();
+}
+
+std::string handleText(KeypointHandle const& handle) {
+    return handle.isFlat() ? "-" : tableText(handle.seconds) + ", " + tableText(handle.value);
+}
+
+std::string cellOf(Keypoint const& key, std::size_t column) {
+    switch (column) {
+    case 0:
+        return timeText(key.time);
+    case 1:
+        return tableText(TempusGetSeconds(key.time));
+    case 2:
+        return tableText(key.value);
+    case 3:
+        return interpolationName(key.interpolation);
+    case 4:
+        return handleText(key.in);
+    case 5:
+        return handleText(key.out);
+    case 6:
+        return key.enabled ? "yes" : "no";
+    default:
+        return std::to_string(key.flags);
+    }
+}
+
+void writeTable(KFSpline& spline, std::string_view unit, OutputSink& out) {
+    std::vector<void*> const handles = keypointHandles(spline);
+    std::string const value = "value (" + std::string(unit) + ")";
+    Table table;
+    table.columns = {
+        {"time", Align::Right}, {"seconds", Align::Right}, {value, Align::Right}, {"interpolation"},
+        {"in", Align::Right},   {"out", Align::Right},     {"enabled"},           {"flags", Align::Right}};
+    table.rowCount = handles.size();
+    Progress bar("writing", ProgressOf::Output);
+    double const cells = 2.0 * static_cast<double>(handles.size() * table.columns.size());
+    double asked = 0;
+    table.cell = [&](std::size_t row, std::size_t column) {
+        bar.update(++asked / cells); // a table is asked for twice
+        return cellOf(readKeypoint(spline, handles[row]), column);
+    };
+    table.write(out);
+}
+
+void runKeys(KeysOptions const& options, OutputSink& out) {
+    MotionInput const input(options.file);
+    std::size_t const channel = input.channelNamed(options.channel);
+    auto const made = input.channels().makeSpline(channel);
+    if (options.json) {
+        writeJson(input.channels().name(channel), made->spline, out);
+    } else {
+        writeTable(made->spline, input.channels().unit(channel), out);
+    }
+}
+
+} // namespace
+
+Verb declareKeys(CLI::App& program) {
+    auto const options = std::make_shared<KeysOptions>();
+    CLI::App* const verb = program.add_subcommand("keys", "List the keypoints of a channel");
+    verb->add_option("FILE", options->file, "The motion capture file (BVH)")->option_text(" ")->required();
+    verb->add_option("CHANNEL", options->channel, "Its name, as info lists it")->option_text(" ")->required();
+    verb->add_flag("--json", options->json,
+                   "For programs: every number in full, handles as [seconds, value]");
+    verb->footer("Example: lumenkey keys walk.bvh Hips.Yposition");
+    return {verb, "FILE CHANNEL [--json]", [options](OutputSink& out) { runKeys(*options, out); }};
+}
+
+} // namespace lumenkey::tools

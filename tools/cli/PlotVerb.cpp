@@ -1,0 +1,129 @@
+#include "tools/cli/Verbs.h"
+
+#include "tools/cli/MotionInput.h"
+#include "tools/cli/PlotOptions.h"
+#include "tools/cli/Progress.h"
+#include "tools/cli/TimeArgument.h"
+#include "tools/cli/UsageError.h"
+#include "tools/output/TextForms.h"
+#include "tools/plot/PlotChart.h"
+
+#include <CLI/CLI.hpp>
+#include <filesystem>
+#include <memory>
+#include <optional>
+
+namespace lumenkey::tools {
+
+namespace {
+
+struct PlotOptions {
+    std::string file;
+    std::vector<std::string> channels;
+    std::string output;
+    std::string from;
+    std::string to;
+    int width = 960;
+    int height = 480;
+};
+
+struct TimeSpan {
+    Tempus from;
+    Tempus to;
+};
+
+std::optional<TimeArgument> readTime(std::string const& text) {
+    return text.empty() ? std::nullopt : std::optional(TimeArgument::parse(text));
+}
+
+TimeSpan spanOf(std::optional<TimeArgument> const& from, std::optional<TimeArgument> const& to,
+                MotionInput const& input) {
+    Tempus const frame = input.motion().frameDuration;
+    TimeSpan span{from ? from->resolve(frame) : kTempusZero, to ? to->resolve(frame) : input.lastKeypoint()};
+    if (!to && span.to == span.from) {
+        span.to = span.from + frame;
+    }
+    if (span.to <= span.from) {
+        throw UsageError{"--to must lie after --from"};
+    }
+    return span;
+}
+
+ChartPanel& panelOfUnit(PlotChart& chart, std::string_view unit) {
+    for (ChartPanel& panel : chart.panels) {
+        if (panel.unit == unit) {
+            return panel;
+        }
+    }
+    return chart.panels.emplace_back(ChartPanel{std::string(unit), {}});
+}
+
+PlotChart chartOf(MotionInput const& input, std::vector<std::size_t> const& channels, TimeSpan const& span,
+                  double width) {
+    Progress bar("plotting");
+    PlotChart chart;
+    chart.title = std::filesystem::path(input.motion().file).filename().string();
+    chart.seconds = PlotRange::sound(TempusGetSeconds(span.from), TempusGetSeconds(span.to));
+    std::size_t done = 0;
+    for (std::size_t const channel : channels) {
+        auto const made = input.channels().makeSpline(channel);
+        ChartPanel& panel = panelOfUnit(chart, input.channels().unit(channel));
+        panel.curves.push_back({input.channels().name(channel),
+                                traceCurve(made->spline, span.from, span.to, widthOfCurves(width))});
+        bar.update(static_cast<double>(++done) / static_cast<double>(channels.size()));
+    }
+    std::size_t const keypoints = chart.panels.front().curves.front().picture.keypoints.size();
+    chart.subtitle =
+        std::to_string(keypoints) + " keypoints, " + timeText(input.motion().frameDuration) + " s apart";
+    return chart;
+}
+
+void runPlot(PlotOptions const& options) {
+    PlotFormat const format = requirePlotFormat(options.output);
+    std::optional<TimeArgument> const from = readTime(options.from);
+    std::optional<TimeArgument> const to = readTime(options.to);
+    MotionInput const input(options.file);
+    std::vector<std::size_t> const channels = input.channelsNamed(options.channels);
+    PlotChart const chart = chartOf(input, channels, spanOf(from, to, input), options.width);
+    PlotCanvas canvas(format, options.width, options.height);
+    chart.draw(canvas);
+    canvas.save(options.output);
+}
+
+} // namespace
+
+PlotFormat requirePlotFormat(std::string const& file) {
+    if (std::optional<PlotFormat> const format = plotFormatOf(file)) {
+        return *format;
+    }
+    throw UsageError{"'" + file + "' must end in .svg, .png or .pdf, which tells what to write"};
+}
+
+Verb declarePlot(CLI::App& program) {
+    auto const options = std::make_shared<PlotOptions>();
+    CLI::App* const verb = program.add_subcommand("plot", "Draw channels over time");
+    verb->add_option("FILE", options->file, "The motion capture file (BVH)")->option_text(" ")->required();
+    verb->add_option("CHANNEL", options->channels, "Names of channels, as info lists them")
+        ->option_text("...")
+        ->required();
+    verb->add_option("-o,--output", options->output, "The picture: OUT.svg, OUT.png or OUT.pdf")
+        ->option_text("OUT")
+        ->required();
+    verb->add_option("--from", options->from, "The first time (else 0)")->option_text("T");
+    verb->add_option("--to", options->to, "The last time (else that of the last keypoint)")->option_text("T");
+    verb->add_option("--width", options->width, "In pixels; in PDF, in points")
+        ->check(CLI::Range(200, 10'000))
+        ->option_text("N")
+        ->capture_default_str();
+    verb->add_option("--height", options->height, "Likewise")
+        ->check(CLI::Range(150, 10'000))
+        ->option_text("N")
+        ->capture_default_str();
+    verb->footer("A time is VALUE/TIMESCALE (1001/24000), seconds (0.5) or frames of the file (12f).\n"
+                 "Rotations and positions get a panel each. What lies outside the keypoints is dashed.\n\n"
+                 "Example: lumenkey plot walk.bvh LeftLeg.Xrotation RightLeg.Xrotation -o legs.svg");
+    return {verb, "FILE CHANNEL... -o OUT.svg|png|pdf [--from T] [--to T] [--width N] [--height N]",
+            [options](OutputSink&) { runPlot(*options); }};
+}
+
+} // namespace lumenkey::tools

@@ -1,0 +1,144 @@
+#include "tools/cli/Program.h"
+
+#include "lumenkey/version.h"
+#include "tools/cli/NearMatch.h"
+#include "tools/cli/UsageError.h"
+#include "tools/cli/Verbs.h"
+#include "tools/import/InputError.h"
+#include "tools/output/StandardOutput.h"
+#include "tools/output/TextForms.h"
+
+#include <CLI/CLI.hpp>
+#include <map>
+#include <new>
+#include <unistd.h>
+#include <vector>
+
+namespace lumenkey::tools {
+
+namespace {
+
+using UsageOfVerbs = std::map<std::string, std::string>;
+
+std::string usageOf(CLI::App const& app, UsageOfVerbs const& usages) {
+    auto const found = usages.find(app.get_name());
+    return found == usages.end() ? "lumenkey VERB ...\n"
+                                 : "lumenkey " + found->first + " " + found->second + "\n";
+}
+
+/// Help with the usage that we word ourselves.
+class HelpFormatter : public CLI::Formatter {
+public:
+    explicit HelpFormatter(UsageOfVerbs const& usages) : _usages(usages) {}
+    std::string make_usage(CLI::App const* app, std::string) const override {
+        return "Usage: " + usageOf(*app, _usages);
+    }
+
+private:
+    UsageOfVerbs const& _usages;
+};
+
+void complain(std::string const& text) { writeFully(STDERR_FILENO, "lumenkey: " + text + "\n"); }
+
+class Program {
+public:
+    Program() {
+        _app.name("lumenkey");
+        _app.description("Reads, samples and draws animation curves.");
+        _app.set_version_flag("--version", std::string("lumenkey ") + LumenkeyVersionString);
+        _app.require_subcommand(1);
+        _app.footer(
+            "lumenkey VERB --help tells more, with an example.\n"
+            "It exits 0 when done, 1 when an input is at fault or an output can't be written, and 2 for "
+            "wrong arguments.");
+        _verbs = {declareInfo(_app), declareKeys(_app), declareSample(_app), declarePlot(_app),
+                  declareGallery(_app)};
+        for (Verb const& verb : _verbs) {
+            _usages[verb.arguments->get_name()] = verb.usage;
+            verb.arguments->formatter(std::make_shared<HelpFormatter>(_usages));
+        }
+        _app.formatter(std::make_shared<HelpFormatter>(_usages));
+    }
+
+    int run(int argc, char const* const* argv) {
+        StandardOutput out;
+        try {
+            checkVerb(argc, argv);
+            _app.parse(argc, argv);
+            chosenVerb().run(out);
+        } catch (CLI::CallForHelp const&) {
+            out.write(chosenApp().help());
+        } catch (CLI::CallForVersion const& version) {
+            out.write(std::string(version.what()) + "\n");
+        } catch (CLI::ParseError const& error) {
+            return wrongArguments(error.what());
+        } catch (UsageError const& error) {
+            return wrongArguments(error.what);
+        }
+        out.flush();
+        return kExitDone;
+    }
+
+private:
+    int wrongArguments(std::string const& what) {
+        complain(printableText(what));
+        writeFully(STDERR_FILENO, "usage: " + usageOf(chosenApp(), _usages) + "see: lumenkey " +
+                                      (&chosenApp() == &_app ? "" : chosenApp().get_name() + " ") +
+                                      "--help\n");
+        return kExitWrongArguments;
+    }
+
+    /// The parser only says that some verb is missing.
+    void checkVerb(int argc, char const* const* argv) const {
+        std::string const word = argc > 1 ? argv[1] : "";
+        if (word.empty() || word.starts_with('-') || _usages.contains(word)) {
+            return;
+        }
+        NearMatch match(word);
+        for (auto const& [verb, usage] : _usages) {
+            match.offer(verb);
+        }
+        throw UsageError{"there is no verb '" + word + "'" +
+                         (match.best().empty() ? "" : "; did you mean '" + match.best() + "'?")};
+    }
+
+    /// The app of the verb among the arguments, or the whole program's.
+    CLI::App& chosenApp() {
+        for (Verb const& verb : _verbs) {
+            if (verb.arguments->parsed()) {
+                return *verb.arguments;
+            }
+        }
+        return _app;
+    }
+
+    Verb const& chosenVerb() {
+        for (Verb const& verb : _verbs) {
+            if (verb.arguments->parsed()) {
+                return verb;
+            }
+        }
+        throw UsageError{"a verb is required"};
+    }
+
+    CLI::App _app;
+    std::vector<Verb> _verbs;
+    UsageOfVerbs _usages;
+};
+
+} // namespace
+
+int runProgram(int argc, char const* const* argv) {
+    try {
+        return Program().run(argc, argv);
+    } catch (InputError const& error) {
+        complain(error.text());
+    } catch (OutputError const& error) {
+        complain(printableText(error.target) + ": " + error.what);
+    } catch (std::bad_alloc const&) {
+        complain("out of memory");
+    }
+    return kExitFailed;
+}
+
+} // namespace lumenkey::tools

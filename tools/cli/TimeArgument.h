@@ -1,0 +1,28 @@
+#pragma once
+
+#include "lumenkey/foundation/Tempus.h"
+
+#include <string_view>
+#include <vector>
+
+namespace lumenkey::tools {
+
+/// A time as a user writes it: `VALUE/TIMESCALE`, seconds (`0.5`, taken as the exact decimal) or frames
+/// (`12f`). What has no exact form as a time is refused.
+class TimeArgument {
+public:
+    /// Throws `UsageError`.
+    static TimeArgument parse(std::string_view text);
+    /// Several, with commas between them.
+    static std::vector<TimeArgument> parseList(std::string_view text);
+
+    /// Where it lies when a frame lasts `frameDuration`. Throws `UsageError`.
+    Tempus resolve(Tempus const& frameDuration) const;
+
+private:
+    /// Seconds, or a number of frames.
+    Tempus _amount{};
+    bool _countsFrames = false;
+};
+
+} // namespace lumenkey::tools

@@ -1,0 +1,29 @@
+#pragma once
+
+#include "tools/output/OutputSink.h"
+
+#include <functional>
+#include <string>
+
+namespace CLI {
+class App;
+}
+
+namespace lumenkey::tools {
+
+/// A verb of the program, declared to the parser of arguments.
+struct Verb {
+    CLI::App* arguments = nullptr;
+    /// `FILE CHANNEL... [--slope]`: what follows the verb's name in its usage.
+    std::string usage;
+    /// What it does once its arguments are read. Throws `InputError`, `OutputError` or `UsageError`.
+    std::function<void(OutputSink&)> run;
+};
+
+Verb declareInfo(CLI::App& program);
+Verb declareKeys(CLI::App& program);
+Verb declareSample(CLI::App& program);
+Verb declarePlot(CLI::App& program);
+Verb declareGallery(CLI::App& program);
+
+} // namespace lumenkey::tools

@@ -1,0 +1,58 @@
+#include "tools/curve/Keypoint.h"
+
+#include <array>
+#include <string_view>
+#include <utility>
+
+namespace lumenkey::tools {
+
+namespace {
+
+constexpr std::array<std::pair<std::uint32_t, std::string_view>, 17> kNames{
+    {{kKFInterpolationConstant, "constant"},
+     {kKFInterpolationLinear, "linear"},
+     {kKFInterpolationBezier, "bezier"},
+     {kKFInterpolationCatmullRom, "catmull-rom"},
+     {kKFInterpolationEaseIn, "ease in"},
+     {kKFInterpolationEaseOut, "ease out"},
+     {kKFInterpolationBSpline, "b-spline"},
+     {kKFInterpolationXSpline, "x-spline"},
+     {kKFInterpolationExponential, "exponential"},
+     {kKFInterpolationLogarithmic, "logarithmic"},
+     {kKFInterpolationEase, "ease"},
+     {kKFInterpolationAccelerate, "accelerate"},
+     {kKFInterpolationDecelerate, "decelerate"},
+     {kKFInterpolationLinearToo, "linear too"},
+     {kKFInterpolationConvex, "convex"},
+     {kKFInterpolationConcave, "concave"},
+     {kKFInterpolationSCurve, "s-curve"}}};
+
+} // namespace
+
+Keypoint readKeypoint(KFSpline& spline, void* handle) {
+    Keypoint key;
+    spline.getVertex(handle, &key.time, &key.value, kTempusZero);
+    spline.getVertexInterpolation(handle, &key.interpolation, &key.usesHandles);
+    spline.getVertexInputHandles(handle, &key.in.seconds, &key.in.value, kTempusZero, true);
+    spline.getVertexOutputHandles(handle, &key.out.seconds, &key.out.value, kTempusZero, true);
+    key.enabled = spline.isEnabledVertex(handle, kTempusZero);
+    spline.getVertexFlags(handle, &key.flags);
+    return key;
+}
+
+std::vector<void*> keypointHandles(KFSpline& spline) {
+    std::vector<void*> handles;
+    spline.getAllVerticesHandles(handles);
+    return handles;
+}
+
+std::string interpolationName(std::uint32_t type) {
+    for (auto const& [number, name] : kNames) {
+        if (number == type) {
+            return std::string(name);
+        }
+    }
+    return "bezier (" + std::to_string(type) + ")";
+}
+
+} // namespace lumenkey::tools

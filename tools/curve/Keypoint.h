@@ -1,0 +1,39 @@
+#pragma once
+
+#include "lumenkey/splines/KFSpline.h"
+
+#include <cstdint>
+#include <string>
+#include <vector>
+
+namespace lumenkey::tools {
+
+/// The end of a handle, seen from its keypoint.
+struct KeypointHandle {
+    double seconds = 0;
+    double value = 0;
+
+    bool isFlat() const { return seconds == 0 && value == 0; }
+};
+
+/// A keypoint as a user sees it: handles instead of tangents.
+struct Keypoint {
+    Tempus time{};
+    double value = 0;
+    std::uint32_t interpolation = 0;
+    bool usesHandles = false;
+    KeypointHandle in;
+    KeypointHandle out;
+    bool enabled = true;
+    std::uint32_t flags = 0;
+};
+
+/// `handle` is that of a vertex of the spline.
+Keypoint readKeypoint(KFSpline& spline, void* handle);
+
+std::vector<void*> keypointHandles(KFSpline& spline);
+
+/// The name of a type, such as "linear"; an unknown number draws as Bezier and is called "bezier (99)".
+std::string interpolationName(std::uint32_t type);
+
+} // namespace lumenkey::tools

@@ -1,0 +1,36 @@
+#include "tools/output/StandardOutput.h"
+
+#include <cerrno>
+#include <system_error>
+#include <unistd.h>
+
+namespace lumenkey::tools {
+
+int writeFully(int descriptor, std::string_view text) noexcept {
+    while (!text.empty()) {
+        ssize_t const count = ::write(descriptor, text.data(), text.size());
+        if (count < 0 && errno != EINTR) {
+            return errno;
+        }
+        text.remove_prefix(count > 0 ? static_cast<std::size_t>(count) : 0);
+    }
+    return 0;
+}
+
+void StandardOutput::write(std::string_view text) {
+    constexpr std::size_t enough = 65'536;
+    _buffer += text;
+    if (_buffer.size() >= enough) {
+        flush();
+    }
+}
+
+void StandardOutput::flush() {
+    int const error = writeFully(STDOUT_FILENO, _buffer);
+    _buffer.clear();
+    if (error != 0) {
+        throw OutputError{"standard output", std::generic_category().message(error)};
+    }
+}
+
+} // namespace lumenkey::tools

@@ -1,0 +1,47 @@
+#include "tools/output/Table.h"
+
+#include "tools/output/TextForms.h"
+
+#include <algorithm>
+
+namespace lumenkey::tools {
+
+namespace {
+
+/// `text` in a cell of `width`; no spaces behind the last one of a row.
+std::string padded(std::string const& text, std::size_t width, Align align, bool isLast) {
+    std::size_t const own = widthOfText(text);
+    std::string const space(width > own ? width - own : 0, ' ');
+    if (align == Align::Right) {
+        return space + text;
+    }
+    return isLast ? text : text + space;
+}
+
+} // namespace
+
+void Table::write(OutputSink& out) const {
+    std::vector<std::size_t> widths;
+    for (TableColumn const& column : columns) {
+        widths.push_back(widthOfText(column.title));
+    }
+    for (std::size_t row = 0; row < rowCount; ++row) {
+        for (std::size_t i = 0; i < columns.size(); ++i) {
+            widths[i] = std::max(widths[i], widthOfText(printableText(cell(row, i))));
+        }
+    }
+    auto const writeRow = [&](auto const& textOf) {
+        std::string line;
+        for (std::size_t i = 0; i < columns.size(); ++i) {
+            line += (i == 0 ? "" : "  ");
+            line += padded(printableText(textOf(i)), widths[i], columns[i].align, i + 1 == columns.size());
+        }
+        out.write(line + "\n");
+    };
+    writeRow([&](std::size_t i) { return columns[i].title; });
+    for (std::size_t row = 0; row < rowCount; ++row) {
+        writeRow([&](std::size_t i) { return cell(row, i); });
+    }
+}
+
+} // namespace lumenkey::tools

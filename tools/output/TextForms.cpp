@@ -1,0 +1,86 @@
+#include "tools/output/TextForms.h"
+
+#include <array>
+#include <charconv>
+#include <cmath>
+#include <numeric>
+
+namespace lumenkey::tools {
+
+namespace {
+
+/// Enough for any double in each of the forms used here.
+using NumberBuffer = std::array<char, 64>;
+
+std::string textOf(NumberBuffer const& buffer, std::to_chars_result result) {
+    return {buffer.data(), static_cast<std::size_t>(result.ptr - buffer.data())};
+}
+
+} // namespace
+
+std::string shortestText(double value) {
+    if (std::isnan(value)) {
+        return "nan";
+    }
+    NumberBuffer buffer{};
+    return textOf(buffer, std::to_chars(buffer.data(), buffer.data() + buffer.size(), value));
+}
+
+std::string tableText(double value) {
+    double const magnitude = std::abs(value);
+    NumberBuffer buffer{};
+    char* const begin = buffer.data();
+    char* const end = begin + buffer.size();
+    value = value == 0 ? 0 : value; // people need no minus zero
+    bool const showsInDecimals = magnitude < 1e9 && (magnitude >= 1e-4 || magnitude == 0);
+    return textOf(buffer, showsInDecimals ? std::to_chars(begin, end, value, std::chars_format::fixed, 6)
+                                          : std::to_chars(begin, end, value, std::chars_format::general, 7));
+}
+
+std::string timeText(Tempus const& time) {
+    switch (TempusGetKind(time)) {
+    case TempusKind::Number:
+        break;
+    case TempusKind::PositiveInfinity:
+        return "+infinity";
+    case TempusKind::NegativeInfinity:
+        return "-infinity";
+    case TempusKind::Indefinite:
+        return "indefinite";
+    case TempusKind::Invalid:
+        return "invalid";
+    }
+    int64_t const divisor = std::gcd(time.value, int64_t{time.timescale});
+    std::string text = std::to_string(time.value / divisor) + "/" + std::to_string(time.timescale / divisor);
+    if (time.epoch != 0) {
+        text += "@" + std::to_string(time.epoch);
+    }
+    return TempusHasBeenRounded(time) ? text + "~" : text;
+}
+
+std::string printableText(std::string_view text) {
+    constexpr std::string_view hexadecimal = "0123456789abcdef";
+    std::string printable;
+    for (char const c : text) {
+        auto const byte = static_cast<unsigned char>(c);
+        if (byte >= 0x20 && byte != 0x7F) {
+            printable += c;
+            continue;
+        }
+        printable += "\\x";
+        printable += hexadecimal[byte >> 4];
+        printable += hexadecimal[byte & 0xF];
+    }
+    return printable;
+}
+
+std::size_t widthOfText(std::string_view text) {
+    std::size_t width = 0;
+    for (char const c : text) {
+        // Continuation bytes belong to the character before them.
+        width += (static_cast<unsigned char>(c) & 0xC0) != 0x80;
+    }
+    return width;
+}
+
+} // namespace lumenkey::tools

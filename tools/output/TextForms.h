@@ -1,0 +1,26 @@
+#pragma once
+
+#include "lumenkey/foundation/Tempus.h"
+
+#include <string>
+#include <string_view>
+
+namespace lumenkey::tools {
+
+/// The shortest decimal that reads back to the same bits; `inf`, `-inf` and `nan` for what is no number.
+std::string shortestText(double value);
+
+/// For tables: six decimals, or seven significant digits where those would show nothing or too much.
+std::string tableText(double value);
+
+/// `VALUE/TIMESCALE` in lowest terms, with `@EPOCH` and `~` behind it where the time has an epoch or was
+/// rounded; the words `invalid`, `indefinite`, `+infinity`, `-infinity` for what is no number.
+std::string timeText(Tempus const& time);
+
+/// What never breaks a line or moves the cursor: control characters as `\xNN`.
+std::string printableText(std::string_view text);
+
+/// The number of characters of UTF-8 text; a byte that is no part of one counts as one.
+std::size_t widthOfText(std::string_view text);
+
+} // namespace lumenkey::tools

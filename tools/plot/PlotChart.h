@@ -1,0 +1,36 @@
+#pragma once
+
+#include "tools/plot/CurvePicture.h"
+#include "tools/plot/PlotCanvas.h"
+
+#include <string>
+#include <vector>
+
+namespace lumenkey::tools {
+
+struct ChartCurve {
+    std::string name;
+    CurvePicture picture;
+};
+
+/// Curves of one unit, which share an axis of values.
+struct ChartPanel {
+    std::string unit;
+    std::vector<ChartCurve> curves;
+};
+
+/// Values over time: a panel for each unit above a common axis of seconds, with a legend. Curves take their
+/// colours in order, over all panels.
+struct PlotChart {
+    std::string title;
+    std::string subtitle;
+    PlotRange seconds;
+    std::vector<ChartPanel> panels;
+
+    void draw(PlotCanvas& canvas) const;
+};
+
+/// How many pixels a chart of this width gives to its curves.
+double widthOfCurves(double chartWidth);
+
+} // namespace lumenkey::tools
