@@ -1,0 +1,13 @@
+#pragma once
+
+struct Bench;
+
+/// Each registers its benchmarks, which refer to `bench` until they have run.
+void registerEvaluation(Bench& bench);
+void registerEditing(Bench& bench);
+void registerMemory(Bench& bench);
+void registerThreads(Bench& bench);
+// What a host would use instead. Where one wasn't found when the build was configured, a note says so.
+void registerGsl(Bench& bench);
+void registerGStreamer(Bench& bench);
+void registerMlt(Bench& bench);

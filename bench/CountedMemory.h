@@ -1,0 +1,16 @@
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+
+/// The program's `operator new` and `operator delete`, which the library calls too, count and hand on to malloc.
+namespace CountedMemory {
+
+/// Allocations and releases by this thread so far.
+std::uint64_t calls() noexcept;
+/// Bytes of the heap in use, with its own bookkeeping.
+std::size_t heapBytes() noexcept;
+/// Bytes that the heap gave for an object from `operator new`, without its bookkeeping.
+std::size_t objectBytes(void* object) noexcept;
+
+} // namespace CountedMemory
