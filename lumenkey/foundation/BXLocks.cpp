@@ -22,7 +22,7 @@ void BXSpinLock::waitAndLock() noexcept {
     // In pauses, which last 10 to 45 ns each. Every look takes the cache line from the owner, which costs it some
     // ten turns, so even the first wait lasts for many. Tuned by measuring: half the longest wait loses about 5 %
     // more of one thread's throughput, twice as much gains 1 or 2 %.
-    constexpr unsigned firstWait = 32;
+    constexpr unsigned firstWait = 16;
     constexpr unsigned longestWait = 128;
     constexpr unsigned looksBeforeYielding = 16;
     unsigned wait = firstWait;

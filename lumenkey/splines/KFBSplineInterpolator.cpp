@@ -64,7 +64,8 @@ void KFBSplineInterpolator::generateOpenKnotVector(std::uint32_t count) {
 void KFBSplineInterpolator::fillTempArrays(std::vector<KFVertex*> const& vertices, Tempus const& t) {
     for (std::size_t i = 0; i < _values.size(); ++i) {
         std::size_t const controlPoint = _firstControlPoint + i;
-        // On a closed spline the last vertex stands in front of the first too, and the first two behind the last.
+        // On a closed spline the last vertex stands in front of the first too, and the first two behind the
+        // last.
         std::size_t const index =
             _closed ? (controlPoint + vertices.size() - 1) % vertices.size() : controlPoint;
         _values[i] = vertices[index]->getValueV(t);
@@ -72,15 +73,17 @@ void KFBSplineInterpolator::fillTempArrays(std::vector<KFVertex*> const& vertice
     }
 }
 
-/// The recursion of Cox and de Boor ("The NURBS Book", equation 2.5), for the basis functions that aren't 0 over the
-/// knot span of x alone: those of the control points from `_firstControlPoint` on, one for each entry of `_basis`.
+/// The recursion of Cox and de Boor ("The NURBS Book", equation 2.5), for the basis functions that aren't 0
+/// over the knot span of x alone: those of the control points from `_firstControlPoint` on, one for each
+/// entry of `_basis`.
 void KFBSplineInterpolator::generateRationalBasisFunctions(double x) {
     auto const lastKnot = static_cast<std::ptrdiff_t>(_knots.size()) - 1;
     std::ptrdiff_t const span = std::upper_bound(_knots.begin(), _knots.end(), x) - _knots.begin() - 1;
     auto const order = static_cast<std::ptrdiff_t>(_order);
     auto const knot = [this](std::ptrdiff_t i) { return _knots[static_cast<std::size_t>(i)]; };
 
-    // entries[j] belongs to control point span - order + 1 + j; one more, for the end of the recursion, stays 0.
+    // entries[j] belongs to control point span - order + 1 + j; one more, for the end of the recursion, stays
+    // 0.
     double entries[kHighestOrder + 1] = {};
     if (span >= 0 && span < lastKnot) {
         entries[order - 1] = 1.0;

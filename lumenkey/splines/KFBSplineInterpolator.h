@@ -6,18 +6,18 @@
 #include <cstdint>
 #include <vector>
 
-/// A rational B-spline of order up to 4 whose weighted control points are the spline's vertices (Piegl and Tiller,
-/// "The NURBS Book", 1997, chapters 2 and 4). One function covers the whole spline. Meant for parametric splines: on
-/// any other the value is 0.
+/// A rational B-spline of order up to 4 whose weighted control points are the spline's vertices (Piegl and
+/// Tiller, "The NURBS Book", 1997, chapters 2 and 4). One function covers the whole spline. Meant for
+/// parametric splines: on any other the value is 0.
 ///
 /// A bias of 1 is weight 1, a bias of 0 weight 25, a bias of 2 weight 0.1.
 ///
-/// An open spline has the order of its number of vertices, up to 4, and U runs from 0 to the number of knots less 1. On
-/// a closed spline the first three control points return behind the last one, knots are the whole numbers, and U runs
-/// from the order less 1 to the number of control points. Outside, the value falls to 0.
+/// An open spline has the order of its number of vertices, up to 4, and U runs from 0 to the number of knots
+/// less 1. On a closed spline the first three control points return behind the last one, knots are the whole
+/// numbers, and U runs from the order less 1 to the number of control points. Outside, the value falls to 0.
 ///
-/// The slope is a difference over 1/1000 around the position, one-sided at the ends of that range. Evaluation costs
-/// O(log n), and O(n) once after a change of the spline's vertices.
+/// The slope is a difference over 1/1000 around the position, one-sided at the ends of that range. Evaluation
+/// costs O(log n), and O(n) once after a change of the spline's vertices.
 class LUMENKEY_API KFBSplineInterpolator : public KFInterpolator {
 public:
     void init(KFSpline& spline, Tempus const& t) override;
@@ -48,7 +48,8 @@ private:
     std::uint32_t _vertexCount = 0;
     bool _closed = false;
 
-    // Of the last position evaluated: the control points that weigh there, at most `_order` from the first on.
+    // Of the last position evaluated: the control points that weigh there, at most `_order` from the first
+    // on.
     std::uint32_t _firstControlPoint = 0;
     std::vector<double> _values;
     std::vector<double> _weights;

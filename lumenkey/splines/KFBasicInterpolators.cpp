@@ -47,8 +47,8 @@ double draw(Shape shape, KFSpline& spline, Tempus const& t, void* vA, void* vB, 
     return segment.isEmpty() ? a : shape(segment.fraction(u), a, valueOf(vB, t));
 }
 
-/// Appends the position at which a segment has the value, by the inverse of its shape: a fraction from an inversion
-/// whose ends differ.
+/// Appends the position at which a segment has the value, by the inverse of its shape: a fraction from an
+/// inversion whose ends differ.
 template <class InverseShape>
 bool invert(InverseShape inverseShape, KFSpline& spline, void* vA, void* vB, Tempus const& lowU,
             Tempus const& highU, double value, std::vector<Tempus>& out) {
@@ -56,7 +56,16 @@ bool invert(InverseShape inverseShape, KFSpline& spline, void* vA, void* vB, Tem
         return false;
     }
     Inversion const ends(spline, vA, vB);
-    return ends.append(ends.a == ends.b ? 0.0 : inverseShape(ends), out);
+    if (ends.a == ends.b) {
+        return value == ends.a && ends.append(0.0, out);
+    }
+    return ends.append(inverseShape(ends), out);
+}
+
+/// A sine or cosine that roundings alone took past the range; one that lies further out has no angle.
+double withinRoundings(double sine) {
+    constexpr double roundings = 1e-12;
+    return std::fabs(sine) <= 1.0 + roundings ? std::clamp(sine, -1.0, 1.0) : sine;
 }
 
 double easedFraction(std::uint32_t easing, void* vA, KFSegmentSpan const& segment, Tempus const& u) {
@@ -194,7 +203,7 @@ bool KFEaseInInterpolator::uForCurveValue(KFSpline& spline, void* vA, void* vB, 
                                           Tempus const& highU, double value, std::vector<Tempus>& out) {
     auto const inverse = [value](Inversion const& ends) {
         double const cosine = (ends.a - value) / (ends.b - ends.a) + 1.0;
-        return 2.0 * std::acos(std::clamp(cosine, -1.0, 1.0)) / KFShape::kPi;
+        return 2.0 * std::acos(withinRoundings(cosine)) / KFShape::kPi;
     };
     return invert(inverse, spline, vA, vB, lowU, highU, value, out);
 }
@@ -208,7 +217,7 @@ bool KFEaseOutInterpolator::uForCurveValue(KFSpline& spline, void* vA, void* vB,
                                            Tempus const& highU, double value, std::vector<Tempus>& out) {
     auto const inverse = [value](Inversion const& ends) {
         double const sine = (value - ends.a) / (ends.b - ends.a);
-        return 2.0 * std::asin(std::clamp(sine, -1.0, 1.0)) / KFShape::kPi;
+        return 2.0 * std::asin(withinRoundings(sine)) / KFShape::kPi;
     };
     return invert(inverse, spline, vA, vB, lowU, highU, value, out);
 }

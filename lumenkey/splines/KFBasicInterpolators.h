@@ -4,24 +4,25 @@
 
 #include <cstdint>
 
-/// The types that need no tangents. Below, a and b are the values of vA and vB and p is the fraction of the segment
-/// that lies before u, computed from exact times and rounded once.
+/// The types that need no tangents. Below, a and b are the values of vA and vB and p is the fraction of the
+/// segment that lies before u, computed from exact times and rounded once.
 ///
 /// A segment of no length has the value a and the slope 0.
 ///
-/// `uForCurveValue` reads values at time zero and gives false for a value that doesn't lie between those of the spline
-/// at `lowU` and `highU`. Where a and b are the same the position is that of vA; a position that no number expresses
-/// isn't given.
+/// `uForCurveValue` reads values at time zero and gives false for a value that doesn't lie between those of
+/// the spline at `lowU` and `highU`. Where a and b are the same the position is that of vA; a position that
+/// no number expresses isn't given.
 ///
-/// `getMinMaxValues` gives the lowest and highest value that a segment takes between two positions; both targets
-/// aren't null, and values are read at time zero.
+/// `getMinMaxValues` gives the lowest and highest value that a segment takes between two positions; both
+/// targets aren't null, and values are read at time zero.
 
 /// Holds a; its slope is 0.
 class LUMENKEY_API KFConstantInterpolator : public KFInterpolator {
 public:
     double interpolate(KFSpline& spline, Tempus const& t, void* vA, void* vB, Tempus const& u,
                        bool parametric, bool derivative) override;
-    /// Adds a vertex of its own in the middle of the segment, whatever the place of `newVertex`. It locks the spline.
+    /// Adds a vertex of its own in the middle of the segment, whatever the place of `newVertex`. It locks the
+    /// spline.
     void subDivide(KFSpline& spline, Tempus const& t, void* vA, void* vB, void* newVertex) override;
     /// `lowU`, when the segment holds exactly that value.
     bool uForCurveValue(KFSpline& spline, void* vA, void* vB, Tempus const& lowU, Tempus const& highU,
@@ -30,7 +31,8 @@ public:
                          double* max);
 };
 
-/// (1 - p) a + p b, each fraction rounded by itself, so that both ends come out exactly; the slope is constant.
+/// (1 - p) a + p b, each fraction rounded by itself, so that both ends come out exactly; the slope is
+/// constant.
 class LUMENKEY_API KFLinearInterpolator : public KFInterpolator {
 public:
     KFLinearInterpolator() noexcept = default;
@@ -45,8 +47,8 @@ public:
                          double* min, double* max);
 
 protected:
-    /// For a type that eases in time. Its values are computed from the eased fraction itself and not from the time
-    /// that `easeTime` makes of it, so that they don't depend on how finely that time can be written.
+    /// For a type that eases in time. Its values are computed from the eased fraction itself and not from the
+    /// time that `easeTime` makes of it, so that they don't depend on how finely that time can be written.
     explicit KFLinearInterpolator(std::uint32_t easing) noexcept : _easing(easing) {}
     /// What `easeTime` of such a type answers; the ramps follow the bias of vA at time zero.
     Tempus easedTime(KFSpline& spline, Tempus const& u, void* vA, void* vB) const;
@@ -105,8 +107,8 @@ public:
                         double value, std::vector<Tempus>& out) override;
 };
 
-/// Exponential growth over four decades from a, scaled to reach b. `uForCurveValue` leaves the start of the growth, a
-/// ten-thousandth, out of account: near a its positions come too early.
+/// Exponential growth over four decades from a, scaled to reach b. `uForCurveValue` leaves the start of the
+/// growth, a ten-thousandth, out of account: near a its positions come too early.
 class LUMENKEY_API KFExponentialInterpolator : public KFMonotonicInterpolator {
 public:
     double interpolate(KFSpline& spline, Tempus const& t, void* vA, void* vB, Tempus const& u,

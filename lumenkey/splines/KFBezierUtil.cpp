@@ -43,18 +43,19 @@ double KFBezierFindParameter(double const* p, double value) noexcept {
     return clampToUnit(nearest);
 }
 
-// With handles that reach d1 forward from the start and d2 back from the end, U'(t) has two roots inside when the
-// handles overlap by too much. The polygons that just don't fold have a double root, at a parameter s:
+// With handles that reach d1 forward from the start and d2 back from the end, U'(t) has two roots inside when
+// the handles overlap by too much. The polygons that just don't fold have a double root, at a parameter s:
 //
 //     U'(t) = 3 (U3 - U0) / (1 - 3 s + 3 s^2) * (t - s)^2
 //
 // whose handles are s^2 / g and (1 - s)^2 / g with g = (1 - 3 s + 3 s^2) / (U3 - U0). The s chosen keeps the
-// proportion of the handles, s^2 : (1 - s)^2 = d1 : d2. Their sum is above 2/3 then, so one of them at least is long.
+// proportion of the handles, s^2 : (1 - s)^2 = d1 : d2. Their sum is above 2/3 then, so one of them at least
+// is long.
 void KFBezierSanitizeControlPolygon(double* polygonU, double* polygonV) noexcept {
     double const start = polygonU[0];
     double const end = polygonU[3];
-    // With both inner points between the outer ones U'(t), whose Bezier values are then such that the square of the
-    // middle one doesn't exceed the product of the others, has no two roots: nothing to solve.
+    // With both inner points between the outer ones U'(t), whose Bezier values are then such that the square
+    // of the middle one doesn't exceed the product of the others, has no two roots: nothing to solve.
     if (start <= polygonU[1] && polygonU[1] <= end && start <= polygonU[2] && polygonU[2] <= end) {
         return;
     }

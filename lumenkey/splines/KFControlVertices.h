@@ -9,11 +9,12 @@
 class KFSpline;
 class KFVertex;
 
-/// The valid vertices of a spline in their order, for strategies that draw a spline as one function of its control
-/// points. They are listed anew when the spline's vertices have changed, and at each request where vertices may be
-/// enabled at one time and disabled at another.
+/// The valid vertices of a spline in their order, for strategies that draw a spline as one function of its
+/// control points. They are listed anew when the spline's vertices have changed, and at each request where
+/// vertices may be enabled at one time and disabled at another.
 ///
-/// The vertices stay the spline's, whose lock guards the list. A copy starts empty: it will serve another spline.
+/// The vertices stay the spline's, whose lock guards the list. A copy starts empty: it will serve another
+/// spline.
 class LUMENKEY_API KFControlVertices {
 public:
     KFControlVertices() noexcept = default;

@@ -107,7 +107,7 @@ bool agree(std::atomic<Strategy*> const& slotA, std::atomic<Strategy*> const& sl
 
 KFInterpolators::KFInterpolators() : _strategies(&KFInterpolatorStrategies::getInstance()) {}
 
-KFInterpolators::KFInterpolators(KFInterpolators const& other) : _strategies(other._strategies) {
+KFInterpolators::KFInterpolators(KFInterpolators const& other) : KFInterpolators() {
     assign(_bSpline, other._bSpline);
     assign(_xSpline, other._xSpline);
 }

@@ -10,14 +10,14 @@
 class KFBSplineInterpolator;
 class KFXSplineInterpolator;
 
-/// One instance of each strategy that all splines share. Made on first use, safely against a concurrent first use;
-/// lives until the process ends.
+/// One instance of each strategy that all splines share. Made on first use, safely against a concurrent first
+/// use; lives until the process ends.
 class LUMENKEY_API KFInterpolatorStrategies : public BXSingleton {
 public:
     static KFInterpolatorStrategies& getInstance();
 
-    /// The strategy of a type; Bezier for every number that has none here, also for BSpline and XSpline, whose
-    /// strategies belong to one spline each. The strategy isn't the caller's.
+    /// The strategy of a type; Bezier for every number that has none here, also for BSpline and XSpline,
+    /// whose strategies belong to one spline each. The strategy isn't the caller's.
     KFInterpolator* getInterpolator(std::uint32_t type) const noexcept;
 
     KFInterpolatorStrategies();
@@ -28,11 +28,11 @@ private:
     std::unique_ptr<Strategies> _strategies;
 };
 
-/// The strategies of one spline: the shared ones, and a BSpline and an XSpline strategy of its own, each made when it
-/// is first asked for.
+/// The strategies of one spline: the shared ones, and a BSpline and an XSpline strategy of its own, each made
+/// when it is first asked for.
 ///
-/// Threads: `getInterpolator` may be called by several threads at once; of two strategies made at once one survives.
-/// Assignment and destruction need the spline's lock.
+/// Threads: `getInterpolator` may be called by several threads at once; of two strategies made at once one
+/// survives. Assignment and destruction need the spline's lock.
 class LUMENKEY_API KFInterpolators {
 public:
     KFInterpolators();
@@ -40,7 +40,8 @@ public:
     KFInterpolators& operator=(KFInterpolators const& other);
     ~KFInterpolators();
 
-    /// Both sides have a BSpline strategy or neither has, the same for XSpline, and those there are compare equal.
+    /// Both sides have a BSpline strategy or neither has, the same for XSpline, and those there are compare
+    /// equal.
     bool operator==(KFInterpolators const& other) const;
 
     KFInterpolator* getInterpolator(std::uint32_t type);

@@ -17,8 +17,8 @@ struct KFSegmentSpan {
     Tempus duration() const noexcept { return BX_TempusSaferSubtract(u2, u1); }
     /// No fraction may be asked of an empty segment.
     bool isEmpty() const noexcept { return TempusCompare(u1, u2) == 0; }
-    /// The fraction of the segment that lies before `u`, and the one that lies behind it. Each is rounded by itself,
-    /// so that the two are exact at both ends.
+    /// The fraction of the segment that lies before `u`, and the one that lies behind it. Each is rounded by
+    /// itself, so that the two are exact at both ends.
     double fraction(Tempus const& u) const noexcept {
         return TempusRatio(BX_TempusSaferSubtract(u, u1), duration());
     }
@@ -34,8 +34,9 @@ inline KFSegmentSpan segmentSpan(KFSpline& spline, void* vA, void* vB) {
     return {u1, TempusCompare(u1, u2) > 0 ? BX_TempusSaferAdd(u1, spline.getSmallDeltaU()) : u2};
 }
 
-/// The shapes of segments, each a pure function of the fraction `p` of the segment and of the values a and b at its
-/// ends. The strategies and the evaluator of a spline both draw with them, and so agree to the last bit.
+/// The shapes of segments, each a pure function of the fraction `p` of the segment and of the values a and b
+/// at its ends. The strategies and the evaluator of a spline both draw with them, and so agree to the last
+/// bit.
 ///
 /// A segment of no length has the value a and the slope 0; that is for the caller to see to.
 namespace KFShape {
@@ -55,7 +56,8 @@ inline double linear(double complement, double p, double a, double b) noexcept {
     return complement * a + p * b;
 }
 
-/// How a segment of a type that eases in time moves, given the bias of its first vertex. Other types move evenly.
+/// How a segment of a type that eases in time moves, given the bias of its first vertex. Other types move
+/// evenly.
 inline BXMath::EaseInOut easing(std::uint32_t type, double bias) noexcept {
     double const ramp = 2.0 - bias;
     switch (type) {
@@ -82,8 +84,8 @@ inline double easeIn(double p, double a, double b) noexcept {
 inline double easeOut(double p, double a, double b) noexcept { return a + (b - a) * std::sin(kPi * p * 0.5); }
 
 /// With L = ln|b - a| and K the range, a + (b - a) (exp((L + K) p - K) - exp(-K)) / (exp(L) - exp(-K)). With
-/// exp(-K) taken out, the quotient is that of exp(g p) - 1 and exp(g) - 1 for g = L + K: nothing cancels where g or p
-/// is small, and where g is large exp(g (p - 1)) is taken out too, so that nothing overflows.
+/// exp(-K) taken out, the quotient is that of exp(g p) - 1 and exp(g) - 1 for g = L + K: nothing cancels
+/// where g or p is small, and where g is large exp(g (p - 1)) is taken out too, so that nothing overflows.
 inline double exponential(double p, double a, double b) noexcept {
     double const d = b - a;
     if (d == 0.0) {
@@ -96,15 +98,20 @@ inline double exponential(double p, double a, double b) noexcept {
     if (growth < 0.0) {
         return a + d * (std::expm1(growth * p) / std::expm1(growth));
     }
+    if (p < 0.0) {
+        // Before the segment, where a closed spline is read: neither factor of the form below would stay finite.
+        return a + d * (std::expm1(growth * p) * std::exp(-growth) / -std::expm1(-growth));
+    }
     return a + d * (std::exp(growth * (p - 1.0)) * (std::expm1(-growth * p) / std::expm1(-growth)));
 }
 
 inline double logarithmic(double p, double a, double b) noexcept {
-    return a + ((b - a) / kLogarithmicRange) * std::log(p * 999.0 + 1.0);
+    // Before the segment, where a closed spline is read, the logarithm has an end; the curve stays at a there.
+    return p < 0.0 ? a : a + ((b - a) / kLogarithmicRange) * std::log(p * 999.0 + 1.0);
 }
 
-// The three below are drawn with sines and cosines of single precision, which is part of their result: only the
-// angle and what is made of the sine or cosine have double precision.
+// The three below are drawn with sines and cosines of single precision, which is part of their result: only
+// the angle and what is made of the sine or cosine have double precision.
 
 inline double sCurve(double p, double a, double b) noexcept {
     double const c = std::cos(static_cast<float>(p * kPi));

@@ -267,7 +267,7 @@ public:
     // --- Extrapolation. No lock. ---
 
     /// The value at `u` beyond `anchor`, which is the last valid vertex with `before` 0 and the first with 1. An
-    /// unknown mode leaves `out`, which isn't null.
+    /// unknown mode leaves `out`, which isn't null. `u` doesn't lie on the inner side of the anchor.
     void extrapolate(void* anchor, Tempus const& t, Tempus const& u, double* out, std::uint32_t before);
     /// Writes the continuation into the spline as vertices: `cycles` repetitions after the last vertex with `side` 0,
     /// before the first with 1. True when there are valid vertices. Takes the lock for the copy and the exchange.

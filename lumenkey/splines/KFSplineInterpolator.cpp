@@ -105,6 +105,9 @@ void KFBezierInterpolator::getControlPoints(KFSpline& spline, void* vA, void* vB
 double KFBezierInterpolator::interpolate(KFSpline& spline, Tempus const& t, void* vA, void* vB,
                                          Tempus const& u, bool parametric, bool derivative) {
     if (derivative) {
+        if (segmentSpan(spline, vA, vB).isEmpty()) {
+            return 0.0;
+        }
         auto const valueAt = [&spline](Tempus const& at) {
             return spline.getVertexValue(at, kTempusZero, false);
         };
@@ -271,7 +274,8 @@ void KFCardinalInterpolator::computeTangents(KFSpline& spline, void* vA, void* v
     double const smallDelta = TempusGetSeconds(spline.getSmallDeltaU());
     void* neighbour = nullptr;
 
-    // The neighbour that an end of an open spline lacks is the mirror image of the other one, at the same value.
+    // The neighbour that an end of an open spline lacks is the mirror image of the other one, at the same
+    // value.
     if (spline.getPreviousValidVertex(vA, &neighbour, kTempusZero)) {
         *outU = k * secondsBetween(vertexOf(neighbour).getValueU(), uB);
         *outV = k * (valueB - vertexOf(neighbour).getValueV(t));

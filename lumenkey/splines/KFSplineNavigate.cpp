@@ -53,9 +53,7 @@ bool KFSpline::getFirstValidVertex(void** out, Tempus const& t) {
 
 bool KFSpline::getLastValidVertex(void** out, Tempus const& t) {
     if (_useValidList) return give(out, _store->lastValid());
-    if (_store->empty()) return give(out, nullptr);
-    Tempus const behind = BX_TempusSaferAdd(_store->back()->getValueU(), getSmallDeltaU());
-    return getPreviousValidVertex(behind, out, t, false);
+    return give(out, vertexOrNull(*_store, enabledBefore(*_store, _store->end(), t)));
 }
 
 bool KFSpline::getNextValidVertex(void* handle, void** out, Tempus const& t) {

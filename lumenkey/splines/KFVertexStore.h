@@ -77,7 +77,7 @@ public:
     Place validFrom(Place place) const noexcept;
     /// The last valid place before `place`.
     Place validBefore(Place place) const noexcept;
-    /// False while vertices were inserted as not valid although they are enabled.
+    /// False while a vertex is listed otherwise than it is enabled: it was inserted or changed without being listed.
     bool validityIsCurrent() const noexcept { return _validityCurrent; }
 
     // Edits.

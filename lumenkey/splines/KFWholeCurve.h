@@ -5,8 +5,8 @@
 #include "lumenkey/splines/KFSpline.h"
 #include "lumenkey/splines/KFVertex.h"
 
-/// The slope at `u` of a curve over the whole spline: the difference of its values 1/1000 before and after, or one of
-/// the two and its value at `u` where the other would lie outside the spline.
+/// The slope at `u` of a curve over the whole spline: the difference of its values 1/1000 before and after,
+/// or one of the two and its value at `u` where the other would lie outside the spline.
 template <class ValueAt> double KFSlopeOfWholeCurve(KFSpline& spline, Tempus const& u, ValueAt valueAt) {
     Tempus const delta = TempusMake(1, 1000);
     Tempus const before = BX_TempusSaferSubtract(u, delta);

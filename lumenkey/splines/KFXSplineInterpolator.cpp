@@ -8,9 +8,9 @@
 #include <array>
 #include <cmath>
 
-// Letters of the paper: the control points k .. k+3 weigh in k+1 <= x < k+2. A control point's influence begins and
-// ends at T- and T+, which its neighbour's shape s moves: p = max(s, 0) widens it, and q = -s/2 for s < 0 makes the
-// curve pass through the control point, as an interpolating spline does.
+// Letters of the paper: the control points k .. k+3 weigh in k+1 <= x < k+2. A control point's influence
+// begins and ends at T- and T+, which its neighbour's shape s moves: p = max(s, 0) widens it, and q = -s/2
+// for s < 0 makes the curve pass through the control point, as an interpolating spline does.
 
 namespace {
 
@@ -40,7 +40,11 @@ public:
     double shapeAt(std::int64_t index) const {
         std::size_t const at = place(index);
         bool const isEnd = !_closed && (at == 0 || at + 1 == _vertices.size());
-        return isEnd ? 1.0 : std::min(_vertices[at]->getBias(_t), 1.0);
+        if (isEnd) {
+            return 1.0;
+        }
+        double const bias = _vertices[at]->getBias(_t);
+        return bias <= 1.0 ? bias : 1.0;
     }
 
 private:

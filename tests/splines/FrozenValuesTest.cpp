@@ -1,6 +1,6 @@
-// Values of every interpolation type at fixed positions, as the engine first gave them. A document holds keypoints and
-// not pictures, so a change of any of these is a change of every document that was ever saved: when this test fails
-// the code is at fault and never the table. Rows may be added, and none altered.
+// Values of every interpolation type at fixed positions, as the engine first gave them. A document holds
+// keypoints and not pictures, so a change of any of these is a change of every document that was ever saved:
+// when this test fails the code is at fault and never the table. Rows may be added, and none altered.
 
 #include "lumenkey/splines/KFSpline.h"
 #include "lumenkey/splines/KFStaticVertex.h"
@@ -41,7 +41,8 @@ struct Key {
     double value, bias, inU, inV, outU, outV;
 };
 
-// Times of several timescales, both directions, a handle of every length: U is inverted by each method there is.
+// Times of several timescales, both directions, a handle of every length: U is inverted by each method there
+// is.
 Key const kKeys[] = {
     {TempusMake(0, 1), 1.5, 0.5, 0.0, 0.0, 0.03125, 0.25},
     {TempusMake(1001, 1000), -2.25, 1.5, -0.0625, 0.125, 0.0625, -0.5},
@@ -72,9 +73,9 @@ double valueNow(FrozenValue const& row) {
     return spline.getVertexValue(TempusMake(row.value, row.timescale), kTempusZero, true);
 }
 
-/// What the mathematical functions of the platform may decide. The types that are products and sums are exact. Sine,
-/// exponential and logarithm of double precision have another last bit on a processor without fused operations, and
-/// those of single precision differ by their last bit, 6e-8, between libraries.
+/// What the mathematical functions of the platform may decide. The types that are products and sums are
+/// exact. Sine, exponential and logarithm of double precision have another last bit on a processor without
+/// fused operations, and those of single precision differ by their last bit, 6e-8, between libraries.
 double toleranceOf(FrozenValue const& row) {
     constexpr double ulps = 8.0 * std::numeric_limits<double>::epsilon();
     switch (row.type) {

@@ -54,7 +54,8 @@ struct Segment {
     }
 };
 
-/// The distance gone after a part p of a move that gains speed over `in` and loses it over `out`, from its speed.
+/// The distance gone after a part p of a move that gains speed over `in` and loses it over `out`, from its
+/// speed.
 long double easedLong(long double p, long double in, long double out) {
     long double const speed = 2.0L / (2.0L - in - out);
     if (p < in)
@@ -153,7 +154,8 @@ TEST(BasicInterpolators, FollowTheirFormulas) {
                     double const value = segment.value(u);
                     ASSERT_NEAR(value, truth, toleranceOf(type, ends.a, ends.b))
                         << "type " << type << ", bias " << bias << ", " << i << "/60, a " << ends.a;
-                    // What the spline answers inside is the strategy's value to the last bit, at an end the vertex's.
+                    // What the spline answers inside is the strategy's value to the last bit, at an end the
+                    // vertex's.
                     double const expected = i == 0 ? ends.a : i == 60 ? ends.b : value;
                     ASSERT_EQ(segment.spline.getVertexValue(u, kTempusZero, true), expected)
                         << "type " << type << ", bias " << bias << ", " << i << "/60, a " << ends.a;

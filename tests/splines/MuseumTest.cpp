@@ -63,9 +63,15 @@ Tempus finer(Tempus const& u, std::int32_t factor) {
 /// The distances from the vertices can be written as times. Where they can't, a strategy that is called by itself sees
 /// them rounded, while the index of the spline compares whole numbers.
 bool hasExactDistances(MuseumSpline const& curve, Tempus const& u) {
+    // Whether a time was itself rounded doesn't matter.
+    auto const asGiven = [](Tempus t) {
+        t.flags &= ~kTempusFlagHasBeenRounded;
+        return t;
+    };
     auto const vertices = museumVertices(*curve);
-    return std::none_of(vertices.begin(), vertices.end(),
-                        [&](KFVertex const* vertex) { return TempusHasBeenRounded(u - vertex->getValueU()); });
+    return std::none_of(vertices.begin(), vertices.end(), [&](KFVertex const* vertex) {
+        return TempusHasBeenRounded(asGiven(u) - asGiven(vertex->getValueU()));
+    });
 }
 
 } // namespace

@@ -355,6 +355,10 @@ TEST(KFSplineSample, KeepsToItsEndsWithoutARow) {
             curve.spline.sampleSplineSegments(kTempusZero, TempusMake(2, 1), odd, &times, &values);
             EXPECT_LE(times.size(), 40u);
         }
+        curve.spline.setExtrapolation(3, 1);
+        curve.spline.sampleSplineSegments(kTempusNegativeInfinity, TempusMake(1, 1), TempusMake(1, 10),
+                                          &times, &values);
+        EXPECT_LE(times.size(), 40u);
     }
 }
 
@@ -385,9 +389,11 @@ TEST(KFSplineSample, StretchesACurveThatIsOneFunction) {
         // A single sample stands at the start.
         count = 1;
         double value = -1.0;
-        ASSERT_TRUE(curve.spline.sampleSpline(kTempusZero, TempusMake(1, 1), count, nullptr, &value,
-                                              kTempusZero, false));
+        Tempus at;
+        ASSERT_TRUE(
+            curve.spline.sampleSpline(kTempusZero, TempusMake(1, 1), count, &at, &value, kTempusZero, false));
         EXPECT_EQ(curve.value(kTempusZero), value);
+        EXPECT_EQ(kTempusZero, at);
 
         curve.spline.deleteAllVertices();
         ASSERT_TRUE(curve.spline.sampleSpline(kTempusZero, TempusMake(1, 1), count, nullptr, &(value = -1.0),

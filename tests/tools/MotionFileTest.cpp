@@ -3,7 +3,7 @@
 #include "tests/tools/TestFolder.h"
 
 #include <gtest/gtest.h>
-#include <sys/resource.h>
+#include <random>
 
 namespace lumenkey::tools {
 namespace {
@@ -142,6 +142,35 @@ TEST(MotionFile, RefusesEveryCutOffFile) {
         EXPECT_NE(faultOf(kSmallMotion.substr(0, length)), "") << "cut at byte " << length;
     }
     EXPECT_EQ(faultOf(kSmallMotion), "");
+}
+
+TEST(MotionFile, SurvivesDamageAnywhere) {
+    std::mt19937 random(7);
+    std::string_view const spare = "{}0-.e \n\tX:JOINT\xFF";
+    for (int i = 0; i < 20'000; ++i) {
+        std::string text(kSmallMotion);
+        for (int damage = 0; damage < 3; ++damage) {
+            std::size_t const place = random() % text.size();
+            char const other = spare[random() % spare.size()];
+            switch (random() % 3) {
+            case 0:
+                text[place] = other;
+                break;
+            case 1:
+                text.insert(place, 1, other);
+                break;
+            default:
+                text.erase(place, random() % 20);
+            }
+        }
+        try {
+            Motion const motion = readMotionText(text, "f.bvh");
+            ASSERT_EQ(motion.values.size(), motion.frameCount * motion.channels.size()) << text;
+        } catch (InputError const& error) {
+            ASSERT_LE(error.line, 40U) << text;
+            ASSERT_FALSE(error.what.empty()) << text;
+        }
+    }
 }
 
 TEST(MotionFile, AsksForNoMemoryOnTheWordOfACount) {

@@ -72,9 +72,11 @@ PlotChart chartOf(MotionInput const& input, std::vector<std::size_t> const& chan
                                 traceCurve(made->spline, span.from, span.to, widthOfCurves(width))});
         bar.update(static_cast<double>(++done) / static_cast<double>(channels.size()));
     }
-    std::size_t const keypoints = chart.panels.front().curves.front().picture.keypoints.size();
-    chart.subtitle =
-        std::to_string(keypoints) + " keypoints, " + timeText(input.motion().frameDuration) + " s apart";
+    CurvePicture const& first = chart.panels.front().curves.front().picture;
+    bool const areMarked = marksFor(first, widthOfCurves(width)) != KeypointMarks::None;
+    chart.subtitle = std::to_string(first.keypoints.size()) + " keypoints, " +
+                     timeText(input.motion().frameDuration) + " s apart" +
+                     (areMarked ? "" : ", too close to mark");
     return chart;
 }
 

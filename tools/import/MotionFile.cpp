@@ -1,13 +1,13 @@
 #include "tools/import/MotionFile.h"
 
 #include "tools/import/MotionReaders.h"
+#include "tools/output/TextForms.h"
 
 #include <algorithm>
 #include <cerrno>
 #include <cstring>
 #include <fcntl.h>
 #include <sys/stat.h>
-#include <system_error>
 #include <unistd.h>
 
 namespace lumenkey::tools {
@@ -81,7 +81,7 @@ private:
     }
 
     [[noreturn]] void failBecauseOf(int error) const {
-        throw InputError{_file, 1, 1, std::generic_category().message(error)};
+        throw InputError{_file, 1, 1, systemErrorText(error)};
     }
 
     std::string const& _file;

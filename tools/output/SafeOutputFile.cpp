@@ -1,6 +1,7 @@
 #include "tools/output/SafeOutputFile.h"
 
 #include "tools/output/StandardOutput.h"
+#include "tools/output/TextForms.h"
 
 #include <cerrno>
 #include <cstdio>
@@ -92,7 +93,7 @@ SafeOutputFile::SafeOutputFile(std::string const& target) : _name(target) {
 
 void SafeOutputFile::fail(int error) {
     discard();
-    throw OutputError{_name, std::generic_category().message(error)};
+    throw OutputError{_name, systemErrorText(error)};
 }
 
 void SafeOutputFile::write(std::string_view text) {

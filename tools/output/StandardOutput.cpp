@@ -1,7 +1,8 @@
 #include "tools/output/StandardOutput.h"
 
+#include "tools/output/TextForms.h"
+
 #include <cerrno>
-#include <system_error>
 #include <unistd.h>
 
 namespace lumenkey::tools {
@@ -29,7 +30,7 @@ void StandardOutput::flush() {
     int const error = writeFully(STDOUT_FILENO, _buffer);
     _buffer.clear();
     if (error != 0) {
-        throw OutputError{"standard output", std::generic_category().message(error)};
+        throw OutputError{"standard output", systemErrorText(error)};
     }
 }
 

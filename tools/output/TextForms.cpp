@@ -3,6 +3,7 @@
 #include <array>
 #include <charconv>
 #include <cmath>
+#include <cstring>
 #include <numeric>
 
 namespace lumenkey::tools {
@@ -50,7 +51,8 @@ std::string timeText(Tempus const& time) {
     case TempusKind::Invalid:
         return "invalid";
     }
-    int64_t const divisor = std::gcd(time.value, int64_t{time.timescale});
+    // The remainder is in reach of int64_t even where the magnitude of the value is not.
+    int64_t const divisor = std::gcd(time.value % time.timescale, int64_t{time.timescale});
     std::string text = std::to_string(time.value / divisor) + "/" + std::to_string(time.timescale / divisor);
     if (time.epoch != 0) {
         text += "@" + std::to_string(time.epoch);
@@ -72,6 +74,11 @@ std::string printableText(std::string_view text) {
         printable += hexadecimal[byte & 0xF];
     }
     return printable;
+}
+
+std::string systemErrorText(int error) {
+    char const* const text = ::strerrordesc_np(error);
+    return text != nullptr ? text : "error " + std::to_string(error);
 }
 
 std::size_t widthOfText(std::string_view text) {

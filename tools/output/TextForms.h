@@ -20,6 +20,9 @@ std::string timeText(Tempus const& time);
 /// What never breaks a line or moves the cursor: control characters as `\xNN`.
 std::string printableText(std::string_view text);
 
+/// What the system calls an error, such as "No such file or directory"; in English whatever the locale.
+std::string systemErrorText(int error);
+
 /// The number of characters of UTF-8 text; a byte that is no part of one counts as one.
 std::size_t widthOfText(std::string_view text);
 
