@@ -1,7 +1,7 @@
 #include "lumenkey/version.h"
 
 #define LUMENKEY_TEXT_OF(number) #number
-#define LUMENKEY_VERSION_TEXT(major, minor, patch) \
+#define LUMENKEY_VERSION_TEXT(major, minor, patch)                                                           \
     LUMENKEY_TEXT_OF(major) "." LUMENKEY_TEXT_OF(minor) "." LUMENKEY_TEXT_OF(patch)
 
 double const LumenkeyVersionNumber =

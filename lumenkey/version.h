@@ -25,4 +25,4 @@ LUMENKEY_API extern double const LumenkeyVersionNumber;
 // link to.
 LUMENKEY_API extern char const* const LumenkeyVersionString;
 
-}  // extern "C"
+} // extern "C"

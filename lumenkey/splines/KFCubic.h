@@ -57,7 +57,8 @@ public:
             return;
         }
         _method = Method::Search;
-        for (int i = 0; i < 4; ++i) _polygon[i] = polygonU[i];
+        for (int i = 0; i < 4; ++i)
+            _polygon[i] = polygonU[i];
     }
     Method method() const noexcept { return _method; }
 
@@ -77,10 +78,10 @@ public:
     }
 
     /// For the methods that iterate; `Steps` is theirs.
-    template <int Steps>
-    double iterate(double p) const noexcept {
+    template <int Steps> double iterate(double p) const noexcept {
         double s = start(p);
-        for (int i = 0; i < Steps; ++i) s = halley(s, p);
+        for (int i = 0; i < Steps; ++i)
+            s = halley(s, p);
         // Selections by value, not std::clamp by reference, which would keep the loop out of the vector units.
         s = s > 0.0 ? s : 0.0;
         return s < 1.0 ? s : 1.0;

@@ -82,11 +82,15 @@ struct KFSegmentCache {
 
     /// The value at a position that the segment holds.
     double valueAt(std::int64_t position) const noexcept {
-        if (kind == Kind::Constant) return a;
+        if (kind == Kind::Constant)
+            return a;
         double const p = static_cast<double>(position - low) / width;
-        if (kind == Kind::Linear) return KFShape::linear(static_cast<double>(high - position) / width, p, a, b);
-        if (kind == Kind::Cubic) return value(parameter(p));
-        if (kind == Kind::Eased) return KFShape::eased(easing, p, a, b);
+        if (kind == Kind::Linear)
+            return KFShape::linear(static_cast<double>(high - position) / width, p, a, b);
+        if (kind == Kind::Cubic)
+            return value(parameter(p));
+        if (kind == Kind::Eased)
+            return KFShape::eased(easing, p, a, b);
         return shapeAt(p);
     }
 

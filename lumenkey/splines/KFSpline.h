@@ -76,12 +76,13 @@ public:
     virtual bool sampleSplineDerivatives(Tempus const& start, Tempus const& step, std::uint32_t& count,
                                          Tempus* times, double* values, Tempus const& t);
     virtual bool sampleSplineDerivatives(Tempus const& start, Tempus const& step, std::uint32_t& count,
-                                         std::vector<Tempus>* times, std::vector<double>* values, Tempus const& t);
-    virtual bool sampleSplineSegment(Tempus const& start, Tempus const& step, std::uint32_t& count, Tempus* times,
-                                     double* values, Tempus const& t, bool lock);
+                                         std::vector<Tempus>* times, std::vector<double>* values,
+                                         Tempus const& t);
+    virtual bool sampleSplineSegment(Tempus const& start, Tempus const& step, std::uint32_t& count,
+                                     Tempus* times, double* values, Tempus const& t, bool lock);
     virtual bool sampleSplineSegments(Tempus const& start, Tempus const& end, Tempus const& step,
                                       std::vector<Tempus>* times, std::vector<double>* values);
-    virtual bool enableVertex(void* handle, Tempus const& t);
+    virtual bool enableVertex(void* handle, Tempus const& t); // enabling and disabling take the lock
     virtual bool disableVertex(void* handle, Tempus const& t);
     virtual bool isEnabledVertex(void* handle, Tempus const& t);
     virtual bool setVertexInputHandles(void* handle, double u, double v, Tempus const& t, bool convert);
@@ -128,7 +129,8 @@ public:
     KFInterpolator* getInterpolator(std::uint32_t type) { return _interpolators->getInterpolator(type); }
 
     /// True asks for the tables of the per-spline interpolators to be made anew, and reads the positions and enabled
-    /// states of all vertices again unless the owner suppresses it: O(n). False says that those tables are current.
+    /// states of all vertices again unless the owner suppresses it: O(n); beside other threads the caller holds the
+    /// lock. False says that those tables are current.
     void setDirty(bool dirty);
     bool isDirty() const noexcept { return _dirty; }
     bool isClosed() const noexcept { return _closed; }
@@ -200,8 +202,8 @@ public:
     /// `range` (the last vertex when all stand before it) until the first at or past its end, appended. `first` and
     /// `last` get the U of the spline's first and last vertex, or `kTempusInvalid` when it is empty. True.
     bool getVerticesTimeAndValue(TempusRange range,
-                                 std::vector<std::pair<Tempus, std::pair<double, unsigned>>>& out, Tempus* first,
-                                 Tempus* last);
+                                 std::vector<std::pair<Tempus, std::pair<double, unsigned>>>& out,
+                                 Tempus* first, Tempus* last);
 
     // --- Ranges and extremes ---
 
@@ -280,12 +282,14 @@ public:
     //
     // `addVertex`: the handle of the new vertex, or, with `replace`, of one that stood at `u` and took the value. A
     // new vertex takes the type of the one in whose segment it stands or that it joins at one U; in front of all and
-    // behind the last valid one, and in an empty spline, that of the state. Of several at one U the newest is first.
+    // behind the last one, and in an empty spline, that of the state. Of several at one U the newest is first.
     // Replacing at an interior vertex derives the point first and so shortens the neighbours' facing tangents, at
     // each call.
     // `setVertex`: moves a vertex and sets its value; false for null, or when it merged into another at `u`, whose
     // value it then sets: the handle is gone.
     // `deleteVertex`: false for a locked vertex; with `scale` the neighbours' tangents grow back first.
+    // An edit tells the store what it changed itself. A position or an enabled state that was written on a vertex, past
+    // the spline, is seen after `setDirty(true)`.
 
     void* addVertexNoTangents(Tempus const& u, double value, Tempus const& t, bool replace);
     /// Adds at the end without comparing U: the caller keeps the order.
@@ -297,7 +301,8 @@ public:
     /// nothing was done: for null, a locked or disabled vertex, or no move. `replace`: a vertex already there stays
     /// and the moved one goes. `constrain`: the vertex stops `roundingDelta` short of the neighbour that it would
     /// cross.
-    void* moveVertex(void* handle, Tempus const& newU, Tempus const& t, bool clone, bool replace, bool constrain);
+    void* moveVertex(void* handle, Tempus const& newU, Tempus const& t, bool clone, bool replace,
+                     bool constrain);
     /// Deletes all vertices at `u` that aren't locked; true when one went.
     bool deleteVertex(Tempus const& u, bool scale, Tempus const& t);
     /// Deletes the vertices after `from` up to and including `to` that aren't locked; true when one went.
@@ -315,8 +320,12 @@ public:
     //
     // `deriveCurve` gives a vertex the slope of the curve around it, with handles that reach a third of the way to
     // its neighbours. With `readOnly` the neighbours stay. `setVertexSmooth` true derives with `readOnly` false, and
-    // so shortens the neighbours' facing tangents at each call. The handle operations don't look at the lock flag
-    // themselves; the vertex does.
+    // so shortens the neighbours' facing tangents at each call; false makes the vertex Linear with tangents of no
+    // length. The handle operations don't look at the lock flag themselves; the vertex does. The setters mark the
+    // vertex as edited by hand and no longer as having crossed a neighbour. With `convert` they take and give handles
+    // as the interpolator of the vertex's type has them (12 times a tangent for the cubic types), else tangents.
+    // `getPointInputTangents`, `getPointOutputTangents`: a unit vector; false and no target written unless the state
+    // derives tangents; not numbers where there is no neighbour on that side.
 
     /// The tangents of the curve at `u`; each target may be null, and none is written unless the state derives
     /// tangents.
@@ -327,8 +336,19 @@ public:
 
     // --- Sampling. All take the lock, but `sampleSplineSegment` only when told, `createSegment` not while it adds. ---
     //
-    // Sample i stands at `start + step * i`. A null target is skipped. The array forms of the adaptive walk need room
-    // for `count`, one sample for each valid vertex in the range, and two more.
+    // Sample i stands at `start + step * i`. A null target is skipped. A parametric spline of type BSpline or XSpline
+    // stretches its `count` samples over the whole curve, whatever `start` and `step` say.
+    //
+    // `adaptive` spends samples only where the curve bends: it walks from vertex to vertex, gives a straight segment
+    // its two ends and a curved one a sample each step, and writes back how many there are. The array form walks until
+    // `start + step * count` and leaves out where two curved segments join; it needs room for `count`, one sample for
+    // each valid vertex in the range, and two more. The vector form walks until `start + step * (count - 1)` and gives
+    // every segment its start, so that two straight ones give their join twice.
+    //
+    // `sampleSplineSegments` is the polyline for drawing: it empties its vectors, which aren't null, gives every
+    // vertex once and ends exactly at `end`; false when `end` is before `start`. `getUForValue` asks the vertex at or
+    // next to either end of the range that is enabled; a range of one step is one position, and one that ends before
+    // it starts has none.
 
     /// Appends to `out` the positions within `range`, less `step` at its end, at which the spline has `value`;
     /// descending with `flags` 1, `out` being reversed as a whole. True when `out` isn't empty.
@@ -342,8 +362,8 @@ public:
 
     /// Takes the lock. Moves vertices in value so that the spline takes `value` at `u`, within the limits: all of
     /// them, or the two around `u`. `keepShape` moves all by the same amount, the largest that the limits let.
-    void offsetSpline(Tempus const& u, double value, double maxV, double minV, bool neighboursOnly, bool keepShape,
-                      Tempus const& t);
+    void offsetSpline(Tempus const& u, double value, double maxV, double minV, bool neighboursOnly,
+                      bool keepShape, Tempus const& t);
     /// Takes the lock. Multiplies values and the ends of tangents, both limited.
     void scaleSpline(double factor, double minV, double maxV, Tempus const& t);
     /// No lock. U becomes U * factor + offset, and the U of tangents follows; locked vertices stay. The order isn't
@@ -351,8 +371,10 @@ public:
     void warpSplineLinear(double factor, Tempus const& offset, Tempus const& t);
     /// No lock. The same for all vertices, locked or not.
     void forceWarpSplineLinear(Tempus const& scale, Tempus const& offset);
-    /// Takes the lock, in two stretches. Mirrors the stretch between two handles in time; the handles are gone
-    /// afterwards. Nothing happens when a vertex of the stretch is locked. A closed spline stays closed.
+    /// Takes the lock, in two stretches, between which others see the spline without the vertices concerned. Mirrors
+    /// the stretch between two handles in time, the curve with it: a tangent changes its side and the sign of its U
+    /// part. The handles are gone afterwards, and the new vertices are marked as edited by hand. Nothing happens when a
+    /// vertex of the stretch is locked, for null, or when `last` is before `first`. A closed spline stays closed.
     void reverseVertices(void* first, void* last);
     /// Takes the lock. Turns a time curve into a parametric one: U counts vertices, tangents follow, and values begin
     /// at 0. Two vertices at one U divide by zero: `purge` first.

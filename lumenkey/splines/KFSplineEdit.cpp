@@ -38,7 +38,7 @@ KFVertexIterator KFSpline::putIn(KFVertexIterator place, std::unique_ptr<KFVerte
     // While the list of valid vertices isn't renewed, a new vertex stays out of it, and one that moves keeps
     // its part.
     KFVertexIterator const placed = store().insert(place, vertex.get(), suppressesRefresh() && !wasValid);
-    vertex.release();
+    (void)vertex.release(); // the store owns it now
     return placed;
 }
 

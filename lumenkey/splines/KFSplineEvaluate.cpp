@@ -32,17 +32,20 @@ double KFSpline::initialValue() const {
     return node == nullptr ? 0.0 : node->getInitialValue();
 }
 
-void KFSpline::interpolate(Tempus const& t, void* vA, void* vB, Tempus const& u, double* out, bool derivative) {
+void KFSpline::interpolate(Tempus const& t, void* vA, void* vB, Tempus const& u, double* out,
+                           bool derivative) {
     KFInterpolator* strategy = customInterpolator();
     if (strategy == nullptr || !static_cast<KFCustomInterpolator*>(strategy)->isActive(*this, vA)) {
         strategy = getInterpolator(vertexOf(vA).getInterpolation());
-        if (strategy->needInit(*this)) strategy->init(*this, t);
+        if (strategy->needInit(*this))
+            strategy->init(*this, t);
     }
     *out = strategy->interpolate(*this, t, vA, vB, u, getState()->parametric, derivative);
 }
 
 double KFSpline::getVertexValue(Tempus const& u, Tempus const& t, bool lock) {
-    if (!lock) return valueWithoutLock(u, t);
+    if (!lock)
+        return valueWithoutLock(u, t);
     BXSpinLock& held = guard();
     held.lock();
     // One position after another in one segment is what happens most: it is told apart by comparisons alone.
@@ -64,12 +67,15 @@ double KFSpline::valueFromLock(Tempus const& u, Tempus const& t, BXSpinLock& hel
     bool wholeCurve = false;
     KFSegmentCache& segment = *_segment;
     std::int64_t position = 0;
-    bool const moves = u.timescale == segment.scale.timescale && u.flags == kTempusFlagValid && u.epoch == 0 &&
-                       !__builtin_mul_overflow(u.value, segment.scale.perUnit, &position) && segmentStands(segment);
-    bool const done = moves ? evaluateAtVertexOrMove(position, segment, &value) : evaluateIndexed(u, segment, &value);
+    bool const moves = u.timescale == segment.scale.timescale && u.flags == kTempusFlagValid &&
+                       u.epoch == 0 && !__builtin_mul_overflow(u.value, segment.scale.perUnit, &position) &&
+                       segmentStands(segment);
+    bool const done =
+        moves ? evaluateAtVertexOrMove(position, segment, &value) : evaluateIndexed(u, segment, &value);
     if (!done) {
         wholeCurve = drawsWholeCurve();
-        if (!wholeCurve) value = evaluateByWalk(u, t);
+        if (!wholeCurve)
+            value = evaluateByWalk(u, t);
     }
     held.unlock();
     return wholeCurve ? valueOfWholeCurve(u, t, true) : value;
@@ -78,7 +84,8 @@ double KFSpline::valueFromLock(Tempus const& u, Tempus const& t, BXSpinLock& hel
 double KFSpline::valueWithoutLock(Tempus const& u, Tempus const& t) {
     KFSegmentCache own;
     double value = 0.0;
-    if (evaluateIndexed(u, own, &value)) return value;
+    if (evaluateIndexed(u, own, &value))
+        return value;
     return drawsWholeCurve() ? valueOfWholeCurve(u, t, false) : evaluateByWalk(u, t);
 }
 
@@ -86,7 +93,8 @@ double KFSpline::valueWithoutLock(Tempus const& u, Tempus const& t) {
 /// sampling of a segment draw it so; elsewhere it would come back here.
 bool KFSpline::drawsWholeCurve() {
     KFSplineState const& state = *getState();
-    if (!isWholeCurve(state.interpolation) || !state.parametric) return false;
+    if (!isWholeCurve(state.interpolation) || !state.parametric)
+        return false;
     std::uint32_t type = 0;
     getInterpolation(&type, nullptr, nullptr);
     return isWholeCurve(type);
@@ -105,21 +113,26 @@ double KFSpline::evaluateByWalk(Tempus const& u, Tempus const& t) {
     double result = initialValue();
     void* end = nullptr;
     if (!_closed && TempusCompare(u, getMinValueU(kTempusZero, false)) < 0) {
-        if (getFirstValidVertex(&end, t)) extrapolate(end, t, u, &result, 1);
+        if (getFirstValidVertex(&end, t))
+            extrapolate(end, t, u, &result, 1);
         return result;
     }
     int const order = TempusCompare(u, getMaxValueU(kTempusZero, false));
     bool const past = order > 0 || (order == 0 && getState()->retimingExtrapolation);
     if (past && !_closed) {
-        if (getLastValidVertex(&end, t)) extrapolate(end, t, u, &result, 0);
+        if (getLastValidVertex(&end, t))
+            extrapolate(end, t, u, &result, 0);
         return result;
     }
-    if (!past && evaluateBetween(u, t, &result)) return result;
+    if (!past && evaluateBetween(u, t, &result))
+        return result;
 
-    if (!getLastValidVertex(&end, t)) return result;
+    if (!getLastValidVertex(&end, t))
+        return result;
     if (_closed) {
         void* first = nullptr;
-        if (getFirstValidVertex(&first, t)) interpolate(t, end, first, u, &result, false);
+        if (getFirstValidVertex(&first, t))
+            interpolate(t, end, first, u, &result, false);
     } else if (isWholeCurve(vertexOf(end).getInterpolation())) {
         interpolate(t, end, end, u, &result, false);
     }
@@ -132,7 +145,8 @@ bool KFSpline::evaluateBetween(Tempus const& u, Tempus const& t, double* result)
     KFVertexStore const& store = *_store;
     for (auto place = store.lowerBound(u); place != store.end(); place = store.next(place)) {
         KFVertex& vertex = *store.at(place);
-        if (!vertex.isEnabled(t)) continue;
+        if (!vertex.isEnabled(t))
+            continue;
         if (TempusCompare(vertex.getValueU(), u) == 0) {
             KFVertex const& before = place == store.begin() ? vertex : *store.at(store.previous(place));
             auto const next = store.next(place);
@@ -164,7 +178,8 @@ double KFSpline::getDerivativeValue(Tempus const& u, Tempus const& t, bool lock)
     double result = 0.0;
     for (auto place = store.lowerBound(u); place != store.end(); place = store.next(place)) {
         void* previous = nullptr;
-        if (!store.at(place)->isEnabled(t) || !getPreviousValidVertex(place, &previous, t)) continue;
+        if (!store.at(place)->isEnabled(t) || !getPreviousValidVertex(place, &previous, t))
+            continue;
         interpolate(t, previous, store.at(place), u, &result, true);
         break;
     }
@@ -176,21 +191,31 @@ double KFSpline::getDerivativeValue(Tempus const& u, Tempus const& t, bool lock)
 /// Whether the index may answer at all: what it draws depends on the index, the vertices and the settings alone.
 bool KFSpline::indexServes() const noexcept {
     KFVertexStore const& store = *_store;
-    if (!_staticVertices || !listAnswers() || !store.hasTicks() || store.validCount() < 2) return false;
-    if (customInterpolator() != nullptr || isWholeCurve(getState()->interpolation)) return false;
+    if (!_staticVertices || !listAnswers() || !store.hasTicks() || store.validCount() < 2)
+        return false;
+    if (customInterpolator() != nullptr || isWholeCurve(getState()->interpolation))
+        return false;
     return !isWholeCurve(store.firstValid()->KFVertex::getInterpolation()) &&
            !isWholeCurve(store.lastValid()->KFVertex::getInterpolation());
 }
 
 bool KFSpline::evaluateIndexed(Tempus const& u, KFSegmentCache& cache, double* out) {
-    if (!TempusIsNumeric(u) || u.epoch != 0 || !indexServes()) return false;
+    if (!TempusIsNumeric(u) || u.epoch != 0)
+        return false;
+    // Read before what it tells of: a change that comes in between leaves a cache that doesn't stand.
+    std::uint32_t const changes = KFStaticVertex::getWholeCurveChanges();
+    if (!indexServes())
+        return false;
+    cache.wholeCurveChanges = changes;
     std::int64_t const tickScale = _store->tickScale();
     if (cache.scale.tickScale != tickScale || cache.scale.timescale != u.timescale) {
         cache.kind = KFSegmentCache::Kind::None;
-        if (!cache.scale.prepare(tickScale, u.timescale)) return false;
+        if (!cache.scale.prepare(tickScale, u.timescale))
+            return false;
     }
     std::int64_t position = 0;
-    if (__builtin_mul_overflow(u.value, cache.scale.perUnit, &position)) return false;
+    if (__builtin_mul_overflow(u.value, cache.scale.perUnit, &position))
+        return false;
     if (cache.holds(position) && segmentStands(cache)) {
         *out = cache.valueAt(position);
         return true;
@@ -203,34 +228,45 @@ bool KFSpline::evaluateIndexed(Tempus const& u, KFSegmentCache& cache, double* o
 bool KFSpline::evaluateAtVertexOrMove(std::int64_t position, KFSegmentCache& cache, double* out) {
     KFVertexStore const& store = *_store;
     auto const end = placeAtOrAfter(position, cache);
-    if (end == store.end()) return false;
+    if (end == store.end())
+        return false;
     std::int64_t high = 0;
-    if (__builtin_mul_overflow(store.tickAt(end), cache.scale.perTick, &high)) return false;
-    if (high == position) return valueAtVertex(end, out);
+    if (__builtin_mul_overflow(store.tickAt(end), cache.scale.perTick, &high))
+        return false;
+    if (high == position)
+        return valueAtVertex(end, out);
 
     auto const start = store.validBefore(end);
     std::int64_t low = 0;
-    if (start == store.end() || __builtin_mul_overflow(store.tickAt(start), cache.scale.perTick, &low)) return false;
-    if (!prepareSegment(start, end, low, high, cache)) return false;
+    if (start == store.end() || __builtin_mul_overflow(store.tickAt(start), cache.scale.perTick, &low))
+        return false;
+    if (!prepareSegment(start, end, low, high, cache))
+        return false;
     *out = cache.valueAt(position);
     return true;
 }
 
 /// The first valid place at or after `position`. At ascending positions it is the end of the same or the next segment.
-[[gnu::always_inline]] inline KFVertexIterator KFSpline::placeAtOrAfter(std::int64_t position, KFSegmentCache const& cache) const noexcept {
+[[gnu::always_inline]] inline KFVertexIterator
+KFSpline::placeAtOrAfter(std::int64_t position, KFSegmentCache const& cache) const noexcept {
     KFVertexStore const& store = *_store;
     std::int64_t const perTick = cache.scale.perTick;
-    if (cache.kind != KFSegmentCache::Kind::None && cache.version == store.version() && cache.low < position) {
-        if (position <= cache.high) return cache.placeOfB;
+    if (cache.kind != KFSegmentCache::Kind::None && cache.version == store.version() &&
+        cache.low < position) {
+        if (position <= cache.high)
+            return cache.placeOfB;
         auto const next = store.validFrom(store.next(cache.placeOfB));
         std::int64_t high = 0;
-        if (next == store.end()) return next;
-        if (!__builtin_mul_overflow(store.tickAt(next), perTick, &high) && position <= high) return next;
+        if (next == store.end())
+            return next;
+        if (!__builtin_mul_overflow(store.tickAt(next), perTick, &high) && position <= high)
+            return next;
     }
     std::int64_t tick = position;
     if (perTick != 1) {
         tick = position / perTick;
-        if (tick * perTick < position) tick += 1;
+        if (tick * perTick < position)
+            tick += 1;
     }
     return store.validFrom(store.lowerBoundTick(tick));
 }
@@ -241,7 +277,8 @@ bool KFSpline::evaluateAtVertexOrMove(std::int64_t position, KFSegmentCache& cac
     KFVertexStore const& store = *_store;
     KFVertex const& vertex = *store.at(place);
     KFVertex const& before = place == store.begin() ? vertex : *store.at(store.previous(place));
-    if (isWholeCurve(before.KFVertex::getInterpolation())) return false;
+    if (isWholeCurve(before.KFVertex::getInterpolation()))
+        return false;
     if (getState()->retimingExtrapolation &&
         TempusCompare(vertex.getValueU(), store.lastValid()->getValueU()) == 0) {
         return false;
@@ -251,11 +288,13 @@ bool KFSpline::evaluateAtVertexOrMove(std::int64_t position, KFSegmentCache& cac
 }
 
 /// Computes what the segment between two neighbouring valid vertices needs. False for one that the index doesn't draw.
-[[gnu::always_inline]] inline bool KFSpline::prepareSegment(KFVertexIterator start, KFVertexIterator end, std::int64_t low, std::int64_t high,
-                              KFSegmentCache& cache) {
+[[gnu::always_inline]] inline bool KFSpline::prepareSegment(KFVertexIterator start, KFVertexIterator end,
+                                                            std::int64_t low, std::int64_t high,
+                                                            KFSegmentCache& cache) {
     cache.kind = KFSegmentCache::Kind::None;
     std::int64_t width = 0;
-    if (__builtin_sub_overflow(high, low, &width) || width >= kExactInDouble || width <= 0) return false;
+    if (__builtin_sub_overflow(high, low, &width) || width >= kExactInDouble || width <= 0)
+        return false;
 
     KFVertexStore const& store = *_store;
     KFSplineState const& state = *getState();
@@ -268,7 +307,6 @@ bool KFSpline::evaluateAtVertexOrMove(std::int64_t position, KFSegmentCache& cac
     cache.width = static_cast<double>(width);
     cache.vertexA.take(&vertexA);
     cache.vertexB.take(&vertexB);
-    cache.wholeCurveChanges = KFStaticVertex::getWholeCurveChanges();
     cache.dependsOnNeighbours = false;
     cache.a = vertexA.getValueV(kTempusZero);
     cache.b = vertexB.getValueV(kTempusZero);
@@ -276,6 +314,8 @@ bool KFSpline::evaluateAtVertexOrMove(std::int64_t position, KFSegmentCache& cac
     cache.parametric = state.parametric;
     cache.sanitizeBezier = state.sanitizeBezier;
     cache.defaultType = state.interpolation;
+    if (isWholeCurve(cache.defaultType))
+        return false;
 
     switch (cache.type) {
     case kKFInterpolationConstant:
@@ -329,7 +369,8 @@ void takeCubic(double const* polygonU, double const* polygonV, KFSegmentCache& c
 [[gnu::always_inline]] inline bool KFSpline::prepareBezier(KFSegmentCache& cache) {
     constexpr double handlesPerTangent = 12.0;
     double const span = cache.width / cache.scale.stepsPerSecond;
-    if (!(span > KFShape::kShortestCurve)) return false;
+    if (!(span > KFShape::kShortestCurve))
+        return false;
     double const factor = cache.parametric ? 1.0 : handlesPerTangent;
     double outU = 0.0;
     double outV = 0.0;
@@ -341,7 +382,8 @@ void takeCubic(double const* polygonU, double const* polygonV, KFSegmentCache& c
     double polygonV[4] = {cache.a, cache.a + outV * factor, cache.b + inV * factor, cache.b};
     // Control points inside the segment can't fold it.
     bool const inside = polygonU[1] >= 0.0 && polygonU[1] <= 1.0 && polygonU[2] >= 0.0 && polygonU[2] <= 1.0;
-    if (!inside && !cache.parametric && cache.sanitizeBezier) KFBezierSanitizeControlPolygon(polygonU, polygonV);
+    if (!inside && !cache.parametric && cache.sanitizeBezier)
+        KFBezierSanitizeControlPolygon(polygonU, polygonV);
     takeCubic(polygonU, polygonV, cache);
     return true;
 }
@@ -349,19 +391,23 @@ void takeCubic(double const* polygonU, double const* polygonV, KFSegmentCache& c
 bool KFSpline::prepareCatmullRom(KFVertexIterator start, KFVertexIterator end, KFSegmentCache& cache) {
     KFVertexStore const& store = *_store;
     double const span = cache.width / cache.scale.stepsPerSecond;
-    if (!(span > KFShape::kShortestCurve)) return false;
+    if (!(span > KFShape::kShortestCurve))
+        return false;
     // Where a neighbour is missing, the tangent depends on the far end of a closed spline or on nothing further.
     auto const before = store.validBefore(start);
     auto const after = store.validFrom(store.next(end));
-    cache.beforeA.take(static_cast<KFStaticVertex const*>(before == store.end() ? store.lastValid() : store.at(before)));
-    cache.afterB.take(static_cast<KFStaticVertex const*>(after == store.end() ? store.firstValid() : store.at(after)));
+    cache.beforeA.take(
+        static_cast<KFStaticVertex const*>(before == store.end() ? store.lastValid() : store.at(before)));
+    cache.afterB.take(
+        static_cast<KFStaticVertex const*>(after == store.end() ? store.firstValid() : store.at(after)));
     cache.dependsOnNeighbours = true;
     Tempus startU;
     Tempus endU;
     double polygonU[4];
     double polygonV[4];
     static_cast<KFBezierInterpolator*>(getInterpolator(cache.type))
-        ->getControlPoints(*this, store.at(start), store.at(end), kTempusZero, startU, endU, polygonU, polygonV);
+        ->getControlPoints(*this, store.at(start), store.at(end), kTempusZero, startU, endU, polygonU,
+                           polygonV);
     takeCubic(polygonU, polygonV, cache);
     return true;
 }

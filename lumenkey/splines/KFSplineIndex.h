@@ -15,5 +15,6 @@ inline KFCustomInterpolator* KFSpline::customInterpolator() const noexcept {
     KFSplineState const& state = *getState();
     return cache.kind != KFSegmentCache::Kind::None && cache.version == _store->version() &&
            cache.parametric == state.parametric && cache.sanitizeBezier == state.sanitizeBezier &&
-           cache.defaultType == state.interpolation && customInterpolator() == nullptr && cache.readingsStand();
+           cache.defaultType == state.interpolation && customInterpolator() == nullptr &&
+           cache.readingsStand();
 }

@@ -13,7 +13,8 @@ namespace {
 using Place = KFVertexIterator;
 
 bool give(void** out, KFVertex* vertex) noexcept {
-    if (out != nullptr) *out = vertex;
+    if (out != nullptr)
+        *out = vertex;
     return vertex != nullptr;
 }
 
@@ -26,7 +27,8 @@ KFVertex* vertexOrNull(KFVertexStore const& store, Place place) noexcept {
 }
 
 Place enabledFrom(KFVertexStore const& store, Place place, Tempus const& t) {
-    while (place != store.end() && !store.at(place)->isEnabled(t)) place = store.next(place);
+    while (place != store.end() && !store.at(place)->isEnabled(t))
+        place = store.next(place);
     return place;
 }
 
@@ -34,25 +36,30 @@ Place enabledFrom(KFVertexStore const& store, Place place, Tempus const& t) {
 Place enabledBefore(KFVertexStore const& store, Place place, Tempus const& t) {
     while (place != store.begin()) {
         place = store.previous(place);
-        if (store.at(place)->isEnabled(t)) return place;
+        if (store.at(place)->isEnabled(t))
+            return place;
     }
     return store.end();
 }
 
 } // namespace
 
-/// While the list of valid vertices holds all enabled ones it answers for them; else each vertex is asked.
-bool KFSpline::listAnswers() const noexcept { return _useValidList && _store->validityIsCurrent(); }
+/// While the list of valid vertices holds all enabled ones, at any time, it answers for them; else each is asked.
+bool KFSpline::listAnswers() const noexcept {
+    return _staticVertices && _useValidList && _store->validityIsCurrent();
+}
 
 // --- Valid vertices ---
 
 bool KFSpline::getFirstValidVertex(void** out, Tempus const& t) {
-    if (_useValidList) return give(out, _store->firstValid());
+    if (_useValidList)
+        return give(out, _store->firstValid());
     return give(out, vertexOrNull(*_store, enabledFrom(*_store, _store->begin(), t)));
 }
 
 bool KFSpline::getLastValidVertex(void** out, Tempus const& t) {
-    if (_useValidList) return give(out, _store->lastValid());
+    if (_useValidList)
+        return give(out, _store->lastValid());
     return give(out, vertexOrNull(*_store, enabledBefore(*_store, _store->end(), t)));
 }
 
@@ -71,11 +78,13 @@ bool KFSpline::getPreviousValidVertex(void* handle, void** out, Tempus const& t)
 
 bool KFSpline::getNextValidVertex(KFVertexIterator const& place, void** out, Tempus const& t) {
     KFVertexStore const& store = *_store;
-    if (place == store.end()) return give(out, nullptr);
+    if (place == store.end())
+        return give(out, nullptr);
     if (_useValidList) {
         // One that isn't in the list counts as its first entry.
         Place const from = store.isValid(place) ? place : store.validFrom(store.begin());
-        return give(out, from == store.end() ? nullptr : vertexOrNull(store, store.validFrom(store.next(from))));
+        return give(out,
+                    from == store.end() ? nullptr : vertexOrNull(store, store.validFrom(store.next(from))));
     }
     Place const next = enabledFrom(store, store.upperBound(store.at(place)->getValueU()), t);
     return give(out, vertexOrNull(store, next));
@@ -83,21 +92,27 @@ bool KFSpline::getNextValidVertex(KFVertexIterator const& place, void** out, Tem
 
 bool KFSpline::getPreviousValidVertex(KFVertexIterator const& place, void** out, Tempus const& t) {
     KFVertexStore const& store = *_store;
-    if (store.empty() || place == store.begin()) return give(out, nullptr);
+    if (store.empty() || place == store.begin())
+        return give(out, nullptr);
     if (_useValidList) {
-        if (place != store.end() && !store.isValid(place)) return give(out, nullptr);
+        if (place != store.end() && !store.isValid(place))
+            return give(out, nullptr);
         return give(out, vertexOrNull(store, store.validBefore(place)));
     }
     Place const start = place == store.end() ? place : store.lowerBound(store.at(place)->getValueU());
     Place const nearest = enabledBefore(store, start, t);
-    if (nearest == store.end()) return give(out, nullptr);
-    return give(out, vertexOrNull(store, enabledFrom(store, store.lowerBound(store.at(nearest)->getValueU()), t)));
+    if (nearest == store.end())
+        return give(out, nullptr);
+    return give(out,
+                vertexOrNull(store, enabledFrom(store, store.lowerBound(store.at(nearest)->getValueU()), t)));
 }
 
 bool KFSpline::getNextValidVertex(Tempus const& u, void** out, Tempus const& t, bool zeroTwice) {
     KFVertexStore const& store = *_store;
     bool const listed = listAnswers();
-    auto const from = [&](Place place) { return listed ? store.validFrom(place) : enabledFrom(store, place, t); };
+    auto const from = [&](Place place) {
+        return listed ? store.validFrom(place) : enabledFrom(store, place, t);
+    };
     if (zeroTwice && TempusCompare(u, kTempusZero) == 0) {
         Place const first = from(store.lowerBound(u));
         Place const second = first == store.end() ? first : from(store.next(first));
@@ -111,14 +126,17 @@ bool KFSpline::getNextValidVertex(Tempus const& u, void** out, Tempus const& t, 
 bool KFSpline::getPreviousValidVertex(Tempus const& u, void** out, Tempus const& t, bool) {
     KFVertexStore const& store = *_store;
     Place const bound = store.lowerBound(u);
-    return give(out, vertexOrNull(store, listAnswers() ? store.validBefore(bound) : enabledBefore(store, bound, t)));
+    return give(
+        out, vertexOrNull(store, listAnswers() ? store.validBefore(bound) : enabledBefore(store, bound, t)));
 }
 
 std::uint32_t KFSpline::getNumberOfValidVertices(Tempus const& t) {
-    if (_useValidList) return static_cast<std::uint32_t>(_store->validCount());
+    if (_useValidList)
+        return static_cast<std::uint32_t>(_store->validCount());
     void* vertex = nullptr;
     std::uint32_t count = 0;
-    for (bool found = getFirstValidVertex(&vertex, t); found; found = getNextValidVertex(vertex, &vertex, kTempusZero)) {
+    for (bool found = getFirstValidVertex(&vertex, t); found;
+         found = getNextValidVertex(vertex, &vertex, kTempusZero)) {
         count += 1;
     }
     return count;
@@ -171,7 +189,8 @@ bool KFSpline::getPreviousValidVertexWithLock(Tempus const& u, void** out, Tempu
 // --- All vertices ---
 
 KFVertexIterator KFSpline::getVertexIter(void* handle) {
-    if (handle == nullptr) return _store->begin();
+    if (handle == nullptr)
+        return _store->begin();
     Place const place = _store->find(static_cast<KFVertex*>(handle));
     return place == _store->end() ? _store->begin() : place;
 }
@@ -179,7 +198,8 @@ KFVertexIterator KFSpline::getVertexIter(void* handle) {
 KFVertexIterator KFSpline::getValidVertexIter(void* handle) {
     if (handle != nullptr) {
         Place const place = _store->find(static_cast<KFVertex*>(handle));
-        if (place != _store->end() && _store->isValid(place)) return place;
+        if (place != _store->end() && _store->isValid(place))
+            return place;
     }
     return _store->validFrom(_store->begin());
 }
@@ -187,7 +207,9 @@ KFVertexIterator KFSpline::getValidVertexIter(void* handle) {
 KFVertexIterator KFSpline::beginVertices() const noexcept { return _store->begin(); }
 KFVertexIterator KFSpline::endVertices() const noexcept { return _store->end(); }
 KFVertexIterator KFSpline::nextPlace(KFVertexIterator place) const noexcept { return _store->next(place); }
-KFVertexIterator KFSpline::previousPlace(KFVertexIterator place) const noexcept { return _store->previous(place); }
+KFVertexIterator KFSpline::previousPlace(KFVertexIterator place) const noexcept {
+    return _store->previous(place);
+}
 KFVertex* KFSpline::vertexAt(KFVertexIterator place) const noexcept { return _store->at(place); }
 void* KFSpline::getFirstVertex() const noexcept { return _store->front(); }
 void* KFSpline::getLastVertex() const noexcept { return _store->back(); }
@@ -207,7 +229,8 @@ void* KFSpline::getNextVertex(Tempus const& u) {
     if (TempusCompare(u, kTempusZero) == 0) {
         Place const first = store.lowerBound(u);
         Place const second = first == store.end() ? first : store.next(first);
-        if (second != store.end() && TempusCompare(store.at(second)->getValueU(), u) == 0) return store.at(second);
+        if (second != store.end() && TempusCompare(store.at(second)->getValueU(), u) == 0)
+            return store.at(second);
     }
     return vertexOrNull(store, store.upperBound(u));
 }
@@ -225,19 +248,20 @@ bool KFSpline::isValidHandle(void* handle) {
 }
 
 bool KFSpline::findVertex(long first, long last, void* handle) {
-    if (last < first || !_store->contains(handle)) return false;
+    if (last < first || !_store->contains(handle))
+        return false;
     auto const index = static_cast<long>(_store->indexOf(_store->find(static_cast<KFVertex*>(handle))));
     return first <= index && index <= last;
 }
 
 namespace {
 
-template <class Takes>
-void collectOnePerU(KFVertexStore const& store, std::vector<void*>& out, Takes takes) {
+template <class Takes> void collectOnePerU(KFVertexStore const& store, std::vector<void*>& out, Takes takes) {
     KFVertex const* appended = nullptr;
     for (Place place = store.begin(); place != store.end(); place = store.next(place)) {
         KFVertex* const vertex = store.at(place);
-        if (!takes(*vertex) || (appended != nullptr && sameU(*vertex, *appended))) continue;
+        if (!takes(*vertex) || (appended != nullptr && sameU(*vertex, *appended)))
+            continue;
         out.push_back(vertex);
         appended = vertex;
     }
@@ -262,19 +286,26 @@ bool KFSpline::getVerticesTimeAndValue(TempusRange range,
                                        Tempus* first, Tempus* last) {
     KFSplineAccess const access(*this);
     KFVertexStore const& store = *_store;
-    if (first != nullptr) *first = store.empty() ? kTempusInvalid : store.front()->getValueU();
-    if (last != nullptr) *last = store.empty() ? kTempusInvalid : store.back()->getValueU();
-    if (store.empty()) return true;
+    if (first != nullptr)
+        *first = store.empty() ? kTempusInvalid : store.front()->getValueU();
+    if (last != nullptr)
+        *last = store.empty() ? kTempusInvalid : store.back()->getValueU();
+    if (store.empty())
+        return true;
 
     Place place = store.lowerBound(range.start);
-    bool const startsLater = place == store.end() || TempusCompare(store.at(place)->getValueU(), range.start) > 0;
-    if (startsLater && place != store.begin()) place = store.previous(place);
+    bool const startsLater =
+        place == store.end() || TempusCompare(store.at(place)->getValueU(), range.start) > 0;
+    if (startsLater && place != store.begin())
+        place = store.previous(place);
     Tempus const end = TempusRangeGetEnd(range);
     for (; place != store.end(); place = store.next(place)) {
         KFVertex const& vertex = *store.at(place);
         Tempus const u = vertex.getValueU();
-        out.emplace_back(u, std::pair<double, unsigned>(vertex.getValueV(kTempusZero), vertex.getInterpolation()));
-        if (TempusCompare(u, end) >= 0) break;
+        out.emplace_back(
+            u, std::pair<double, unsigned>(vertex.getValueV(kTempusZero), vertex.getInterpolation()));
+        if (TempusCompare(u, end) >= 0)
+            break;
     }
     return true;
 }
@@ -284,7 +315,8 @@ bool KFSpline::getVerticesTimeAndValue(TempusRange range,
 Tempus KFSpline::getMinValueU(Tempus const& t, bool lock) {
     KFSplineAccess const access(*this, lock);
     void* handle = nullptr;
-    if (!getFirstValidVertex(&handle, t)) return kTempusZero;
+    if (!getFirstValidVertex(&handle, t))
+        return kTempusZero;
     auto const& vertex = *static_cast<KFVertex*>(handle);
     std::uint32_t const type = vertex.getInterpolation();
     Tempus const u = vertex.getValueU();
@@ -294,7 +326,8 @@ Tempus KFSpline::getMinValueU(Tempus const& t, bool lock) {
 Tempus KFSpline::getMaxValueU(Tempus const& t, bool lock) {
     KFSplineAccess const access(*this, lock);
     void* handle = nullptr;
-    if (!getLastValidVertex(&handle, t)) return kTempusZero;
+    if (!getLastValidVertex(&handle, t))
+        return kTempusZero;
     auto const& vertex = *static_cast<KFVertex*>(handle);
     std::uint32_t const type = vertex.getInterpolation();
     Tempus const u = vertex.getValueU();
@@ -304,7 +337,8 @@ Tempus KFSpline::getMaxValueU(Tempus const& t, bool lock) {
 Tempus KFSpline::getRangeU(Tempus const& t) {
     KFSplineAccess const access(*this);
     Tempus const range = BX_TempusSaferSubtract(getMaxValueU(t, false), getMinValueU(t, false));
-    if (!_closed || TempusCompare(range, kTempusZero) == 0) return range;
+    if (!_closed || TempusCompare(range, kTempusZero) == 0)
+        return range;
     std::uint32_t type = 0;
     getInterpolation(&type, nullptr, nullptr);
     return getInterpolator(type)->useKeypoints() ? BX_TempusSaferAdd(range, getStep()) : range;
@@ -319,9 +353,11 @@ double KFSpline::extremeV(double start, Tempus const& t, Tempus* atU, Offers off
          found = getNextValidVertex(handle, &handle, kTempusZero)) {
         auto const& vertex = *static_cast<KFVertex*>(handle);
         offers(vertex, vertex.getValueV(t), [&](double candidate) {
-            if (!better(candidate, best)) return;
+            if (!better(candidate, best))
+                return;
             best = candidate;
-            if (atU != nullptr) *atU = vertex.getValueU();
+            if (atU != nullptr)
+                *atU = vertex.getValueU();
         });
     }
     return best;
@@ -348,9 +384,13 @@ auto const kHandleEnds = [](KFVertex const& vertex, double value, auto offer) {
 
 } // namespace
 
-double KFSpline::getMaxValueV(Tempus const& t, Tempus* atU) { return extremeV(-kHighest, t, atU, kValue, kAbove); }
+double KFSpline::getMaxValueV(Tempus const& t, Tempus* atU) {
+    return extremeV(-kHighest, t, atU, kValue, kAbove);
+}
 
-double KFSpline::getMinValueV(Tempus const& t, Tempus* atU) { return extremeV(kHighest, t, atU, kValue, kBelow); }
+double KFSpline::getMinValueV(Tempus const& t, Tempus* atU) {
+    return extremeV(kHighest, t, atU, kValue, kBelow);
+}
 
 double KFSpline::getMaxValueVWithTangents(Tempus const& t, Tempus* atU) {
     return extremeV(-kHighest, t, atU, kHandleEnds, kAbove);

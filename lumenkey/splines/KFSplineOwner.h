@@ -16,7 +16,7 @@ class LUMENKEY_API KFSplineOwner {
 public:
     virtual ~KFSplineOwner();
 
-    /// The value of a spline without a valid vertex.
+    /// The value of a spline without a valid vertex. Called under the spline's lock: it may not evaluate the spline.
     virtual double getInitialValue() const = 0;
     /// Duration of a frame, for the step of a retimed continuation.
     virtual Tempus getFrameDuration() const = 0;

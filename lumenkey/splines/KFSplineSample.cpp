@@ -8,7 +8,7 @@ void KFSampling::sampleUniform(KFSpline& spline, Tempus const& start, Tempus con
                                std::uint32_t count, Tempus const& t, KFSampleSink& sink) {
     KFSampleSink::Room const room = sink.next(count);
     if (room.values != nullptr) {
-        KFSplineSampler(spline, position(start, step, first), step, count, t).values(room.values);
+        KFSplineSampler(spline, start, step, count, t, first).values(room.values);
     }
     if (room.times != nullptr) {
         for (std::uint32_t i = 0; i < count; ++i) {

@@ -12,7 +12,7 @@
 // The loops over a run are compiled for the plain machine and for one with 256-bit vectors; the loader picks. Both
 // round every operation alike, since neither fuses a product with a sum. The sanitizers can't start with such a
 // choice in the library.
-#if defined(__x86_64__) && defined(__GNUC__) && !defined(__clang__) && !defined(__SANITIZE_ADDRESS__) && \
+#if defined(__x86_64__) && defined(__GNUC__) && !defined(__clang__) && !defined(__SANITIZE_ADDRESS__) &&     \
     !defined(__SANITIZE_THREAD__)
 #define LUMENKEY_FOR_EACH_MACHINE __attribute__((target_clones("default", "avx2")))
 #else
@@ -43,19 +43,22 @@ void linearRun(Run const run, double const a, double const b, int const count, d
 
 LUMENKEY_FOR_EACH_MACHINE
 void polynomialRun(Run const run, KFCubic const value, int const count, double* out) noexcept {
-    for (int k = 0; k < count; ++k) out[k] = value(run.distance(k) / run.width);
+    for (int k = 0; k < count; ++k)
+        out[k] = value(run.distance(k) / run.width);
 }
 
 LUMENKEY_FOR_EACH_MACHINE
 void twoStepRun(Run const run, KFCubicInverse const parameter, KFCubic const value, int const count,
                 double* out) noexcept {
-    for (int k = 0; k < count; ++k) out[k] = value(parameter.iterate<2>(run.distance(k) / run.width));
+    for (int k = 0; k < count; ++k)
+        out[k] = value(parameter.iterate<2>(run.distance(k) / run.width));
 }
 
 LUMENKEY_FOR_EACH_MACHINE
 void threeStepRun(Run const run, KFCubicInverse const parameter, KFCubic const value, int const count,
                   double* out) noexcept {
-    for (int k = 0; k < count; ++k) out[k] = value(parameter.iterate<3>(run.distance(k) / run.width));
+    for (int k = 0; k < count; ++k)
+        out[k] = value(parameter.iterate<3>(run.distance(k) / run.width));
 }
 
 void cubicRun(Run const& run, KFSegmentCache const& segment, int count, double* out) noexcept {
@@ -70,33 +73,46 @@ void cubicRun(Run const& run, KFSegmentCache const& segment, int count, double* 
         threeStepRun(run, segment.parameter, segment.value, count, out);
         break;
     case KFCubicInverse::Method::Search:
-        for (int k = 0; k < count; ++k) out[k] = segment.value(segment.parameter(run.distance(k) / run.width));
+        for (int k = 0; k < count; ++k)
+            out[k] = segment.value(segment.parameter(run.distance(k) / run.width));
         break;
     }
 }
 
 } // namespace
 
-KFSplineSampler::KFSplineSampler(KFSpline& spline, Tempus const& start, Tempus const& step, std::uint32_t count,
-                                 Tempus const& t)
-    : _spline(spline), _start(start), _step(step), _t(t), _count(count) {}
+KFSplineSampler::KFSplineSampler(KFSpline& spline, Tempus const& start, Tempus const& step,
+                                 std::uint32_t count, Tempus const& t, std::uint32_t first)
+    : _spline(spline), _start(start), _step(step), _t(t), _first(first), _count(count) {}
 
 /// Brings the row to one scale with the spline's positions; false when there is none.
 bool KFSplineSampler::prepareRow() noexcept {
-    if (!_spline.indexServes()) return false;
-    if (!TempusIsNumeric(_start) || !TempusIsNumeric(_step) || _start.epoch != 0 || _step.epoch != 0) return false;
+    std::uint32_t const changes = KFStaticVertex::getWholeCurveChanges();
+    if (!_spline.indexServes())
+        return false;
+    _segment.wholeCurveChanges = changes;
+    if (!TempusIsNumeric(_start) || !TempusIsNumeric(_step) || _start.epoch != 0 || _step.epoch != 0)
+        return false;
     // Beyond that the positions themselves are rounded, one by one.
     std::int64_t const common = std::lcm(std::int64_t{_start.timescale}, std::int64_t{_step.timescale});
-    if (common > std::numeric_limits<std::int32_t>::max()) return false;
-    if (!_segment.scale.prepare(_spline._store->tickScale(), static_cast<std::int32_t>(common))) return false;
+    if (common > std::numeric_limits<std::int32_t>::max())
+        return false;
+    if (!_segment.scale.prepare(_spline._store->tickScale(), static_cast<std::int32_t>(common)))
+        return false;
     std::int64_t const perUnit = _segment.scale.perUnit;
     std::int64_t last = 0;
     if (__builtin_mul_overflow(_start.value, common / _start.timescale * perUnit, &_origin) ||
         __builtin_mul_overflow(_step.value, common / _step.timescale * perUnit, &_stride) ||
-        __builtin_mul_overflow(_stride, std::int64_t{_count}, &last)) {
+        __builtin_mul_overflow(_stride, std::int64_t{_first} + _count, &last)) {
         return false;
     }
-    return std::abs(_origin) < kLargestPosition && std::abs(last) < kLargestPosition;
+    auto const isNear = [](std::int64_t position) {
+        return position > -kLargestPosition && position < kLargestPosition;
+    };
+    if (!isNear(_origin) || !isNear(last))
+        return false;
+    _origin += _stride * std::int64_t{_first};
+    return true;
 }
 
 void KFSplineSampler::values(double* out) {
@@ -125,7 +141,8 @@ std::uint32_t KFSplineSampler::runLength(std::int64_t position, std::uint32_t le
 }
 
 void KFSplineSampler::run(std::int64_t position, std::uint32_t count, double* out) const noexcept {
-    Run const samples{static_cast<double>(position - _segment.low), static_cast<double>(_stride), _segment.width};
+    Run const samples{static_cast<double>(position - _segment.low), static_cast<double>(_stride),
+                      _segment.width};
     int const n = static_cast<int>(count);
     switch (_segment.kind) {
     case KFSegmentCache::Kind::Constant:
@@ -142,12 +159,14 @@ void KFSplineSampler::run(std::int64_t position, std::uint32_t count, double* ou
         break;
     case KFSegmentCache::Kind::Eased:
         for (int k = 0; k < n; ++k) {
-            out[k] = KFShape::eased(_segment.easing, samples.distance(k) / samples.width, _segment.a, _segment.b);
+            out[k] =
+                KFShape::eased(_segment.easing, samples.distance(k) / samples.width, _segment.a, _segment.b);
         }
         break;
     case KFSegmentCache::Kind::Shape:
     case KFSegmentCache::Kind::None:
-        for (std::uint32_t k = 0; k < count; ++k) out[k] = _segment.valueAt(position + _stride * std::int64_t{k});
+        for (std::uint32_t k = 0; k < count; ++k)
+            out[k] = _segment.valueAt(position + _stride * std::int64_t{k});
         break;
     }
 }

@@ -14,28 +14,17 @@ KFSplineState::KFSplineState(bool parametricIn, bool roundingInUSpaceIn, bool de
                              bool sanitizeBezierIn, std::uint32_t interpolationIn,
                              std::uint32_t preExtrapolationIn, std::uint32_t postExtrapolationIn,
                              bool retimingExtrapolationIn) noexcept
-    : parametric(parametricIn),
-      roundingInUSpace(roundingInUSpaceIn),
-      deriveTangents(deriveTangentsIn),
-      sanitizeBezier(sanitizeBezierIn),
-      retimingExtrapolation(retimingExtrapolationIn),
-      roundingDelta(roundingDeltaFor(roundingInUSpaceIn)),
-      interpolation(interpolationIn),
-      postExtrapolation(postExtrapolationIn),
-      preExtrapolation(preExtrapolationIn),
-      shared(true) {}
+    : parametric(parametricIn), roundingInUSpace(roundingInUSpaceIn), deriveTangents(deriveTangentsIn),
+      sanitizeBezier(sanitizeBezierIn), retimingExtrapolation(retimingExtrapolationIn),
+      roundingDelta(roundingDeltaFor(roundingInUSpaceIn)), interpolation(interpolationIn),
+      postExtrapolation(postExtrapolationIn), preExtrapolation(preExtrapolationIn), shared(true) {}
 
 KFSplineState::KFSplineState(KFSplineState const& other) noexcept
-    : parametric(other.parametric),
-      roundingInUSpace(other.roundingInUSpace),
-      deriveTangents(other.deriveTangents),
-      sanitizeBezier(other.sanitizeBezier),
+    : parametric(other.parametric), roundingInUSpace(other.roundingInUSpace),
+      deriveTangents(other.deriveTangents), sanitizeBezier(other.sanitizeBezier),
       retimingExtrapolation(other.retimingExtrapolation),
-      roundingDelta(roundingDeltaFor(other.roundingInUSpace)),
-      interpolation(other.interpolation),
-      postExtrapolation(other.postExtrapolation),
-      preExtrapolation(other.preExtrapolation),
-      shared(false) {}
+      roundingDelta(roundingDeltaFor(other.roundingInUSpace)), interpolation(other.interpolation),
+      postExtrapolation(other.postExtrapolation), preExtrapolation(other.preExtrapolation), shared(false) {}
 
 KFSplineState& KFSplineState::operator=(KFSplineState const& other) noexcept {
     parametric = other.parametric;

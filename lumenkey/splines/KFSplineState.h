@@ -17,8 +17,8 @@ public:
     KFSplineState() noexcept = default;
     /// `shared` becomes true; `roundingDelta` follows `roundingInUSpace`.
     KFSplineState(bool parametric, bool roundingInUSpace, bool deriveTangents, bool sanitizeBezier,
-                  std::uint32_t interpolation, std::uint32_t preExtrapolation, std::uint32_t postExtrapolation,
-                  bool retimingExtrapolation) noexcept;
+                  std::uint32_t interpolation, std::uint32_t preExtrapolation,
+                  std::uint32_t postExtrapolation, bool retimingExtrapolation) noexcept;
     /// All settings; `shared` false.
     KFSplineState(KFSplineState const& other) noexcept;
     /// All settings; `shared` stays as it is.

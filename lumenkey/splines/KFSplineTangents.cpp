@@ -72,14 +72,14 @@ void fitToDistance(KFVertex& neighbour, KFTangentSide side, Tempus const& distan
     KFTangentWrite(neighbour, side, tangent * factorToDerivedLength(distance, tangent.u), t);
 }
 
-/// Scales one side of all enabled vertices that stand at `u`.
-void scaleTangentsAt(KFVertexStore const& vertices, Tempus const& u, KFTangentSide side, double factor,
-                     Tempus const& t) {
+/// Scales one side of all enabled vertices that stand at `u`, but for the one that came there.
+void scaleTangentsAt(KFVertexStore const& vertices, KFVertex const* newcomer, Tempus const& u,
+                     KFTangentSide side, double factor, Tempus const& t) {
     for (auto place = vertices.lowerBound(u); place != vertices.end(); place = vertices.next(place)) {
         KFVertex& vertex = *vertices.at(place);
         if (vertex.getValueU() != u)
             return;
-        if (vertex.isEnabled(kTempusZero))
+        if (&vertex != newcomer && vertex.isEnabled(kTempusZero))
             KFTangentScale(vertex, side, factor, t);
     }
 }
@@ -153,8 +153,9 @@ void KFSpline::scaleTangentsAfterInsertion(void* handle, Tempus const& delta, Te
     // Between two neighbours at one U there is no segment to divide.
     if (previous != nullptr && next != nullptr && previousU != nextU) {
         Tempus const span = nextU - previousU;
-        scaleTangentsAt(store(), previousU, KFTangentSide::Output, fractionOf(newU - previousU, span), t);
-        scaleTangentsAt(store(), nextU, KFTangentSide::Input, fractionOf(newU - nextU, span), t);
+        scaleTangentsAt(store(), &vertex, previousU, KFTangentSide::Output,
+                        fractionOf(newU - previousU, span), t);
+        scaleTangentsAt(store(), &vertex, nextU, KFTangentSide::Input, fractionOf(newU - nextU, span), t);
     }
     if (previous != nullptr) {
         stretchMovedTangent(vertex, KFTangentSide::Input, oldU - previousU, newU - previousU, t);

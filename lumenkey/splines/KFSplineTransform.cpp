@@ -94,7 +94,7 @@ void parametrizeTangents(KFVertex& w, KFVertex* next) {
     double v = 0.0;
     if (next == nullptr) {
         w.getInputTangents(&u, &v, kTempusZero);
-        w.setOutputTangents(-u, -v, kTempusZero);
+        w.setOutputTangents(0.0 - u, 0.0 - v, kTempusZero); // no zero gets a sign
         return;
     }
     double const span = TempusGetSeconds(next->getValueU() - w.getValueU());
@@ -211,11 +211,11 @@ void KFSpline::reverseVertices(void* first, void* last) {
             double b = 0.0;
             if (w != first) {
                 getVertexInputHandles(w, &a, &b, kTempusZero, false);
-                setVertexOutputHandles(copy.get(), -a, b, kTempusZero, false);
+                setVertexOutputHandles(copy.get(), 0.0 - a, b, kTempusZero, false);
             }
             if (w != last) {
                 getVertexOutputHandles(w, &a, &b, kTempusZero, false);
-                setVertexInputHandles(copy.get(), -a, b, kTempusZero, false);
+                setVertexInputHandles(copy.get(), 0.0 - a, b, kTempusZero, false);
             }
             copy->setValueU(lastU - (w->getValueU() - firstU));
             copy->setInterpolation(type);
@@ -231,7 +231,8 @@ void KFSpline::reverseVertices(void* first, void* last) {
 
     KFSplineAccess access(*this);
     KFVertexStore& vertices = store();
-    auto place = vertices.lowerBound(mirrored.front()->getValueU());
+    // Behind a vertex in front of the stretch that shares its first position.
+    auto place = vertices.upperBound(mirrored.front()->getValueU());
     for (auto& vertex : mirrored) {
         place = vertices.next(vertices.insert(place, vertex.release(), suppressesRefresh()));
     }

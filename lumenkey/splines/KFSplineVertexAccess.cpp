@@ -30,7 +30,8 @@ constexpr Speed kSpeeds[] = {
 };
 
 bool easesInTime(std::uint32_t type) noexcept {
-    return type == kKFInterpolationEase || type == kKFInterpolationAccelerate || type == kKFInterpolationDecelerate;
+    return type == kKFInterpolationEase || type == kKFInterpolationAccelerate ||
+           type == kKFInterpolationDecelerate;
 }
 
 } // namespace
@@ -38,12 +39,14 @@ bool easesInTime(std::uint32_t type) noexcept {
 // --- The whole spline ---
 
 void KFSpline::setInterpolation(std::uint32_t type) {
-    if (type == kKFInterpolationMixed) return;
+    if (type == kKFInterpolationMixed)
+        return;
     KFSplineAccess const access(*this);
     bool const parametric = getState()->parametric;
     for (auto place = _store->begin(); place != _store->end(); place = _store->next(place)) {
         KFVertex& vertex = *_store->at(place);
-        if (parametric || !vertex.testFlag(kKFVertexFlagLocked)) vertex.setInterpolation(type);
+        if (parametric || !vertex.testFlag(kKFVertexFlagLocked))
+            vertex.setInterpolation(type);
     }
     getInterpolator(type)->init(*this, kTempusZero);
 }
@@ -53,14 +56,18 @@ bool KFSpline::getInterpolation(std::uint32_t* type, bool* usesTangents, bool* i
     if (!_store->empty()) {
         answer = _store->front()->getInterpolation();
         for (auto place = _store->begin(); place != _store->end(); place = _store->next(place)) {
-            if (_store->at(place)->getInterpolation() == answer) continue;
+            if (_store->at(place)->getInterpolation() == answer)
+                continue;
             answer = kKFInterpolationMixed;
             break;
         }
     }
-    if (type != nullptr) *type = answer;
-    if (usesTangents != nullptr) *usesTangents = interpolatorUsesTangents(answer, nullptr);
-    if (isSpline != nullptr) *isSpline = !getInterpolator(answer)->useKeypoints();
+    if (type != nullptr)
+        *type = answer;
+    if (usesTangents != nullptr)
+        *usesTangents = interpolatorUsesTangents(answer, nullptr);
+    if (isSpline != nullptr)
+        *isSpline = !getInterpolator(answer)->useKeypoints();
     return true;
 }
 
@@ -68,14 +75,17 @@ bool KFSpline::interpolatorUsesTangents(std::uint32_t type, void* handle) {
     KFSplineOwner const* const node = getNode();
     KFCustomInterpolator* const custom =
         node == nullptr ? nullptr : node->_customInterpolator.load(std::memory_order_acquire);
-    if (custom != nullptr && custom->isActive(*this, handle)) return custom->useTangents();
+    if (custom != nullptr && custom->isActive(*this, handle))
+        return custom->useTangents();
     return getInterpolator(type)->useTangents();
 }
 
 bool KFSpline::hasInterpolation(std::uint32_t type) {
-    if (_store->empty()) return getState()->interpolation == type;
+    if (_store->empty())
+        return getState()->interpolation == type;
     for (auto place = _store->next(_store->begin()); place != _store->end(); place = _store->next(place)) {
-        if (_store->at(place)->getInterpolation() == type) return true;
+        if (_store->at(place)->getInterpolation() == type)
+            return true;
     }
     return false;
 }
@@ -111,67 +121,82 @@ void KFSpline::setAllVerticesValues(double value, Tempus const& t) {
 
 bool KFSpline::getVertex(Tempus const& u, double* v, Tempus const& t) {
     void* handle = nullptr;
-    if (v == nullptr || !getVertexHandle(u, &handle, false)) return false;
+    if (v == nullptr || !getVertexHandle(u, &handle, false))
+        return false;
     *v = vertexOf(handle)->getValueV(t);
     return true;
 }
 
 bool KFSpline::getVertex(void* handle, Tempus* u, double* v, Tempus const& t) {
-    if (handle == nullptr) return false;
-    if (u != nullptr) *u = vertexOf(handle)->getValueU();
-    if (v != nullptr) *v = vertexOf(handle)->getValueV(t);
+    if (handle == nullptr)
+        return false;
+    if (u != nullptr)
+        *u = vertexOf(handle)->getValueU();
+    if (v != nullptr)
+        *v = vertexOf(handle)->getValueV(t);
     return true;
 }
 
 bool KFSpline::setVertexValue(void* handle, double value, Tempus const& t) {
-    if (handle == nullptr) return false;
+    if (handle == nullptr)
+        return false;
     KFSplineAccess const access(*this);
     vertexOf(handle)->setValueV(value, t);
     return true;
 }
 
 bool KFSpline::setVertexInterpolation(void* handle, std::uint32_t type) {
-    if (handle == nullptr) return false;
+    if (handle == nullptr)
+        return false;
     vertexOf(handle)->setInterpolation(type);
     return true;
 }
 
 bool KFSpline::getVertexInterpolation(void* handle, std::uint32_t* type, bool* usesTangents) {
-    if (handle == nullptr) return false;
+    if (handle == nullptr)
+        return false;
     std::uint32_t const answer = vertexOf(handle)->getInterpolation();
-    if (type != nullptr) *type = answer;
-    if (usesTangents != nullptr) *usesTangents = interpolatorUsesTangents(answer, handle);
+    if (type != nullptr)
+        *type = answer;
+    if (usesTangents != nullptr)
+        *usesTangents = interpolatorUsesTangents(answer, handle);
     return true;
 }
 
 bool KFSpline::setVertexFlag(void* handle, std::uint32_t mask) {
-    if (handle == nullptr) return false;
+    if (handle == nullptr)
+        return false;
     vertexOf(handle)->setFlag(mask);
     return true;
 }
 
 bool KFSpline::resetVertexFlag(void* handle, std::uint32_t mask) {
-    if (handle == nullptr) return false;
+    if (handle == nullptr)
+        return false;
     vertexOf(handle)->resetFlag(mask);
     return true;
 }
 
 bool KFSpline::setVertexFlags(void* handle, std::uint32_t flags) {
-    if (handle == nullptr) return false;
+    if (handle == nullptr)
+        return false;
     vertexOf(handle)->setFlags(flags);
     return true;
 }
 
 bool KFSpline::getVertexFlags(void* handle, std::uint32_t* flags) {
-    if (handle == nullptr) return false;
-    if (flags != nullptr) *flags = vertexOf(handle)->getFlags();
+    if (handle == nullptr)
+        return false;
+    if (flags != nullptr)
+        *flags = vertexOf(handle)->getFlags();
     return true;
 }
 
 /// The change of a vertex's enabled state and the list that follows from it belong together under the lock: other
 /// threads walk that list.
 bool KFSpline::setVertexEnabled(void* handle, bool enabled, Tempus const& t) {
-    if (handle == nullptr) return false;
+    if (handle == nullptr)
+        return false;
     KFSplineAccess const access(*this);
     vertexOf(handle)->setEnabled(enabled, t);
     auto const place = _store->find(vertexOf(handle));
@@ -193,23 +218,28 @@ bool KFSpline::isEnabledVertex(void* handle, Tempus const& t) {
 }
 
 void KFSpline::offsetVertexInTime(void* handle, Tempus const& u, Tempus const&) {
-    if (handle == nullptr) return;
+    if (handle == nullptr)
+        return;
     KFSplineAccess const access(*this);
     auto const place = _store->find(vertexOf(handle));
     vertexOf(handle)->setValueU(u);
-    if (place != _store->end()) _store->updatePosition(place);
+    if (place != _store->end())
+        _store->updatePosition(place);
 }
 
 bool KFSpline::setVertexBiasLinear(void* handle, double bias, Tempus const& t) {
     bool const ends = getFirstValidVertex(nullptr, t) && getLastValidVertex(nullptr, t);
-    if (handle == nullptr || (!_closed && !suppressesRefresh() && !ends)) return false;
+    if (handle == nullptr || (!_closed && !suppressesRefresh() && !ends))
+        return false;
     vertexOf(handle)->setBias(bias, t);
     return true;
 }
 
 bool KFSpline::getVertexBiasLinear(void* handle, double* bias, Tempus const& t) {
-    if (handle == nullptr) return false;
-    if (bias != nullptr) *bias = vertexOf(handle)->getBias(t);
+    if (handle == nullptr)
+        return false;
+    if (bias != nullptr)
+        *bias = vertexOf(handle)->getBias(t);
     return true;
 }
 
@@ -218,27 +248,33 @@ bool KFSpline::setVertexBiasExp(void* handle, double exponent, Tempus const& t) 
 }
 
 bool KFSpline::getVertexBiasExp(void* handle, double* exponent, Tempus const& t) {
-    if (handle == nullptr) return false;
-    if (exponent != nullptr) *exponent = std::log(vertexOf(handle)->getBias(t));
+    if (handle == nullptr)
+        return false;
+    if (exponent != nullptr)
+        *exponent = std::log(vertexOf(handle)->getBias(t));
     return true;
 }
 
 bool KFSpline::setVertexNormal(void* handle, double normal, Tempus const& t) {
-    if (handle == nullptr) return false;
+    if (handle == nullptr)
+        return false;
     vertexOf(handle)->setNormal(normal, t);
     return true;
 }
 
 bool KFSpline::getVertexNormal(void* handle, double* normal, Tempus const& t) {
-    if (handle == nullptr) return false;
-    if (normal != nullptr) *normal = vertexOf(handle)->getNormal(t);
+    if (handle == nullptr)
+        return false;
+    if (normal != nullptr)
+        *normal = vertexOf(handle)->getNormal(t);
     return true;
 }
 
 /// The vertex at exactly `u` if it is enabled, else the last enabled one before it.
 void* KFSpline::vertexWithNormalAt(Tempus const& u, Tempus const& t) {
     void* handle = nullptr;
-    if (getVertexHandle(u, &handle, false) && vertexOf(handle)->isEnabled(t)) return handle;
+    if (getVertexHandle(u, &handle, false) && vertexOf(handle)->isEnabled(t))
+        return handle;
     getPreviousValidVertex(u, &handle, t, false);
     return handle;
 }
@@ -256,34 +292,42 @@ bool KFSpline::getVertexNormal(Tempus const& u, double* normal, Tempus const& t)
 // --- Speeds ---
 
 bool KFSpline::setVertexSpeed(void* handle, std::uint32_t speed) {
-    if (handle == nullptr || speed >= std::size(kSpeeds)) return false;
+    if (handle == nullptr || speed >= std::size(kSpeeds))
+        return false;
     vertexOf(handle)->setInterpolation(kSpeeds[speed].type);
-    if (speed != kKFVertexSpeedLinear) vertexOf(handle)->setBias(1.0, kTempusZero);
+    if (speed != kKFVertexSpeedLinear)
+        vertexOf(handle)->setBias(1.0, kTempusZero);
     return true;
 }
 
 bool KFSpline::getVertexSpeed(void* handle, std::uint32_t* speed) {
-    if (handle == nullptr) return false;
+    if (handle == nullptr)
+        return false;
     std::uint32_t const type = vertexOf(handle)->getInterpolation();
-    auto const* const found =
-        std::find_if(std::begin(kSpeeds), std::end(kSpeeds), [&](Speed const& row) { return row.type == type; });
-    if (found == std::end(kSpeeds)) return false;
-    if (speed != nullptr) *speed = found->speed;
+    auto const* const found = std::find_if(std::begin(kSpeeds), std::end(kSpeeds),
+                                           [&](Speed const& row) { return row.type == type; });
+    if (found == std::end(kSpeeds))
+        return false;
+    if (speed != nullptr)
+        *speed = found->speed;
     return true;
 }
 
 bool KFSpline::adjustVertexSpeed(void* handle, double delta) {
     void* next = nullptr;
-    if (handle == nullptr || !getNextValidVertex(handle, &next, kTempusZero)) return false;
+    if (handle == nullptr || !getNextValidVertex(handle, &next, kTempusZero))
+        return false;
     KFVertex& vertex = *vertexOf(handle);
     if (vertex.getInterpolation() == kKFInterpolationLinear) {
         double const rise = vertexOf(next)->getValueV(kTempusZero) - vertex.getValueV(kTempusZero);
-        if (std::fabs(rise) < kValueTolerance) return false;
+        if (std::fabs(rise) < kValueTolerance)
+            return false;
         vertex.setInterpolation(kKFInterpolationEase);
         vertex.setBias(2.0, kTempusZero);
     }
     std::uint32_t const type = vertex.getInterpolation();
-    if (!easesInTime(type)) return false;
+    if (!easesInTime(type))
+        return false;
     double const step = type == kKFInterpolationDecelerate ? -(delta / -3.0) : delta / -3.0;
     vertex.setBias(std::clamp(vertex.getBias(kTempusZero) + step, 0.0, 2.0), kTempusZero);
     return false;

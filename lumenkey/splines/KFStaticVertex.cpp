@@ -26,10 +26,7 @@ KFStaticVertex::KFStaticVertex(Tempus const& u, double value) noexcept
     : KFVertex(u), _enabled(true), _revision(0), _valueV(value), _bias(1.0) {}
 
 KFStaticVertex::KFStaticVertex(KFVertex const* vertex, Tempus const& t)
-    : KFVertex(vertex->getValueU()),
-      _enabled(true),
-      _revision(0),
-      _valueV(vertex->getValueV(t)),
+    : KFVertex(vertex->getValueU()), _enabled(true), _revision(0), _valueV(vertex->getValueV(t)),
       _bias(vertex->getBias(t)) {
     double u = 0.0;
     double v = 0.0;
@@ -64,33 +61,38 @@ void KFStaticVertex::setValueU(Tempus const& u) {
 }
 
 void KFStaticVertex::setValueV(double value, Tempus const&) {
-    if (isGuarded()) return;
+    if (isGuarded())
+        return;
     _valueV = value;
     touch();
 }
 
 void KFStaticVertex::setBias(double bias, Tempus const&) {
-    if (isGuarded()) return;
+    if (isGuarded())
+        return;
     _bias = bias;
     touch();
 }
 
 void KFStaticVertex::setInputTangents(double u, double v, Tempus const&) {
-    if (isGuarded() || !_enabled) return;
+    if (isGuarded() || !_enabled)
+        return;
     _inputTangentU = atMostZero(u);
     _inputTangentV = v;
     touch();
 }
 
 void KFStaticVertex::setOutputTangents(double u, double v, Tempus const&) {
-    if (isGuarded() || !_enabled) return;
+    if (isGuarded() || !_enabled)
+        return;
     _outputTangentU = atLeastZero(u);
     _outputTangentV = v;
     touch();
 }
 
 void KFStaticVertex::flattenTangents(Tempus const&) {
-    if (isGuarded() || !_enabled) return;
+    if (isGuarded() || !_enabled)
+        return;
     _inputTangentU = 0.0;
     _inputTangentV = 0.0;
     _outputTangentU = 0.0;
@@ -124,7 +126,8 @@ bool KFStaticVertex::isFlat() const {
 void KFStaticVertex::setInterpolation(std::uint32_t type) {
     bool const wholeCurve = isWholeCurve(type) || isWholeCurve(KFVertex::getInterpolation());
     KFVertex::setInterpolation(type);
-    if (wholeCurve) _wholeCurveChanges.fetch_add(1, std::memory_order_relaxed);
+    if (wholeCurve)
+        _wholeCurveChanges.fetch_add(1, std::memory_order_release);
     touch();
 }
 
@@ -136,7 +139,8 @@ void KFStaticVertex::offsetVertexInTime(Tempus const& delta) {
 }
 
 bool KFStaticVertex::isEqual(KFVertex const* other) const {
-    if (other == nullptr || typeid(*other) != typeid(*this)) return false;
+    if (other == nullptr || typeid(*other) != typeid(*this))
+        return false;
     auto const& vertex = static_cast<KFStaticVertex const&>(*other);
     return KFVertex::isEqual(other) && _enabled.get() == vertex._enabled.get() &&
            _valueV.get() == vertex._valueV.get() && _bias.get() == vertex._bias.get() &&
@@ -147,6 +151,8 @@ bool KFStaticVertex::isEqual(KFVertex const* other) const {
 }
 
 void KFStaticVertex::getValue(Tempus* u, double* v, Tempus const&) const {
-    if (u != nullptr) *u = getValueU();
-    if (v != nullptr) *v = _valueV;
+    if (u != nullptr)
+        *u = getValueU();
+    if (v != nullptr)
+        *v = _valueV;
 }

@@ -36,6 +36,7 @@ public:
     bool isEnabled(Tempus const&) const final { return _enabled; }
     bool isFlat() const override;
     void setInterpolation(std::uint32_t type) override;
+    std::uint32_t getInterpolation() const final { return KFVertex::getInterpolation(); }
     KFVertex* clone() const override;
     void offsetVertexInTime(Tempus const& delta) override;
     /// False for null and for another class; else the base's comparison, then every field exactly.
@@ -45,16 +46,17 @@ public:
     virtual void getValue(Tempus* u, double* v, Tempus const& t) const;
 
     /// Grows with every change of a field that evaluation reads, so that what was computed from the vertex can be
-    /// told to be out of date. Meaningful only in comparison with an earlier reading of the same vertex.
-    std::uint32_t getRevision() const noexcept { return _revision; }
+    /// told to be out of date. Meaningful only in comparison with an earlier reading of the same vertex. Who reads it
+    /// first and the fields then never takes an old field for one of the new revision.
+    std::uint32_t getRevision() const noexcept { return _revision.getAcquired(); }
     /// Grows whenever any static vertex of the process takes or leaves a type that draws a whole spline as one
     /// function: the types of a spline's ends decide how all of it is evaluated.
     static std::uint32_t getWholeCurveChanges() noexcept {
-        return _wholeCurveChanges.load(std::memory_order_relaxed);
+        return _wholeCurveChanges.load(std::memory_order_acquire);
     }
 
 private:
-    void touch() noexcept { _revision = _revision + 1; }
+    void touch() noexcept { _revision.release(_revision + 1); }
     bool isGuarded() const noexcept { return (KFVertex::getFlags() & kKFVertexFlagLocked) != 0; }
 
     static std::atomic<std::uint32_t> _wholeCurveChanges;
@@ -70,11 +72,15 @@ private:
 };
 
 inline void KFStaticVertex::getInputTangents(double* u, double* v, Tempus const&) const {
-    if (u != nullptr) *u = _inputTangentU;
-    if (v != nullptr) *v = _inputTangentV;
+    if (u != nullptr)
+        *u = _inputTangentU;
+    if (v != nullptr)
+        *v = _inputTangentV;
 }
 
 inline void KFStaticVertex::getOutputTangents(double* u, double* v, Tempus const&) const {
-    if (u != nullptr) *u = _outputTangentU;
-    if (v != nullptr) *v = _outputTangentV;
+    if (u != nullptr)
+        *u = _outputTangentU;
+    if (v != nullptr)
+        *v = _outputTangentV;
 }

@@ -3,13 +3,8 @@
 #include "lumenkey/splines/KFInterpolation.h"
 
 KFVertex::KFVertex(Tempus const& u) noexcept
-    : _flags(0),
-      _interpolation(kKFInterpolationLinear),
-      _valueUValue(u.value),
-      _valueUTimescale(u.timescale),
-      _valueUFlags(u.flags),
-      _valueUEpoch(u.epoch),
-      _normal(0.0) {}
+    : _flags(0), _interpolation(kKFInterpolationLinear), _valueUValue(u.value), _valueUTimescale(u.timescale),
+      _valueUFlags(u.flags), _valueUEpoch(u.epoch), _normal(0.0) {}
 
 KFVertex::KFVertex(KFVertex const& other) noexcept = default;
 KFVertex& KFVertex::operator=(KFVertex const& other) noexcept = default;
@@ -23,8 +18,10 @@ void KFVertex::storeValueU(Tempus const& u) noexcept {
 }
 
 void KFVertex::setValueU(Tempus const& u) {
-    if ((_flags & kKFVertexFlagLocked) != 0) return;
-    if (TempusCompare(u, getValueU()) != 0) storeValueU(u);
+    if ((_flags & kKFVertexFlagLocked) != 0)
+        return;
+    if (TempusCompare(u, getValueU()) != 0)
+        storeValueU(u);
 }
 
 void KFVertex::setNormal(double normal, Tempus const&) { _normal = normal; }

@@ -104,7 +104,9 @@ public:
     Tempus getValueU() const noexcept;
 
     /// Before `other` along U.
-    bool operator<(KFVertex const& other) const noexcept { return TempusCompare(getValueU(), other.getValueU()) < 0; }
+    bool operator<(KFVertex const& other) const noexcept {
+        return TempusCompare(getValueU(), other.getValueU()) < 0;
+    }
     bool operator==(KFVertex const& other) const { return isEqual(&other); }
 
 protected:

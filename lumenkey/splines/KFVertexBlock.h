@@ -51,8 +51,10 @@ public:
     std::uint32_t from(std::uint32_t slot) const noexcept {
         for (std::uint32_t i = slot / kWordBits; i < kWords; ++i) {
             std::uint64_t word = _words[i];
-            if (i == slot / kWordBits) word &= ~std::uint64_t{0} << (slot % kWordBits);
-            if (word != 0) return i * kWordBits + static_cast<std::uint32_t>(std::countr_zero(word));
+            if (i == slot / kWordBits)
+                word &= ~std::uint64_t{0} << (slot % kWordBits);
+            if (word != 0)
+                return i * kWordBits + static_cast<std::uint32_t>(std::countr_zero(word));
         }
         return kCapacity;
     }
@@ -61,8 +63,10 @@ public:
     std::uint32_t before(std::uint32_t slot) const noexcept {
         for (std::uint32_t i = std::min(slot / kWordBits, kWords - 1) + 1; i-- > 0;) {
             std::uint64_t word = _words[i];
-            if (i == slot / kWordBits) word &= (std::uint64_t{1} << (slot % kWordBits)) - 1;
-            if (word != 0) return i * kWordBits + static_cast<std::uint32_t>(std::bit_width(word)) - 1;
+            if (i == slot / kWordBits)
+                word &= (std::uint64_t{1} << (slot % kWordBits)) - 1;
+            if (word != 0)
+                return i * kWordBits + static_cast<std::uint32_t>(std::bit_width(word)) - 1;
         }
         return kCapacity;
     }
@@ -112,8 +116,10 @@ struct KFVertexBlock {
 
 private:
     void growForOne() {
-        if (entries.size() < entries.capacity()) return;
-        std::size_t const wanted = std::min<std::size_t>(std::max<std::size_t>(8, 2 * entries.size()), kCapacity);
+        if (entries.size() < entries.capacity())
+            return;
+        std::size_t const wanted =
+            std::min<std::size_t>(std::max<std::size_t>(8, 2 * entries.size()), kCapacity);
         entries.reserve(wanted);
     }
 };

@@ -16,8 +16,7 @@ std::int64_t tickOf(std::int64_t tick) noexcept { return tick; }
 std::int64_t tickOf(KFVertexEntry const& entry) noexcept { return entry.tick; }
 
 /// The first of some ascending ticks that is at or after `tick`, without a branch that depends on the data.
-template <class Item>
-std::size_t lowerBoundOf(std::vector<Item> const& items, std::int64_t tick) noexcept {
+template <class Item> std::size_t lowerBoundOf(std::vector<Item> const& items, std::int64_t tick) noexcept {
     Item const* const data = items.data();
     std::size_t count = items.size();
     std::size_t first = 0;
@@ -27,14 +26,6 @@ std::size_t lowerBoundOf(std::vector<Item> const& items, std::int64_t tick) noex
         count -= half;
     }
     return first + (count == 1 && tickOf(data[first]) < tick ? 1 : 0);
-}
-
-/// A store with more blocks than that doesn't stay in the processor's nearer memory.
-constexpr std::size_t kBlocksInNearMemory = 32;
-
-/// The probes of a search in far memory wait for each other; the first of them are asked for beforehand, together.
-void fetchProbes(std::vector<KFVertexEntry> const& entries) noexcept {
-    for (std::size_t i = 1; i < 8; ++i) __builtin_prefetch(entries.data() + i * entries.size() / 8);
 }
 
 bool validAtZero(KFVertex const& vertex) { return vertex.isEnabled(kTempusZero); }
@@ -52,11 +43,13 @@ void KFVertexStore::reserve(std::size_t count) {
 }
 
 std::size_t KFVertexStore::bytes() const noexcept {
-    std::size_t total = sizeof(*this) + _blocks.capacity() * sizeof(_blocks[0]) + _firstTicks.capacity() * sizeof(std::int64_t);
+    std::size_t total = sizeof(*this) + _blocks.capacity() * sizeof(_blocks[0]) +
+                        _firstTicks.capacity() * sizeof(std::int64_t);
     for (auto const& block : _blocks) {
         total += sizeof(Block) + block->entries.capacity() * sizeof(KFVertexEntry);
     }
-    if (_handles) total += _handles->bytes();
+    if (_handles)
+        total += _handles->bytes();
     return total;
 }
 
@@ -64,7 +57,8 @@ std::size_t KFVertexStore::bytes() const noexcept {
 
 KFVertex* KFVertexStore::atIndex(std::size_t index) const noexcept {
     for (auto const& block : _blocks) {
-        if (index < block->count()) return block->entries[index].vertex;
+        if (index < block->count())
+            return block->entries[index].vertex;
         index -= block->count();
     }
     return nullptr;
@@ -72,7 +66,8 @@ KFVertex* KFVertexStore::atIndex(std::size_t index) const noexcept {
 
 std::size_t KFVertexStore::indexOf(Place place) const noexcept {
     std::size_t index = place.slot;
-    for (std::uint32_t block = 0; block < place.block; ++block) index += _blocks[block]->count();
+    for (std::uint32_t block = 0; block < place.block; ++block)
+        index += _blocks[block]->count();
     return index;
 }
 
@@ -81,11 +76,12 @@ std::size_t KFVertexStore::indexOf(Place place) const noexcept {
 KFVertexStore::Place KFVertexStore::lowerBoundTick(std::int64_t tick) const noexcept {
     // Equal positions may run over several blocks: the first of them stands in the last block that starts before them.
     std::size_t const behind = lowerBoundOf(_firstTicks, tick);
-    if (behind == 0) return begin();
+    if (behind == 0)
+        return begin();
     Block const& block = *_blocks[behind - 1];
-    if (_blocks.size() > kBlocksInNearMemory) fetchProbes(block.entries);
     std::size_t const slot = lowerBoundOf(block.entries, tick);
-    if (slot == block.entries.size()) return {static_cast<std::uint32_t>(behind), 0};
+    if (slot == block.entries.size())
+        return {static_cast<std::uint32_t>(behind), 0};
     return {static_cast<std::uint32_t>(behind - 1), static_cast<std::uint32_t>(slot)};
 }
 
@@ -93,14 +89,19 @@ namespace {
 
 /// The tick of the smallest multiple of 1/scale at or after `u`, or strictly after it; false when `u` has none.
 bool tickBound(Tempus const& u, std::int64_t scale, bool strictly, std::int64_t* tick) noexcept {
-    if (!TempusIsNumeric(u) || u.epoch != 0) return false;
+    if (!TempusIsNumeric(u) || u.epoch != 0)
+        return false;
     TempusDetail::Wide const product = TempusDetail::Wide{u.value} * scale;
     TempusDetail::Wide quotient = product / u.timescale;
     TempusDetail::Wide const remainder = product % u.timescale;
-    if (remainder < 0) quotient -= 1;
-    if (remainder != 0 || strictly) quotient += 1;
-    if (quotient > std::numeric_limits<std::int64_t>::max()) return false;
-    if (quotient < std::numeric_limits<std::int64_t>::min()) return false;
+    if (remainder < 0)
+        quotient -= 1;
+    if (remainder != 0 || strictly)
+        quotient += 1;
+    if (quotient > std::numeric_limits<std::int64_t>::max())
+        return false;
+    if (quotient < std::numeric_limits<std::int64_t>::min())
+        return false;
     *tick = static_cast<std::int64_t>(quotient);
     return true;
 }
@@ -109,13 +110,15 @@ bool tickBound(Tempus const& u, std::int64_t scale, bool strictly, std::int64_t*
 
 KFVertexStore::Place KFVertexStore::lowerBound(Tempus const& u) const noexcept {
     std::int64_t tick = 0;
-    if (hasTicks() && tickBound(u, _tickScale, false, &tick)) return lowerBoundTick(tick);
+    if (hasTicks() && tickBound(u, _tickScale, false, &tick))
+        return lowerBoundTick(tick);
     return boundByComparison(u, false);
 }
 
 KFVertexStore::Place KFVertexStore::upperBound(Tempus const& u) const noexcept {
     std::int64_t tick = 0;
-    if (hasTicks() && tickBound(u, _tickScale, true, &tick)) return lowerBoundTick(tick);
+    if (hasTicks() && tickBound(u, _tickScale, true, &tick))
+        return lowerBoundTick(tick);
     return boundByComparison(u, true);
 }
 
@@ -124,38 +127,46 @@ KFVertexStore::Place KFVertexStore::boundByComparison(Tempus const& u, bool stri
         int const order = TempusCompare(entry.vertex->getValueU(), u);
         return strictly ? order <= 0 : order < 0;
     };
-    auto const block = std::partition_point(_blocks.begin(), _blocks.end(),
-                                            [&](auto const& candidate) { return stands(candidate->entries.front()); });
-    if (block == _blocks.begin()) return begin();
+    auto const block = std::partition_point(_blocks.begin(), _blocks.end(), [&](auto const& candidate) {
+        return stands(candidate->entries.front());
+    });
+    if (block == _blocks.begin())
+        return begin();
     auto const index = static_cast<std::uint32_t>(block - _blocks.begin());
     auto const& entries = _blocks[index - 1]->entries;
     auto const slot = std::partition_point(entries.begin(), entries.end(), stands);
-    if (slot == entries.end()) return {index, 0};
+    if (slot == entries.end())
+        return {index, 0};
     return {index - 1, static_cast<std::uint32_t>(slot - entries.begin())};
 }
 
 KFVertexStore::Place KFVertexStore::find(KFVertex const* vertex) const noexcept {
     Tempus const u = vertex->getValueU();
-    for (Place place = lowerBound(u); place != end() && TempusCompare(at(place)->getValueU(), u) == 0; place = next(place)) {
-        if (at(place) == vertex) return place;
+    for (Place place = lowerBound(u); place != end() && TempusCompare(at(place)->getValueU(), u) == 0;
+         place = next(place)) {
+        if (at(place) == vertex)
+            return place;
     }
     // A vertex whose position was written without telling the store doesn't stand where its position says.
     for (std::uint32_t index = 0; index < _blocks.size(); ++index) {
         auto const& entries = _blocks[index]->entries;
         auto const found = std::find_if(entries.begin(), entries.end(),
                                         [&](KFVertexEntry const& entry) { return entry.vertex == vertex; });
-        if (found != entries.end()) return {index, static_cast<std::uint32_t>(found - entries.begin())};
+        if (found != entries.end())
+            return {index, static_cast<std::uint32_t>(found - entries.begin())};
     }
     return end();
 }
 
 bool KFVertexStore::contains(void const* handle) const {
-    if (handle == nullptr || empty()) return false;
+    if (handle == nullptr || empty())
+        return false;
     if (!_handles) {
         _handles = std::make_unique<KFHandleSet>();
         _handles->reserve(_size);
         for (auto const& block : _blocks) {
-            for (KFVertexEntry const& entry : block->entries) _handles->insert(entry.vertex);
+            for (KFVertexEntry const& entry : block->entries)
+                _handles->insert(entry.vertex);
         }
     }
     return _handles->contains(handle);
@@ -174,12 +185,15 @@ void KFVertexStore::updateEnds() noexcept {
 
 KFVertexStore::Place KFVertexStore::insert(Place place, KFVertex* vertex, bool suppressed) {
     bool const enabled = validAtZero(*vertex);
-    if (suppressed && enabled) _validityCurrent = false;
+    if (suppressed && enabled)
+        _validityCurrent = false;
     bool const isValid = enabled && !suppressed;
 
     std::int64_t tick = 0;
-    if (hasTicks() && !adoptPosition(vertex->getValueU(), &tick)) _tickScale = 0;
-    if (_handles) _handles->insert(vertex);
+    if (hasTicks() && !adoptPosition(vertex->getValueU(), &tick))
+        _tickScale = 0;
+    if (_handles)
+        _handles->insert(vertex);
 
     place = roomAt(place);
     Block& block = *_blocks[place.block];
@@ -197,11 +211,13 @@ KFVertexStore::Place KFVertexStore::roomAt(Place place) {
     if (place.slot == 0 && place.block > 0 && _blocks[place.block - 1]->count() < kBlockCapacity) {
         return {place.block - 1, _blocks[place.block - 1]->count()};
     }
-    if (place.block == _blocks.size() || (place.slot == 0 && _blocks[place.block]->count() == kBlockCapacity)) {
+    if (place.block == _blocks.size() ||
+        (place.slot == 0 && _blocks[place.block]->count() == kBlockCapacity)) {
         insertBlock(place.block);
         return {place.block, 0};
     }
-    if (_blocks[place.block]->count() < kBlockCapacity) return place;
+    if (_blocks[place.block]->count() < kBlockCapacity)
+        return place;
     splitBlock(place.block);
     std::uint32_t const kept = _blocks[place.block]->count();
     return place.slot <= kept ? place : Place{place.block + 1, place.slot - kept};
@@ -219,7 +235,8 @@ void KFVertexStore::splitBlock(std::uint32_t index) {
     Block& high = *_blocks[index + 1];
     high.entries.assign(low.entries.begin() + half, low.entries.end());
     for (std::uint32_t slot = half; slot < kBlockCapacity; ++slot) {
-        if (!low.valid.test(slot)) continue;
+        if (!low.valid.test(slot))
+            continue;
         high.setValid(slot - half, true);
         low.setValid(slot, false);
     }
@@ -229,7 +246,8 @@ void KFVertexStore::splitBlock(std::uint32_t index) {
 
 KFVertexStore::Place KFVertexStore::remove(Place place) {
     Block& block = *_blocks[place.block];
-    if (_handles) _handles->erase(block.entries[place.slot].vertex);
+    if (_handles)
+        _handles->erase(block.entries[place.slot].vertex);
     _validCount -= block.valid.test(place.slot) ? 1 : 0;
     block.remove(place.slot);
     _size -= 1;
@@ -241,7 +259,8 @@ KFVertexStore::Place KFVertexStore::remove(Place place) {
     } else {
         _firstTicks[place.block] = block.entries.front().tick;
         mergeWithNext(place);
-        if (place.slot == _blocks[place.block]->count()) place = {place.block + 1, 0};
+        if (place.slot == _blocks[place.block]->count())
+            place = {place.block + 1, 0};
     }
     if (empty()) {
         _tickScale = 1;
@@ -254,10 +273,12 @@ KFVertexStore::Place KFVertexStore::remove(Place place) {
 
 /// Two neighbours that fit into half a block become one, so that many deletions leave no thin blocks.
 void KFVertexStore::mergeWithNext(Place const& place) {
-    if (place.block + 1 >= _blocks.size()) return;
+    if (place.block + 1 >= _blocks.size())
+        return;
     Block& low = *_blocks[place.block];
     Block& high = *_blocks[place.block + 1];
-    if (low.count() + high.count() > kBlockCapacity / 2) return;
+    if (low.count() + high.count() > kBlockCapacity / 2)
+        return;
     for (std::uint32_t slot = 0; slot < high.count(); ++slot) {
         low.insert(low.count(), high.entries[slot].vertex, high.entries[slot].tick, high.valid.test(slot));
     }
@@ -308,7 +329,8 @@ void KFVertexStore::refresh() {
 }
 
 void KFVertexStore::rotate(Place place) {
-    if (place == begin() || place == end()) return;
+    if (place == begin() || place == end())
+        return;
     std::vector<KFVertex*> vertices;
     std::vector<bool> valid;
     vertices.reserve(_size);
@@ -324,10 +346,12 @@ void KFVertexStore::rotate(Place place) {
     _blocks.clear();
     _firstTicks.clear();
     for (std::size_t i = 0; i < vertices.size(); ++i) {
-        if (i % kBlockCapacity == 0) insertBlock(static_cast<std::uint32_t>(_blocks.size()));
+        if (i % kBlockCapacity == 0)
+            insertBlock(static_cast<std::uint32_t>(_blocks.size()));
         _blocks.back()->insert(_blocks.back()->count(), vertices[i], 0, valid[i]);
     }
     updateAllPositions();
+    updateEnds();
 }
 
 // --- Ticks ---
@@ -335,31 +359,39 @@ void KFVertexStore::rotate(Place place) {
 bool KFVertexStore::tickOf(Tempus const& u, std::int64_t* tick) const noexcept {
     // The caller made sure that the timescale of `u` divides the common one.
     std::int64_t product = 0;
-    if (__builtin_mul_overflow(u.value, _tickScale / u.timescale, &product)) return false;
-    if (product > kLargestTick || product < -kLargestTick) return false;
+    if (__builtin_mul_overflow(u.value, _tickScale / u.timescale, &product))
+        return false;
+    if (product > kLargestTick || product < -kLargestTick)
+        return false;
     *tick = product;
     return true;
 }
 
 bool KFVertexStore::adoptPosition(Tempus const& u, std::int64_t* tick) noexcept {
-    if (!TempusIsNumeric(u) || u.epoch != 0) return false;
-    if (_tickScale % u.timescale != 0 && !adoptTimescale(u.timescale)) return false;
+    if (!TempusIsNumeric(u) || u.epoch != 0)
+        return false;
+    if (_tickScale % u.timescale != 0 && !adoptTimescale(u.timescale))
+        return false;
     return tickOf(u, tick);
 }
 
 bool KFVertexStore::adoptTimescale(std::int32_t timescale) noexcept {
     std::int64_t const factor = timescale / std::gcd(_tickScale, std::int64_t{timescale});
-    if (_tickScale > kLargestTick / factor) return false;
+    if (_tickScale > kLargestTick / factor)
+        return false;
     std::int64_t const limit = kLargestTick / factor;
     for (auto const& block : _blocks) {
         for (KFVertexEntry const& entry : block->entries) {
-            if (entry.tick > limit || entry.tick < -limit) return false;
+            if (entry.tick > limit || entry.tick < -limit)
+                return false;
         }
     }
     for (auto const& block : _blocks) {
-        for (KFVertexEntry& entry : block->entries) entry.tick *= factor;
+        for (KFVertexEntry& entry : block->entries)
+            entry.tick *= factor;
     }
-    for (std::int64_t& tick : _firstTicks) tick *= factor;
+    for (std::int64_t& tick : _firstTicks)
+        tick *= factor;
     _tickScale *= factor;
     return true;
 }
@@ -404,7 +436,8 @@ void KFVertexStore::updateAllPositions() {
 
 bool KFVertexStore::widenScale(std::int32_t timescale) noexcept {
     std::int64_t const factor = timescale / std::gcd(_tickScale, std::int64_t{timescale});
-    if (_tickScale > kLargestTick / factor) return false;
+    if (_tickScale > kLargestTick / factor)
+        return false;
     _tickScale *= factor;
     return true;
 }

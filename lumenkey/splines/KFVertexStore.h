@@ -144,12 +144,14 @@ inline KFVertexStore::Place KFVertexStore::end() const noexcept {
 inline KFVertexStore::Place KFVertexStore::last() const noexcept { return empty() ? end() : previous(end()); }
 
 inline KFVertexStore::Place KFVertexStore::next(Place place) const noexcept {
-    if (place.slot + 1 < _blocks[place.block]->count()) return {place.block, place.slot + 1};
+    if (place.slot + 1 < _blocks[place.block]->count())
+        return {place.block, place.slot + 1};
     return {place.block + 1, 0};
 }
 
 inline KFVertexStore::Place KFVertexStore::previous(Place place) const noexcept {
-    if (place.slot > 0) return {place.block, place.slot - 1};
+    if (place.slot > 0)
+        return {place.block, place.slot - 1};
     return {place.block - 1, _blocks[place.block - 1]->count() - 1};
 }
 
@@ -166,25 +168,31 @@ inline bool KFVertexStore::isValid(Place place) const noexcept {
 }
 
 inline KFVertexStore::Place KFVertexStore::validFrom(Place place) const noexcept {
-    if (_validCount == _size) return place;
+    if (_validCount == _size)
+        return place;
     for (; place.block < _blocks.size(); place = {place.block + 1, 0}) {
         Block const& block = *_blocks[place.block];
-        if (block.validCount == 0) continue;
+        if (block.validCount == 0)
+            continue;
         std::uint32_t const slot = block.valid.from(place.slot);
-        if (slot < kBlockCapacity) return {place.block, slot};
+        if (slot < kBlockCapacity)
+            return {place.block, slot};
     }
     return end();
 }
 
 inline KFVertexStore::Place KFVertexStore::validBefore(Place place) const noexcept {
-    if (_validCount == _size) return place == begin() ? end() : previous(place);
+    if (_validCount == _size)
+        return place == begin() ? end() : previous(place);
     if (place.block < _blocks.size()) {
         std::uint32_t const slot = _blocks[place.block]->valid.before(place.slot);
-        if (slot < kBlockCapacity) return {place.block, slot};
+        if (slot < kBlockCapacity)
+            return {place.block, slot};
     }
     for (std::uint32_t index = place.block; index-- > 0;) {
         Block const& block = *_blocks[index];
-        if (block.validCount > 0) return {index, block.valid.before(kBlockCapacity)};
+        if (block.validCount > 0)
+            return {index, block.valid.before(kBlockCapacity)};
     }
     return end();
 }

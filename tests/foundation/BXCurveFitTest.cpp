@@ -119,9 +119,7 @@ TEST(BXCurveFit, SmallestInputs) {
 }
 
 TEST(BXCurveFit, HoldsTheToleranceOverTime) {
-    constexpr unsigned seed = 8101;
-    SCOPED_TRACE(::testing::Message() << "seed " << seed);
-    std::mt19937 engine(seed);
+    std::mt19937 engine(8101);
     std::normal_distribution<double> normal;
     double walk = 0.0;
     Points const museum[] = {
@@ -145,9 +143,7 @@ TEST(BXCurveFit, HoldsTheToleranceOverTime) {
 }
 
 TEST(BXCurveFit, HoldsTheToleranceInThePlane) {
-    constexpr unsigned seed = 8102;
-    SCOPED_TRACE(::testing::Message() << "seed " << seed);
-    std::mt19937 engine(seed);
+    std::mt19937 engine(8102);
     std::normal_distribution<double> normal;
     Points circle, spiral, cloud, doubled;
     for (int i = 0; i <= 100; ++i) {

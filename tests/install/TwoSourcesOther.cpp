@@ -2,6 +2,4 @@
 
 double versionNumberSeenFromOtherSource();
 
-double versionNumberSeenFromOtherSource() {
-    return LumenkeyVersionNumber;
-}
+double versionNumberSeenFromOtherSource() { return LumenkeyVersionNumber; }

@@ -54,7 +54,8 @@ double walkedValue(KFSpline& spline, Tempus const& u) {
     auto const agrees = [&](KFVertex const* vertex) {
         return vertex->getInterpolation() == all.front()->getInterpolation();
     };
-    if (isWholeCurveType(state.interpolation) && state.parametric && std::all_of(all.begin(), all.end(), agrees) &&
+    if (isWholeCurveType(state.interpolation) && state.parametric &&
+        std::all_of(all.begin(), all.end(), agrees) &&
         (all.empty() || isWholeCurveType(all.front()->getInterpolation()))) {
         return all.empty() ? result : draw(spline, all.front(), all.back(), u, false);
     }
@@ -94,8 +95,9 @@ double walkedValue(KFSpline& spline, Tempus const& u) {
     if (closed) {
         return draw(spline, valid.back(), valid.front(), u, false);
     }
-    return isWholeCurveType(valid.back()->getInterpolation()) ? draw(spline, valid.back(), valid.back(), u, false)
-                                                              : result;
+    return isWholeCurveType(valid.back()->getInterpolation())
+               ? draw(spline, valid.back(), valid.back(), u, false)
+               : result;
 }
 
 double walkedSlope(KFSpline& spline, Tempus const& u) {
@@ -157,8 +159,8 @@ long double casteljau(long double const* p, long double t) {
 } // namespace
 
 LongCubic::LongCubic(KFSpline& spline, Segment const& segment)
-    : _parametric(spline.getState()->parametric), _start(segment.a->getValueU()), _end(segment.b->getValueU()),
-      _u{0.0L, 0.0L, 1.0L, 1.0L} {
+    : _parametric(spline.getState()->parametric), _start(segment.a->getValueU()),
+      _end(segment.b->getValueU()), _u{0.0L, 0.0L, 1.0L, 1.0L} {
     _v[0] = segment.a->getValueV(kTempusZero);
     _v[3] = segment.b->getValueV(kTempusZero);
     if (segment.a->getInterpolation() == 6) {
@@ -200,7 +202,9 @@ void LongCubic::readNeighbours(KFSpline& spline, Segment const& segment) {
     auto const valid = enabledOf(museumVertices(spline));
     auto const a = std::find(valid.begin(), valid.end(), segment.a);
     auto const b = std::find(valid.begin(), valid.end(), segment.b);
-    auto const value = [](KFVertex const* vertex) { return static_cast<long double>(vertex->getValueV(kTempusZero)); };
+    auto const value = [](KFVertex const* vertex) {
+        return static_cast<long double>(vertex->getValueV(kTempusZero));
+    };
 
     long double reach = 2.0L * span;
     long double rise = 0.0L;

@@ -77,7 +77,8 @@ private:
     }
     std::size_t bound(Tempus const& u, bool strictly) const {
         std::size_t i = 0;
-        while (i < _list.size() && (strictly ? !(u < _list[i].vertex->getValueU()) : _list[i].vertex->getValueU() < u)) {
+        while (i < _list.size() &&
+               (strictly ? !(u < _list[i].vertex->getValueU()) : _list[i].vertex->getValueU() < u)) {
             ++i;
         }
         return i;
@@ -100,7 +101,8 @@ void StoreTwins::insert() {
     vertex->setEnabled(pick(4) != 0, kTempusZero);
     bool const suppressed = pick(10) == 0;
     Place const place = store.insert(placeAt(index), vertex, suppressed);
-    _list.insert(_list.begin() + static_cast<std::ptrdiff_t>(index), {vertex, vertex->isEnabled(kTempusZero) && !suppressed});
+    _list.insert(_list.begin() + static_cast<std::ptrdiff_t>(index),
+                 {vertex, vertex->isEnabled(kTempusZero) && !suppressed});
     // The allocator hands out memory of dead vertices again.
     std::erase(_dead, static_cast<void const*>(vertex));
     ASSERT_EQ(store.at(place), vertex);
@@ -111,7 +113,8 @@ void StoreTwins::remove(std::size_t index) {
     KFVertex* const vertex = _list[index].vertex;
     Place const behind = store.remove(placeAt(index));
     _list.erase(_list.begin() + static_cast<std::ptrdiff_t>(index));
-    ASSERT_EQ(behind == store.end() ? nullptr : store.at(behind), index < _list.size() ? _list[index].vertex : nullptr);
+    ASSERT_EQ(behind == store.end() ? nullptr : store.at(behind),
+              index < _list.size() ? _list[index].vertex : nullptr);
     _dead.push_back(vertex);
     delete vertex;
 }
@@ -148,7 +151,9 @@ void StoreTwins::edit(bool growing) {
 
 void StoreTwins::expectSearches() {
     auto const vertexAt = [&](Place place) { return place == store.end() ? nullptr : store.at(place); };
-    auto const entryAt = [&](std::size_t index) { return index < _list.size() ? _list[index].vertex : nullptr; };
+    auto const entryAt = [&](std::size_t index) {
+        return index < _list.size() ? _list[index].vertex : nullptr;
+    };
     for (int i = 0; i < 20; ++i) {
         Tempus const u = i == 0 ? kTempusPositiveInfinity : i == 1 ? kTempusNegativeInfinity : pickU();
         ASSERT_EQ(vertexAt(store.lowerBound(u)), entryAt(bound(u, false))) << museumText(u);
@@ -170,7 +175,8 @@ void StoreTwins::expectSearches() {
 void StoreTwins::expectAgreement() {
     ASSERT_EQ(store.size(), _list.size());
     auto const isValid = [](Entry const& entry) { return entry.valid; };
-    ASSERT_EQ(store.validCount(), static_cast<std::size_t>(std::count_if(_list.begin(), _list.end(), isValid)));
+    ASSERT_EQ(store.validCount(),
+              static_cast<std::size_t>(std::count_if(_list.begin(), _list.end(), isValid)));
     auto const first = std::find_if(_list.begin(), _list.end(), isValid);
     auto const last = std::find_if(_list.rbegin(), _list.rend(), isValid);
     ASSERT_EQ(store.firstValid(), first == _list.end() ? nullptr : first->vertex);
@@ -185,14 +191,17 @@ void StoreTwins::expectAgreement() {
         ASSERT_EQ(found == store.end() ? nullptr : store.at(found), before) << i;
         auto const next = std::find_if(_list.begin() + static_cast<std::ptrdiff_t>(i), _list.end(), isValid);
         Place const from = store.validFrom(place);
-        ASSERT_EQ(from == store.end() ? nullptr : store.at(from), next == _list.end() ? nullptr : next->vertex) << i;
+        ASSERT_EQ(from == store.end() ? nullptr : store.at(from),
+                  next == _list.end() ? nullptr : next->vertex)
+            << i;
         if (i == _list.size()) {
             break;
         }
         ASSERT_EQ(store.at(place), _list[i].vertex) << i;
         ASSERT_EQ(store.isValid(place), _list[i].valid) << i;
         if (store.hasTicks()) {
-            ASSERT_EQ(TempusMake(store.tickAt(place), 1), _list[i].vertex->getValueU() * Tempus(TempusMake(store.tickScale(), 1)));
+            ASSERT_EQ(TempusMake(store.tickAt(place), 1),
+                      _list[i].vertex->getValueU() * Tempus(TempusMake(store.tickScale(), 1)));
         }
         before = _list[i].valid ? _list[i].vertex : before;
         Place const next2 = store.next(place);
@@ -254,11 +263,14 @@ struct Walks {
     bool listed;
 
     Walks(KFSpline& spline, bool listedIn) : all(museumVertices(spline)), listed(listedIn) {
-        std::copy_if(all.begin(), all.end(), std::back_inserter(valid), [](KFVertex* v) { return v->isEnabled(kTempusZero); });
+        std::copy_if(all.begin(), all.end(), std::back_inserter(valid),
+                     [](KFVertex* v) { return v->isEnabled(kTempusZero); });
     }
 
     static KFVertex* entry(std::vector<KFVertex*> const& list, std::ptrdiff_t index) {
-        return index >= 0 && index < static_cast<std::ptrdiff_t>(list.size()) ? list[static_cast<std::size_t>(index)] : nullptr;
+        return index >= 0 && index < static_cast<std::ptrdiff_t>(list.size())
+                   ? list[static_cast<std::size_t>(index)]
+                   : nullptr;
     }
     /// In the list of valid vertices; one that isn't there counts as its first.
     std::ptrdiff_t listPlace(KFVertex const* vertex) const {
@@ -277,11 +289,13 @@ struct Walks {
         return nearest == nullptr ? nullptr : *std::find_if(valid.begin(), valid.end(), same);
     }
     KFVertex* after(Tempus const& u) const {
-        auto const found = std::find_if(valid.begin(), valid.end(), [&](KFVertex* v) { return v->getValueU() > u; });
+        auto const found =
+            std::find_if(valid.begin(), valid.end(), [&](KFVertex* v) { return v->getValueU() > u; });
         return found == valid.end() ? nullptr : *found;
     }
     KFVertex* before(Tempus const& u) const {
-        auto const found = std::find_if(valid.rbegin(), valid.rend(), [&](KFVertex* v) { return v->getValueU() < u; });
+        auto const found =
+            std::find_if(valid.rbegin(), valid.rend(), [&](KFVertex* v) { return v->getValueU() < u; });
         return found == valid.rend() ? nullptr : *found;
     }
     std::uint32_t count() const {
@@ -304,10 +318,13 @@ template <class Operation> void* found(Operation operation) {
 
 void expectNavigation(KFSpline& spline, Walks const& walks) {
     Tempus const t = kTempusZero;
-    EXPECT_EQ(found([&](void** out) { return spline.getFirstValidVertex(out, t); }), Walks::entry(walks.valid, 0));
+    EXPECT_EQ(found([&](void** out) { return spline.getFirstValidVertex(out, t); }),
+              Walks::entry(walks.valid, 0));
     auto const lastIndex = static_cast<std::ptrdiff_t>(walks.valid.size()) - 1;
-    EXPECT_EQ(found([&](void** out) { return spline.getLastValidVertexWithLock(out, t); }), Walks::entry(walks.valid, lastIndex));
-    EXPECT_EQ(found([&](void** out) { return spline.getFirstValidVertexWithLock(out, t); }), Walks::entry(walks.valid, 0));
+    EXPECT_EQ(found([&](void** out) { return spline.getLastValidVertexWithLock(out, t); }),
+              Walks::entry(walks.valid, lastIndex));
+    EXPECT_EQ(found([&](void** out) { return spline.getFirstValidVertexWithLock(out, t); }),
+              Walks::entry(walks.valid, 0));
     EXPECT_EQ(spline.getNumberOfValidVertices(t), walks.count());
     EXPECT_EQ(spline.getNumberOfValidVerticesWithMultiplicity(t), walks.count());
 
@@ -318,17 +335,24 @@ void expectNavigation(KFSpline& spline, Walks const& walks) {
         KFVertex* const vertex = walks.all[i];
         bool const isFirst = i == 0;
         ASSERT_EQ(spline.vertexAt(spline.getVertexIter(vertex)), vertex);
-        ASSERT_EQ(found([&](void** out) { return spline.getNextValidVertex(vertex, out, t); }), walks.next(vertex)) << i;
-        ASSERT_EQ(found([&](void** out) { return spline.getNextValidVertexWithLock(place, out, t); }), walks.next(vertex)) << i;
+        ASSERT_EQ(found([&](void** out) { return spline.getNextValidVertex(vertex, out, t); }),
+                  walks.next(vertex))
+            << i;
+        ASSERT_EQ(found([&](void** out) { return spline.getNextValidVertexWithLock(place, out, t); }),
+                  walks.next(vertex))
+            << i;
         ASSERT_EQ(found([&](void** out) { return spline.getPreviousValidVertex(place, out, t); }),
-                  isFirst ? nullptr : walks.previous(vertex)) << i;
+                  isFirst ? nullptr : walks.previous(vertex))
+            << i;
         ASSERT_EQ(found([&](void** out) { return spline.getPreviousValidVertexWithLock(vertex, out, t); }),
-                  isFirst ? nullptr : walks.previous(vertex)) << i;
+                  isFirst ? nullptr : walks.previous(vertex))
+            << i;
         ASSERT_EQ(spline.getNextVertex(vertex), Walks::entry(walks.all, static_cast<std::ptrdiff_t>(i) + 1));
         ASSERT_EQ(spline.getPreviousVertex(vertex), isFirst ? nullptr : walks.all[i - 1]);
         ASSERT_TRUE(spline.isValidHandle(vertex));
         ASSERT_TRUE(spline.findVertex(static_cast<long>(i), static_cast<long>(i), vertex));
-        ASSERT_FALSE(spline.findVertex(static_cast<long>(i) + 1, static_cast<long>(walks.all.size()), vertex));
+        ASSERT_FALSE(
+            spline.findVertex(static_cast<long>(i) + 1, static_cast<long>(walks.all.size()), vertex));
     }
 }
 
@@ -336,9 +360,12 @@ void expectSearches(KFSpline& spline, Walks const& walks) {
     Tempus const t = kTempusZero;
     for (Tempus const& u : museumPositions(spline)) {
         SCOPED_TRACE(museumText(u));
-        ASSERT_EQ(found([&](void** out) { return spline.getNextValidVertex(u, out, t, false); }), walks.after(u));
-        ASSERT_EQ(found([&](void** out) { return spline.getPreviousValidVertexWithLock(u, out, t, false); }), walks.before(u));
-        auto const at = std::find_if(walks.all.begin(), walks.all.end(), [&](KFVertex* v) { return v->getValueU() == u; });
+        ASSERT_EQ(found([&](void** out) { return spline.getNextValidVertex(u, out, t, false); }),
+                  walks.after(u));
+        ASSERT_EQ(found([&](void** out) { return spline.getPreviousValidVertexWithLock(u, out, t, false); }),
+                  walks.before(u));
+        auto const at = std::find_if(walks.all.begin(), walks.all.end(),
+                                     [&](KFVertex* v) { return v->getValueU() == u; });
         KFVertex* const expected = at == walks.all.end() ? nullptr : *at;
         ASSERT_EQ(found([&](void** out) { return spline.getVertexHandle(u, out, true); }), expected);
         double value = 0.0;
@@ -347,7 +374,8 @@ void expectSearches(KFSpline& spline, Walks const& walks) {
 
         // Of several vertices at zero the second comes after the first.
         auto const secondAtZero = [&](std::vector<KFVertex*> const& list) -> KFVertex* {
-            auto const first = std::find_if(list.begin(), list.end(), [](KFVertex* v) { return v->getValueU() == kTempusZero; });
+            auto const first = std::find_if(list.begin(), list.end(),
+                                            [](KFVertex* v) { return v->getValueU() == kTempusZero; });
             bool const isTwice = u == kTempusZero && first != list.end() && first + 1 != list.end() &&
                                  first[1]->getValueU() == kTempusZero;
             return isTwice ? first[1] : nullptr;
@@ -355,9 +383,12 @@ void expectSearches(KFSpline& spline, Walks const& walks) {
         KFVertex* const twice = secondAtZero(walks.valid);
         ASSERT_EQ(found([&](void** out) { return spline.getNextValidVertexWithLock(u, out, t, true); }),
                   twice != nullptr ? twice : walks.after(u));
-        auto const next = std::find_if(walks.all.begin(), walks.all.end(), [&](KFVertex* v) { return v->getValueU() > u; });
+        auto const next =
+            std::find_if(walks.all.begin(), walks.all.end(), [&](KFVertex* v) { return v->getValueU() > u; });
         KFVertex* const plainTwice = secondAtZero(walks.all);
-        ASSERT_EQ(spline.getNextVertex(u), plainTwice != nullptr ? plainTwice : next == walks.all.end() ? nullptr : *next);
+        ASSERT_EQ(spline.getNextVertex(u), plainTwice != nullptr     ? plainTwice
+                                           : next == walks.all.end() ? nullptr
+                                                                     : *next);
     }
 }
 
@@ -391,7 +422,8 @@ void expectLists(KFSpline& spline, Walks const& walks) {
             double out = 0.0;
             vertex->getInputTangents(nullptr, &in, kTempusZero);
             vertex->getOutputTangents(nullptr, &out, kTempusZero);
-            for (double const offer : {handlesToo ? value + 12.0 * in : value, handlesToo ? value + 12.0 * out : value}) {
+            for (double const offer :
+                 {handlesToo ? value + 12.0 * in : value, handlesToo ? value + 12.0 * out : value}) {
                 if (highest ? offer > best.value : offer < best.value) {
                     best = {offer, vertex->getValueU()};
                 }
@@ -404,7 +436,8 @@ void expectLists(KFSpline& spline, Walks const& walks) {
         EXPECT_EQ(u, expected.u);
     };
     Tempus u[4] = {};
-    double const values[4] = {spline.getMaxValueV(kTempusZero, &u[0]), spline.getMinValueV(kTempusZero, &u[1]),
+    double const values[4] = {spline.getMaxValueV(kTempusZero, &u[0]),
+                              spline.getMinValueV(kTempusZero, &u[1]),
                               spline.getMaxValueVWithTangents(kTempusZero, &u[2]),
                               spline.getMinValueVWithTangents(kTempusZero, &u[3])};
     for (int i = 0; i < 4; ++i) {

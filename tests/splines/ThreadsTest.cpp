@@ -88,7 +88,9 @@ protected:
     static Tempus pickU(std::mt19937& random) {
         std::int32_t const scales[] = {24, 30, 262144, 600};
         std::int32_t const scale = scales[random() % 4];
-        return s(static_cast<std::int64_t>(random() % 16) * scale - 3 * scale + static_cast<int>(random() % 24), scale);
+        return s(static_cast<std::int64_t>(random() % 16) * scale - 3 * scale +
+                     static_cast<int>(random() % 24),
+                 scale);
     }
 
     void expectAt(Tempus const& u, double value, char const* what) {
@@ -115,7 +117,8 @@ protected:
 private:
     KFVertex* pickVertex(std::mt19937& random) {
         void* handle = nullptr;
-        curve->getNextValidVertex(s(static_cast<std::int64_t>(random() % 290) + 1, 30), &handle, kTempusZero, false);
+        curve->getNextValidVertex(s(static_cast<std::int64_t>(random() % 290) + 1, 30), &handle, kTempusZero,
+                                  false);
         return static_cast<KFVertex*>(handle == nullptr ? last : handle);
     }
     void editVertex(KFVertex& vertex, std::mt19937& random);
@@ -247,7 +250,8 @@ void KFSplineThreads::edit(std::mt19937& random) {
     case 4:
         if (!stays) {
             curve->disableVertex(vertex, kTempusZero);
-            curve->enableVertex(random() % 2 == 0 ? vertex : static_cast<KFVertex*>(curve->getNextVertex(u)), kTempusZero);
+            curve->enableVertex(random() % 2 == 0 ? vertex : static_cast<KFVertex*>(curve->getNextVertex(u)),
+                                kTempusZero);
         }
         break;
     case 5:
@@ -325,8 +329,9 @@ TEST_F(KFSplineThreads, WholeCurvesAreReadByManyAtOnce) {
             // Its strategy is made by whoever comes first, and its tables follow the edit.
             atOnce(4, [&](int thread) {
                 if (thread == 0) {
-                    whole->setVertexFlag(whole->getFirstVertex(), kKFVertexFlagSelected);
+                    whole->preSplineAccess(true);
                     whole->setDirty(true);
+                    whole->postSplineAccess(true);
                 }
                 whole->preSplineAccess(true);
                 double value = 0.0;

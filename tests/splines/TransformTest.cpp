@@ -1,34 +1,36 @@
-#include "lumenkey/splines/KFSpline.h"
-#include "lumenkey/splines/KFVertex.h"
+#include "tests/splines/museum.h"
 
 #include <gtest/gtest.h>
 
 #include <array>
 #include <random>
 #include <utility>
-#include <vector>
 
 namespace {
 
+using Numbers = std::vector<double>;
+using Sides = std::array<double, 4>;
+
 Tempus seconds(int n) { return TempusMake(n, 1); }
 
-struct Curve {
-    KFSplineState state;
-    KFSpline spline{&state};
+Sides sidesOf(KFVertex* vertex) {
+    Sides sides{};
+    vertex->getInputTangents(&sides[0], &sides[1], kTempusZero);
+    vertex->getOutputTangents(&sides[2], &sides[3], kTempusZero);
+    return sides;
+}
 
-    Curve() { state.deriveTangents = false; }
-    Curve(std::initializer_list<std::pair<int, double>> keys) : Curve() {
+struct Curve : MuseumSpline {
+    Curve(std::initializer_list<std::pair<int, double>> keys = {}) {
         for (auto const& [u, v] : keys) {
             append(seconds(u), v, 1);
         }
     }
-
     KFVertex* append(Tempus const& u, double value, std::uint32_t type) {
-        void* const handle = spline.appendVertexNoTangents(u, value, kTempusZero);
-        spline.setVertexInterpolation(handle, type);
-        return static_cast<KFVertex*>(handle);
+        auto* const vertex = static_cast<KFVertex*>(spline->appendVertexNoTangents(u, value, kTempusZero));
+        vertex->setInterpolation(type);
+        return vertex;
     }
-
     void fillWithBeziers(std::mt19937& random, int count) {
         auto const number = [&random](int high) {
             return static_cast<int>(random() % static_cast<unsigned>(high + 1));
@@ -41,86 +43,73 @@ struct Curve {
             u += 10 + number(30);
         }
     }
-
-    KFVertex* at(int index) {
-        auto place = spline.beginVertices();
-        while (index-- > 0) {
-            place = spline.nextPlace(place);
+    KFVertex* key(int index) { return museumVertices(*spline)[static_cast<std::size_t>(index)]; }
+    void lock(int index) { key(index)->setFlag(kKFVertexFlagLocked); }
+    void expect(Numbers const& positions, Numbers const& values) {
+        auto const vertices = museumVertices(*spline);
+        ASSERT_EQ(values.size(), vertices.size());
+        for (std::size_t i = 0; i < values.size(); ++i) {
+            EXPECT_EQ(positions[i], TempusGetSeconds(vertices[i]->getValueU()));
+            EXPECT_EQ(values[i], vertices[i]->getValueV(kTempusZero)) << i;
         }
-        return spline.vertexAt(place);
-    }
-
-    double value(Tempus const& u) { return spline.getVertexValue(u, kTempusZero, true); }
-    std::vector<double> values() {
-        std::vector<double> all;
-        for (auto place = spline.beginVertices(); place != spline.endVertices();
-             place = spline.nextPlace(place)) {
-            all.push_back(spline.vertexAt(place)->getValueV(kTempusZero));
-        }
-        return all;
-    }
-    std::vector<double> positions() {
-        std::vector<double> all;
-        for (auto place = spline.beginVertices(); place != spline.endVertices();
-             place = spline.nextPlace(place)) {
-            all.push_back(TempusGetSeconds(spline.vertexAt(place)->getValueU()));
-        }
-        return all;
+        expectFindable();
     }
     /// Searches find each vertex where it stands: the index of positions is up to date.
     void expectFindable() {
-        for (auto place = spline.beginVertices(); place != spline.endVertices();
-             place = spline.nextPlace(place)) {
+        for (KFVertex const* vertex : museumVertices(*spline)) {
             void* found = nullptr;
-            Tempus const u = spline.vertexAt(place)->getValueU();
-            ASSERT_TRUE(spline.getVertexHandle(u, &found, true));
-            EXPECT_EQ(u, static_cast<KFVertex*>(found)->getValueU());
+            ASSERT_TRUE(spline->getVertexHandle(vertex->getValueU(), &found, true));
+            EXPECT_EQ(vertex->getValueU(), static_cast<KFVertex*>(found)->getValueU());
         }
     }
 };
 
-using Numbers = std::vector<double>;
-
 TEST(KFSplineTransform, OffsetsWithinLimits) {
-    auto const offset = [](Curve& curve, int u, double value, bool neighboursOnly, bool keepShape) {
-        curve.spline.offsetSpline(seconds(u), value, 10.0, -10.0, neighboursOnly, keepShape, kTempusZero);
-        return curve.values();
+    struct {
+        Numbers values; // at 1, 2, ... s
+        int u;
+        double offset;
+        bool neighboursOnly, keepShape;
+        Numbers expected;
+    } const rows[] = {
+        // The one at the limit holds all back, or only itself.
+        {{1, 9, 5}, 1, 4, false, true, {2, 10, 6}},
+        {{1, 9, 5}, 1, 4, false, false, {4, 10, 8}},
+        {{1, -8, 5}, 1, -4, false, true, {-1, -10, 3}},
+        // Only the neighbours move, and none that stands at u.
+        {{1, 9, 5, 0}, 2, 12, true, false, {4, 9, 8, 0}},
+        {{1, 7, 9, 0}, 2, 10, true, true, {2, 7, 10, 0}},
+        {{9, 5}, 0, 12, true, true, {10, 5}},
     };
-    { // The one at the limit holds all back, or only itself.
-        Curve curve{{0, 1.0}, {1, 9.0}, {2, 5.0}};
-        EXPECT_EQ((Numbers{2.0, 10.0, 6.0}), offset(curve, 0, 4.0, false, true));
-        Curve other{{0, 1.0}, {1, 9.0}, {2, 5.0}};
-        EXPECT_EQ((Numbers{4.0, 10.0, 8.0}), offset(other, 0, 4.0, false, false));
-        Curve downwards{{0, 1.0}, {1, -8.0}, {2, 5.0}};
-        EXPECT_EQ((Numbers{-1.0, -10.0, 3.0}), offset(downwards, 0, -4.0, false, true));
-    }
-    { // Only the neighbours move, and of several at one place none that stands at u.
-        Curve curve{{0, 1.0}, {1, 9.0}, {2, 5.0}, {3, 0.0}};
-        EXPECT_EQ((Numbers{4.0, 9.0, 8.0, 0.0}), offset(curve, 1, 12.0, true, false));
-        Curve held{{0, 1.0}, {1, 7.0}, {2, 9.0}, {3, 0.0}};
-        EXPECT_EQ((Numbers{2.0, 7.0, 10.0, 0.0}), offset(held, 1, 10.0, true, true));
-        Curve before{{1, 9.0}, {2, 5.0}};
-        EXPECT_EQ((Numbers{10.0, 5.0}), offset(before, 0, 12.0, true, true));
-    }
-    { // A locked vertex stays.
-        Curve curve{{0, 1.0}, {1, 2.0}};
-        curve.at(0)->setFlag(kKFVertexFlagLocked);
-        EXPECT_EQ((Numbers{1.0, 5.0}), offset(curve, 1, 5.0, false, false));
+    for (auto const& row : rows) {
+        for (bool const locked : {false, true}) {
+            Curve curve;
+            Numbers positions;
+            for (double const value : row.values) {
+                positions.push_back(static_cast<double>(positions.size() + 1));
+                curve.append(seconds(static_cast<int>(positions.size())), value, 1);
+            }
+            Numbers expected = row.expected;
+            if (locked && !row.keepShape) {
+                curve.lock(0);
+                expected[0] = row.values[0];
+            }
+            curve->offsetSpline(seconds(row.u), row.offset, 10, -10, row.neighboursOnly, row.keepShape,
+                                kTempusZero);
+            SCOPED_TRACE(testing::Message() << "row " << &row - rows << ", locked " << locked);
+            curve.expect(positions, expected);
+        }
     }
 }
 
 TEST(KFSplineTransform, ScalesValuesAndTheEndsOfTangents) {
     Curve curve{{0, 1.0}, {1, -4.0}};
-    curve.at(0)->setInputTangents(-0.5, 0.25, kTempusZero);
-    curve.at(0)->setOutputTangents(0.5, 1.0, kTempusZero);
-    curve.spline.scaleSpline(2.0, 0.0, 3.0, kTempusZero);
-    EXPECT_EQ((Numbers{2.0, 0.0}), curve.values());
-    double u = 0.0;
-    double v = 0.0;
-    curve.at(0)->getInputTangents(&u, &v, kTempusZero);
-    EXPECT_EQ((std::pair{-0.5, 0.5}), (std::pair{u, v}));
-    curve.at(0)->getOutputTangents(&u, &v, kTempusZero);
-    EXPECT_EQ((std::pair{0.5, 1.0}), (std::pair{u, v})) << "its end stops at the limit";
+    curve.key(0)->setInputTangents(-0.5, 0.25, kTempusZero);
+    curve.key(0)->setOutputTangents(0.5, 1.0, kTempusZero);
+    curve->scaleSpline(2.0, 0.0, 3.0, kTempusZero);
+    curve.expect({0, 1}, {2.0, 0.0});
+    EXPECT_EQ((Sides{-0.5, 0.5, 0.5, 1.0}), sidesOf(curve.key(0)))
+        << "the end of the last stops at the limit";
 }
 
 TEST(KFSplineTransform, WarpsTheCurveWithItsTangents) {
@@ -129,174 +118,133 @@ TEST(KFSplineTransform, WarpsTheCurveWithItsTangents) {
         Curve curve;
         curve.fillWithBeziers(random, 5);
         Tempus const offset = TempusMake(7, 24);
-        curve.at(2)->setFlag(kKFVertexFlagLocked);
-        double const lockedAt = TempusGetSeconds(curve.at(2)->getValueU());
-
+        curve.lock(2);
         Curve warped;
-        warped.spline = curve.spline;
-        warped.spline.forceWarpSplineLinear(TempusMake(3, 2), offset);
-        EXPECT_TRUE(warped.at(2)->testFlag(kKFVertexFlagLocked));
+        *warped = *curve;
+        warped->forceWarpSplineLinear(TempusMake(3, 2), offset);
+        EXPECT_TRUE(warped.key(2)->testFlag(kKFVertexFlagLocked));
         warped.expectFindable();
         for (int i = -10; i < 200; ++i) {
             Tempus const u = TempusMake(i, 40);
-            EXPECT_NEAR(curve.value(u), warped.value(u * 1.5 + offset), 1e-6);
+            EXPECT_NEAR(curve.at(u), warped.at(u * 1.5 + offset), 1e-6);
         }
-        warped.spline = curve.spline;
-        warped.spline.warpSplineLinear(1.5, offset, kTempusZero);
-        EXPECT_EQ(lockedAt, TempusGetSeconds(warped.at(2)->getValueU()));
-        EXPECT_EQ(curve.at(1)->getValueU() * 1.5 + offset, warped.at(1)->getValueU());
+        *warped = *curve;
+        warped->warpSplineLinear(1.5, offset, kTempusZero);
+        EXPECT_EQ(curve.key(2)->getValueU(), warped.key(2)->getValueU());
+        EXPECT_EQ(curve.key(1)->getValueU() * 1.5 + offset, warped.key(1)->getValueU());
     }
 }
 
 TEST(KFSplineReverseVertices, MirrorsTheCurve) {
     std::mt19937 random(2);
     for (int round = 0; round < 200; ++round) {
-        Curve curve;
+        SCOPED_TRACE(round);
+        Curve curve, original;
         int const count = 2 + static_cast<int>(random() % 6);
         curve.fillWithBeziers(random, count);
-        Curve original;
-        original.spline = curve.spline;
+        *original = *curve;
         int const first = static_cast<int>(random() % static_cast<unsigned>(count));
         int const last = first + static_cast<int>(random() % static_cast<unsigned>(count - first));
-        Tempus const from = original.at(first)->getValueU();
-        Tempus const to = original.at(last)->getValueU();
-        curve.spline.reverseVertices(curve.at(first), curve.at(last));
+        Tempus const from = original.key(first)->getValueU();
+        Tempus const to = original.key(last)->getValueU();
+        curve->reverseVertices(curve.key(first), curve.key(last));
 
-        ASSERT_EQ(static_cast<std::size_t>(count), curve.spline.getNumberOfVertices());
-        EXPECT_EQ(from, curve.at(first)->getValueU());
-        EXPECT_EQ(to, curve.at(last)->getValueU());
+        ASSERT_EQ(static_cast<std::size_t>(count), curve->getNumberOfVertices());
+        EXPECT_EQ(from, curve.key(first)->getValueU());
+        EXPECT_EQ(to, curve.key(last)->getValueU());
         curve.expectFindable();
         for (int i = 0; i <= 100; ++i) {
             Tempus const u = from + (to - from) * TempusMake(i, 100);
             // Where a tangent was vertical the mirrored solution is rounded from the other side.
-            ASSERT_NEAR(original.value(u), curve.value(to - (u - from)), 1e-6) << "round " << round;
+            ASSERT_NEAR(original.at(u), curve.at(to - (u - from)), 1e-6);
         }
         // The segment that follows takes the type of the last.
-        EXPECT_EQ(original.at(last)->getInterpolation(), curve.at(last)->getInterpolation());
+        EXPECT_EQ(original.key(last)->getInterpolation(), curve.key(last)->getInterpolation());
         // An inner vertex has changed its two sides; what the first and last show outwards they keep.
-        auto const sidesOf = [](KFVertex* vertex) {
-            std::array<double, 4> sides{};
-            vertex->getInputTangents(&sides[0], &sides[1], kTempusZero);
-            vertex->getOutputTangents(&sides[2], &sides[3], kTempusZero);
-            return sides;
-        };
         for (int i = first; i <= last; ++i) {
-            std::array<double, 4> const old = sidesOf(original.at(i));
-            std::array<double, 4> expected{-old[2], old[3], -old[0], old[1]};
-            if (i == first) {
-                expected[2] = old[2];
-                expected[3] = old[3];
-            }
-            if (i == last) {
-                expected[0] = old[0];
-                expected[1] = old[1];
-            }
-            EXPECT_EQ(expected, sidesOf(curve.at(first + last - i)));
+            Sides const old = sidesOf(original.key(i));
+            Sides const expected{i == last ? old[0] : -old[2], i == last ? old[1] : old[3],
+                                 i == first ? old[2] : -old[0], i == first ? old[3] : old[1]};
+            EXPECT_EQ(expected, sidesOf(curve.key(first + last - i)));
         }
     }
 }
 
 TEST(KFSplineReverseVertices, KeepsWhatItMayNotTouch) {
-    { // A closed spline stays closed though all its vertices are exchanged.
-        Curve curve{{0, 1.0}, {1, 2.0}, {3, 5.0}};
-        curve.spline.setClosed(true, nullptr);
-        curve.spline.reverseVertices(curve.at(0), curve.at(2));
-        EXPECT_TRUE(curve.spline.isClosed());
-        EXPECT_EQ((Numbers{5.0, 2.0, 1.0}), curve.values());
-        EXPECT_EQ((Numbers{0.0, 2.0, 3.0}), curve.positions());
-        EXPECT_EQ(5.0, curve.value(seconds(0)));
-    }
-    { // A lock anywhere in the stretch, and a stretch that isn't one.
-        Curve curve{{0, 1.0}, {1, 2.0}, {3, 5.0}};
-        curve.at(1)->setFlag(kKFVertexFlagLocked);
-        int foreign = 0;
-        void* const handles[] = {curve.at(0), curve.at(2)};
-        curve.spline.reverseVertices(handles[0], handles[1]);
-        curve.spline.reverseVertices(handles[1], handles[0]);
-        curve.spline.reverseVertices(nullptr, handles[1]);
-        curve.spline.reverseVertices(handles[0], &foreign);
-        EXPECT_EQ((Numbers{1.0, 2.0, 5.0}), curve.values());
-        EXPECT_EQ(handles[0], curve.at(0)) << "the handles are still good";
-    }
+    Curve curve{{0, 1.0}, {1, 2.0}, {3, 5.0}};
+    curve->setClosed(true, nullptr);
+    curve->reverseVertices(curve.key(0), curve.key(2));
+    EXPECT_TRUE(curve->isClosed()) << "though all its vertices are exchanged";
+    curve.expect({0, 2, 3}, {5.0, 2.0, 1.0});
+    EXPECT_EQ(5.0, curve.at(seconds(0)));
+    // A lock anywhere in the stretch, and a stretch that isn't one; the handles are still good.
+    curve.lock(1);
+    int foreign = 0;
+    void* const handles[] = {curve.key(0), curve.key(2)};
+    curve->reverseVertices(handles[0], handles[1]);
+    curve->reverseVertices(handles[1], handles[0]);
+    curve->reverseVertices(nullptr, handles[1]);
+    curve->reverseVertices(handles[0], &foreign);
+    curve.expect({0, 2, 3}, {5.0, 2.0, 1.0});
+    EXPECT_EQ(handles[0], curve.key(0));
 }
 
 TEST(KFSplineTransform, CountsVerticesAsParameter) {
-    { // A time curve becomes a path from value 0, tangents in fractions of a segment.
-        Curve curve{{0, 5.0}, {2, 7.0}, {6, 4.0}};
-        curve.at(1)->setFlag(kKFVertexFlagLocked);
-        for (int i = 0; i < 3; ++i) {
-            std::uint32_t const flags = curve.at(i)->getFlags();
-            curve.at(i)->setFlags(0);
-            curve.at(i)->setInputTangents(-0.5, 0.25, kTempusZero);
-            curve.at(i)->setOutputTangents(0.5, 0.75, kTempusZero);
-            curve.at(i)->setFlags(flags);
-        }
-        curve.spline.parametrizeSpline();
-        EXPECT_EQ((Numbers{0.0, 7.0, -1.0}), curve.values()) << "a locked vertex keeps its value";
-        EXPECT_EQ((Numbers{0.0, 1.0, 2.0}), curve.positions()) << "but is counted";
-        EXPECT_TRUE(curve.at(1)->testFlag(kKFVertexFlagLocked));
-        curve.expectFindable();
-        double u = 0.0;
-        double v = 0.0;
-        curve.at(0)->getOutputTangents(&u, &v, kTempusZero);
-        EXPECT_EQ((std::pair{0.25, 0.75}), (std::pair{u, v}));
-        curve.at(2)->getInputTangents(&u, &v, kTempusZero);
-        EXPECT_EQ((std::pair{-0.125, 0.25}), (std::pair{u, v}));
-        curve.at(2)->getOutputTangents(&u, &v, kTempusZero);
-        EXPECT_EQ((std::pair{0.125, -0.25}), (std::pair{u, v}));
+    // A time curve becomes a path from value 0, tangents in fractions of a segment.
+    Curve curve{{0, 5.0}, {2, 7.0}, {6, 4.0}};
+    for (KFVertex* const vertex : museumVertices(*curve)) {
+        vertex->setInputTangents(-0.5, 0.25, kTempusZero);
+        vertex->setOutputTangents(0.5, 0.75, kTempusZero);
     }
-    Curve empty;
-    empty.spline.parametrizeSpline();
-    EXPECT_EQ(0u, empty.spline.getNumberOfVertices());
+    curve.lock(1);
+    curve->parametrizeSpline();
+    curve.expect({0, 1, 2}, {0.0, 7.0, -1.0}); // a locked vertex keeps its value but is counted
+    EXPECT_TRUE(curve.key(1)->testFlag(kKFVertexFlagLocked));
+    EXPECT_EQ((std::pair{0.25, 0.75}), (std::pair{sidesOf(curve.key(0))[2], sidesOf(curve.key(0))[3]}));
+    EXPECT_EQ((Sides{-0.125, 0.25, 0.125, -0.25}), sidesOf(curve.key(2)));
 }
 
 TEST(KFSplineTransform, OpensAtAVertex) {
     Curve curve{{0, 10.0}, {1, 11.0}, {2, 12.0}, {5, 15.0}};
-    curve.spline.setClosed(false, curve.at(2));
-    EXPECT_EQ((Numbers{10.0, 11.0, 12.0, 15.0}), curve.values()) << "it is open already";
-    curve.spline.setClosed(true, curve.at(2));
-    EXPECT_EQ((Numbers{0.0, 1.0, 2.0, 5.0}), curve.positions());
-    curve.spline.setClosed(false, curve.at(2));
-    EXPECT_FALSE(curve.spline.isClosed());
-    EXPECT_EQ((Numbers{12.0, 15.0, 10.0, 11.0}), curve.values());
-    EXPECT_EQ((Numbers{0.0, 1.0, 2.0, 3.0}), curve.positions());
-    EXPECT_EQ(12.5, curve.value(seconds(2)) + 2.5);
+    curve->setClosed(false, curve.key(2)); // it is open already
+    curve->setClosed(true, curve.key(2));
+    curve.expect({0, 1, 2, 5}, {10.0, 11.0, 12.0, 15.0});
+    curve->setClosed(false, curve.key(2));
+    EXPECT_FALSE(curve->isClosed());
+    curve.expect({0, 1, 2, 3}, {12.0, 15.0, 10.0, 11.0});
+    EXPECT_EQ(10.0, curve.at(seconds(2)));
     void* first = nullptr;
-    EXPECT_TRUE(curve.spline.getFirstValidVertex(&first, kTempusZero));
-    EXPECT_EQ(curve.at(0), first);
-    EXPECT_TRUE(curve.spline.isDirty());
+    EXPECT_TRUE(curve->getFirstValidVertex(&first, kTempusZero));
+    EXPECT_EQ(curve.key(0), first);
+    EXPECT_TRUE(curve->isDirty());
 }
 
 TEST(KFSplineTransform, PurgesAllButTheFirstAtAPlace) {
     Curve curve{{1, 1.0}, {1, 2.0}, {2, 3.0}, {2, 4.0}, {2, 5.0}, {3, 6.0}};
-    curve.at(4)->setFlag(kKFVertexFlagLocked);
-    curve.spline.purge();
-    EXPECT_EQ((Numbers{1.0, 3.0, 5.0, 6.0}), curve.values());
-    curve.at(2)->resetFlag(kKFVertexFlagLocked);
-    curve.spline.purge();
-    EXPECT_EQ((Numbers{1.0, 2.0, 3.0}), curve.positions());
-    Curve empty;
-    empty.spline.purge();
-    EXPECT_EQ(0u, empty.spline.getNumberOfVertices());
+    curve.lock(4);
+    curve->purge();
+    curve.expect({1, 2, 2, 3}, {1.0, 3.0, 5.0, 6.0});
+    curve.key(2)->resetFlag(kKFVertexFlagLocked);
+    curve->purge();
+    curve.expect({1, 2, 3}, {1.0, 3.0, 6.0});
 }
 
 TEST(KFSplineTransform, TakesSnapshotsOfValidVertices) {
     Curve source{{0, 1.0}, {1, 2.0}, {2, 3.0}};
-    source.spline.setClosed(true, nullptr);
-    source.at(0)->setInterpolation(4);
-    source.at(0)->setBias(0.5, kTempusZero);
-    source.at(0)->setFlag(kKFVertexFlagLocked);
-    source.spline.disableVertex(source.at(1), kTempusZero);
+    source->setClosed(true, nullptr);
+    source.key(0)->setInterpolation(4);
+    source.key(0)->setBias(0.5, kTempusZero);
+    source.lock(0);
+    source->disableVertex(source.key(1), kTempusZero);
     Curve curve{{7, 7.0}};
-    curve.at(0)->setFlag(kKFVertexFlagLocked);
-    curve.spline.generateSplineFromDynamicSpline(kTempusZero, &source.spline);
-    EXPECT_EQ((Numbers{1.0, 3.0}), curve.values());
-    EXPECT_TRUE(curve.spline.isClosed());
-    EXPECT_EQ(0u, curve.at(0)->getFlags());
-    EXPECT_EQ(4u, curve.at(0)->getInterpolation());
-    EXPECT_EQ(0.5, curve.at(0)->getBias(kTempusZero));
-    EXPECT_EQ(2u, curve.spline.getNumberOfValidVertices(kTempusZero));
-    EXPECT_EQ(3u, source.spline.getNumberOfVertices());
+    curve.lock(0);
+    curve->generateSplineFromDynamicSpline(kTempusZero, source.spline.get());
+    curve.expect({0, 2}, {1.0, 3.0});
+    EXPECT_TRUE(curve->isClosed());
+    EXPECT_EQ(0u, curve.key(0)->getFlags());
+    EXPECT_EQ(4u, curve.key(0)->getInterpolation());
+    EXPECT_EQ(0.5, curve.key(0)->getBias(kTempusZero));
+    EXPECT_EQ(3u, source->getNumberOfVertices());
 }
 
 } // namespace

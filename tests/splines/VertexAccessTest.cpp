@@ -25,7 +25,8 @@ protected:
     /// Linear, at whole seconds.
     void add(std::initializer_list<double> values) {
         for (double const value : values) {
-            keys.push_back(static_cast<KFVertex*>(curve->appendVertexNoTangents(s(static_cast<int>(keys.size())), value, kTempusZero)));
+            keys.push_back(static_cast<KFVertex*>(
+                curve->appendVertexNoTangents(s(static_cast<int>(keys.size())), value, kTempusZero)));
         }
     }
     std::uint32_t validCount() { return curve->getNumberOfValidVertices(kTempusZero); }
@@ -60,7 +61,8 @@ TEST_F(KFSplineAccessTest, AnswersForNullAndEmpty) {
     EXPECT_FALSE(curve->setVertexValue(nullptr, 1.0, kTempusZero));
     EXPECT_FALSE(curve->setVertexInterpolation(nullptr, 1));
     EXPECT_FALSE(curve->getVertexInterpolation(nullptr, &number, nullptr));
-    EXPECT_FALSE(curve->setVertexFlag(nullptr, 1) || curve->resetVertexFlag(nullptr, 1) || curve->setVertexFlags(nullptr, 1));
+    EXPECT_FALSE(curve->setVertexFlag(nullptr, 1) || curve->resetVertexFlag(nullptr, 1) ||
+                 curve->setVertexFlags(nullptr, 1));
     EXPECT_FALSE(curve->getVertexFlags(nullptr, &number));
     EXPECT_FALSE(curve->setVertexSpeed(nullptr, 1));
     EXPECT_FALSE(curve->getVertexSpeed(nullptr, &number));
@@ -163,10 +165,11 @@ TEST_F(KFSplineAccessTest, SpeedsStandForTypes) {
         double newBias;
     };
     // Linear becomes Ease at its neutral bias first; Decelerate turns the other way; level and last stay.
-    Nudge const nudges[] = {{0, 1, 0.4, 1.5, 15, 1.5},  {0, 15, 1.0, 1.5, 15, 0.5}, {0, 16, 1.0, -1.5, 16, 1.5},
-                            {0, 17, 1.0, 1.5, 17, 1.5}, {0, 15, 1.0, 9.0, 15, 0.0}, {0, 17, 1.0, 9.0, 17, 2.0},
-                            {1, 1, 0.4, 1.5, 1, 0.4},   {1, 15, 1.0, 1.5, 15, 0.5}, {2, 15, 1.0, 1.5, 15, 1.0},
-                            {0, 4, 1.0, 1.5, 4, 1.0}};
+    Nudge const nudges[] = {{0, 1, 0.4, 1.5, 15, 1.5},   {0, 15, 1.0, 1.5, 15, 0.5},
+                            {0, 16, 1.0, -1.5, 16, 1.5}, {0, 17, 1.0, 1.5, 17, 1.5},
+                            {0, 15, 1.0, 9.0, 15, 0.0},  {0, 17, 1.0, 9.0, 17, 2.0},
+                            {1, 1, 0.4, 1.5, 1, 0.4},    {1, 15, 1.0, 1.5, 15, 0.5},
+                            {2, 15, 1.0, 1.5, 15, 1.0},  {0, 4, 1.0, 1.5, 4, 1.0}};
     for (Nudge const& nudge : nudges) {
         KFVertex& vertex = *keys[nudge.key];
         vertex.setInterpolation(nudge.type);
@@ -260,7 +263,8 @@ public:
     bool isActive(KFSpline&, void* vA) override {
         return vA != nullptr && static_cast<KFVertex*>(vA)->getValueV(kTempusZero) == 10.0;
     }
-    double interpolate(KFSpline&, Tempus const&, void*, void*, Tempus const& u, bool, bool derivative) override {
+    double interpolate(KFSpline&, Tempus const&, void*, void*, Tempus const& u, bool,
+                       bool derivative) override {
         if (lock != nullptr && lock->tryLock()) {
             lock->unlock();
             drawnUnlocked = true;
@@ -362,25 +366,45 @@ TEST(KFSpline, KeepsTheSlotsOfItsOperations) {
     using T = Tempus const&;
     using Count = std::uint32_t&;
     std::size_t const order[] = {
-        slotOf(&S::getInterpolation), slotOf(&S::getAllVerticesHandles),
+        slotOf(&S::getInterpolation),
+        slotOf(&S::getAllVerticesHandles),
         slotOf(static_cast<bool (S::*)(void*, bool, T)>(&S::deleteVertex)),
         slotOf(static_cast<bool (S::*)(T, T, Count, Tempus*, double*, T, bool)>(&S::sampleSpline)),
-        slotOf(static_cast<bool (S::*)(T, T, Count, std::vector<Tempus>*, std::vector<double>*, T, bool)>(&S::sampleSpline)),
+        slotOf(static_cast<bool (S::*)(T, T, Count, std::vector<Tempus>*, std::vector<double>*, T, bool)>(
+            &S::sampleSpline)),
         slotOf(static_cast<bool (S::*)(T, T, Count, Tempus*, double*, T)>(&S::sampleSplineDerivatives)),
-        slotOf(static_cast<bool (S::*)(T, T, Count, std::vector<Tempus>*, std::vector<double>*, T)>(&S::sampleSplineDerivatives)),
-        slotOf(&S::sampleSplineSegment), slotOf(&S::sampleSplineSegments), slotOf(&S::enableVertex),
-        slotOf(&S::disableVertex), slotOf(&S::isEnabledVertex), slotOf(&S::setVertexInputHandles),
-        slotOf(&S::setVertexOutputHandles), slotOf(&S::getVertexInputHandles), slotOf(&S::getVertexOutputHandles),
-        slotOf(&S::flattenHandles), slotOf(&S::setVertexSmooth),
+        slotOf(static_cast<bool (S::*)(T, T, Count, std::vector<Tempus>*, std::vector<double>*, T)>(
+            &S::sampleSplineDerivatives)),
+        slotOf(&S::sampleSplineSegment),
+        slotOf(&S::sampleSplineSegments),
+        slotOf(&S::enableVertex),
+        slotOf(&S::disableVertex),
+        slotOf(&S::isEnabledVertex),
+        slotOf(&S::setVertexInputHandles),
+        slotOf(&S::setVertexOutputHandles),
+        slotOf(&S::getVertexInputHandles),
+        slotOf(&S::getVertexOutputHandles),
+        slotOf(&S::flattenHandles),
+        slotOf(&S::setVertexSmooth),
         slotOf(static_cast<bool (S::*)(void*, double, T)>(&S::setVertexNormal)),
         slotOf(static_cast<bool (S::*)(void*, double*, T)>(&S::getVertexNormal)),
         slotOf(static_cast<bool (S::*)(T, double, T)>(&S::setVertexNormal)),
-        slotOf(static_cast<bool (S::*)(T, double*, T)>(&S::getVertexNormal)), slotOf(&S::addVertex), slotOf(&S::setVertex),
-        slotOf(&S::setVertexValue), slotOf(&S::deriveVertex), slotOf(&S::getPointInputTangents),
-        slotOf(&S::getPointOutputTangents), slotOf(&S::getVertexValue), slotOf(&S::getDerivativeValue),
+        slotOf(static_cast<bool (S::*)(T, double*, T)>(&S::getVertexNormal)),
+        slotOf(&S::addVertex),
+        slotOf(&S::setVertex),
+        slotOf(&S::setVertexValue),
+        slotOf(&S::deriveVertex),
+        slotOf(&S::getPointInputTangents),
+        slotOf(&S::getPointOutputTangents),
+        slotOf(&S::getVertexValue),
+        slotOf(&S::getDerivativeValue),
         slotOf(static_cast<bool (S::*)(T, double*, T)>(&S::getVertex)),
-        slotOf(static_cast<bool (S::*)(void*, Tempus*, double*, T)>(&S::getVertex)), slotOf(&S::setVertexBiasLinear),
-        slotOf(&S::getVertexBiasLinear), slotOf(&S::setVertexBiasExp), slotOf(&S::getVertexBiasExp), slotOf(&S::deriveCurve)};
+        slotOf(static_cast<bool (S::*)(void*, Tempus*, double*, T)>(&S::getVertex)),
+        slotOf(&S::setVertexBiasLinear),
+        slotOf(&S::getVertexBiasLinear),
+        slotOf(&S::setVertexBiasExp),
+        slotOf(&S::getVertexBiasExp),
+        slotOf(&S::deriveCurve)};
     std::size_t slot = 2;
     for (std::size_t const actual : order) {
         EXPECT_EQ(actual, slot);

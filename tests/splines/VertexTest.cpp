@@ -81,8 +81,12 @@ public:
     void setValueV(double, Tempus const&) override {}
     double getBias(Tempus const& t) const override { return TempusGetSeconds(t) / 10.0; }
     void setBias(double, Tempus const&) override {}
-    void getInputTangents(double* u, double* v, Tempus const& t) const override { give(u, v, -1.0, TempusGetSeconds(t)); }
-    void getOutputTangents(double* u, double* v, Tempus const& t) const override { give(u, v, TempusGetSeconds(t), 1.0); }
+    void getInputTangents(double* u, double* v, Tempus const& t) const override {
+        give(u, v, -1.0, TempusGetSeconds(t));
+    }
+    void getOutputTangents(double* u, double* v, Tempus const& t) const override {
+        give(u, v, TempusGetSeconds(t), 1.0);
+    }
     void setInputTangents(double, double, Tempus const&) override {}
     void setOutputTangents(double, double, Tempus const&) override {}
     void flattenTangents(Tempus const&) override {}
@@ -129,7 +133,8 @@ TEST(KFStaticVertex, GuardsWhatALockedOrDisabledVertexKeeps) {
                 std::uint32_t const revision = vertex.getRevision();
                 setter.apply(vertex);
                 bool const writes = (!locked || setter.writesLocked) && (enabled || setter.writesDisabled);
-                EXPECT_EQ(vertex == before, !writes) << setter.name << ", locked " << locked << ", enabled " << enabled;
+                EXPECT_EQ(vertex == before, !writes)
+                    << setter.name << ", locked " << locked << ", enabled " << enabled;
                 bool const isRead = std::string(setter.name).find("Flag") == std::string::npos &&
                                     std::string(setter.name) != "setNormal";
                 if (writes && isRead) {
@@ -232,15 +237,38 @@ TEST(KFStaticVertex, IsCopiedWholeAndSnapshotInPart) {
 // Hosts derive from vertices: the slots of the virtual operations are the interface. Two belong to the destructor.
 TEST(KFVertex, KeepsTheSlotsOfItsOperations) {
     using V = KFVertex;
-    std::size_t const order[] = {
-        slotOf(&V::setValueU), slotOf(&V::getValueV), slotOf(&V::setValueV), slotOf(&V::getBias), slotOf(&V::setBias),
-        slotOf(&V::getInputTangents), slotOf(&V::getOutputTangents), slotOf(&V::setInputTangents),
-        slotOf(&V::setOutputTangents), slotOf(&V::flattenTangents), slotOf(&V::resetTangents), slotOf(&V::setNormal),
-        slotOf(&V::getNormal), slotOf(&V::swapTangents), slotOf(&V::setEnabled), slotOf(&V::isEnabled),
-        slotOf(&V::isFlat), slotOf(&V::setFlag), slotOf(&V::resetFlag), slotOf(&V::getFlags), slotOf(&V::setFlags),
-        slotOf(&V::testFlag), slotOf(&V::setDefaultAtCurrentTime), slotOf(&V::setInterpolation),
-        slotOf(&V::getInterpolation), slotOf(&V::clone), slotOf(&V::updateBias), slotOf(&V::enableBehavior),
-        slotOf(&V::enabledBehavior), slotOf(&V::offsetVertexInTime), slotOf(&V::isEqual), slotOf(&KFStaticVertex::getValue)};
+    std::size_t const order[] = {slotOf(&V::setValueU),
+                                 slotOf(&V::getValueV),
+                                 slotOf(&V::setValueV),
+                                 slotOf(&V::getBias),
+                                 slotOf(&V::setBias),
+                                 slotOf(&V::getInputTangents),
+                                 slotOf(&V::getOutputTangents),
+                                 slotOf(&V::setInputTangents),
+                                 slotOf(&V::setOutputTangents),
+                                 slotOf(&V::flattenTangents),
+                                 slotOf(&V::resetTangents),
+                                 slotOf(&V::setNormal),
+                                 slotOf(&V::getNormal),
+                                 slotOf(&V::swapTangents),
+                                 slotOf(&V::setEnabled),
+                                 slotOf(&V::isEnabled),
+                                 slotOf(&V::isFlat),
+                                 slotOf(&V::setFlag),
+                                 slotOf(&V::resetFlag),
+                                 slotOf(&V::getFlags),
+                                 slotOf(&V::setFlags),
+                                 slotOf(&V::testFlag),
+                                 slotOf(&V::setDefaultAtCurrentTime),
+                                 slotOf(&V::setInterpolation),
+                                 slotOf(&V::getInterpolation),
+                                 slotOf(&V::clone),
+                                 slotOf(&V::updateBias),
+                                 slotOf(&V::enableBehavior),
+                                 slotOf(&V::enabledBehavior),
+                                 slotOf(&V::offsetVertexInTime),
+                                 slotOf(&V::isEqual),
+                                 slotOf(&KFStaticVertex::getValue)};
     std::size_t slot = 2;
     for (std::size_t const actual : order) {
         EXPECT_EQ(actual, slot);

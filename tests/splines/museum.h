@@ -24,7 +24,9 @@ struct MuseumSpline {
 
     KFSpline* operator->() const { return spline.get(); }
     KFSpline& operator*() const { return *spline; }
-    double at(Tempus const& u, bool lock = true) const { return spline->getVertexValue(u, kTempusZero, lock); }
+    double at(Tempus const& u, bool lock = true) const {
+        return spline->getVertexValue(u, kTempusZero, lock);
+    }
     double slopeAt(Tempus const& u, bool lock = true) const {
         return spline->getDerivativeValue(u, kTempusZero, lock);
     }

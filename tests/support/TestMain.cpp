@@ -24,12 +24,13 @@ bool useLocaleWithDecimalComma() {
     return std::strcmp(std::localeconv()->decimal_point, ",") == 0;
 }
 
-}  // namespace
+} // namespace
 
 int main(int argc, char** argv) {
     ::testing::InitGoogleTest(&argc, argv);
     if (std::getenv("LUMENKEY_TEST_LOCALE") != nullptr && !useLocaleWithDecimalComma()) {
-        std::cerr << "LUMENKEY_TEST_LOCALE is set, but the environment gives no locale with a decimal comma\n";
+        std::cerr
+            << "LUMENKEY_TEST_LOCALE is set, but the environment gives no locale with a decimal comma\n";
         return EXIT_FAILURE;
     }
     return RUN_ALL_TESTS();

@@ -14,8 +14,8 @@ namespace lumenkey::tools {
 
 namespace {
 
-/// The environment of a child. The library that finds fonts keeps some of what it found until the process ends; where
-/// a leak checker is built into the program, it hears of that.
+/// The environment of a child. The library that finds fonts keeps some of what it found until the process
+/// ends; where a leak checker is built into the program, it hears of that.
 std::vector<std::string> environmentWith(std::string const& suppressions) {
     std::vector<std::string> variables;
     for (char** variable = environ; *variable != nullptr; ++variable) {

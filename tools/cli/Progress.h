@@ -7,7 +7,7 @@ namespace lumenkey::tools {
 
 enum class ProgressOf {
     Work,
-    /// Of writing results to standard output: no bar is drawn into results that go to the terminal themselves.
+    /// Of writing results to standard output: no bar is drawn into results that go to the terminal.
     Output,
 };
 

@@ -9,8 +9,8 @@
 
 namespace lumenkey::tools {
 
-/// A curve between two times as the engine draws it, in seconds and values: what lies between the keypoints, and
-/// the continuation on both sides.
+/// A curve between two times as the engine draws it, in seconds and values: what lies between the keypoints,
+/// and the continuation on both sides.
 struct CurvePicture {
     std::vector<PlotPoint> before;
     std::vector<PlotPoint> inside;
