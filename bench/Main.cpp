@@ -58,6 +58,7 @@ int main(int argc, char** argv) {
     registerEditing(bench);
     registerMemory(bench);
     registerThreads(bench);
+    registerTree(bench);
     registerGsl(bench);
     registerGStreamer(bench);
     registerMlt(bench);

@@ -28,7 +28,7 @@ BXSingleton* BXSingleton::detachNext() noexcept {
     std::lock_guard const guard(registryLock);
     BXSingleton** next = &newestSingleton;
     for (BXSingleton** link = next; *link != nullptr; link = &(*link)->_older) {
-        if ((*link)->_rank > (*next)->_rank) {
+        if ((*link)->_rank < (*next)->_rank) {
             next = link;
         }
     }

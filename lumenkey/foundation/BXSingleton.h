@@ -3,8 +3,8 @@
 #include "lumenkey/foundation/BXExport.h"
 
 /// Base of the objects that exist once in a process. Each is made on first use by `BXSingletonInstance` and
-/// destroyed at the end of the process. The rank orders that teardown only: a higher rank goes earlier, and among
-/// equal ranks the one made last. A singleton that others use in their destructors therefore has the lower rank.
+/// destroyed at the end of the process. The rank orders that teardown only: a lower rank goes earlier, and among
+/// equal ranks the one made last. A singleton that others use in their destructors therefore has the higher rank.
 ///
 /// Teardown runs on the thread that ends the process, as a handler registered with std::atexit when the first
 /// singleton is made; a singleton made by another's destructor is destroyed with the rest. Nobody may use one

@@ -16,7 +16,7 @@ public:
     ~Reporting() override { std::cerr << Name; }
 };
 
-/// Makes another singleton while it is destroyed, and one more of a higher rank.
+/// Makes another singleton while it is destroyed, and one more of a lower rank.
 class Late : public BXSingleton {
 public:
     Late() : BXSingleton(1) {}
@@ -46,7 +46,7 @@ public:
 } // namespace
 
 TEST(BXSingletonDeathTest, TearsDownByRank) {
-    EXPECT_EXIT(makeSeveralAndExit(), ::testing::ExitedWithCode(0), "^cbLxady$");
+    EXPECT_EXIT(makeSeveralAndExit(), ::testing::ExitedWithCode(0), "^daLycbx$");
 }
 
 TEST(BXSingleton, ThreadsShareOneInstance) {

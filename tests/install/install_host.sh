@@ -1,7 +1,7 @@
 #!/bin/sh
 # install_host.sh SOURCE_DIR BUILD_DIR SCRATCH CMAKE CXX VERSION ABI: installs into SCRATCH, compares the installed
-# files with installed_files.txt, and builds and runs the example host against the installed library, once found by
-# find_package and once by pkg-config.
+# files with installed_files.txt, builds and runs the example host against the installed library, once found by
+# find_package and once by pkg-config, and a plug-in with a program that loads it.
 set -eu
 source_dir=$1 build_dir=$2 scratch=$3 cmake=$4 cxx=$5 version=$6 abi=$7
 here=$source_dir/tests/install
@@ -33,15 +33,21 @@ fi
 
 "$cmake" -S "$here/host" -B "$scratch/by_cmake" -G Ninja -DCMAKE_BUILD_TYPE=Release \
     -DCMAKE_PREFIX_PATH="$prefix" -DCMAKE_CXX_COMPILER="$cxx" \
-    -DHOST_SOURCE="$source_dir/examples/spline_host.cpp" -DWANTED_VERSION="$version" >"$scratch/by_cmake.log"
+    -DHOST_SOURCE="$source_dir/examples/channel_host.cpp" -DWANTED_VERSION="$version" >"$scratch/by_cmake.log"
 "$cmake" --build "$scratch/by_cmake" >>"$scratch/by_cmake.log"
 "$scratch/by_cmake/host" >"$scratch/by_cmake.out"
+
+# A plug-in whose classes override the library's, in pinned slots.
+"$cmake" -S "$here/plugin" -B "$scratch/plugin" -G Ninja -DCMAKE_BUILD_TYPE=Release \
+    -DCMAKE_PREFIX_PATH="$prefix" -DCMAKE_CXX_COMPILER="$cxx" -DWANTED_VERSION="$version" >"$scratch/plugin.log"
+"$cmake" --build "$scratch/plugin" >>"$scratch/plugin.log"
+"$scratch/plugin/plugin_host" "$scratch/plugin/plugin.so" >>"$scratch/plugin.log" 2>&1
 
 export PKG_CONFIG_PATH="$prefix/$libdir/pkgconfig"
 [ "$(pkg-config --modversion lumenkey)" = "$version" ]
 # The flags are words to be split.
 # shellcheck disable=SC2046
-"$cxx" -std=c++20 -Wall -Wextra -Werror $(pkg-config --cflags lumenkey) "$source_dir/examples/spline_host.cpp" \
+"$cxx" -std=c++20 -Wall -Wextra -Werror $(pkg-config --cflags lumenkey) "$source_dir/examples/channel_host.cpp" \
     -o "$scratch/by_pkgconfig" $(pkg-config --libs lumenkey) -Wl,-rpath,"$prefix/$libdir"
 "$scratch/by_pkgconfig" >"$scratch/by_pkgconfig.out"
 

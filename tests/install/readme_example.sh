@@ -4,4 +4,4 @@ set -eu
 cd "$1"
 # The quotes hold a pattern, nothing to expand.
 # shellcheck disable=SC2016
-sed -n '/^```cpp$/,/^```$/p' README.md | sed '1d;$d' | diff -u - examples/spline_host.cpp
+sed -n '/^```cpp$/,/^```$/p' README.md | sed '1d;$d' | diff -u - examples/channel_host.cpp

@@ -1,0 +1,292 @@
+#pragma once
+
+#include "lumenkey/Channels/KFChannelBase.h"
+#include "lumenkey/curves/KFCurveOwner.h"
+
+#include <cmath>
+
+class KFChannelImpl;
+class KFChannelInfo;
+class KFCompoundChannel;
+class KFCurve;
+class KFCurveInterface;
+class KFCurveNode;
+struct KFFadeBlock;
+
+/// A node of the tree with a value over time.
+///
+/// The value lives in a curve, reached through a `KFChannelImpl`; what a slider shows lives in a `KFChannelInfo`.
+/// Both records are shared by all channels of a class until one of them differs: a channel gets a local copy at its
+/// first difference, and gives it up again when `resetToDefault` finds it back at the class's state. So a channel
+/// at its class's state is a few pointers, and owns no memory of its own but a long name.
+///
+/// Times are global unless an operation says curve time: `globalToLocalTime` converts, down to the nearest time
+/// converter or object root. Doubles are equal within 1e-7.
+///
+/// A locked channel (bit 2 of its own) ignores every form of setting, removing and moving values, `offsetChannel`,
+/// `scaleChannel`, the limits, and the switches of the curve's shape. It obeys `resetToDefault`, `setInitialValue`,
+/// `setDefaultValue`, the info setters, `copy` and `assign`.
+///
+/// Threads: reading values may run on any number of threads beside one that edits keypoints of a channel with a
+/// local record; what exchanges the record or the curve (the first difference, returning to the shared record,
+/// copies) must not run beside reads of that channel.
+class LUMENKEY_API KFChannel : public KFChannelBase, private KFCurveOwner {
+public:
+    /// Both records may be null only if the class's constructor then calls `usePrototypes`.
+    KFChannel(KFFactory* factory, BXString const& name, KFChannelFolder* parent, unsigned int id,
+              unsigned int flags, KFChannelImpl* impl, KFChannelInfo* info);
+    KFChannel(KFFactory* factory, BXString const& name, unsigned int id, KFChannelImpl* impl,
+              KFChannelInfo* info);
+    /// A blank base with the source's ID alone (no factory, no name, no parent); records as in the other form.
+    KFChannel(KFChannel const& other);
+    /// A copy of the base; shares shared records with the source and copies local ones.
+    KFChannel(KFChannel const& other, KFChannelFolder* parent);
+    /// `assign`, if `allowsAssignment` says yes.
+    KFChannel& operator=(KFChannel const& other);
+    ~KFChannel() override;
+
+    // Of KFChannelBase ------------------------------------------------------------------------------------------
+
+    char const* getFacadeWrapperName() override;
+    void lock(bool on, bool passDown) override;
+    void setDefaultToCurrentValue() override;
+    void copy(KFChannelBase const* other, bool silent) override;
+    /// Equal records; ID, name and flags don't count.
+    bool compare(KFChannelBase const* other) const override;
+    /// Null: each typed class has its own.
+    KFChannelBase* clone() const override;
+    void assign(KFChannelBase const* other) override;
+    /// False for what is no value channel, for this one, for one with keypoints if this takes none, and where the
+    /// other's present smallest or largest value, in this channel's unit, lies outside this curve's absolute limits.
+    /// A limit at or beyond the largest 32-bit float counts as none.
+    bool allowsAssignment(KFChannelBase const* other) override;
+    void resetToDefault(bool silent) override;
+    void lockFromParent(bool on, bool passDown) override;
+    /// Takes the whole curve of a value channel, in this channel's unit (where that has a scale) and within its
+    /// limits. Announces nothing.
+    void setValue(KFChannelBase const& other) override;
+    /// A change to what isn't both keyframable and a spline counts as one of state. A compound parent is announced
+    /// first.
+    void willBeModified(unsigned int kind) override;
+    void setIsSpline(bool on) override;
+    bool isSpline() const override;
+    bool isModified(bool skipHidden) const override;
+    void setKeyframable(bool on, bool force) override;
+    bool isKeyframable() const override;
+    bool hasKeypoints(unsigned int mask) const override;
+    bool hasMoreThanOneKeypoint() const override;
+    bool hasKeypointAt(Tempus const& t, unsigned int mask) const override;
+    bool allHaveKeypointsAt(Tempus const& t) const override;
+    unsigned int numberOfKeypointsAt(Tempus const& t) const override;
+    void addKeypointAt(Tempus const& t) override;
+    void deleteKeypointAt(Tempus const& t) override;
+    Tempus moveKeypointTo(Tempus const& from, Tempus const& to, bool a, bool b) override;
+    bool previousKeypoint(Tempus* t, unsigned int mask) const override;
+    bool nextKeypoint(Tempus* t, unsigned int mask) const override;
+    void retimeKeypoints(double factor, Tempus const& t) override;
+    void adjustToFrameDuration(Tempus const& frameDuration) override;
+    void setInterpolation(unsigned int type) override;
+    void setExtrapolation(unsigned int mode, unsigned int which) override;
+    /// In curve time; a linked compound's other components keep theirs.
+    void deleteKeypoints(Tempus const& from, Tempus const& to) override;
+    bool hasFadeHandles() const override;
+    void scaleFadeHandles(double factor) override;
+
+    // Slots behind those of KFChannelBase -----------------------------------------------------------------------
+
+    /// Announces this channel alone: what a compound calls on its children.
+    virtual void parentWillBeModified(unsigned int kind);
+    /// A linked compound parent takes the write over. Else announces (unless silent), keys the old value at the
+    /// start of the extent if the object root wants that, and sets the value on the curve: the constant, or, while
+    /// the curve is animated, a keypoint.
+    virtual void setValue(Tempus const& t, double value, bool silent);
+    /// So that the value behind the processing nodes becomes `value`.
+    virtual void setValueOffsetByBehaviors(Tempus const& t, double value);
+    virtual void setValueAndIgnoreRecordOption(Tempus const& t);
+    /// Keys the value that the curve has.
+    virtual void setValue(Tempus const& t);
+    /// False if there is no keypoint at `t`, and on a locked channel.
+    virtual bool removeValue(Tempus const& t, bool force);
+    virtual void removeAllValues(Tempus const& t, bool force);
+    virtual bool moveValue(Tempus const& from, Tempus const& to, bool force);
+    virtual void offsetChannel(Tempus const& t, double delta);
+    virtual void scaleChannel(double factor);
+    // Takes: false, with the outputs untouched, and nothing.
+    virtual bool isPlaying(unsigned int* scope, unsigned int* mode, Tempus* resolution);
+    virtual bool isRecording();
+    virtual void didRecordValue(Tempus const& t);
+    virtual double getSliderMax() const;
+    /// Start and end of the range in local time, and the duration of a frame. Outputs may be null.
+    virtual void getBakeParameters(BXTimeRange const& range, Tempus* start, Tempus* end, Tempus* frame) const;
+    /// The smallest and largest value between two curve times, in either order, without processing nodes and fades.
+    /// False, with nothing done, if both outputs are null. Keypoints and the ends count exactly; an extreme between
+    /// two neighbouring ones is looked for at 64 steps and then narrowed down.
+    virtual bool getCurrentMinAndMax(Tempus const& from, Tempus const& to, double* minimum, double* maximum);
+    virtual unsigned int getNumberOfKeyframes() const;
+    /// By handle, in curve time. False on a locked channel.
+    virtual bool moveKeyframe(void* handle, Tempus const& t, bool a, bool b);
+
+    // Reading ---------------------------------------------------------------------------------------------------
+
+    /// The value at global time `t`; `input` goes to the processing nodes. 0 without a curve. A channel without
+    /// keypoints and processing nodes answers its initial value without looking at the time.
+    double getValueAsDouble(Tempus const& t, double input) const;
+    /// Truncated toward zero; limited to the type's range, 0 for a not-a-number.
+    int getValueAsInt(Tempus const& t, double input) const;
+    unsigned int getValueAsUint(Tempus const& t, double input) const;
+    /// Empty here: for classes with a text value.
+    BXString getValueAsString(Tempus const& t, double input) const;
+    /// At curve time, with or without processing nodes; without fades.
+    double getCurveValue(Tempus const& t, bool withBehaviors) const;
+    /// At curve time, up to and including a processing node of this channel.
+    double getCurveValueForNode(Tempus const& t, void* node, double input) const;
+
+    // Initial, default and limits -------------------------------------------------------------------------------
+
+    double getInitialValue() const;
+    void setInitialValue(double value, bool silent);
+    double getDefaultValue() const;
+    /// On an initialized channel sets bit 32, so that the default is written to documents.
+    void setDefaultValue(double value);
+    void setDefaultAtCurrentTime(Tempus const& t);
+    void setValueAndDontAddFirstKeypoint(Tempus const& t, double value);
+    /// Absolute limits of the curve; the slider's range is pulled in where it reaches beyond.
+    void setMin(double value);
+    void setMax(double value);
+    double getMin() const;
+    double getMax() const;
+
+    bool canModifyChannelData() const noexcept { return !isLocked(false); }
+    bool isAnimated() const;
+
+    // Slider ----------------------------------------------------------------------------------------------------
+
+    double getSliderMin() const;
+    double getCoarseDelta() const;
+    double getFineDelta() const;
+    double getScale() const;
+    double getOffset() const;
+    BXString const& getSuffix() const;
+    char const* getSliderTransformerName() const;
+    // Each makes the info local if the value differs, as a copy of the class's. No lock, no announcement. A null
+    // suffix is the empty one, a null transformer name that of a new record.
+    void setSliderMax(double value);
+    void setSliderMin(double value);
+    void setCoarseDelta(double value);
+    void setFineDelta(double value);
+    void setScale(double value);
+    void setOffset(double value);
+    void setSuffix(BXString const& suffix);
+    void setSuffix(char const* suffix);
+    void setSliderTransformerName(char const* name);
+
+    // Records ---------------------------------------------------------------------------------------------------
+
+    KFChannelImpl const* getImpl() const noexcept { return _impl; }
+    KFChannelInfo const* getInfo() const noexcept { return _info; }
+    KFChannelImpl* createLocalChannelImplementation();
+    /// Returns to the class's record if nothing differs and nothing keeps the local one.
+    void resetLocalChannelImplementation();
+    KFChannelInfo* createLocalChannelInfo();
+    void resetLocalChannelInfo();
+    /// Makes the info local and assigns. Null does nothing.
+    void setInfo(KFChannelInfo const* source);
+    /// Takes the record: a shared one becomes the prototype too, a local one is owned. Null does nothing.
+    void replaceInfo(KFChannelInfo* info);
+
+    /// Null after `releaseCurveInterface`.
+    KFCurve* getCurveInterface() noexcept;
+    KFCurve const* getCurveInterface() const noexcept;
+    /// Takes the curve as this channel's prototype, and a clone of it as the curve in use. Refused, so that the caller
+    /// keeps it: null, what is no `KFCurve`, the curve in use, and every curve on a locked channel.
+    void setCurveInterface(KFCurveInterface* curve);
+    /// Gives the curve in use to the caller, without this channel as its owner; the channel must get another before it
+    /// is used again (until then it reads as 0 and as a constant). Null if locked.
+    KFCurveInterface* releaseCurveInterface();
+    /// A clone of the prototype becomes the curve in use, with this channel as its owner. Nothing without a prototype.
+    void installPrototypeCurveInterface();
+    /// The channel whose frame duration the curve uses; null for none. It isn't owned and must outlive the curve.
+    void setOwnerChannel(KFChannel* owner);
+
+    // Curve -----------------------------------------------------------------------------------------------------
+
+    bool isChannelAffectedByBehaviors(bool selectedOnly) const;
+    bool isChannelAffectedBySelectedBehaviors() const;
+    bool isRigged() const;
+    bool isParametric() const;
+    void setParametric(bool on);
+    bool isDiscrete() const;
+    /// With `inPlace` and a shared record the curve of the whole class is changed.
+    void setDiscrete(bool on, bool inPlace);
+    void setShouldCreateTangents(bool on);
+
+    /// The bulk path: `willLoadKeyframes(true, n)`, any number of `appendKeyframes` in ascending curve time, then
+    /// `willLoadKeyframes(false, 0)`. Ignored by a locked channel.
+    void willLoadKeyframes(bool loading, int count);
+    void appendKeyframes(unsigned int count, Tempus const* times, double const* values, bool unused);
+
+    // Processing nodes, in evaluation order. The curve owns them; a removed one goes back to the caller. A lock
+    // doesn't forbid them, and they aren't announced.
+    bool appendCurveProcessingNode(KFCurveNode* node);
+    bool insertCurveProcessingNode(KFCurveNode* node, KFCurveNode* after);
+    bool deleteCurveProcessingNode(KFCurveNode* node);
+    bool removeCurveProcessingNode(KFCurveNode* node);
+    std::vector<KFCurveNode*> enumerateCurveProcessingNodes() const;
+    unsigned int getNumberOfCurveProcessingNodes() const;
+
+    // Fades -----------------------------------------------------------------------------------------------------
+
+    Tempus getFadeInOffset() const;
+    Tempus getFadeOutOffset() const;
+    unsigned int getFadeInCurve() const;
+    unsigned int getFadeOutCurve() const;
+    /// With `limit` the two fades are kept from overlapping within the extent.
+    void setFadeInOffset(Tempus const& t, bool limit);
+    void setFadeOutOffset(Tempus const& t, bool limit);
+    void setFadeInCurve(unsigned int shape);
+    void setFadeOutCurve(unsigned int shape);
+    /// The factor at local time `t`; 1 without fades or without an object root.
+    double getFadeRatio(Tempus const& t) const;
+
+protected:
+    /// Takes the class's records where none were given to the constructor.
+    void usePrototypes(KFChannelImpl* impl, KFChannelInfo* info) noexcept;
+    KFChannelImpl* prototypeImpl() const noexcept { return _prototypeImpl; }
+    /// The parent, if it is a compound whose children are edited together.
+    KFCompoundChannel* linkedCompound() const;
+
+private:
+    /// Doubles that count as equal.
+    static bool isSame(double a, double b) noexcept { return a == b || std::fabs(a - b) < 1e-7; }
+
+    Tempus getFrameDurationForCurve() const override;
+    unsigned int kindAsAnnounced(unsigned int kind) const;
+    /// What turns the other's values into this channel's unit; 1 where the scales are the same or this has none.
+    double unitFactor(KFChannel const& other) const;
+    /// The curve in use, which must be there.
+    KFCurve& curve() const noexcept;
+    /// The same on a local record.
+    KFCurve& curveToWrite();
+    /// The checks and the announcement in front of an edit; false to stop.
+    bool beginEdit();
+    void* keypointAt(Tempus const& t) const;
+    /// Keys the old value at the start of the extent, if the root wants that: as the channel reads, or as the curve has
+    /// it.
+    void keyStartOfExtentIfWanted(KFChannelObjectRootBase& root, Tempus const& t, bool atCurveValue);
+    void noteRecordedValue(Tempus const& t);
+    KFFadeBlock& fadesToWrite();
+    bool beginFadeEdit(bool wantsBlock);
+
+    void takeImplOf(KFChannel const& other);
+    void takeInfoOf(KFChannel const& other);
+    void freeLocalImpl() noexcept;
+    void freeLocalInfo() noexcept;
+    void setInfoNumber(double KFChannelInfo::*field, double value);
+
+    // A local record is owned; a prototype is, where a local record was given to the constructor, the one in use.
+    KFChannelImpl* _impl;
+    KFChannelImpl* _prototypeImpl;
+    KFChannelInfo* _info;
+    KFChannelInfo* _prototypeInfo;
+    std::unique_ptr<KFCurve> _prototypeCurve;
+};

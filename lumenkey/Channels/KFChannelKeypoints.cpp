@@ -1,0 +1,140 @@
+// Keypoints: the family that takes global time, and what of the family in curve time the slots ask for.
+
+#include "lumenkey/Channels/KFChannel.h"
+#include "lumenkey/Channels/KFChannelImpl.h"
+#include "lumenkey/Channels/KFCompoundChannel.h"
+#include "lumenkey/curves/KFCurve.h"
+
+unsigned int KFChannel::getNumberOfKeyframes() const {
+    return _impl == nullptr || _impl->getCurve() == nullptr ? 0 : curve().getNumberOfKeypoints();
+}
+
+bool KFChannel::moveKeyframe(void* handle, Tempus const& t, bool a, bool b) {
+    return !isLocked(false) && curveToWrite().moveKeypoint(handle, t, a, b, false);
+}
+
+// --- Looking ---
+
+void* KFChannel::keypointAt(Tempus const& t) const {
+    void* handle = nullptr;
+    return curve().getKeypointHandle(globalToLocalTime(t), &handle) ? handle : nullptr;
+}
+
+bool KFChannel::hasKeypoints(unsigned int) const {
+    return _impl != nullptr && _impl->getCurve() != nullptr && curve().getNumberOfKeypoints() > 0;
+}
+
+bool KFChannel::hasMoreThanOneKeypoint() const { return curve().getNumberOfKeypoints() > 1; }
+bool KFChannel::hasKeypointAt(Tempus const& t, unsigned int) const { return keypointAt(t) != nullptr; }
+bool KFChannel::allHaveKeypointsAt(Tempus const& t) const { return keypointAt(t) != nullptr; }
+unsigned int KFChannel::numberOfKeypointsAt(Tempus const& t) const { return keypointAt(t) != nullptr; }
+
+bool KFChannel::previousKeypoint(Tempus* t, unsigned int) const {
+    Tempus found;
+    if (t == nullptr || !curve().getPreviousKeypoint(globalToLocalTime(*t), &found, nullptr))
+        return false;
+    *t = localToGlobalTime(found);
+    return true;
+}
+
+bool KFChannel::nextKeypoint(Tempus* t, unsigned int) const {
+    Tempus found;
+    if (t == nullptr || !curve().getNextKeypoint(globalToLocalTime(*t), &found, nullptr))
+        return false;
+    *t = localToGlobalTime(found);
+    return true;
+}
+
+// --- Editing ---
+
+void KFChannel::addKeypointAt(Tempus const& t) {
+    if (KFCompoundChannel* const compound = linkedCompound()) {
+        compound->compoundAddKeypointAt(this, t, false);
+        return;
+    }
+    if (!beginEdit())
+        return;
+    createLocalChannelImplementation();
+    if (!isSpline())
+        setIsSpline(true);
+    curveToWrite().setKeypoint(globalToLocalTime(t), true);
+}
+
+void KFChannel::deleteKeypointAt(Tempus const& t) {
+    if (KFCompoundChannel* const compound = linkedCompound()) {
+        compound->compoundDeleteKeypointAt(this, t, false);
+        return;
+    }
+    if (!beginEdit())
+        return;
+    KFCurve& written = curveToWrite();
+    if (void* const handle = keypointAt(t))
+        written.delKeypoint(handle, true);
+}
+
+Tempus KFChannel::moveKeypointTo(Tempus const& from, Tempus const& to, bool a, bool b) {
+    if (KFCompoundChannel* const compound = linkedCompound())
+        return compound->compoundMoveKeypointTo(this, from, to, a, b, false);
+    if (!beginEdit())
+        return from;
+    createLocalChannelImplementation();
+    if (!isSpline())
+        setIsSpline(true);
+    void* const handle = keypointAt(from);
+    if (handle == nullptr)
+        return to;
+    // The curve takes the two switches in the other order.
+    curve().moveKeypoint(handle, globalToLocalTime(to), true, b, a);
+    Tempus moved;
+    // A keypoint that was merged into another is gone; then it is the target that stands there.
+    return curve().getKeypoint(handle, &moved, nullptr) ? localToGlobalTime(moved) : to;
+}
+
+void KFChannel::deleteKeypoints(Tempus const& from, Tempus const& to) {
+    if (isLocked(false))
+        return;
+    createLocalChannelImplementation();
+    willBeModified(kModifyData);
+    curve().delKeypoints(from, to, true);
+}
+
+// --- The curve between and beyond ---
+
+void KFChannel::retimeKeypoints(double factor, Tempus const& t) {
+    if (!beginEdit())
+        return;
+    createLocalChannelImplementation();
+    if (!testFlag(kChannelFlagNotRetimed))
+        curve().warpCurveLinear(factor, t, true);
+}
+
+void KFChannel::adjustToFrameDuration(Tempus const& frameDuration) {
+    curveToWrite().forceRetimeCurve(frameDuration, kTempusZero);
+}
+
+void KFChannel::setInterpolation(unsigned int type) {
+    std::uint32_t present = 0;
+    if (isLocked(false) || (curve().getCurveInterpolation(&present) && present == type))
+        return;
+    willBeModified(kModifyData);
+    curveToWrite().setCurveInterpolation(type);
+}
+
+void KFChannel::setExtrapolation(unsigned int mode, unsigned int which) {
+    std::uint32_t present = 0;
+    if (isLocked(false) || (curve().getCurveExtrapolation(&present, which) && present == mode))
+        return;
+    willBeModified(kModifyData);
+    curveToWrite().setCurveExtrapolation(mode, which);
+}
+
+// --- Ranges ---
+
+void KFChannel::getBakeParameters(BXTimeRange const& range, Tempus* start, Tempus* end, Tempus* frame) const {
+    if (start != nullptr)
+        *start = globalToLocalTime(range.start);
+    if (end != nullptr)
+        *end = globalToLocalTime(TempusRangeGetEnd(range));
+    if (frame != nullptr)
+        *frame = getFrameDuration();
+}

@@ -1,0 +1,3 @@
+#include "lumenkey/curves/KFCurveInterface.h"
+
+KFCurveInterface::~KFCurveInterface() = default;

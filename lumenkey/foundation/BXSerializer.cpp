@@ -1,0 +1,5 @@
+#include "lumenkey/foundation/BXSerializer.h"
+
+BXSerializer::~BXSerializer() = default;
+
+bool BXSerializer::readSignificantWhiteSpace() { return false; }

@@ -1,0 +1,7 @@
+#include "lumenkey/foundation/BXSerializerStreams.h"
+
+BXSerializerWriteStream::~BXSerializerWriteStream() = default;
+
+bool BXSerializerWriteStream::isHashStream() const {
+    return false;
+}

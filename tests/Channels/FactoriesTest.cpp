@@ -1,0 +1,165 @@
+#include "lumenkey/Channels/KFChannelFactories.h"
+#include "lumenkey/Channels/KFChannelFactoryTable.h"
+#include "lumenkey/Channels/KFChannelFolder.h"
+#include "lumenkey/Channels/KFFactories.h"
+#include "lumenkey/Channels/KFScalarChannels.h"
+#include "lumenkey/foundation/BXSerializerStreams.h"
+
+#include <gtest/gtest.h>
+
+#include <memory>
+#include <set>
+#include <string>
+#include <thread>
+
+namespace {
+
+/// Writes what it is given as one line of text for each operation.
+class LoggingStream : public BXSerializerWriteStream {
+public:
+    std::string log;
+
+    void pushScope(BXScope const*) override { ++depth; }
+    void popScope() override { --depth; }
+    void startElement(std::uint32_t tag) override { log += "<" + std::to_string(tag); }
+    void endElement() override { log += ">"; }
+    void writeValue(bool) override {}
+    void writeValue(std::uint32_t) override {}
+    void writeValue(std::uint64_t) override {}
+    void writeValue(double value) override { log += "=" + std::to_string(static_cast<int>(value * 10)); }
+    void writeValue(BXString const& value) override { log += "=" + value.str(); }
+    void writeValue(BXUUID const&) override {}
+    void writeValue(Tempus const&) override {}
+    void writeAttribute(std::uint32_t, bool) override {}
+    void writeAttribute(std::uint32_t tag, std::uint32_t value) override {
+        log += " " + std::to_string(tag) + "=" + std::to_string(value);
+    }
+    void writeAttribute(std::uint32_t, std::uint64_t) override {}
+    void writeAttribute(std::uint32_t, double) override {}
+    void writeAttribute(std::uint32_t, BXString const&) override {}
+    void writeAttribute(std::uint32_t tag, BXUUID const& value) override {
+        log += " " + std::to_string(tag) + "=" + value.text().substr(0, 4);
+    }
+    void writeAttribute(std::uint32_t, Tempus const&) override {}
+    void endLine() override { log += "\n"; }
+
+    int depth = 0;
+};
+
+KFFactories& registry() {
+    return KFFactories::getInstance();
+}
+
+} // namespace
+
+TEST(KFFactories, EveryClassIsMadeByItsFactoryAndComesFromTheBase) {
+    BXUUID const base = KFChannelFactoryUUID("KFChannelBase");
+    std::set<BXUUID> seen;
+    for (KFChannelFactoryRow const& row : KFChannelFactoryTable()) {
+        EXPECT_TRUE(seen.insert(row.identity()).second) << row.className;
+        KFFactory* const found = registry().findFactory(row.identity());
+        if (row.getInstance == nullptr || !row.registered) {
+            EXPECT_EQ(found, nullptr) << row.className;
+            if (row.getInstance == nullptr) {
+                continue;
+            }
+        } else {
+            EXPECT_EQ(found, row.getInstance()) << row.className;
+        }
+        KFFactory& factory = *row.getInstance();
+        EXPECT_EQ(factory.uuid(), row.identity()) << row.className;
+        EXPECT_TRUE(factory.isKindOfClass(row.identity()));
+        EXPECT_TRUE(factory.isKindOfClass(base)) << row.className;
+        EXPECT_FALSE(factory.isKindOfClass(BXUUID()));
+
+        std::unique_ptr<KFFactoryBase> const made(factory.create("Name", 7));
+        if (row.className == "KFChannel") {
+            EXPECT_EQ(made, nullptr);
+            continue;
+        }
+        ASSERT_NE(made, nullptr) << row.className;
+        EXPECT_EQ(made->getFactory(), &factory);
+        EXPECT_EQ(made->getInstanceID(), 7U);
+        auto* const channel = dynamic_cast<KFChannelBase*>(made.get());
+        ASSERT_NE(channel, nullptr);
+        EXPECT_EQ(channel->getParent(), nullptr);
+        EXPECT_EQ(channel->getName(), "Name");
+        std::unique_ptr<KFFactoryBase> const copy(factory.createCopy(made.get(), 0));
+        ASSERT_NE(copy, nullptr);
+        EXPECT_EQ(copy->getFactory(), &factory);
+        EXPECT_EQ(typeid(*copy.get()), typeid(*made.get()));
+        std::unique_ptr<KFChannelBase> const clone(channel->clone());
+        ASSERT_NE(clone, nullptr) << row.className;
+        EXPECT_EQ(typeid(*clone.get()), typeid(*channel));
+    }
+}
+
+TEST(KFFactories, TheNearestCommonClass) {
+    KFChannelDouble a("a", nullptr, 1, 0);
+    KFChannelChrono b("b", nullptr, 2, 0);
+    KFChannelBool c("c", nullptr, 3, 0);
+    KFChannelFolder d("d", nullptr, 4, 0, 0);
+    KFFactories& factories = registry();
+    EXPECT_EQ(factories.findCommonFactory({}), nullptr);
+    EXPECT_EQ(factories.findCommonFactory({&a, &b}), getKFChannelDouble_FactoryBase());
+    EXPECT_EQ(factories.findCommonFactory({&b, &a}), getKFChannelDouble_FactoryBase());
+    EXPECT_EQ(factories.findCommonFactory({&a, &c}), getKFChannel_FactoryBase());
+    EXPECT_EQ(factories.findCommonFactory({&a, &d, &a}), getKFChannelBase_FactoryBase());
+    KFChannelBase stray(nullptr, "no factory", 5);
+    EXPECT_EQ(factories.findCommonFactory({&a, &stray, &a}), nullptr);
+}
+
+TEST(KFFactories, MarksBecomeNumbersInTheOrderOfUUIDs) {
+    KFFactory* const later = getKFChannelDouble_FactoryBase();  // FDC1...
+    KFFactory* const earlier = getKFChannelBool_FactoryBase(); // 0B00...
+    later->setNeedsSaving(true);
+    earlier->setNeedsSaving(true);
+    LoggingStream first;
+    registry().saveFactories(first);
+    EXPECT_EQ(first.log, "<92 111=1 117=0B00<93=Channel><95=Arbor><94=10>>\n"
+                         "<92 111=2 117=FDC1<93=Channel><95=Arbor><94=10>>\n\n");
+    EXPECT_EQ(first.depth, 0);
+    EXPECT_EQ(earlier->fileRefID(), 1U);
+    EXPECT_EQ(later->fileRefID(), 2U);
+    std::thread([&] { EXPECT_EQ(later->fileRefID(), 0U); }).join();
+
+    LoggingStream second;
+    registry().saveFactories(second);
+    EXPECT_EQ(second.log, "\n");
+    EXPECT_EQ(later->fileRefID(), 0U);
+}
+
+TEST(KFFactories, NumbersOfADocumentBelongToTheThreadThatReadsIt) {
+    KFFactories& factories = registry();
+    factories.setFactoryLoadID(3, getKFChannelBool_FactoryBase());
+    factories.setFactoryLoadID(3, getKFChannelDouble_FactoryBase());
+    EXPECT_EQ(factories.lookupFactory(3), getKFChannelDouble_FactoryBase());
+    EXPECT_EQ(factories.lookupFactory(4), nullptr);
+    std::thread([&] { EXPECT_EQ(factories.lookupFactory(3), nullptr); }).join();
+    factories.clearFactoryLoadIDs();
+    EXPECT_EQ(factories.lookupFactory(3), nullptr);
+}
+
+namespace {
+class HostFactory : public KFChannelFactory {
+public:
+    HostFactory() : KFChannelFactory({{1, 2, 3, 4}}, KFChannelFactoryUUID("KFChannelDouble"), 1) {}
+    BXString getIconNameInternal() const override { return "HostIcon"; }
+};
+class UntitledHostFactory : public KFChannelFactory {
+public:
+    UntitledHostFactory() : KFChannelFactory({{1, 2, 3, 5}}, {{1, 2, 3, 4}}, 1) {}
+};
+} // namespace
+
+TEST(KFFactories, AHostsClassFindsItsSuperclassOnceThatIsRegistered) {
+    static HostFactory host;
+    static UntitledHostFactory derived;
+    EXPECT_EQ(derived.getSuperFactory(), nullptr);
+    registry().addFactory(&host);
+    EXPECT_EQ(derived.getSuperFactory(), &host);
+    EXPECT_TRUE(derived.isKindOfClass(KFChannelFactoryUUID("KFChannel")));
+    EXPECT_EQ(derived.getIconName(), "HostIcon");
+    EXPECT_EQ(derived.getIconID(), KFFactory::kNoIconID);
+    EXPECT_EQ(derived.getLibraryIconName(), "");
+}

@@ -1,0 +1,24 @@
+// Replaces the program's `new` and `delete`. A source of its own: where the compiler sees them beside their
+// callers, it takes the block from std::malloc for one from another allocator.
+
+#include "tests/curves/CountedMemory.h"
+
+#include <cstdlib>
+#include <new>
+
+namespace {
+
+thread_local std::size_t allocations = 0;
+
+} // namespace
+
+std::size_t allocationsOfThisThread() noexcept { return allocations; }
+
+void* operator new(std::size_t size) {
+    ++allocations;
+    if (void* const block = std::malloc(size == 0 ? 1 : size))
+        return block;
+    throw std::bad_alloc();
+}
+void operator delete(void* block) noexcept { std::free(block); }
+void operator delete(void* block, std::size_t) noexcept { std::free(block); }

@@ -1,0 +1,139 @@
+// Classes of a host, derived from the installed ones. Each overrides operations from the beginning, the middle and
+// the end of its table, so that a slot that moves is noticed.
+
+#include "plugin.h"
+
+namespace {
+
+PluginJournal lastAsked = "";
+
+void note(char const* operation) { lastAsked = operation; }
+
+class HostRoot : public KFChannelObjectRootBase {
+public:
+    HostRoot() : KFChannelObjectRootBase("Host", nullptr, 1, 0, 0) {}
+
+    unsigned int getInstanceID() const override { return note("getInstanceID"), 1; }
+    void finishInitializing() override { note("finishInitializing"); }
+    void copy(KFChannelBase const*, bool) override { note("copy"); }
+    Tempus getTimeOffset() const override { return note("getTimeOffset"), TempusMake(1, 2); }
+    bool hasBeenModified(bool*) override { return note("hasBeenModified"), true; }
+    bool hasKeypoints(unsigned int) const override { return note("hasKeypoints"), false; }
+    bool shouldIgnoreDynamicIDs() const override { return note("shouldIgnoreDynamicIDs"), false; }
+    void resetTimeIndependentFlagIfNeeded(bool, bool) override { note("resetTimeIndependentFlagIfNeeded"); }
+    BXTimeRange getTimeExtent() const override { return note("getTimeExtent"), BXTimeRange{}; }
+    void willModifyChannel(KFChannelBase*, unsigned int) override { note("willModifyChannel"); }
+    bool checkSolo() override { return note("checkSolo"), false; }
+    Tempus getFrameDuration() const override { return note("getFrameDuration"), TempusMake(1, 25); }
+};
+
+class HostChannel : public KFChannelDouble {
+public:
+    HostChannel() : KFChannelDouble("Value", nullptr, 2, 0) {}
+
+    void willBeModified(unsigned int) override { note("willBeModified"); }
+    void parentWillBeModified(unsigned int) override { note("parentWillBeModified"); }
+    double getSliderMax() const override { return note("getSliderMax"), 7.0; }
+    unsigned int getNumberOfKeyframes() const override { return note("getNumberOfKeyframes"), 0; }
+    bool moveKeyframe(void*, Tempus const&, bool, bool) override { return note("moveKeyframe"), true; }
+};
+
+class HostNode : public KFCurveNode {
+public:
+    double solveNode(Tempus const&, double, double input) override { return note("solveNode"), 2 * input; }
+    void solveNode(KFCurveNodeParam& param) override {
+        for (std::uint32_t i = 0; i < param.outputCount; ++i) {
+            param.outputValues[i] = 2 * param.inputValues[i];
+        }
+    }
+    bool getUForValue(double, std::vector<Tempus>&, BXTimeRange&, Tempus&, std::uint32_t) override {
+        return note("getUForValue"), false;
+    }
+    void getNeededRange(KFCurveNodeParam* param) override { param->needSameRange(); }
+    KFCurveNode* cloneNode() const override { return new HostNode(*this); }
+    bool compare(KFCurveNode const*) const override { return note("compare"), false; }
+    bool isPointToPoint() const override { return note("isPointToPoint"), true; }
+    void reset() override { note("reset"); }
+};
+
+template <class Result, class... Arguments>
+void callAs(void* object, unsigned int slot, Arguments... arguments) {
+    using Operation = Result (*)(void*, Arguments...);
+    auto const* const table = *static_cast<Operation* const*>(object);
+    table[slot](object, arguments...);
+}
+
+Tempus const zero = kTempusZero;
+
+HostRoot root;
+HostChannel channel;
+HostNode node;
+
+PluginInterface makeInterface() {
+    PluginInterface made;
+    made.lastAsked = &lastAsked;
+    made.root = &root;
+    made.channel = &channel;
+    made.makeNode = [] { return static_cast<KFCurveNode*>(new HostNode()); };
+    auto const add = [&made](char const* name, unsigned int slot, void* object, void (*call)(void*, unsigned int)) {
+        made.slots.push_back({name, slot, object, call});
+    };
+    auto const onNothing = [](void* object, unsigned int slot) { callAs<void>(object, slot); };
+    auto const onPointers = [](void* object, unsigned int slot) {
+        callAs<bool, void*, void*>(object, slot, nullptr, nullptr);
+    };
+    auto const onKind = [](void* object, unsigned int slot) {
+        callAs<void, unsigned int>(object, slot, kModifyData);
+    };
+    auto const answersTime = [](void* object, unsigned int slot) {
+        // A result in memory: its address comes first.
+        Tempus result;
+        using Operation = Tempus* (*)(Tempus*, void*);
+        (*static_cast<Operation* const*>(object))[slot](&result, object);
+    };
+
+    // KFChannelBase, with the destructors as slots 0 and 1.
+    add("getInstanceID", 7, &root, onNothing);
+    add("finishInitializing", 10, &root, onNothing);
+    add("copy", 29, &root, onPointers);
+    add("getTimeOffset", 40, &root, answersTime);
+    add("willBeModified", 58, &channel, onKind);
+    add("hasBeenModified", 59, &root, onPointers);
+    add("hasKeypoints", 69, &root, onKind);
+    add("shouldIgnoreDynamicIDs", 87, &root, onNothing);
+    // KFChannelFolder and KFChannelObjectRootBase.
+    add("resetTimeIndependentFlagIfNeeded", 88, &root, onPointers);
+    add("getTimeExtent", 89, &root, [](void* object, unsigned int slot) {
+        BXTimeRange result;
+        using Operation = BXTimeRange* (*)(BXTimeRange*, void*);
+        (*static_cast<Operation* const*>(object))[slot](&result, object);
+    });
+    add("willModifyChannel", 97, &root, onPointers);
+    add("checkSolo", 99, &root, onNothing);
+    add("getFrameDuration", 110, &root, answersTime);
+    // KFChannel.
+    add("parentWillBeModified", 88, &channel, onKind);
+    add("getSliderMax", 101, &channel, onNothing);
+    add("getNumberOfKeyframes", 104, &channel, onNothing);
+    add("moveKeyframe", 105, &channel, [](void* object, unsigned int slot) {
+        callAs<bool, void*, Tempus const*, bool, bool>(object, slot, nullptr, &zero, false, false);
+    });
+    // KFCurveNode.
+    add("solveNode", 2, &node, [](void* object, unsigned int slot) {
+        callAs<double, Tempus const*, double, double>(object, slot, &zero, 0.0, 1.0);
+    });
+    add("getUForValue", 4, &node, [](void* object, unsigned int slot) {
+        callAs<bool, double, void*, void*, void*, std::uint32_t>(object, slot, 0.0, nullptr, nullptr, nullptr, 0);
+    });
+    add("compare", 17, &node, onPointers);
+    add("isPointToPoint", 22, &node, onNothing);
+    add("reset", 25, &node, onNothing);
+    return made;
+}
+
+} // namespace
+
+extern "C" __attribute__((visibility("default"))) PluginInterface const* lumenkeyPluginSlots() {
+    static PluginInterface const made = makeInterface();
+    return &made;
+}
