@@ -13,6 +13,7 @@ using TempusDetail::fromScaledQuotient;
 using TempusDetail::infinityOfSign;
 using TempusDetail::magnitude;
 using TempusDetail::ResultTraits;
+using TempusDetail::toDouble;
 using TempusDetail::toDyadic;
 using TempusDetail::UWide;
 using TempusDetail::Wide;
@@ -149,7 +150,7 @@ Wide floorDivide(Wide n, Wide d) noexcept {
 double TempusDetail::seconds(Tempus const& t) noexcept {
     switch (TempusGetKind(t)) {
     case TempusKind::Number:
-        return static_cast<double>(static_cast<long double>(t.value) / static_cast<long double>(t.timescale));
+        return toDouble(t.value < 0, magnitude(t.value), static_cast<UWide>(t.timescale));
     case TempusKind::NegativeInfinity:
         return -std::numeric_limits<double>::infinity();
     case TempusKind::PositiveInfinity:
@@ -167,11 +168,40 @@ double TempusDetail::ratio(Tempus const& a, Tempus const& b) noexcept {
     bool const sameTimescale = a.timescale == b.timescale;
     Wide const n = sameTimescale ? Wide{a.value} : Wide{a.value} * b.timescale;
     Wide const d = sameTimescale ? Wide{b.value} : Wide{b.value} * a.timescale;
-    constexpr UWide exact = UWide{1} << 53;
-    if (magnitude(n) <= exact && magnitude(d) <= exact) {
-        return static_cast<double>(n) / static_cast<double>(d);
+    return toDouble((n < 0) != (d < 0), magnitude(n), magnitude(d));
+}
+
+double TempusSecondsBetween(Tempus const& from, Tempus const& to) noexcept {
+    int64_t epoch = 0;
+    if (!TempusIsNumeric(from) || !TempusIsNumeric(to) || !subtractEpochs(to, from, epoch)) {
+        return TempusGetSeconds(BX_TempusSaferSubtract(to, from));
     }
-    return static_cast<double>(static_cast<long double>(n) / static_cast<long double>(d));
+    bool const sameTimescale = from.timescale == to.timescale;
+    Wide const n = sameTimescale ? Wide{to.value} - from.value
+                                 : Wide{to.value} * from.timescale - Wide{from.value} * to.timescale;
+    Wide const d = sameTimescale ? Wide{from.timescale} : Wide{from.timescale} * to.timescale;
+    return toDouble(n < 0, magnitude(n), static_cast<UWide>(d));
+}
+
+double TempusDetail::fraction(Tempus const& u, Tempus const& from, Tempus const& to) noexcept {
+    bool const numbers = TempusIsNumeric(u) && TempusIsNumeric(from) && TempusIsNumeric(to) &&
+                         u.epoch == from.epoch && to.epoch == from.epoch;
+    if (!numbers || TempusCompare(from, to) == 0) {
+        return TempusRatio(BX_TempusSaferSubtract(u, from), BX_TempusSaferSubtract(to, from));
+    }
+    // Both differences times the timescales that they don't share: below 2^126 at most.
+    Wide part = u.timescale == from.timescale
+                    ? Wide{u.value} - from.value
+                    : Wide{u.value} * from.timescale - Wide{from.value} * u.timescale;
+    Wide whole = to.timescale == from.timescale
+                     ? Wide{to.value} - from.value
+                     : Wide{to.value} * from.timescale - Wide{from.value} * to.timescale;
+    if (u.timescale != to.timescale) {
+        part *= to.timescale != from.timescale ? to.timescale : 1;
+        whole *= u.timescale != from.timescale ? u.timescale : 1;
+    }
+    bool const negative = part != 0 && (part < 0) != (whole < 0);
+    return toDouble(negative, magnitude(part), magnitude(whole));
 }
 
 Tempus KFChronoForChannelSeconds(double seconds, uint32_t timescale) noexcept {

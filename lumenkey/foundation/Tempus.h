@@ -94,6 +94,7 @@ LUMENKEY_API Tempus add(Tempus const& a, Tempus const& b) noexcept;
 LUMENKEY_API Tempus subtract(Tempus const& a, Tempus const& b) noexcept;
 LUMENKEY_API double ratio(Tempus const& a, Tempus const& b) noexcept;
 LUMENKEY_API double seconds(Tempus const& t) noexcept;
+LUMENKEY_API double fraction(Tempus const& u, Tempus const& from, Tempus const& to) noexcept;
 } // namespace TempusDetail
 
 // Order ------------------------------------------------------------------------------------------------------
@@ -131,8 +132,7 @@ inline Tempus TempusMaximum(Tempus const& a, Tempus const& b) noexcept { return 
 
 // Doubles ----------------------------------------------------------------------------------------------------
 
-/// The seconds, correctly rounded while |value| < 2^53 and within 1 ulp beyond; infinities as such, NaN for
-/// indefinite and invalid times. The epoch is left out.
+/// The seconds, correctly rounded; infinities as such, NaN for indefinite and invalid times. The epoch is left out.
 inline double TempusGetSeconds(Tempus const& t) noexcept {
     constexpr int64_t limit = int64_t{1} << 53;
     if (TempusIsNumeric(t) && t.value < limit && t.value > -limit) {
@@ -141,9 +141,8 @@ inline double TempusGetSeconds(Tempus const& t) noexcept {
     return TempusDetail::seconds(t);
 }
 
-/// a / b as a double, straight from the exact cross products: within 1 ulp, without the rounded rational that
-/// `TempusGetSeconds(a / b)` goes through. The kinds follow the table of `operator/` (NaN where that gives
-/// indefinite or invalid).
+/// a / b as a double, correctly rounded, without the rounded rational that `TempusGetSeconds(a / b)` goes through.
+/// The kinds follow the table of `operator/` (NaN where that gives indefinite or invalid).
 inline double TempusRatio(Tempus const& a, Tempus const& b) noexcept {
     constexpr int64_t limit = int64_t{1} << 53;
     if (TempusDetail::haveCommonTimescale(a, b) && b.value != 0 && a.value < limit && a.value > -limit &&
@@ -151,6 +150,25 @@ inline double TempusRatio(Tempus const& a, Tempus const& b) noexcept {
         return static_cast<double>(a.value) / static_cast<double>(b.value);
     }
     return TempusDetail::ratio(a, b);
+}
+
+/// `TempusGetSeconds(to - from)`, but of the exact difference, which may have no Tempus: rounded once.
+LUMENKEY_API double TempusSecondsBetween(Tempus const& from, Tempus const& to) noexcept;
+
+/// `TempusRatio(u - from, to - from)`, but of the exact differences: the part of the way between two times that lies
+/// before `u`, correctly rounded whatever the timescales. So whole numbers of a common timescale, where they are
+/// exact as doubles, give the same bits when they are subtracted and divided.
+inline double TempusFraction(Tempus const& u, Tempus const& from, Tempus const& to) noexcept {
+    constexpr int64_t limit = int64_t{1} << 53;
+    int64_t part = 0;
+    int64_t whole = 0;
+    if (TempusDetail::haveCommonTimescale(u, from) && TempusDetail::haveCommonTimescale(to, from) &&
+        !__builtin_sub_overflow(u.value, from.value, &part) &&
+        !__builtin_sub_overflow(to.value, from.value, &whole) && whole > 0 && whole < limit && part < limit &&
+        part > -limit) {
+        return static_cast<double>(part) / static_cast<double>(whole);
+    }
+    return TempusDetail::fraction(u, from, to);
 }
 
 /// The time nearest to `seconds` at `timescale`, ties to even, with the has-been-rounded flag unless it is exact.

@@ -196,6 +196,36 @@ Tempus fromScaledQuotient(bool negative, UWide numerator, UWide denominator, int
     return fromTinyQuotient(negative, numerator, denominator, -exponent, traits);
 }
 
+double toDouble(bool negative, UWide numerator, UWide denominator) noexcept {
+    constexpr UWide exact = UWide{1} << 53;
+    if (numerator <= exact && denominator <= exact) {
+        double const quotient = static_cast<double>(numerator) / static_cast<double>(denominator);
+        return negative ? -quotient : quotient;
+    }
+    // Quotient bits until there are more than the 54 that decide how to round; one bit more stands for all below.
+    constexpr int enough = 55;
+    int exponent = std::min(bitWidth(numerator) - bitWidth(denominator), 0);
+    UWide rest = numerator << -exponent;
+    UWide quotient = rest / denominator;
+    rest %= denominator;
+    while (rest != 0 && bitWidth(quotient) < enough) {
+        int const bits = std::min(128 - bitWidth(denominator), enough - bitWidth(quotient));
+        rest <<= bits;
+        quotient = (quotient << bits) | (rest / denominator);
+        rest %= denominator;
+        exponent -= bits;
+    }
+    UWide lost = rest;
+    if (int const surplus = bitWidth(quotient) - 62; surplus > 0) {
+        lost |= quotient & ((UWide{1} << surplus) - 1);
+        quotient >>= surplus;
+        exponent += surplus;
+    }
+    auto const rounded =
+        static_cast<double>(static_cast<uint64_t>(quotient * 2 + static_cast<UWide>(lost != 0)));
+    return std::ldexp(negative ? -rounded : rounded, exponent - 1);
+}
+
 Dyadic toDyadic(double x) noexcept {
     if (x == 0.0) {
         return {};

@@ -33,6 +33,10 @@ Tempus fromQuotient(bool negative, UWide numerator, UWide denominator, ResultTra
 Tempus fromScaledQuotient(bool negative, UWide numerator, UWide denominator, int exponent,
                           ResultTraits const& traits) noexcept;
 
+/// +-numerator / denominator as the nearest double, ties to even; of 0 the zero of the sign. For a numerator below 2^127
+/// and a denominator from 1 to below 2^127.
+double toDouble(bool negative, UWide numerator, UWide denominator) noexcept;
+
 /// A finite double as +-mantissa * 2^exponent with an odd mantissa below 2^53, or 0.
 struct Dyadic {
     bool negative = false;

@@ -60,14 +60,15 @@ void KFBSplineInterpolator::generateOpenKnotVector(std::uint32_t count) {
     }
 }
 
-/// Reads the control points that `generateRationalBasisFunctions` is to weigh.
-void KFBSplineInterpolator::fillTempArrays(std::vector<KFVertex*> const& vertices, Tempus const& t) {
-    for (std::size_t i = 0; i < _values.size(); ++i) {
-        std::size_t const controlPoint = _firstControlPoint + i;
+/// Reads `count` control points from the first on.
+void KFBSplineInterpolator::fillTempArrays(std::vector<KFVertex*> const& vertices, Tempus const& t,
+                                           std::uint32_t first, std::uint32_t count) {
+    _values.resize(_controlPointCount);
+    _weights.resize(_controlPointCount);
+    for (std::size_t i = first; i < std::size_t{first} + count; ++i) {
         // On a closed spline the last vertex stands in front of the first too, and the first two behind the
         // last.
-        std::size_t const index =
-            _closed ? (controlPoint + vertices.size() - 1) % vertices.size() : controlPoint;
+        std::size_t const index = _closed ? (i + vertices.size() - 1) % vertices.size() : i;
         _values[i] = vertices[index]->getValueV(t);
         _weights[i] = weightOfBias(vertices[index]->getBias(t));
     }
@@ -125,29 +126,33 @@ void KFBSplineInterpolator::generateRationalBasisFunctions(double x) {
 double KFBSplineInterpolator::evalBSplineNURB(std::vector<KFVertex*> const& vertices, Tempus const& t,
                                               double x) {
     generateRationalBasisFunctions(x);
-    _values.resize(_basis.size());
-    _weights.resize(_basis.size());
-    fillTempArrays(vertices, t);
+    fillTempArrays(vertices, t, _firstControlPoint, _order);
+    double const* const values = &_values[_firstControlPoint];
+    double const* const weights = &_weights[_firstControlPoint];
 
     double sum = 0.0;
     for (std::size_t i = 0; i < _basis.size(); ++i) {
-        sum += _basis[i] * _weights[i];
+        sum += _basis[i] * weights[i];
     }
     double value = 0.0;
     for (std::size_t i = 0; i < _basis.size(); ++i) {
-        _basis[i] = std::fabs(sum) < kNegligible ? 0.0 : _basis[i] * _weights[i] / sum;
-        value += _values[i] * _basis[i];
+        _basis[i] = std::fabs(sum) < kNegligible ? 0.0 : _basis[i] * weights[i] / sum;
+        value += values[i] * _basis[i];
     }
     return value;
 }
 
 double KFBSplineInterpolator::valueAt(KFSpline& spline, Tempus const& t, Tempus const& u) {
-    std::vector<KFVertex*> const& vertices = _controlVertices.of(spline, t);
+    bool listedAnew = false;
+    std::vector<KFVertex*> const& vertices = _controlVertices.of(spline, t, &listedAnew);
     // The flag of the spline may have been cleared on behalf of another strategy.
     if (vertices.size() != _vertexCount || spline.isClosed() != _closed) {
         generateKnotVector(static_cast<std::uint32_t>(vertices.size()), spline.isClosed());
     }
     spline.setDirty(false);
+    if (listedAnew || _values.size() != _controlPointCount) {
+        fillTempArrays(vertices, t, 0, vertices.empty() ? 0 : _controlPointCount);
+    }
     if (vertices.empty()) {
         return 0.0;
     }
@@ -194,8 +199,20 @@ Tempus KFBSplineInterpolator::getAdjustedMaxU(KFSpline& spline, Tempus const& t,
     return KFChronoForChannelSeconds(end, kKFChannelTimescale);
 }
 
+double KFBSplineInterpolator::basisOf(std::uint32_t controlPoint) const noexcept {
+    std::size_t const place = std::size_t{controlPoint} - _firstControlPoint;
+    return controlPoint >= _firstControlPoint && place < _basis.size() ? _basis[place] : 0.0;
+}
+
 bool KFBSplineInterpolator::operator==(KFBSplineInterpolator const& other) const {
-    return _order == other._order && _controlPointCount == other._controlPointCount &&
-           _firstControlPoint == other._firstControlPoint && _knots == other._knots &&
-           _basis == other._basis && _weights == other._weights && _values == other._values;
+    if (_order != other._order || _controlPointCount != other._controlPointCount || _knots != other._knots ||
+        _weights != other._weights || _values != other._values) {
+        return false;
+    }
+    for (std::uint32_t i = 0; i < _controlPointCount; ++i) {
+        if (basisOf(i) != other.basisOf(i)) {
+            return false;
+        }
+    }
+    return true;
 }

@@ -29,7 +29,9 @@ public:
     Tempus getAdjustedMinU(KFSpline& spline, Tempus const& t, Tempus const& u) override;
     bool needInit(KFSpline& spline) override;
 
-    /// The same knots, and the last evaluation was at the same control points with the same result for each.
+    /// The same knots, the same values and weights of all control points, and the same basis at the position evaluated
+    /// last, exactly. Values and weights are those that the last evaluation knew: a vertex that was written past its
+    /// spline counts with what it had when the vertices were listed or when it last weighed in an evaluation.
     bool operator==(KFBSplineInterpolator const& other) const;
 
     /// The bias that gives a weight.
@@ -39,8 +41,10 @@ private:
     void generateKnotVector(std::uint32_t vertexCount, bool closed);
     void generatePeriodicKnotVector(std::uint32_t count);
     void generateOpenKnotVector(std::uint32_t count);
-    void fillTempArrays(std::vector<KFVertex*> const& vertices, Tempus const& t);
+    void fillTempArrays(std::vector<KFVertex*> const& vertices, Tempus const& t, std::uint32_t first,
+                        std::uint32_t count);
     void generateRationalBasisFunctions(double x);
+    double basisOf(std::uint32_t controlPoint) const noexcept;
     double evalBSplineNURB(std::vector<KFVertex*> const& vertices, Tempus const& t, double x);
     double valueAt(KFSpline& spline, Tempus const& t, Tempus const& u);
 
@@ -48,13 +52,15 @@ private:
     std::uint32_t _vertexCount = 0;
     bool _closed = false;
 
-    // Of the last position evaluated: the control points that weigh there, at most `_order` from the first
-    // on.
-    std::uint32_t _firstControlPoint = 0;
+    /// One entry for each control point. All are read when the vertices are listed, which takes as long anyway, and
+    /// those that weigh at each evaluation.
     std::vector<double> _values;
     std::vector<double> _weights;
     std::vector<double> _knots;
+    /// Of the last position evaluated: the share of each control point that weighs there, at most `_order` from this
+    /// first one on.
     std::vector<double> _basis;
+    std::uint32_t _firstControlPoint = 0;
     std::uint32_t _controlPointCount = 0;
     std::uint32_t _order = 4;
 };

@@ -129,7 +129,7 @@ double KFLinearInterpolator::interpolate(KFSpline& spline, Tempus const& t, void
     }
     double const b = valueOf(vB, t);
     if (derivative) {
-        return (b - a) / TempusGetSeconds(segment.duration());
+        return (b - a) / segment.seconds();
     }
     if (_easing != kKFInterpolationLinear) {
         double const q = easedFraction(_easing, vA, segment, u);

@@ -10,9 +10,13 @@ KFControlVertices& KFControlVertices::operator=(KFControlVertices const&) noexce
     return *this;
 }
 
-std::vector<KFVertex*> const& KFControlVertices::of(KFSpline& spline, Tempus const& t) {
+std::vector<KFVertex*> const& KFControlVertices::of(KFSpline& spline, Tempus const& t, bool* listedAnew) {
     std::uint64_t const version = spline.store().version();
-    if (_spline == &spline && _version == version && spline._useValidList) {
+    bool const stands = _spline == &spline && _version == version && spline._useValidList;
+    if (listedAnew != nullptr) {
+        *listedAnew = !stands;
+    }
+    if (stands) {
         return _vertices;
     }
     _vertices.clear();

@@ -21,8 +21,8 @@ public:
     KFControlVertices(KFControlVertices const&) noexcept {}
     KFControlVertices& operator=(KFControlVertices const&) noexcept;
 
-    /// The vertices valid at `t`. Good until the next call.
-    std::vector<KFVertex*> const& of(KFSpline& spline, Tempus const& t);
+    /// The vertices valid at `t`. Good until the next call. `listedAnew`, if given, tells whether this call listed them.
+    std::vector<KFVertex*> const& of(KFSpline& spline, Tempus const& t, bool* listedAnew = nullptr);
 
 private:
     std::vector<KFVertex*> _vertices;

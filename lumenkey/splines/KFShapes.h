@@ -17,14 +17,13 @@ struct KFSegmentSpan {
     Tempus duration() const noexcept { return BX_TempusSaferSubtract(u2, u1); }
     /// No fraction may be asked of an empty segment.
     bool isEmpty() const noexcept { return TempusCompare(u1, u2) == 0; }
+    double seconds() const noexcept { return TempusSecondsBetween(u1, u2); }
     /// The fraction of the segment that lies before `u`, and the one that lies behind it. Each is rounded by
-    /// itself, so that the two are exact at both ends.
-    double fraction(Tempus const& u) const noexcept {
-        return TempusRatio(BX_TempusSaferSubtract(u, u1), duration());
-    }
-    double complement(Tempus const& u) const noexcept {
-        return TempusRatio(BX_TempusSaferSubtract(u2, u), duration());
-    }
+    /// itself, once, so that the two are exact at both ends and a quotient of whole steps has the same bits.
+    double fraction(Tempus const& u) const noexcept { return TempusFraction(u, u1, u2); }
+    double complement(Tempus const& u) const noexcept { return TempusFraction(u, u2, u1); }
+    /// The fraction of a cubic segment, for one shorter than `KFShape::kShortestCurve` too.
+    double curveFraction(Tempus const& u) const noexcept;
 };
 
 /// The segment between two vertices; one that closes a spline, whose end stands before its start, is short.
@@ -139,12 +138,9 @@ inline double concave(double p, double a, double b) noexcept {
     return a * (1.0 - (1.0 - c)) + b * (1.0 - c);
 }
 
-/// The fraction of a cubic segment that begins at `start` and lasts `duration`, for one shorter than
-/// `kShortestCurve` too.
-inline double curveFraction(Tempus const& u, Tempus const& start, Tempus const& duration) noexcept {
-    Tempus const elapsed = BX_TempusSaferSubtract(u, start);
-    return TempusGetSeconds(duration) > kShortestCurve ? TempusRatio(elapsed, duration)
-                                                       : TempusGetSeconds(elapsed) / kShortestCurve;
-}
-
 } // namespace KFShape
+
+inline double KFSegmentSpan::curveFraction(Tempus const& u) const noexcept {
+    return seconds() > KFShape::kShortestCurve ? fraction(u)
+                                               : TempusSecondsBetween(u1, u) / KFShape::kShortestCurve;
+}

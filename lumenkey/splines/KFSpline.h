@@ -323,7 +323,10 @@ public:
     // so shortens the neighbours' facing tangents at each call; false makes the vertex Linear with tangents of no
     // length. The handle operations don't look at the lock flag themselves; the vertex does. The setters mark the
     // vertex as edited by hand and no longer as having crossed a neighbour. With `convert` they take and give handles
-    // as the interpolator of the vertex's type has them (12 times a tangent for the cubic types), else tangents.
+    // as the interpolator of the vertex's type has them (12 times a tangent for Bezier, a third of it on a parametric
+    // spline; for CatmullRom, whose handles follow from the neighbours, and the types without handles nothing is
+    // converted), else tangents. What is set on a vertex of such a type is stored as given: it stands unused and
+    // unconverted until the vertex becomes Bezier.
     // `getPointInputTangents`, `getPointOutputTangents`: a unit vector; false and no target written unless the state
     // derives tangents; not numbers where there is no neighbour on that side.
 
@@ -415,6 +418,7 @@ private:
     template <class Offers, class Better>
     double extremeV(double start, Tempus const& t, Tempus* atU, Offers offers, Better better);
     bool isWholeCurve(std::uint32_t type) const noexcept;
+    std::uint32_t commonInterpolation();
 
     // Evaluation (KFSplineEvaluate.cpp). The caller holds the lock or knows that no other thread edits.
     double initialValue() const;
@@ -464,6 +468,8 @@ private:
     /// What the last evaluation under the lock computed about its segment.
     std::unique_ptr<KFSegmentCache> _segment;
     bool _staticVertices = true;
+    /// What `commonInterpolation` found last, and of what: see there.
+    BXRelaxed<std::uint64_t> _commonInterpolation{0};
 };
 
 inline BXSpinLock& KFSpline::guard() const noexcept {

@@ -95,6 +95,8 @@ bool KFSpline::drawsWholeCurve() {
     KFSplineState const& state = *getState();
     if (!isWholeCurve(state.interpolation) || !state.parametric)
         return false;
+    if (_staticVertices && !_store->empty() && !isWholeCurve(_store->front()->getInterpolation()))
+        return false;
     std::uint32_t type = 0;
     getInterpolation(&type, nullptr, nullptr);
     return isWholeCurve(type);

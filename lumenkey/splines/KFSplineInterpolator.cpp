@@ -22,9 +22,18 @@ bool isParametric(KFSpline& spline) { return spline.getState()->parametric; }
 
 double handleFactor(KFSpline& spline) { return isParametric(spline) ? kThird : kHandlesPerTangent; }
 
-double secondsBetween(Tempus const& from, Tempus const& to) {
-    return TempusGetSeconds(BX_TempusSaferSubtract(to, from));
-}
+/// What `getControlPoints` of a strategy says of a segment.
+struct ControlPolygon {
+    KFSegmentSpan segment;
+    double u[4];
+    double v[4];
+
+    ControlPolygon(KFBezierInterpolator& strategy, KFSpline& spline, void* vA, void* vB, Tempus const& t) {
+        strategy.getControlPoints(spline, vA, vB, t, segment.u1, segment.u2, u, v);
+    }
+    /// The parameter at which a position in time is reached.
+    double parameterAt(Tempus const& at) const { return KFBezierFindParameter(u, segment.fraction(at)); }
+};
 
 /// A locked vertex keeps its lock through a write that must reach it.
 template <class Write> void writeLocked(KFVertex& vertex, Write write) {
@@ -91,7 +100,7 @@ void KFBezierInterpolator::getControlPoints(KFSpline& spline, void* vA, void* vB
         polygonU[1] = 0.0;
         polygonU[2] = 1.0;
     } else {
-        double const span = TempusGetSeconds(segment.duration());
+        double const span = segment.seconds();
         polygonU[1] = _handleScale * polygonU[1] / span;
         polygonU[2] = (span + _handleScale * polygonU[2]) / span;
     }
@@ -113,27 +122,22 @@ double KFBezierInterpolator::interpolate(KFSpline& spline, Tempus const& t, void
         };
         return KFSlopeOfWholeCurve(spline, u, valueAt);
     }
-    Tempus startU;
-    Tempus endU;
-    double polygonU[4];
-    double polygonV[4];
-    getControlPoints(spline, vA, vB, t, startU, endU, polygonU, polygonV);
-    Tempus const duration = BX_TempusSaferSubtract(endU, startU);
-    if (duration == kTempusZero) {
-        return polygonV[0];
+    ControlPolygon polygon(*this, spline, vA, vB, t);
+    if (polygon.segment.isEmpty()) {
+        return polygon.v[0];
     }
-    double p = KFShape::curveFraction(u, startU, duration);
+    double p = polygon.segment.curveFraction(u);
     if (parametric) {
-        return eval(polygonV, p);
+        return eval(polygon.v, p);
     }
     if (p >= 0.0 && p <= 1.0) {
         KFCubicInverse inverse;
-        inverse.prepare(polygonU);
+        inverse.prepare(polygon.u);
         p = inverse(p);
     } else {
-        p = KFBezierFindParameter(polygonU, p);
+        p = KFBezierFindParameter(polygon.u, p);
     }
-    return eval(polygonV, p);
+    return eval(polygon.v, p);
 }
 
 double KFBezierInterpolator::eval(double* polygon, double param) { return KFBezierEval(polygon, param); }
@@ -194,19 +198,14 @@ void KFBezierInterpolator::subDivide(KFSpline& spline, Tempus const& t, void* vA
 
 void KFBezierInterpolator::getMinMaxValues(KFSpline& spline, void* vA, void* vB, Tempus const& lowU,
                                            Tempus const& highU, double* min, double* max) {
-    Tempus startU;
-    Tempus endU;
-    double polygonU[4];
-    double polygonV[4];
-    getControlPoints(spline, vA, vB, kTempusZero, startU, endU, polygonU, polygonV);
-    KFSegmentSpan const segment{startU, endU};
+    ControlPolygon polygon(*this, spline, vA, vB, kTempusZero);
+    KFSegmentSpan const& segment = polygon.segment;
+    double const(&polygonV)[4] = polygon.v;
     bool const empty = segment.isEmpty();
-    double const low =
-        !empty && startU < lowU ? KFBezierFindParameter(polygonU, segment.fraction(lowU)) : 0.0;
-    double const high =
-        !empty && endU > highU ? KFBezierFindParameter(polygonU, segment.fraction(highU)) : 1.0;
-    double const atLow = eval(polygonV, low);
-    double const atHigh = eval(polygonV, high);
+    double const low = !empty && segment.u1 < lowU ? polygon.parameterAt(lowU) : 0.0;
+    double const high = !empty && segment.u2 > highU ? polygon.parameterAt(highU) : 1.0;
+    double const atLow = eval(polygon.v, low);
+    double const atHigh = eval(polygon.v, high);
     *min = std::min(atLow, atHigh);
     *max = std::max(atLow, atHigh);
 
@@ -218,7 +217,7 @@ void KFBezierInterpolator::getMinMaxValues(KFSpline& spline, void* vA, void* vB,
                           -3.0 * polygonV[0] + 3.0 * polygonV[1], roots[0], roots[1], 0.0);
     for (int i = 0; i < count; ++i) {
         if (roots[i] >= low && roots[i] <= high) {
-            double const extreme = eval(polygonV, roots[i]);
+            double const extreme = eval(polygon.v, roots[i]);
             *min = std::min(*min, extreme);
             *max = std::max(*max, extreme);
         }
@@ -227,28 +226,24 @@ void KFBezierInterpolator::getMinMaxValues(KFSpline& spline, void* vA, void* vB,
 
 bool KFBezierInterpolator::uForCurveValue(KFSpline& spline, void* vA, void* vB, Tempus const& lowU,
                                           Tempus const& highU, double value, std::vector<Tempus>& out) {
-    Tempus startU;
-    Tempus endU;
-    double polygonU[4];
-    double polygonV[4];
-    getControlPoints(spline, vA, vB, kTempusZero, startU, endU, polygonU, polygonV);
-    KFSegmentSpan const segment{startU, endU};
+    ControlPolygon polygon(*this, spline, vA, vB, kTempusZero);
+    KFSegmentSpan const& segment = polygon.segment;
     if (segment.isEmpty()) {
         return !out.empty();
     }
-    double const span = TempusGetSeconds(segment.duration());
+    double const span = segment.seconds();
     double const lowest = segment.fraction(lowU) - kEndTolerance;
     double const highest = segment.fraction(highU) + kEndTolerance;
     double roots[3] = {};
-    int const count = KFBezierGetRoots(polygonV, value, roots);
+    int const count = KFBezierGetRoots(polygon.v, value, roots);
     for (int i = 0; i < count; ++i) {
         if (roots[i] < -kEndTolerance || roots[i] > 1.0 + kEndTolerance) {
             continue;
         }
-        double const fraction = eval(polygonU, roots[i]);
+        double const fraction = eval(polygon.u, roots[i]);
         if (fraction >= lowest && fraction <= highest) {
             Tempus const offset = KFChronoForChannelSeconds(span * fraction, kKFChannelTimescale);
-            out.push_back(BXMath::clamp(BX_TempusSaferAdd(startU, offset), lowU, highU));
+            out.push_back(BXMath::clamp(BX_TempusSaferAdd(segment.u1, offset), lowU, highU));
         }
     }
     return !out.empty();
@@ -277,24 +272,24 @@ void KFCardinalInterpolator::computeTangents(KFSpline& spline, void* vA, void* v
     // The neighbour that an end of an open spline lacks is the mirror image of the other one, at the same
     // value.
     if (spline.getPreviousValidVertex(vA, &neighbour, kTempusZero)) {
-        *outU = k * secondsBetween(vertexOf(neighbour).getValueU(), uB);
+        *outU = k * TempusSecondsBetween(vertexOf(neighbour).getValueU(), uB);
         *outV = k * (valueB - vertexOf(neighbour).getValueV(t));
     } else if (spline.isClosed() && spline.getLastValidVertex(&neighbour, kTempusZero)) {
-        *outU = k * (secondsBetween(uA, uB) + smallDelta);
+        *outU = k * (TempusSecondsBetween(uA, uB) + smallDelta);
         *outV = k * (valueB - vertexOf(neighbour).getValueV(t));
     } else {
-        *outU = k * 2.0 * secondsBetween(uA, uB);
+        *outU = k * 2.0 * TempusSecondsBetween(uA, uB);
         *outV = 0.0;
     }
 
     if (spline.getNextValidVertex(vB, &neighbour, kTempusZero)) {
-        *inU = k * secondsBetween(vertexOf(neighbour).getValueU(), uA);
+        *inU = k * TempusSecondsBetween(vertexOf(neighbour).getValueU(), uA);
         *inV = k * (valueA - vertexOf(neighbour).getValueV(t));
     } else if (spline.isClosed() && spline.getFirstValidVertex(&neighbour, kTempusZero)) {
-        *inU = k * (secondsBetween(uB, uA) - smallDelta);
+        *inU = k * (TempusSecondsBetween(uB, uA) - smallDelta);
         *inV = k * (valueA - vertexOf(neighbour).getValueV(t));
     } else {
-        *inU = k * 2.0 * secondsBetween(uB, uA);
+        *inU = k * 2.0 * TempusSecondsBetween(uB, uA);
         *inV = 0.0;
     }
 }

@@ -4,11 +4,13 @@
 #include "lumenkey/splines/KFSpline.h"
 #include "lumenkey/splines/KFSplineAccess.h"
 #include "lumenkey/splines/KFSplineOwner.h"
+#include "lumenkey/splines/KFStaticVertex.h"
 #include "lumenkey/splines/KFVertex.h"
 #include "lumenkey/splines/KFVertexStore.h"
 
 #include <algorithm>
 #include <cmath>
+#include <iterator>
 
 namespace {
 
@@ -51,17 +53,38 @@ void KFSpline::setInterpolation(std::uint32_t type) {
     getInterpolator(type)->init(*this, kTempusZero);
 }
 
-bool KFSpline::getInterpolation(std::uint32_t* type, bool* usesTangents, bool* isSpline) {
-    std::uint32_t answer = getState()->interpolation;
-    if (!_store->empty()) {
-        answer = _store->front()->getInterpolation();
-        for (auto place = _store->begin(); place != _store->end(); place = _store->next(place)) {
-            if (_store->at(place)->getInterpolation() == answer)
-                continue;
-            answer = kKFInterpolationMixed;
-            break;
-        }
+/// The type that all vertices share, or mixed. Each read of a spline whose first vertex has a whole-curve type asks for
+/// it. There it is found once and kept: it can't change without a change of the store or of a vertex to or from such a
+/// type, and both are counted. Kept are the low bits of either count, and behind them which of three answers it is.
+std::uint32_t KFSpline::commonInterpolation() {
+    constexpr std::uint32_t answers[] = {kKFInterpolationMixed, kKFInterpolationBSpline,
+                                         kKFInterpolationXSpline};
+    constexpr std::uint64_t answerMask = 3;
+    std::uint32_t const first = _store->front()->getInterpolation();
+    bool const keeps = _staticVertices && isWholeCurve(first);
+    // Read before what they tell of.
+    std::uint64_t const counts = std::uint64_t{KFStaticVertex::getWholeCurveChanges()} << 32 |
+                                 static_cast<std::uint32_t>(_store->version() << 2);
+    std::uint64_t const kept = _commonInterpolation;
+    if (keeps && (kept & ~answerMask) == counts && (kept & answerMask) != 0)
+        return answers[(kept & answerMask) - 1];
+
+    std::uint32_t common = first;
+    for (auto place = _store->begin(); place != _store->end(); place = _store->next(place)) {
+        if (_store->at(place)->getInterpolation() == first)
+            continue;
+        common = kKFInterpolationMixed;
+        break;
     }
+    if (keeps) {
+        auto const answer = std::find(std::begin(answers), std::end(answers), common) - std::begin(answers);
+        _commonInterpolation = counts | static_cast<std::uint64_t>(answer + 1);
+    }
+    return common;
+}
+
+bool KFSpline::getInterpolation(std::uint32_t* type, bool* usesTangents, bool* isSpline) {
+    std::uint32_t const answer = _store->empty() ? getState()->interpolation.get() : commonInterpolation();
     if (type != nullptr)
         *type = answer;
     if (usesTangents != nullptr)

@@ -47,7 +47,6 @@ class LUMENKEY_API KFVertex {
 public:
     explicit KFVertex(Tempus const& u) noexcept;
     KFVertex(KFVertex const& other) noexcept;
-    KFVertex& operator=(KFVertex const& other) noexcept;
 
     // The order of the virtual operations is the interface that hosts derive from: never reorder.
 
@@ -110,6 +109,9 @@ public:
     bool operator==(KFVertex const& other) const { return isEqual(&other); }
 
 protected:
+    /// For the assignment of a class that knows what else depends on these fields: assigned by themselves, they would
+    /// change under what a spline keeps of the vertex.
+    KFVertex& operator=(KFVertex const& other) noexcept;
     void storeValueU(Tempus const& u) noexcept;
 
 private:

@@ -55,15 +55,6 @@ std::size_t KFVertexStore::bytes() const noexcept {
 
 // --- Places ---
 
-KFVertex* KFVertexStore::atIndex(std::size_t index) const noexcept {
-    for (auto const& block : _blocks) {
-        if (index < block->count())
-            return block->entries[index].vertex;
-        index -= block->count();
-    }
-    return nullptr;
-}
-
 std::size_t KFVertexStore::indexOf(Place place) const noexcept {
     std::size_t index = place.slot;
     for (std::uint32_t block = 0; block < place.block; ++block)

@@ -52,9 +52,6 @@ public:
     KFVertex* at(Place place) const noexcept;
     KFVertex* front() const noexcept { return empty() ? nullptr : at(begin()); }
     KFVertex* back() const noexcept { return empty() ? nullptr : at(last()); }
-    /// The vertex with that index in the order; null when out of range. O(blocks).
-    KFVertex* atIndex(std::size_t index) const noexcept;
-
     /// The index of a place in the order. O(blocks).
     std::size_t indexOf(Place place) const noexcept;
 

@@ -26,8 +26,8 @@ inline void KFSetValueOnChord(Tempus const& t, void* vA, void* vB, void* newVert
     KFVertex const& b = *static_cast<KFVertex*>(vB);
     KFVertex& added = *static_cast<KFVertex*>(newVertex);
     double const valueA = a.getValueV(t);
-    double const span = TempusGetSeconds(BX_TempusSaferSubtract(b.getValueU(), a.getValueU()));
-    double const elapsed = TempusGetSeconds(BX_TempusSaferSubtract(added.getValueU(), a.getValueU()));
+    double const span = TempusSecondsBetween(a.getValueU(), b.getValueU());
+    double const elapsed = TempusSecondsBetween(a.getValueU(), added.getValueU());
     double const slope = span == 0.0 ? 0.0 : (b.getValueV(t) - valueA) / span;
     added.setValueV(valueA + elapsed * slope, kTempusZero);
 }

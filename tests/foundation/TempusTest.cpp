@@ -1,6 +1,8 @@
 #include "lumenkey/foundation/Tempus.h"
 
 #include <array>
+#include <bit>
+#include <cmath>
 #include <limits>
 #include <ostream>
 #include <random>
@@ -186,27 +188,41 @@ TEST(Tempus, ProductsAndQuotientsAreExactOrNearest) {
     }
 }
 
-TEST(Tempus, DoublesAreWithinAnUlp) {
+TEST(Tempus, DoublesAreTheNearest) {
     Operands operands(20240613);
     constexpr double infinity = std::numeric_limits<double>::infinity();
-    auto const isNear = [](double result, SlowRational const& truth) {
-        return compare(SlowRational::of(std::nextafter(result, -infinity)), truth) <= 0 &&
-               compare(truth, SlowRational::of(std::nextafter(result, infinity))) <= 0;
+    // Between the middles of the ways to both neighbours; on one of them where the last bit is 0.
+    auto const isNearest = [](double result, SlowRational const& truth) {
+        SlowRational const here = SlowRational::of(result);
+        int const above = compare(truth + truth, here + SlowRational::of(std::nextafter(result, -infinity)));
+        int const below = compare(truth + truth, here + SlowRational::of(std::nextafter(result, infinity)));
+        bool const even = std::bit_cast<uint64_t>(result) % 2 == 0;
+        return even ? above >= 0 && below <= 0 : above > 0 && below < 0;
     };
     for (int i = 0; i < 5000; ++i) {
         Tempus const a = operands.time();
         Tempus const b = operands.time();
         SCOPED_TRACE(caseText(i, a, b));
         SlowRational const x = SlowRational::of(a);
-        ASSERT_TRUE(isNear(TempusGetSeconds(a), x));
+        ASSERT_TRUE(isNearest(TempusGetSeconds(a), x));
         if (b.value != 0) {
-            ASSERT_TRUE(isNear(TempusRatio(a, b), x / SlowRational::of(b)));
+            ASSERT_TRUE(isNearest(TempusRatio(a, b), x / SlowRational::of(b)));
+        }
+        Tempus c = operands.time();
+        c.timescale = i % 4 == 0 ? a.timescale : i % 4 == 1 ? b.timescale : c.timescale;
+        SlowRational const whole = SlowRational::of(c) - SlowRational::of(b);
+        ASSERT_TRUE(isNearest(TempusSecondsBetween(b, c), whole));
+        if (b != c) {
+            ASSERT_TRUE(isNearest(TempusFraction(a, b, c), (x - SlowRational::of(b)) / whole));
+            ASSERT_EQ(TempusFraction(b, b, c), 0.0);
+            ASSERT_FALSE(std::signbit(TempusFraction(b, b, c)));
+            ASSERT_EQ(TempusFraction(c, b, c), 1.0);
         }
         double const seconds = operands.number();
         int32_t const timescale = operands.timescale();
         Tempus const t = KFChronoForChannelSeconds(seconds, static_cast<uint32_t>(timescale));
         SlowRational const scaled = SlowRational::of(seconds) * SlowRational::of(int64_t{timescale});
-        Natural const twice = scaled.numerator + scaled.numerator;
+        Natural const doubled = scaled.numerator + scaled.numerator;
         if (TempusIsNumeric(t)) {
             ASSERT_EQ(t.timescale, timescale);
             SlowRational const error = SlowRational::of(t.value) - scaled;
@@ -214,7 +230,7 @@ TEST(Tempus, DoublesAreWithinAnUlp) {
             ASSERT_TRUE(side < 0 || (side == 0 && t.value % 2 == 0)) << seconds;
             ASSERT_EQ(TempusHasBeenRounded(t), !error.numerator.isZero());
         } else {
-            ASSERT_GE(compare(twice, Natural(~uint64_t{0}) * scaled.denominator), 0) << seconds;
+            ASSERT_GE(compare(doubled, Natural(~uint64_t{0}) * scaled.denominator), 0) << seconds;
         }
     }
     EXPECT_EQ(TempusGetSeconds(kTempusNegativeInfinity), -infinity);
@@ -222,6 +238,10 @@ TEST(Tempus, DoublesAreWithinAnUlp) {
     EXPECT_EQ(TempusRatio(TempusMake(-1, 2), kTempusZero), -infinity);
     EXPECT_EQ(TempusRatio(TempusMake(1, 2), kTempusPositiveInfinity), 0.0);
     EXPECT_TRUE(std::isnan(TempusRatio(kTempusZero, kTempusZero)));
+    EXPECT_EQ(TempusFraction(kTempusPositiveInfinity, kTempusZero, TempusMake(1, 2)), infinity);
+    EXPECT_TRUE(std::isnan(TempusFraction(kTempusInvalid, kTempusZero, TempusMake(1, 2))));
+    EXPECT_TRUE(std::isnan(TempusFraction(kTempusZero, kTempusZero, kTempusZero)));
+    EXPECT_EQ(TempusSecondsBetween(kTempusPositiveInfinity, kTempusZero), -infinity);
     EXPECT_FALSE(TempusIsValid(KFChronoForChannelSeconds(std::nan(""), kKFChannelTimescale)));
     EXPECT_FALSE(TempusIsValid(KFChronoForChannelSeconds(1.0, 0x80000000)));
     EXPECT_TRUE(TempusIsNegativeInfinity(KFChronoForChannelSeconds(-infinity, kKFChannelTimescale)));

@@ -60,28 +60,11 @@ Tempus finer(Tempus const& u, std::int32_t factor) {
     return fits ? TempusMake(value, timescale) : u;
 }
 
-/// The distances from the vertices can be written as times. Where they can't, a strategy that is called by itself sees
-/// them rounded, while the index of the spline compares whole numbers.
-bool hasExactDistances(MuseumSpline const& curve, Tempus const& u) {
-    // Whether a time was itself rounded doesn't matter.
-    auto const asGiven = [](Tempus t) {
-        t.flags &= ~kTempusFlagHasBeenRounded;
-        return t;
-    };
-    auto const vertices = museumVertices(*curve);
-    return std::none_of(vertices.begin(), vertices.end(), [&](KFVertex const* vertex) {
-        return TempusHasBeenRounded(asGiven(u) - asGiven(vertex->getValueU()));
-    });
-}
-
 } // namespace
 
 TEST(Museum, ReadsAsAPlainWalkWould) {
     overMuseum([](MuseumSpline& curve) {
         for (Tempus const& u : museumPositions(*curve)) {
-            if (!hasExactDistances(curve, u)) {
-                continue;
-            }
             double const expected = walkedValue(*curve, u);
             ASSERT_SAME(curve.at(u), expected, museumText(u));
             ASSERT_SAME(curve.at(u, false), expected, museumText(u) << ", without the lock");
@@ -158,7 +141,7 @@ TEST(Museum, DrawsCubicSegmentsAsTheConstructionDoes) {
             auto const begin = std::upper_bound(positions.begin(), positions.end(), segment.a->getValueU());
             auto const end = std::lower_bound(positions.begin(), positions.end(), segment.b->getValueU());
             for (auto u = begin; u < end; ++u) {
-                if ((truth.folds() && truth.isAtTurn(*u)) || !hasExactDistances(curve, *u)) {
+                if (truth.folds() && truth.isAtTurn(*u)) {
                     continue;
                 }
                 auto const [low, high] = truth.at(*u);
@@ -356,7 +339,7 @@ TEST(Museum, SlopesFollowTheCurve) {
                 double const slope = curve.slopeAt(u);
                 if (isChord || type == 0) {
                     ASSERT_DOUBLE_EQ(slope, chord) << museumText(u);
-                } else if (!isCubicType(type) && !isWholeCurveType(type) && hasExactDistances(curve, u)) {
+                } else if (!isCubicType(type) && !isWholeCurveType(type)) {
                     ASSERT_SAME(slope, curve.at(u), museumText(u));
                 } else if (isCubicType(type) && to - from > TempusMake(1, 10)) {
                     Tempus const d = TempusMake(1, 1000);
@@ -468,10 +451,8 @@ TEST(Museum, EditsAreSeenByTheNextRead) {
                     positions.push_back(u + (vertices[k + 1]->getValueU() - u) * 0.375);
                 }
                 auto const expectSeen = [&](Tempus const& u) {
-                    if (hasExactDistances(curve, u)) {
-                        ASSERT_SAME(curve.at(u), walkedValue(*curve, u),
-                                    museumText(u) << " after " << edit.what << " of vertex " << i);
-                    }
+                    ASSERT_SAME(curve.at(u), walkedValue(*curve, u),
+                                museumText(u) << " after " << edit.what << " of vertex " << i);
                 };
                 for (std::size_t k = 0; k < positions.size(); ++k) {
                     curve.at(positions[k]);

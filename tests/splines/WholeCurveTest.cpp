@@ -288,6 +288,52 @@ TEST(WholeCurves, FollowEditsWhicheverStrategyNoticedThem) {
                 bSplineByDefinition(fewer, true, 4.5), 1e-14);
 }
 
+// The type that all vertices share is kept between reads; it may be written past the spline.
+TEST(WholeCurves, FollowTypesThatAreSetOnAVertexItself) {
+    Controls const controls = controlsOf(9);
+    WholeCurve curve(10, controls, false);
+    auto const typeOfAll = [&curve] {
+        std::uint32_t type = 0;
+        curve.spline.getInterpolation(&type, nullptr, nullptr);
+        return type;
+    };
+    EXPECT_NEAR(curve.at(3.5), bSplineByDefinition(controls, false, 3.5), 1e-14);
+    auto* const last = static_cast<KFVertex*>(curve.spline.getLastVertex());
+    for (int round = 0; round < 2; ++round) {
+        last->setInterpolation(1);
+        EXPECT_EQ(typeOfAll(), kKFInterpolationMixed);
+        last->setInterpolation(10);
+        EXPECT_EQ(typeOfAll(), kKFInterpolationBSpline);
+    }
+    for (void* handle = curve.spline.getFirstVertex(); handle != nullptr;
+         handle = curve.spline.getNextVertex(handle)) {
+        static_cast<KFVertex*>(handle)->setInterpolation(12);
+        EXPECT_EQ(typeOfAll(), handle == last ? kKFInterpolationXSpline : kKFInterpolationMixed);
+    }
+    EXPECT_NEAR(curve.at(3.5), xSplineByDefinition(controls, false, 3.5), 1e-12);
+    *static_cast<KFStaticVertex*>(curve.spline.getFirstVertex()) = KFStaticVertex(kTempusZero, 1.0);
+    EXPECT_EQ(typeOfAll(), kKFInterpolationMixed);
+}
+
+TEST(KFBSplineInterpolator, IsEqualWithAllControlPointsAndTheSameLastPosition) {
+    Controls controls = controlsOf(30);
+    WholeCurve one(10, controls, false);
+    WholeCurve other(10, controls, false);
+    controls.values.front() += 1.0;
+    WholeCurve apart(10, controls, false);
+    auto const strategyOf = [](WholeCurve& curve) -> KFBSplineInterpolator& {
+        return *static_cast<KFBSplineInterpolator*>(curve.spline.getInterpolator(10));
+    };
+    for (double const u : {5.5, 25.5}) {
+        one.at(u);
+        EXPECT_FALSE(strategyOf(one) == strategyOf(other));
+        other.at(u);
+        EXPECT_TRUE(strategyOf(one) == strategyOf(other));
+        apart.at(u);
+        EXPECT_FALSE(strategyOf(one) == strategyOf(apart)) << "a control point far from the position differs";
+    }
+}
+
 TEST(WholeCurves, PutASubdividingVertexOnTheChord) {
     WholeCurve curve(12, {{2.0, 8.0}, {1.0, 1.0}}, false);
     void* a = curve.spline.getFirstVertex();
