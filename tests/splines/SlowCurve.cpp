@@ -1,5 +1,6 @@
 #include "tests/splines/SlowCurve.h"
 
+#include "lumenkey/splines/KFBezierUtil.h"
 #include "lumenkey/splines/KFInterpolator.h"
 
 #include <algorithm>
@@ -138,6 +139,8 @@ namespace {
 /// A few roundings of a double.
 constexpr long double kRoundings = 16.0L * std::numeric_limits<double>::epsilon();
 
+long double valueOf(KFVertex const* vertex) { return vertex->getValueV(kTempusZero); }
+
 /// b - a in seconds, from whole numbers.
 long double distance(Tempus const& a, Tempus const& b) {
     TempusDetail::Wide const left = TempusDetail::Wide{a.value} * b.timescale;
@@ -146,7 +149,7 @@ long double distance(Tempus const& a, Tempus const& b) {
            (static_cast<long double>(a.timescale) * static_cast<long double>(b.timescale));
 }
 
-long double casteljau(long double const* p, long double t) {
+long double casteljau(double const* p, long double t) {
     long double level[4] = {p[0], p[1], p[2], p[3]};
     for (int n = 3; n > 0; --n) {
         for (int i = 0; i < n; ++i) {
@@ -156,157 +159,90 @@ long double casteljau(long double const* p, long double t) {
     return level[0];
 }
 
-} // namespace
+/// The handles of a segment, as offsets from its ends.
+struct Handles {
+    long double outU, outV, inU, inV;
+};
 
-LongCubic::LongCubic(KFSpline& spline, Segment const& segment)
-    : _parametric(spline.getState()->parametric), _start(segment.a->getValueU()),
-      _end(segment.b->getValueU()), _u{0.0L, 0.0L, 1.0L, 1.0L} {
-    _v[0] = segment.a->getValueV(kTempusZero);
-    _v[3] = segment.b->getValueV(kTempusZero);
-    if (segment.a->getInterpolation() == 6) {
-        readNeighbours(spline, segment);
-    } else {
-        readTangents(spline, segment);
-    }
-    if (!_parametric && spline.getState()->sanitizeBezier) {
-        sanitize();
-    }
-    _c1 = 3.0L * (_u[1] - _u[0]);
-    _c2 = 3.0L * (_u[0] - 2.0L * _u[1] + _u[2]);
-    _c3 = _u[3] - _u[0] + 3.0L * (_u[1] - _u[2]);
-    // Part of the rule, not of the rounding.
-    if (std::fabs(_c3) < 1e-7L) {
-        _c3 = 0.0L;
-    }
-}
-
-void LongCubic::readTangents(KFSpline& spline, Segment const& segment) {
+Handles handlesFromTangents(KFSpline& spline, Segment const& segment) {
     long double const factor = spline.getState()->parametric ? 1.0L : 12.0L;
-    long double const span = distance(_start, _end);
-    double x = 0.0;
-    double y = 0.0;
-    segment.a->getOutputTangents(&x, &y, kTempusZero);
-    _u[1] = factor * x / span;
-    _v[1] = _v[0] + factor * y;
-    segment.b->getInputTangents(&x, &y, kTempusZero);
-    _u[2] = 1.0L + factor * x / span;
-    _v[2] = _v[3] + factor * y;
+    double outU = 0.0, outV = 0.0, inU = 0.0, inV = 0.0;
+    segment.a->getOutputTangents(&outU, &outV, kTempusZero);
+    segment.b->getInputTangents(&inU, &inV, kTempusZero);
+    return {factor * outU, factor * outV, factor * inU, factor * inV};
 }
 
 /// A sixth of the way between the neighbours on either side. Where there is none, the curve ends level, or, closed,
 /// goes on a small step away at the other end.
-void LongCubic::readNeighbours(KFSpline& spline, Segment const& segment) {
+Handles handlesFromNeighbours(KFSpline& spline, Segment const& segment) {
     long double const sixth = 0.3333333333333333 * 0.5L;
-    long double const span = distance(_start, _end);
+    long double const span = distance(segment.a->getValueU(), segment.b->getValueU());
     long double const step = distance(kTempusZero, spline.getSmallDeltaU());
     auto const valid = enabledOf(museumVertices(spline));
     auto const a = std::find(valid.begin(), valid.end(), segment.a);
     auto const b = std::find(valid.begin(), valid.end(), segment.b);
-    auto const value = [](KFVertex const* vertex) {
-        return static_cast<long double>(vertex->getValueV(kTempusZero));
-    };
-
-    long double reach = 2.0L * span;
-    long double rise = 0.0L;
+    long double out[2] = {2.0L * span, 0.0L};
+    long double in[2] = {2.0L * span, 0.0L};
     if (a != valid.begin()) {
-        reach = distance((*(a - 1))->getValueU(), _end);
-        rise = _v[3] - value(*(a - 1));
+        out[0] = distance((*(a - 1))->getValueU(), segment.b->getValueU());
+        out[1] = valueOf(segment.b) - valueOf(*(a - 1));
     } else if (spline.isClosed()) {
-        reach = span + step;
-        rise = _v[3] - value(valid.back());
+        out[0] = span + step;
+        out[1] = valueOf(segment.b) - valueOf(valid.back());
     }
-    _u[1] = sixth * reach / span;
-    _v[1] = _v[0] + sixth * rise;
-
-    reach = 2.0L * span;
-    rise = 0.0L;
     if (b + 1 != valid.end()) {
-        reach = distance(_start, (*(b + 1))->getValueU());
-        rise = value(*(b + 1)) - _v[0];
+        in[0] = distance(segment.a->getValueU(), (*(b + 1))->getValueU());
+        in[1] = valueOf(*(b + 1)) - valueOf(segment.a);
     } else if (spline.isClosed()) {
-        reach = span + step;
-        rise = value(valid.front()) - _v[0];
+        in[0] = span + step;
+        in[1] = valueOf(valid.front()) - valueOf(segment.a);
     }
-    _u[2] = 1.0L - sixth * reach / span;
-    _v[2] = _v[3] - sixth * rise;
+    return {sixth * out[0], sixth * out[1], -sixth * in[0], -sixth * in[1]};
 }
 
-/// U turns back when its slope has two zeros inside. The handles that just don't let it, in the same proportion, give
-/// the slope a double zero at s, with s^2 : (1 - s)^2 as d1 : d2.
-void LongCubic::sanitize() {
-    long double const d1 = _u[1];
-    long double const d2 = 1.0L - _u[2];
-    long double const a = 3.0L * (d1 + d2) - 2.0L; // slope / 3 = a x^2 + b x + d1
-    long double const b = 2.0L * (_u[2] - 2.0L * d1);
-    if (!(a > 0.0L) || !(-b >= 0.0L && -b <= 2.0L * a) || !(b * b - 4.0L * a * d1 > 0.0L)) {
-        return;
+} // namespace
+
+LongCubic::LongCubic(KFSpline& spline, Segment const& segment)
+    : _parametric(spline.getState()->parametric), _start(segment.a->getValueU()),
+      _span(distance(_start, segment.b->getValueU())) {
+    Handles const handles = segment.a->getInterpolation() == 6 ? handlesFromNeighbours(spline, segment)
+                                                               : handlesFromTangents(spline, segment);
+    double const v[4] = {
+        segment.a->getValueV(kTempusZero), static_cast<double>(valueOf(segment.a) + handles.outV),
+        static_cast<double>(valueOf(segment.b) + handles.inV), segment.b->getValueV(kTempusZero)};
+    double const u[4] = {0.0, static_cast<double>(handles.outU / _span),
+                         static_cast<double>(1.0L + handles.inU / _span), 1.0};
+    std::copy(u, u + 4, _u);
+    std::copy(v, v + 4, _v);
+    if (!_parametric) {
+        KFBezierSanitizeControlPolygon(_u, _v); // which is tested by itself
     }
-    long double const s = std::sqrt(d1) / (std::sqrt(d1) + std::sqrt(d2));
-    long double const shape = 1.0L - 3.0L * s + 3.0L * s * s;
-    long double const reach1 = s * s / shape;
-    long double const reach2 = (1.0L - s) * (1.0L - s) / shape;
-    long double const shortening = d2 <= d1 ? reach1 / d1 : reach2 / d2;
-    _u[1] = reach1;
-    _u[2] = 1.0L - reach2;
-    _v[1] = _v[0] + (_v[1] - _v[0]) * shortening;
-    _v[2] = _v[3] + (_v[2] - _v[3]) * shortening;
 }
 
-long double LongCubic::curveU(long double parameter) const {
-    return ((_c3 * parameter + _c2) * parameter + _c1) * parameter;
-}
-
-bool LongCubic::folds() const {
-    if (_parametric) {
-        return false;
-    }
-    for (int i = 0; i <= 1000; ++i) {
-        long double const x = static_cast<long double>(i) / 1000.0L;
-        if ((3.0L * _c3 * x + 2.0L * _c2) * x + _c1 < -1e-12L) {
-            return true;
-        }
-    }
-    return false;
-}
-
-bool LongCubic::isAtTurn(Tempus const& u) const {
-    long double const root = std::sqrt(std::max(0.0L, _c2 * _c2 - 3.0L * _c3 * _c1));
-    for (long double const turn : {(-_c2 - root) / (3.0L * _c3), (-_c2 + root) / (3.0L * _c3)}) {
-        if (std::fabs(curveU(turn) - fractionOf(u)) < 1e-7L) {
-            return true;
-        }
-    }
-    return false;
-}
-
-long double LongCubic::fractionOf(Tempus const& u) const {
-    long double const shortest = 9.999999747378752e-06L;
-    return distance(_start, u) / std::max(distance(_start, _end), _parametric ? 0.0L : shortest);
-}
-
-/// The last parameter in 0 to 1 at which U reaches the fraction: from the end, the first step that crosses it, halved.
+/// The parameter in 0 to 1 at which U reaches the fraction, by bisection.
 long double LongCubic::parameterAt(long double fraction) const {
-    int const steps = folds() ? 4096 : 1;
     long double low = 0.0L;
     long double high = 1.0L;
-    for (int i = steps; i > 0; --i) {
-        low = static_cast<long double>(i - 1) / steps;
-        high = static_cast<long double>(i) / steps;
-        if ((curveU(low) < fraction) != (curveU(high) < fraction)) {
-            break;
-        }
-    }
-    bool const rises = curveU(low) < curveU(high);
     for (int i = 0; i < 80; ++i) {
         long double const middle = (low + high) / 2.0L;
-        ((curveU(middle) < fraction) == rises ? low : high) = middle;
+        (curveU(middle) < fraction ? low : high) = middle;
     }
     return low;
 }
 
+/// A leading coefficient of U below 1e-7 counts as none: that is part of the rule, not of the rounding.
+long double LongCubic::curveU(long double t) const {
+    long double const u1 = _u[1];
+    long double const u2 = _u[2];
+    long double const leading = 1.0L + 3.0L * (u1 - u2);
+    return 3.0L * u1 * t + 3.0L * (u2 - 2.0L * u1) * t * t +
+           (std::fabs(leading) < 1e-7L ? 0.0L : leading * t * t * t);
+}
+
 LongCubic::Bounds LongCubic::at(Tempus const& u) const {
-    long double const fraction = fractionOf(u);
-    long double const slack = kRoundings * (1.0L + std::fabs(_c1) + std::fabs(_c2) + std::fabs(_c3));
+    long double const shortest = 9.999999747378752e-06L;
+    long double const fraction = distance(_start, u) / std::max(_span, _parametric ? 0.0L : shortest);
+    long double const slack = kRoundings * (2.0L + 9.0L * (std::fabs(_u[1]) + std::fabs(_u[2])));
     long double from = fraction - kRoundings;
     long double to = fraction + kRoundings;
     if (!_parametric) {
@@ -321,8 +257,8 @@ LongCubic::Bounds LongCubic::at(Tempus const& u) const {
         high = std::max(high, value);
     }
     long double size = 0.0L;
-    for (long double const v : _v) {
-        size = std::max(size, std::fabs(v));
+    for (double const v : _v) {
+        size = std::max<long double>(size, std::fabs(v));
     }
     long double const rounding = kRoundings * size + std::numeric_limits<double>::denorm_min();
     return {static_cast<double>(low - rounding), static_cast<double>(high + rounding)};

@@ -19,13 +19,12 @@ struct Segment {
 };
 std::vector<Segment> segmentsOf(KFSpline& spline);
 
-/// A cubic segment from the tangents of its ends, or of its neighbours, in long double.
+/// A cubic segment from the tangents of its ends, or of its neighbours, in long double. Not for one that may fold back
+/// in time.
 class LongCubic {
 public:
     LongCubic(KFSpline& spline, Segment const& segment);
 
-    /// U turns back on the way, which only unsanitized segments do.
-    bool folds() const;
     /// The lowest and highest value that the curve may have at `u`, which lies inside the segment. They differ by the
     /// rounding of U and V: where U hardly moves with the parameter, a rounding of U is a stretch of the curve, and
     /// any value on it is right.
@@ -33,22 +32,14 @@ public:
         double low, high;
     };
     Bounds at(Tempus const& u) const;
-    /// `u` lies where the curve turns back, so near that the roundings decide which branch is read.
-    bool isAtTurn(Tempus const& u) const;
 
 private:
-    void readTangents(KFSpline& spline, Segment const& segment);
-    void readNeighbours(KFSpline& spline, Segment const& segment);
-    void sanitize();
-    long double fractionOf(Tempus const& u) const;
     long double parameterAt(long double fraction) const;
-    long double curveU(long double parameter) const;
+    long double curveU(long double t) const;
 
     bool _parametric;
     Tempus _start;
-    Tempus _end;
-    long double _u[4];
-    long double _v[4];
-    /// Of U as a polynomial.
-    long double _c1, _c2, _c3;
+    long double _span;
+    double _u[4];
+    double _v[4];
 };

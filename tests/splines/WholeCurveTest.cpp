@@ -1,9 +1,9 @@
-// The two strategies that draw a spline as one function, against their definitions over all control points.
+// The two strategies that draw a spline as one function of all control points.
 
 #include "lumenkey/splines/KFBSplineInterpolator.h"
+#include "lumenkey/splines/KFInterpolator.h"
 #include "lumenkey/splines/KFSpline.h"
 #include "lumenkey/splines/KFStaticVertex.h"
-#include "lumenkey/splines/KFXSplineInterpolator.h"
 
 #include <gtest/gtest.h>
 
@@ -50,242 +50,105 @@ struct WholeCurve {
     }
 };
 
-double weightOfBias(double bias) { return bias <= 1.0 ? 25.0 - 24.0 * bias : 1.9 - 0.9 * bias; }
-
-/// The whole knot vector and the whole triangle of basis functions.
-double bSplineByDefinition(Controls const& controls, bool closed, double u) {
-    std::size_t const count = controls.values.size();
-    std::vector<double> values = controls.values;
-    std::vector<double> weights;
-    for (double bias : controls.biases)
-        weights.push_back(weightOfBias(bias));
-    std::size_t const k = closed ? 4 : std::min<std::size_t>(count, 4);
-    std::vector<double> knots;
-    double x = u;
-    if (closed) {
-        for (std::vector<double>* list : {&values, &weights}) {
-            std::vector<double> const once = *list;
-            list->insert(list->begin(), once.back());
-            list->push_back(once[0]);
-            list->push_back(once[1 % count]);
-        }
-        for (std::size_t i = 0; i < count + 3 + k; ++i)
-            knots.push_back(static_cast<double>(i));
-    } else {
-        knots.push_back(0.0);
-        for (std::size_t i = 1; i < count + k; ++i) {
-            knots.push_back(knots[i - 1] + (i < k || i + 1 >= count + 2 ? 0.0 : 1.0));
-        }
-        x = u / static_cast<double>(knots.size() - 1) * knots.back();
-    }
-    std::size_t const n = values.size();
-    std::size_t const m = n + k;
-    std::vector<double> entries(m, 0.0);
-    for (std::size_t i = 0; i + 1 < m; ++i)
-        entries[i] = x >= knots[i] && x < knots[i + 1] ? 1.0 : 0.0;
-    for (std::size_t d = 2; d <= k; ++d) {
-        for (std::size_t i = 0; i + d < m; ++i) {
-            double a = 0.0;
-            double b = 0.0;
-            if (std::fabs(entries[i]) >= 1e-7)
-                a = entries[i] * (x - knots[i]) / (knots[i + d - 1] - knots[i]);
-            if (std::fabs(entries[i + 1]) >= 1e-7)
-                b = entries[i + 1] * (knots[i + d] - x) / (knots[i + d] - knots[i + 1]);
-            entries[i] = a + b;
-        }
-    }
-    if (std::fabs(x - knots[m - 1]) < 1e-7)
-        entries[n - 1] = 1.0;
-    double sum = 0.0;
-    for (std::size_t i = 0; i < n; ++i)
-        sum += entries[i] * weights[i];
-    double value = 0.0;
-    for (std::size_t i = 0; i < n; ++i)
-        value += std::fabs(sum) < 1e-7 ? 0.0 : values[i] * (entries[i] * weights[i] / sum);
-    return value;
-}
-
-double g(double u, double q, double p) {
-    return q * u + 2.0 * q * u * u + (10.0 - 12.0 * q - p) * u * u * u +
-           (2.0 * p + 14.0 * q - 15.0) * std::pow(u, 4) + (6.0 - 5.0 * q - p) * std::pow(u, 5);
-}
-
-double h(double u, double q) {
-    return q * u + 2.0 * q * u * u - 2.0 * q * std::pow(u, 4) - q * std::pow(u, 5);
-}
-
-/// The definition by lists: the vertices in order, and on an open spline the last one twice.
-double xSplineByDefinition(Controls const& controls, bool closed, double x) {
-    std::vector<double> values = controls.values;
-    std::vector<double> shapes;
-    for (std::size_t i = 0; i < values.size(); ++i) {
-        bool const isEnd = !closed && (i == 0 || i + 1 == values.size());
-        shapes.push_back(isEnd ? 1.0 : std::min(controls.biases[i], 1.0));
-    }
-    if (!closed) {
-        values.push_back(values.back());
-        shapes.push_back(1.0);
-    }
-    int const n = static_cast<int>(values.size());
-    double const k = std::trunc(x) - 1.0;
-    int const i = static_cast<int>(k);
-    double s1 = 0.0;
-    double s2 = 0.0;
-    int points[4];
-    if (closed) {
-        if (i < -2)
-            return 0.0;
-        int const idx = i < 0 ? i + n : i;
-        s1 = shapes[static_cast<std::size_t>((idx + 1) % n)];
-        s2 = shapes[static_cast<std::size_t>((idx + 2) % n)];
-        for (int j = 0; j < 4; ++j)
-            points[j] = idx + j < 0 ? n - 1 : (idx + j) % n;
-    } else {
-        int const idx = std::max(i, -1);
-        if (i >= 0 && idx < n - 1)
-            s1 = shapes[static_cast<std::size_t>(idx + 1)];
-        if (idx + 2 < n - 1)
-            s2 = shapes[static_cast<std::size_t>(idx + 2)];
-        for (int j = 0; j < 4; ++j)
-            points[j] = std::clamp(idx + j, 0, n - 1);
-    }
-    double const p1 = std::max(s1, 0.0), p2 = std::max(s2, 0.0);
-    double const q1 = s1 < 0.0 ? -0.5 * s1 : 0.0, q2 = s2 < 0.0 ? -0.5 * s2 : 0.0;
-    double const t[4] = {k + 1.0 + p1, k + 2.0 + p2, k + 1.0 - p1, k + 2.0 - p2};
-    double e[4], u[4], P[4];
-    for (int j = 0; j < 4; ++j) {
-        e[j] = k + j - t[j];
-        u[j] = (x - t[j]) / e[j];
-        P[j] = 2.0 * e[j] * e[j];
-    }
-    double const w[4] = {x <= t[0]  ? g(u[0], q1, P[0])
-                         : q1 > 0.0 ? h(u[0], q1)
-                                    : 0.0,
-                         g(u[1], q2, P[1]), g(u[2], q1, P[2]),
-                         x >= t[3]  ? g(u[3], q2, P[3])
-                         : q2 > 0.0 ? h(u[3], q2)
-                                    : 0.0};
-    double above = 0.0;
-    double below = 0.0;
-    for (int j = 0; j < 4; ++j) {
-        if (std::fabs(w[j]) >= 1e-7)
-            above += w[j] * values[static_cast<std::size_t>(points[j])];
-        below += w[j];
-    }
-    return below == 0.0 ? 0.0 : above / below;
-}
-
 } // namespace
 
-TEST(KFBSplineInterpolator, IsTheSumOverAllControlPoints) {
-    for (bool closed : {false, true}) {
+// The values themselves are frozen. These hold for any number of control points, and tell where a curve begins
+// and ends.
+TEST(WholeCurves, AreSymmetric) {
+    for (std::uint32_t const type : {10u, 12u}) {
         for (std::size_t count = 1; count <= 9; ++count) {
+            SCOPED_TRACE(testing::Message() << "type " << type << ", " << count << " control points");
             Controls const controls = controlsOf(count);
-            WholeCurve curve(10, controls, closed);
-            double const end = TempusGetSeconds(curve.spline.getMaxValueU(kTempusZero, true));
+            Controls reversed = controls, rotated = controls;
+            for (std::vector<double>* list : {&reversed.values, &reversed.biases}) {
+                std::reverse(list->begin(), list->end());
+            }
+            for (std::vector<double>* list : {&rotated.values, &rotated.biases}) {
+                std::rotate(list->begin(), list->begin() + 1, list->end());
+            }
+            // An open curve looks alike from both ends, and starts and ends in its end points.
+            WholeCurve open(type, controls, false), back(type, reversed, false);
+            double const end = TempusGetSeconds(open.spline.getMaxValueU(kTempusZero, true));
             EXPECT_EQ(end,
-                      static_cast<double>(closed ? count + 3 : count + std::min<std::size_t>(count, 4) - 1));
-            EXPECT_EQ(TempusGetSeconds(curve.spline.getMinValueU(kTempusZero, true)), closed ? 3.0 : 0.0);
-            // From before the start, through both ends, past the end and past the last knot.
-            for (int i = -64; i <= static_cast<int>(end + 5.0) * 64; ++i) {
-                double const u = i / 64.0;
-                ASSERT_NEAR(curve.at(u), bSplineByDefinition(controls, closed, u), 1e-14)
-                    << closed << count << " " << u;
+                      static_cast<double>(type == 12 ? count : count + std::min<std::size_t>(count, 4) - 1));
+            EXPECT_NEAR(open.at(0.0), controls.values.front(), 1e-12);
+            EXPECT_NEAR(open.at(end), controls.values.back(), 1e-12);
+            for (int i = 0; i <= 64 && type == 10; ++i) {
+                EXPECT_NEAR(open.at(end * i / 64.0), back.at(end - end * i / 64.0), 1e-12) << i;
+            }
+            // A closed one looks alike from each control point, and goes on evenly past its end.
+            WholeCurve closed(type, controls, true), next(type, rotated, true);
+            double const start = TempusGetSeconds(closed.spline.getMinValueU(kTempusZero, true));
+            EXPECT_EQ(start, type == 12 ? 0.0 : 3.0);
+            EXPECT_EQ(TempusGetSeconds(closed.spline.getMaxValueU(kTempusZero, true)),
+                      static_cast<double>(type == 12 ? count : count + 3));
+            for (int i = 0; i < 64 * (static_cast<int>(count) - 1); ++i) {
+                double const u = start + i / 64.0;
+                EXPECT_NEAR(closed.at(u + 1.0), next.at(u), 1e-12) << u;
+            }
+            for (double const far : {-1e12, -3.5, end + 2.5, 1e12}) {
+                EXPECT_TRUE(std::isfinite(open.at(far)) && std::isfinite(closed.at(far))) << far;
             }
         }
     }
 }
 
-TEST(KFBSplineInterpolator, PassesThroughTheEndsOfAnOpenSpline) {
-    Controls const controls = controlsOf(6);
-    WholeCurve curve(10, controls, false);
-    EXPECT_EQ(curve.at(0.0), controls.values.front());
-    EXPECT_EQ(curve.at(9.0), controls.values.back());
-    // Weight 1 everywhere: values within the hull, and a constant is reproduced.
-    WholeCurve constant(10, {{4.0, 4.0, 4.0, 4.0, 4.0}, {1.0, 1.0, 1.0, 1.0, 1.0}}, false);
-    EXPECT_NEAR(constant.at(3.3), 4.0, 1e-15);
-    for (double bias : {0.0, 0.5, 1.0, 2.0}) {
-        EXPECT_NEAR(KFBSplineInterpolator::convertBSplineBiasToLinear(weightOfBias(bias)), bias, 1e-15);
-    }
-    // The slope is one-sided where the other side would lie outside.
+TEST(WholeCurves, KnowTheirSlopes) {
+    // One-sided where the other side would lie outside.
+    WholeCurve curve(10, controlsOf(6), false);
     Tempus const d = TempusMake(1, 1000);
-    auto* const strategy = curve.spline.getInterpolator(10);
     auto const read = [&](Tempus const& u, bool slope) {
-        return strategy->interpolate(curve.spline, kTempusZero, nullptr, nullptr, u, true, slope);
+        return curve.spline.getInterpolator(10)->interpolate(curve.spline, kTempusZero, nullptr, nullptr, u,
+                                                             true, slope);
     };
     EXPECT_EQ(read(kTempusZero, true), (read(d, false) - read(kTempusZero, false)) / 0.001);
-    EXPECT_EQ(read(TempusMake(5, 1), true),
-              (read(TempusMake(5, 1) + d, false) - read(TempusMake(5, 1) - d, false)) / 0.002);
-    EXPECT_EQ(strategy->interpolate(curve.spline, kTempusZero, nullptr, nullptr, d, false, false), 0.0);
-}
-
-TEST(KFXSplineInterpolator, IsTheBlendOfFourControlPoints) {
-    for (bool closed : {false, true}) {
-        for (std::size_t count = 1; count <= 9; ++count) {
-            Controls const controls = controlsOf(count);
-            WholeCurve curve(12, controls, closed);
-            double const end = TempusGetSeconds(curve.spline.getMaxValueU(kTempusZero, true));
-            EXPECT_EQ(end, static_cast<double>(count));
-            for (int i = -200; i <= static_cast<int>(end + 3.0) * 64; ++i) {
-                double const truth = xSplineByDefinition(controls, closed, i / 64.0);
-                // Outside weights can all but vanish, and their quotient is then anything.
-                double const tolerance = std::max(1e-12, 1e-12 * std::fabs(truth));
-                if (i < 0 || i > static_cast<int>(end) * 64) {
-                    ASSERT_TRUE(std::isfinite(curve.at(i / 64.0))) << closed << count << " " << i;
-                } else {
-                    ASSERT_NEAR(curve.at(i / 64.0), truth, tolerance) << closed << count << " " << i;
-                }
-            }
-            for (double far : {-1e12, 1e12})
-                EXPECT_TRUE(std::isfinite(curve.at(far))) << closed << count;
-        }
-    }
+    Tempus const u = TempusMake(5, 1);
+    EXPECT_EQ(read(u, true), (read(u + d, false) - read(u - d, false)) / 0.002);
 }
 
 TEST(WholeCurves, FollowEditsWhicheverStrategyNoticedThem) {
-    Controls const controls = controlsOf(7);
+    Controls controls = controlsOf(7);
     WholeCurve curve(10, controls, false);
-    auto const read = [](WholeCurve& from, std::uint32_t type, double u) {
-        Tempus const at = KFChronoForChannelSeconds(u, kKFChannelTimescale);
-        return from.spline.getInterpolator(type)->interpolate(from.spline, kTempusZero, nullptr, nullptr, at,
-                                                              true, false);
+    auto const read = [](WholeCurve& from, std::uint32_t type) {
+        return from.spline.getInterpolator(type)->interpolate(from.spline, kTempusZero, nullptr, nullptr,
+                                                              TempusMake(9, 2), true, false);
     };
-    curve.at(2.0);
-    read(curve, 12, 2.0);
-
+    // A curve made anew of the same control points is the truth. They stand where those of the edited one do.
+    auto const expectLikeNew = [&](char const* after) {
+        WholeCurve fresh(10, controls, curve.spline.isClosed());
+        EXPECT_EQ(read(curve, 12), read(fresh, 12)) << after;
+        // The X-spline strategy cleared the spline's flag; the other one must see the edit all the same.
+        EXPECT_EQ(read(curve, 10), read(fresh, 10)) << after;
+    };
+    auto const erase = [&](std::ptrdiff_t index) {
+        controls.values.erase(controls.values.begin() + index);
+        controls.biases.erase(controls.biases.begin() + index);
+    };
+    expectLikeNew("nothing");
     void* third = nullptr;
     ASSERT_TRUE(curve.spline.getVertexHandle(TempusMake(2, 1), &third, true));
     curve.spline.deleteVertex(third, false, kTempusZero);
-    Controls fewer = controls;
-    fewer.values.erase(fewer.values.begin() + 2);
-    fewer.biases.erase(fewer.biases.begin() + 2);
-    // The X-spline strategy clears the spline's flag; the other one must see the deletion all the same.
-    EXPECT_NEAR(read(curve, 12, 2.5), xSplineByDefinition(fewer, false, 2.5), 1e-12);
-    WholeCurve fresh(10, fewer, false);
-    EXPECT_EQ(read(curve, 10, 2.5), read(fresh, 10, 2.5));
-
+    erase(2);
+    expectLikeNew("a deletion");
     void* second = nullptr;
     ASSERT_TRUE(curve.spline.getVertexHandle(TempusMake(1, 1), &second, true));
     curve.spline.disableVertex(second, kTempusZero);
-    fewer.values.erase(fewer.values.begin() + 1);
-    fewer.biases.erase(fewer.biases.begin() + 1);
-    EXPECT_NEAR(curve.at(2.5), bSplineByDefinition(fewer, false, 2.5), 1e-14);
+    erase(1);
+    expectLikeNew("a vertex was disabled");
     curve.spline.setClosed(true, nullptr);
-    EXPECT_NEAR(curve.at(4.5), bSplineByDefinition(fewer, true, 4.5), 1e-14);
-
+    expectLikeNew("it was closed");
     // Values and biases are read at each evaluation.
-    void* first = nullptr;
-    ASSERT_TRUE(curve.spline.getFirstValidVertexWithLock(&first, kTempusZero));
+    void* const first = curve.spline.getFirstVertex();
     curve.spline.setVertexValue(first, 40.0, kTempusZero);
-    fewer.values[0] = 40.0;
-    EXPECT_NEAR(curve.at(4.5), bSplineByDefinition(fewer, true, 4.5), 1e-14);
+    controls.values[0] = 40.0;
+    expectLikeNew("a value was set");
 
     // A copy has a strategy of its own, which reads the vertices of the copy.
     KFSplineState state(curve.state);
     KFSpline copy(curve.spline, &state);
+    double const before = read(curve, 10);
     curve.spline.setVertexValue(first, -40.0, kTempusZero);
-    EXPECT_NEAR(copy.getVertexValue(TempusMake(9, 2), kTempusZero, true),
-                bSplineByDefinition(fewer, true, 4.5), 1e-14);
+    EXPECT_EQ(copy.getVertexValue(TempusMake(9, 2), kTempusZero, true), before);
 }
 
 // The type that all vertices share is kept between reads; it may be written past the spline.
@@ -297,7 +160,6 @@ TEST(WholeCurves, FollowTypesThatAreSetOnAVertexItself) {
         curve.spline.getInterpolation(&type, nullptr, nullptr);
         return type;
     };
-    EXPECT_NEAR(curve.at(3.5), bSplineByDefinition(controls, false, 3.5), 1e-14);
     auto* const last = static_cast<KFVertex*>(curve.spline.getLastVertex());
     for (int round = 0; round < 2; ++round) {
         last->setInterpolation(1);
@@ -310,7 +172,6 @@ TEST(WholeCurves, FollowTypesThatAreSetOnAVertexItself) {
         static_cast<KFVertex*>(handle)->setInterpolation(12);
         EXPECT_EQ(typeOfAll(), handle == last ? kKFInterpolationXSpline : kKFInterpolationMixed);
     }
-    EXPECT_NEAR(curve.at(3.5), xSplineByDefinition(controls, false, 3.5), 1e-12);
     *static_cast<KFStaticVertex*>(curve.spline.getFirstVertex()) = KFStaticVertex(kTempusZero, 1.0);
     EXPECT_EQ(typeOfAll(), kKFInterpolationMixed);
 }
@@ -331,17 +192,5 @@ TEST(KFBSplineInterpolator, IsEqualWithAllControlPointsAndTheSameLastPosition) {
         EXPECT_TRUE(strategyOf(one) == strategyOf(other));
         apart.at(u);
         EXPECT_FALSE(strategyOf(one) == strategyOf(apart)) << "a control point far from the position differs";
-    }
-}
-
-TEST(WholeCurves, PutASubdividingVertexOnTheChord) {
-    WholeCurve curve(12, {{2.0, 8.0}, {1.0, 1.0}}, false);
-    void* a = curve.spline.getFirstVertex();
-    void* b = curve.spline.getLastVertex();
-    KFStaticVertex added(TempusMake(1, 4), 0.0);
-    for (std::uint32_t type : {10u, 12u}) {
-        added.setValueV(0.0, kTempusZero);
-        curve.spline.getInterpolator(type)->subDivide(curve.spline, kTempusZero, a, b, &added);
-        EXPECT_EQ(added.getValueV(kTempusZero), 3.5);
     }
 }

@@ -3,9 +3,7 @@
 #include "lumenkey/splines/KFInterpolation.h"
 
 #include <algorithm>
-#include <array>
 #include <cmath>
-#include <iterator>
 
 namespace {
 
@@ -115,232 +113,189 @@ void controlPoints(MuseumSpline& curve, std::uint32_t type, int count, bool clos
     }
 }
 
-using Exhibits = std::vector<Exhibit>;
+class Builder {
+public:
+    void add(std::string const& name, std::function<void(MuseumSpline&)> const& fill) {
+        all.push_back({name, fill});
+    }
+    void addKeys(std::string const& name, std::vector<Tempus> const& positions, std::uint32_t type) {
+        add(name, [=](MuseumSpline& c) { keysAt(c, positions, type); });
+    }
+    void addZigzag(std::string const& name, std::uint32_t type,
+                   std::function<void(MuseumSpline&)> const& change) {
+        add(name, [=](MuseumSpline& c) {
+            zigzag(c, type);
+            change(c);
+        });
+    }
 
-void addTypes(Exhibits& all) {
+    std::vector<Exhibit> all;
+};
+
+void close(MuseumSpline& curve) { curve->setClosed(true, nullptr); }
+
+void addTypes(Builder& build) {
     for (std::uint32_t const type : museumSegmentTypes()) {
         std::string const name = "type " + std::to_string(type);
-        all.push_back({name, "each way to draw a segment, up, down and level",
-                       [=](MuseumSpline& c) { zigzag(c, type); }});
-        all.push_back({"closed " + name, "the segment behind the last vertex is short, and neighbours wrap",
-                       [=](MuseumSpline& c) {
-                           zigzag(c, type);
-                           c->setClosed(true, nullptr);
-                       }});
-        all.push_back({"parametric " + name, "handles are a third of a tangent and U is the parameter",
-                       [=](MuseumSpline& c) {
-                           c.state->parametric = true;
-                           zigzag(c, type);
-                       }});
+        build.addZigzag(name, type, [](MuseumSpline&) {});
+        // The segment behind the last vertex is short, and neighbours wrap.
+        build.addZigzag("closed " + name, type, close);
+        // Handles are a third of a tangent and U is the parameter.
+        build.addZigzag("parametric " + name, type, [](MuseumSpline& c) { c.state->parametric = true; });
     }
-    all.push_back({"all types in turn", "the type is that of the vertex in front", [](MuseumSpline& c) {
-                       int i = 0;
-                       for (std::uint32_t const type : museumSegmentTypes()) {
-                           key(c, s(i, 3), (i * 7) % 5 - 2.0, type);
-                           ++i;
-                       }
-                       stretchHandles(c, 0.5, -0.4);
-                   }});
+    // One type after the other, plain, and with differences and products near the ends of the doubles.
+    std::vector<double> const values[] = {
+        {-2.0, 0.0, 2.0, -1.0, 1.0}, {1e300, -1e300, 1e300, 1e-300, -1e-300, 0.0}, {1e-300, 3e-308}};
+    for (auto const& cycle : values) {
+        build.add("all types, from " + std::to_string(cycle[0]),
+                  [&types = museumSegmentTypes(), cycle](MuseumSpline& c) {
+                      for (std::size_t i = 0; i < types.size(); ++i) {
+                          key(c, s(static_cast<int>(i), 3), cycle[i % cycle.size()], types[i]);
+                      }
+                      stretchHandles(c, 0.5, -0.4 * std::fabs(cycle[1]));
+                  });
+    }
 }
 
-void addSizes(Exhibits& all) {
-    all.push_back({"empty", "nothing to find", [](MuseumSpline&) {}});
-    all.push_back({"one vertex", "no segment, no range", [](MuseumSpline& c) { key(c, s(2), 5.0); }});
-    all.push_back({"two vertices", "the smallest curve", [](MuseumSpline& c) {
-                       keysAt(c, {s(0), s(1)}, 1);
-                   }});
+void addSizes(Builder& build) {
+    for (int const count : {0, 1, 2}) {
+        build.addKeys(std::to_string(count) + " vertices",
+                      std::vector<Tempus>(static_cast<std::size_t>(count), s(2)), 1);
+    }
+    build.addKeys("the smallest curve", {s(0), s(1)}, 1);
+    // Several blocks of the store.
     for (int const count : {300, 600, 5000}) {
-        all.push_back({std::to_string(count) + " vertices", "several blocks of the store",
-                       [=](MuseumSpline& c) { many(c, count); }});
+        build.add(std::to_string(count) + " vertices", [=](MuseumSpline& c) { many(c, count); });
     }
     for (std::uint32_t const type : {1u, 4u, 6u, 15u}) {
-        std::string const name = ", type " + std::to_string(type);
-        all.push_back(
-            {"shortest spans" + name, "a tick apart, and below the least duration of a cubic segment",
-             [=](MuseumSpline& c) {
-                 keysAt(c, {s(0), s(1, 3000000), s(2, 3000000), s(30, 3000000), s(31, 3000000), s(1, 10)},
-                        type);
-             }});
-        all.push_back({"longest spans" + name, "ten hours of film between two frames", [=](MuseumSpline& c) {
-                           keysAt(c,
-                                  {s(0), s(1001, 24000), s(std::int64_t{863136} * 1001, 24000),
-                                   s(std::int64_t{863137} * 1001, 24000),
-                                   s(std::int64_t{5000000} * 1001, 24000)},
-                                  type);
-                       }});
+        // A tick apart, and below the least duration of a cubic segment; ten hours of film between two frames.
+        int const fine = 3000000;
+        std::int64_t const frame = 1001;
+        build.addKeys("shortest spans, type " + std::to_string(type),
+                      {s(0), s(1, fine), s(2, fine), s(30, fine), s(31, fine), s(1, 10)}, type);
+        build.addKeys("longest spans, type " + std::to_string(type),
+                      {s(0), s(frame, 24000), s(863136 * frame, 24000), s(863137 * frame, 24000),
+                       s(5000000 * frame, 24000)},
+                      type);
     }
-    all.push_back({"huge values", "products of values near the end of the doubles", [](MuseumSpline& c) {
-                       double const values[] = {1e300, -1e300, 1e300, 1e-300, -1e-300, 0.0, 1e300};
-                       int i = 0;
-                       for (std::uint32_t const type : museumSegmentTypes()) {
-                           key(c, s(i, 2), values[i % 7], type);
-                           ++i;
-                       }
-                   }});
-    all.push_back({"tiny values", "differences at the start of the doubles", [](MuseumSpline& c) {
-                       int i = 0;
-                       for (std::uint32_t const type : museumSegmentTypes()) {
-                           key(c, s(i, 2), i % 2 == 0 ? 1e-300 : 3e-308, type);
-                           ++i;
-                       }
-                   }});
 }
 
-void addHandles(Exhibits& all) {
+void addHandles(Builder& build) {
+    // The handles of one segment: out (a, b) and in (c, d).
     struct Shape {
-        char const *name, *why;
+        char const* name;
         double a, b, c, d;
     };
     Shape const shapes[] = {
-        {"flat handles", "no tangents: a cubic in U too", 0.0, 0.0, 0.0, 0.0},
-        {"handles at thirds", "U is the parameter itself", 1.0 / 3.0, 4.0, -1.0 / 3.0, 2.0},
-        {"handles nearly at thirds", "a leading coefficient that counts as none", 1.0 / 3.0 + 1e-9, 4.0,
-         -1.0 / 3.0, 2.0},
-        {"gentle handles", "two steps find the parameter", 0.3, 1.0, -0.4, 1.0},
-        {"short handles", "three steps find the parameter", 0.15, 1.0, -0.2, -1.0},
-        {"free handles", "a steep curve that needs a search", 0.8, -3.0, -0.7, 6.0},
-        {"vertical handle at the start", "the slope at the vertex is infinite", 0.0, 3.0, -0.3, 0.0},
-        {"vertical handle at the end", "the slope at the vertex is infinite", 0.5, 0.0, 0.0, -7.0},
-        {"vertical in the middle", "U stands still at one parameter", 1.0, 0.5, -1.0, 0.5},
-        {"handles past the neighbours", "shortened, in U and V, so that time doesn't fold", 2.5, 4.0, -1.7,
-         1.0},
-        {"one handle past its neighbour", "shortened by a very unequal pair", 3.9, -2.0, -0.01, 1.0},
+        {"flat handles", 0.0, 0.0, 0.0, 0.0},
+        {"handles at thirds", 1.0 / 3.0, 4.0, -1.0 / 3.0, 2.0},
+        {"handles nearly at thirds", 1.0 / 3.0 + 1e-9, 4.0, -1.0 / 3.0, 2.0},
+        // Each finds the parameter by another method.
+        {"gentle handles", 0.3, 1.0, -0.4, 1.0},
+        {"short handles", 0.15, 1.0, -0.2, -1.0},
+        {"free handles", 0.8, -3.0, -0.7, 6.0},
+        {"vertical handle at the start", 0.0, 3.0, -0.3, 0.0},
+        {"vertical handle at the end", 0.5, 0.0, 0.0, -7.0},
+        {"vertical in the middle", 1.0, 0.5, -1.0, 0.5},
+        // Shortened, in U and V, so that time doesn't fold.
+        {"handles past the neighbours", 2.5, 4.0, -1.7, 1.0},
+        {"one handle past its neighbour", 3.9, -2.0, -0.01, 1.0},
     };
     for (Shape const& shape : shapes) {
-        all.push_back({shape.name, shape.why,
-                       [=](MuseumSpline& c) { oneSegment(c, shape.a, shape.b, shape.c, shape.d); }});
+        build.add(shape.name, [=](MuseumSpline& c) { oneSegment(c, shape.a, shape.b, shape.c, shape.d); });
     }
-    all.push_back({"a fold", "the same, left to fold back in time", [](MuseumSpline& c) {
-                       c.state->sanitizeBezier = false;
-                       oneSegment(c, 2.5, 4.0, -1.7, 1.0);
-                   }});
-    all.push_back({"S of neighbours", "tangents that come from far and near vertices", [](MuseumSpline& c) {
-                       keysAt(c, {s(0), s(10), s(101, 10), s(103, 10), s(30)}, kKFInterpolationCatmullRom);
-                   }});
-    all.push_back(
-        {"derived tangents", "as a user sets keys: tangents follow from the neighbours", [](MuseumSpline& c) {
-             c.state->deriveTangents = true;
-             c.state->interpolation = kKFInterpolationBezier;
-             for (int const frame : {30, 0, 12, 90, 48, 47, 60}) {
-                 c->addVertex(s(frame, 24), std::sin(frame * 0.1), kTempusZero, true);
-             }
-         }});
+    build.add("a fold", [](MuseumSpline& c) {
+        c.state->sanitizeBezier = false;
+        oneSegment(c, 2.5, 4.0, -1.7, 1.0);
+    });
+    // Tangents that come from far and near vertices.
+    build.addKeys("S of neighbours", {s(0), s(10), s(101, 10), s(103, 10), s(30)},
+                  kKFInterpolationCatmullRom);
+    build.add("derived tangents", [](MuseumSpline& c) {
+        c.state->deriveTangents = true;
+        c.state->interpolation = kKFInterpolationBezier;
+        for (int const frame : {30, 0, 12, 90, 48, 47, 60}) {
+            c->addVertex(s(frame, 24), std::sin(frame * 0.1), kTempusZero, true);
+        }
+    });
 }
 
-void addPlaces(Exhibits& all) {
+void addPlaces(Builder& build) {
+    // Of several at one place the first counts there, the last behind.
     for (std::uint32_t const type : {1u, 4u, 6u}) {
-        all.push_back({"several at one place, type " + std::to_string(type),
-                       "the first counts there, the last behind", [=](MuseumSpline& c) {
-                           keysAt(c, {s(0), s(0), s(1), s(1), s(1), s(2), s(3), s(3)}, type);
-                           disable(c, {2});
-                           museumVertices(*c)[3]->setInterpolation(kKFInterpolationEaseIn);
-                       }});
+        build.add("several at one place, type " + std::to_string(type), [=](MuseumSpline& c) {
+            keysAt(c, {s(0), s(0), s(1), s(1), s(1), s(2), s(3), s(3)}, type);
+            disable(c, {2});
+            museumVertices(*c)[3]->setInterpolation(kKFInterpolationEaseIn);
+        });
     }
-    all.push_back({"all at one place", "no range though several vertices", [](MuseumSpline& c) {
-                       keysAt(c, {s(1), s(1), s(1)}, 1);
-                   }});
-    struct Absent {
-        char const* name;
-        std::vector<std::size_t> indices;
-    };
-    Absent const absents[] = {{"first disabled", {0}},
-                              {"middle disabled", {2, 3}},
-                              {"last disabled", {6}},
-                              {"only one enabled", {0, 1, 2, 4, 5, 6}},
-                              {"all disabled", {0, 1, 2, 3, 4, 5, 6}}};
-    for (Absent const& absent : absents) {
-        for (bool const closed : {false, true}) {
-            all.push_back({(closed ? "closed, " : "") + std::string(absent.name),
-                           "the curve passes by what is disabled", [=](MuseumSpline& c) {
-                               zigzag(c, kKFInterpolationCatmullRom);
-                               disable(c, absent.indices);
-                               if (closed) {
-                                   c->setClosed(true, nullptr);
-                               }
-                           }});
-        }
+    std::vector<std::size_t> const absents[] = {{0}, {2, 3}, {6}, {0, 1, 2, 4, 5, 6}, {0, 1, 2, 3, 4, 5, 6}};
+    for (auto const& absent : absents) {
+        std::string const name =
+            std::to_string(absent.size()) + " disabled from " + std::to_string(absent[0]);
+        auto const change = [absent](MuseumSpline& c) { disable(c, absent); };
+        build.addZigzag(name, kKFInterpolationCatmullRom, change);
+        build.addZigzag("closed, " + name, kKFInterpolationCatmullRom, [=](MuseumSpline& c) {
+            change(c);
+            close(c);
+        });
     }
-    all.push_back({"locked", "the lock of vertices doesn't change what is read", [](MuseumSpline& c) {
-                       zigzag(c, kKFInterpolationBezier);
-                       c->lockSpline(true);
-                   }});
-    all.push_back(
-        {"mixed timescales", "a common timescale of all positions fits", [](MuseumSpline& c) {
-             keysAt(c,
-                    {s(1001, 30000), s(1, 24), s(100000, 262144), s(48000, 90000), s(44100, 44100), s(7, 6)},
-                    4);
-         }});
-    all.push_back(
-        {"incommensurable", "no common timescale fits: positions are compared exactly", [](MuseumSpline& c) {
-             std::int32_t const primes[] = {2147483647, 2147483629, 2147483587, 2147483579, 2147483563};
-             std::vector<Tempus> positions;
-             for (std::int32_t const prime : primes) {
-                 positions.push_back(s(static_cast<std::int64_t>(positions.size()) * prime + 1, prime));
-             }
-             keysAt(c, positions, 4);
-         }});
-    all.push_back({"two large primes",
-                   "a common timescale fits, but not with that of most positions asked for",
-                   [](MuseumSpline& c) {
-                       keysAt(c, {s(1, 2147483647), s(2147483629, 2147483629), s(2)}, 15);
-                   }});
-    all.push_back(
-        {"negative times", "before zero, with a vertex at zero", [](MuseumSpline& c) {
-             keysAt(c, {s(-1001 * 99, 30000), s(-5, 3), s(-1, 2147483647), s(0), s(0), s(1, 24)}, 4);
-         }});
-    all.push_back({"ages", "positions whose ticks overflow in finer timescales", [](MuseumSpline& c) {
-                       keysAt(c,
-                              {s(-(std::int64_t{1} << 45)), s(0), s(std::int64_t{1} << 45),
-                               s((std::int64_t{1} << 61) - 3)},
-                              7);
-                   }});
-    all.push_back({"fine and long", "a segment of more ticks than a double counts", [](MuseumSpline& c) {
-                       keysAt(c, {s(1, 2147483647), s(9000000), s(9000001)}, 8);
-                   }});
+    build.addZigzag("locked", kKFInterpolationBezier, [](MuseumSpline& c) { c->lockSpline(true); });
+    build.addKeys("mixed timescales",
+                  {s(1001, 30000), s(1, 24), s(100000, 262144), s(48000, 90000), s(44100, 44100), s(7, 6)},
+                  4);
+    // No common timescale fits, so that positions are compared exactly; or one that fits few positions asked for.
+    std::int32_t const primes[] = {2147483647, 2147483629, 2147483587, 2147483579, 2147483563};
+    std::vector<Tempus> positions;
+    for (std::int32_t const prime : primes) {
+        positions.push_back(s(static_cast<std::int64_t>(positions.size()) * prime + 1, prime));
+    }
+    build.addKeys("incommensurable", positions, 4);
+    build.addKeys("two large primes", {s(1, primes[0]), s(primes[1], primes[1]), s(2)}, 15);
+    build.addKeys("negative times", {s(-1001 * 99, 30000), s(-5, 3), s(-1, primes[0]), s(0), s(0), s(1, 24)},
+                  4);
+    // Positions whose ticks overflow in finer timescales, and a segment of more ticks than a double counts.
+    std::int64_t const age = std::int64_t{1} << 45;
+    build.addKeys("ages", {s(-age), s(0), s(age), s((std::int64_t{1} << 61) - 3)}, 7);
+    build.addKeys("fine and long", {s(1, primes[0]), s(9000000), s(9000001)}, 8);
 }
 
-void addWholeCurves(Exhibits& all) {
+void addWholeCurves(Builder& build) {
     for (std::uint32_t const type : {10u, 12u}) {
-        for (bool const closed : {false, true}) {
-            std::string const name =
-                (closed ? "closed " : "open ") + std::string(type == 10 ? "B-spline" : "X-spline");
-            for (int const count : {1, 3, 9}) {
-                all.push_back({name + " of " + std::to_string(count), "one function of all control points",
-                               [=](MuseumSpline& c) { controlPoints(c, type, count, closed); }});
-            }
-            all.push_back({name + " under a plain state", "drawn segment by segment, each as the whole",
-                           [=](MuseumSpline& c) {
-                               controlPoints(c, type, 6, closed);
-                               c.state->interpolation = kKFInterpolationLinear;
-                           }});
-            all.push_back({name + " with a vertex disabled", "control points are the valid vertices",
-                           [=](MuseumSpline& c) {
-                               controlPoints(c, type, 7, closed);
-                               disable(c, {0, 3});
-                           }});
-        }
         std::string const number = "type " + std::to_string(type);
-        all.push_back({number + " inside", "meaningless on a curve over time, but it must not spread",
-                       [=](MuseumSpline& c) {
-                           zigzag(c, kKFInterpolationLinear);
-                           museumVertices(*c)[3]->setInterpolation(type);
-                       }});
-        all.push_back(
-            {number + " at the ends", "the range is asked of the types at the ends", [=](MuseumSpline& c) {
-                 zigzag(c, kKFInterpolationLinear);
-                 auto const vertices = museumVertices(*c);
-                 vertices.front()->setInterpolation(type);
-                 vertices.back()->setInterpolation(type);
-             }});
-        all.push_back({"state of " + number, "a state whose type no vertex has", [=](MuseumSpline& c) {
-                           c.state->interpolation = type;
-                           c.state->parametric = true;
-                           zigzag(c, kKFInterpolationEaseOut);
-                       }});
+        for (bool const closed : {false, true}) {
+            std::string const name = (closed ? "closed whole " : "open whole ") + number;
+            for (int const count : {1, 3, 9}) {
+                build.add(name + " of " + std::to_string(count),
+                          [=](MuseumSpline& c) { controlPoints(c, type, count, closed); });
+            }
+            // Drawn segment by segment, each as the whole.
+            build.add(name + " under a plain state", [=](MuseumSpline& c) {
+                controlPoints(c, type, 6, closed);
+                c.state->interpolation = kKFInterpolationLinear;
+            });
+            build.add(name + " with a vertex disabled", [=](MuseumSpline& c) {
+                controlPoints(c, type, 7, closed);
+                disable(c, {0, 3});
+            });
+        }
+        // Meaningless on a curve over time, but it must not spread.
+        build.addZigzag(number + " inside", kKFInterpolationLinear,
+                        [=](MuseumSpline& c) { museumVertices(*c)[3]->setInterpolation(type); });
+        // The range is asked of the types at the ends.
+        build.addZigzag(number + " at the ends", kKFInterpolationLinear, [=](MuseumSpline& c) {
+            auto const vertices = museumVertices(*c);
+            vertices.front()->setInterpolation(type);
+            vertices.back()->setInterpolation(type);
+        });
+        build.addZigzag("state of " + number, kKFInterpolationEaseOut, [=](MuseumSpline& c) {
+            c.state->interpolation = type;
+            c.state->parametric = true;
+        });
     }
 }
 
-void addExtrapolations(Exhibits& all) {
+void addExtrapolations(Builder& build) {
     for (std::uint32_t const mode : {0u, 1u, 2u, 3u, 4u, 9u}) {
         for (bool const retiming : {false, true}) {
             std::string const name = (retiming ? "retimed mode " : "mode ") + std::to_string(mode);
@@ -349,19 +304,16 @@ void addExtrapolations(Exhibits& all) {
                 c.state->preExtrapolation = mode;
                 c.state->postExtrapolation = mode;
             };
-            all.push_back({name, "how the curve goes on outside", [=](MuseumSpline& c) {
-                               zigzag(c, kKFInterpolationBezier);
-                               set(c);
-                           }});
-            all.push_back({name + ", short", "a curve shorter than the step and the reach of a slope",
-                           [=](MuseumSpline& c) {
-                               keysAt(c, {s(1), s(1001, 1000), s(1004, 1000)}, kKFInterpolationLinear);
-                               set(c);
-                           }});
-            all.push_back({name + ", ends shared", "several vertices at each end", [=](MuseumSpline& c) {
-                               keysAt(c, {s(0), s(0), s(1), s(2), s(2)}, kKFInterpolationEase);
-                               set(c);
-                           }});
+            build.addZigzag(name, kKFInterpolationBezier, set);
+            // A curve shorter than the step and the reach of a slope; several vertices at each end.
+            build.add(name + ", short", [=](MuseumSpline& c) {
+                keysAt(c, {s(1), s(1001, 1000), s(1004, 1000)}, kKFInterpolationLinear);
+                set(c);
+            });
+            build.add(name + ", ends shared", [=](MuseumSpline& c) {
+                keysAt(c, {s(0), s(0), s(1), s(2), s(2)}, kKFInterpolationEase);
+                set(c);
+            });
         }
     }
 }
@@ -385,14 +337,12 @@ MuseumSpline Exhibit::build() const {
 
 std::vector<Exhibit> const& museum() {
     static std::vector<Exhibit> const exhibits = [] {
-        Exhibits all;
-        addSizes(all);
-        addTypes(all);
-        addHandles(all);
-        addPlaces(all);
-        addWholeCurves(all);
-        addExtrapolations(all);
-        return all;
+        Builder build;
+        for (auto* const add :
+             {addSizes, addTypes, addHandles, addPlaces, addWholeCurves, addExtrapolations}) {
+            add(build);
+        }
+        return build.all;
     }();
     return exhibits;
 }
@@ -434,9 +384,8 @@ std::vector<Tempus> museumPositions(KFSpline& spline) {
             for (double const part : parts) {
                 positions.push_back(u + span * part);
             }
-            for (Tempus const& grid : grids) {
+            for (Tempus const& grid : grids)
                 positions.push_back(BX_TempusFloorToSampleDuration(u + span * 0.61, grid));
-            }
             positions.push_back(u + span * s(1, 2));
             positions.push_back(
                 KFChronoForChannelSeconds(TempusGetSeconds(u + span * 0.29), kKFChannelTimescale));
@@ -454,16 +403,6 @@ std::vector<Tempus> museumPositions(KFSpline& spline) {
 }
 
 std::string museumText(Tempus const& t) {
-    switch (TempusGetKind(t)) {
-    case TempusKind::Number:
-        return std::to_string(t.value) + "/" + std::to_string(t.timescale);
-    case TempusKind::NegativeInfinity:
-        return "-infinity";
-    case TempusKind::PositiveInfinity:
-        return "+infinity";
-    case TempusKind::Indefinite:
-        return "indefinite";
-    default:
-        return "invalid";
-    }
+    return TempusIsNumeric(t) ? std::to_string(t.value) + "/" + std::to_string(t.timescale)
+                              : "kind " + std::to_string(static_cast<int>(TempusGetKind(t)));
 }

@@ -1,4 +1,5 @@
-// Named curves, each there for a reason. Properties run over all of them, so that a new exhibit tests everything.
+// Named curves, each there for a reason that its builder tells. Properties run over all of them, so that a new
+// exhibit tests everything.
 #pragma once
 
 #include "lumenkey/splines/KFSpline.h"
@@ -34,7 +35,6 @@ struct MuseumSpline {
 
 struct Exhibit {
     std::string name;
-    std::string why;
     std::function<void(MuseumSpline&)> fill;
 
     MuseumSpline build() const;
