@@ -44,7 +44,9 @@ void KFSpline::interpolate(Tempus const& t, void* vA, void* vB, Tempus const& u,
     *out = strategy->interpolate(*this, t, vA, vB, u, getState()->parametric, derivative);
 }
 
-double KFSpline::getVertexValue(Tempus const& u, Tempus const& t, bool lock) {
+// The two functions that reading a point spends its time in are flattened: their calls cost as much as what they call.
+
+[[gnu::flatten]] double KFSpline::getVertexValue(Tempus const& u, Tempus const& t, bool lock) {
     // One position after another in one segment is what happens most: the thread has all that it needs.
     std::uint64_t const version = _store->acquiredVersion();
     KFSegmentPlace& place = KFThreadSegments::placeOf(version);
@@ -57,7 +59,7 @@ double KFSpline::getVertexValue(Tempus const& u, Tempus const& t, bool lock) {
     return lock ? readUnderLock(u, t, place) : readWithoutLock(u, t, place);
 }
 
-double KFSpline::readUnderLock(Tempus const& u, Tempus const& t, KFSegmentPlace& place) {
+[[gnu::noinline]] double KFSpline::readUnderLock(Tempus const& u, Tempus const& t, KFSegmentPlace& place) {
     double value = 0.0;
     bool wholeCurve = false;
     BXSpinLock& held = guard();
@@ -71,7 +73,7 @@ double KFSpline::readUnderLock(Tempus const& u, Tempus const& t, KFSegmentPlace&
     return wholeCurve ? valueOfWholeCurve(u, t, true) : value;
 }
 
-double KFSpline::readWithoutLock(Tempus const& u, Tempus const& t, KFSegmentPlace& place) {
+[[gnu::noinline]] double KFSpline::readWithoutLock(Tempus const& u, Tempus const& t, KFSegmentPlace& place) {
     KFSegmentCache own;
     double value = 0.0;
     if (evaluateAndKeep(u, place, own, &value))
@@ -240,7 +242,8 @@ bool KFSpline::evaluateIndexed(Tempus const& u, KFSegmentCache& cache, double* o
 
 /// A vertex exactly at `position` gives its own value; else the cache moves to the segment around it. False outside
 /// the valid vertices, and where the walk must decide.
-bool KFSpline::evaluateAtVertexOrMove(std::int64_t position, KFSegmentCache& cache, double* out) {
+[[gnu::flatten]] bool KFSpline::evaluateAtVertexOrMove(std::int64_t position, KFSegmentCache& cache,
+                                                       double* out) {
     KFVertexStore const& store = *_store;
     auto const end = placeAtOrAfter(position, cache);
     if (end == store.end())
@@ -403,7 +406,8 @@ void takeCubic(double const* polygonU, double const* polygonV, KFSegmentCache& c
     return true;
 }
 
-bool KFSpline::prepareCatmullRom(KFVertexIterator start, KFVertexIterator end, KFSegmentCache& cache) {
+[[gnu::noinline]] bool KFSpline::prepareCatmullRom(KFVertexIterator start, KFVertexIterator end,
+                                                   KFSegmentCache& cache) {
     KFVertexStore const& store = *_store;
     double const span = cache.width / cache.scale.stepsPerSecond;
     if (!(span > KFShape::kShortestCurve))
