@@ -59,7 +59,7 @@ LUMENKEY_API int cubic(double a, double b, double c, double& r1, double& r2, dou
 class EaseInOut {
 public:
     /// A move at constant speed.
-    EaseInOut() noexcept = default;
+    constexpr EaseInOut() noexcept = default;
     EaseInOut(double in, double out) noexcept : _in(in > 0.0 ? in : 0.0), _out(out > 0.0 ? out : 0.0) {
         if (double const ramps = _in + _out; ramps > 1.0) {
             _in = std::min(_in / ramps, 1.0);

@@ -27,11 +27,6 @@ public:
     void set(Value value) noexcept { _value.store(value, std::memory_order_relaxed); }
     operator Value() const noexcept { return get(); }
 
-    /// A write that brings along what this thread wrote before, and the read that takes all of it: for a number that
-    /// says that others have changed.
-    void release(Value value) noexcept { _value.store(value, std::memory_order_release); }
-    Value getAcquired() const noexcept { return _value.load(std::memory_order_acquire); }
-
 private:
     std::atomic<Value> _value;
 };

@@ -21,6 +21,12 @@ struct KFStepScale {
 
     /// False, and unusable, when R doesn't stay below 2^53, up to where doubles hold all whole numbers.
     bool prepare(std::int64_t tickScaleIn, std::int32_t timescaleIn) noexcept;
+
+    /// A position asked for, in steps; false for one of another timescale, and for what is no plain number.
+    bool stepsOf(Tempus const& u, std::int64_t* position) const noexcept {
+        return u.timescale == timescale && u.flags == kTempusFlagValid && u.epoch == 0 &&
+               !__builtin_mul_overflow(u.value, perUnit, position);
+    }
 };
 
 /// What evaluation computed about one segment between two static vertices, so that the next position in it needs no
@@ -29,7 +35,8 @@ struct KFStepScale {
 /// It is current while the store's version, the settings and the revisions of the vertices that it depends on are
 /// those that it names. Which positions it is asked for in which order never changes an answer.
 ///
-/// Threads: whoever uses a cache owns it or holds the lock that guards it.
+/// Threads: whoever uses a cache owns it or holds the lock that guards it. The revisions may be compared only while the
+/// vertices are certain to be there, under the spline's lock; see `KFThreadSegments` for who doesn't hold it.
 struct KFSegmentCache {
     enum class Kind : std::uint8_t { None, Constant, Linear, Cubic, ParametricCubic, Eased, Shape };
 
@@ -43,9 +50,14 @@ struct KFSegmentCache {
             revision = from->getRevision();
         }
         bool stands() const noexcept { return vertex->getRevision() == revision; }
+        bool watch() const noexcept { return vertex->watch() == revision; }
     };
 
     KFStepScale scale;
+    /// Positions of vA and vB, and the distance between them.
+    std::int64_t low = 0;
+    std::int64_t high = 0;
+    double width = 0.0;
 
     Kind kind = Kind::None;
     bool parametric = false;
@@ -54,22 +66,20 @@ struct KFSegmentCache {
     std::uint32_t defaultType = 0;
     std::uint32_t type = 0;
     std::uint64_t version = 0;
-    /// `KFStaticVertex::getWholeCurveChanges` when the types of the spline's ends let the index serve.
+    /// `KFStaticVertex::getWatchedChanges` and `getWholeCurveChanges` before anything else was read.
+    std::uint64_t watchedChanges = 0;
     std::uint32_t wholeCurveChanges = 0;
+
+    double a = 0.0;
+    double b = 0.0;
+    KFCubic value;
+    KFCubicInverse parameter;
+    BXMath::EaseInOut easing;
+
     Reading vertexA, vertexB;
     /// The vertices beyond the ends, for a shape that depends on them.
     Reading beforeA, afterB;
     KFVertexIterator placeOfB;
-
-    /// Positions of vA and vB, and the distance between them.
-    std::int64_t low = 0;
-    std::int64_t high = 0;
-    double width = 0.0;
-    double a = 0.0;
-    double b = 0.0;
-    BXMath::EaseInOut easing;
-    KFCubicInverse parameter;
-    KFCubic value;
 
     /// Strictly between the two ends.
     bool holds(std::int64_t position) const noexcept { return low < position && position < high; }
@@ -80,8 +90,22 @@ struct KFSegmentCache {
                (!dependsOnNeighbours || (beforeA.stands() && afterB.stands()));
     }
 
+    void forget() noexcept {
+        kind = Kind::None;
+        version = 0;
+    }
+
+    /// Has the vertices say of their next change that they were watched. A segment whose vertices have changed since it
+    /// was prepared is forgotten.
+    void watch() noexcept {
+        bool const stands = kind != Kind::None && vertexA.watch() && vertexB.watch() &&
+                            (!dependsOnNeighbours || (beforeA.watch() && afterB.watch()));
+        if (!stands)
+            forget();
+    }
+
     /// The value at a position that the segment holds.
-    double valueAt(std::int64_t position) const noexcept {
+    [[gnu::always_inline]] double valueAt(std::int64_t position) const noexcept {
         if (kind == Kind::Constant)
             return a;
         double const p = static_cast<double>(position - low) / width;

@@ -119,10 +119,6 @@ std::size_t KFSpline::getNumberOfVertices() const noexcept { return _store->size
 
 std::size_t KFSpline::getStoreBytes() const noexcept { return _store->bytes(); }
 
-bool KFSpline::isWholeCurve(std::uint32_t type) const noexcept {
-    return type == kKFInterpolationBSpline || type == kKFInterpolationXSpline;
-}
-
 Tempus KFSpline::getStep() {
     KFSplineState const& state = *getState();
     if (state.parametric)

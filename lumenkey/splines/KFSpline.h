@@ -21,6 +21,7 @@ class KFCustomInterpolator;
 class KFVertex;
 class KFVertexStore;
 struct KFSegmentCache;
+struct KFSegmentPlace;
 
 /// An ordered store of vertices with everything needed to evaluate it.
 ///
@@ -44,7 +45,9 @@ struct KFSegmentCache;
 /// owner's `_customLock` when there is one, else the spline's own. Each block of operations below says whether its
 /// operations take the lock; an argument named `lock` says whether to take it. Operations that don't take it are for
 /// callers that hold it, or that know that no other thread edits. `preSplineAccess` and `postSplineAccess` hold it
-/// around several calls.
+/// around several calls. `getVertexValue` asked to take the lock may do without: a thread that reads on in one segment
+/// keeps what it computed about it, and goes on with that as long as nothing has changed that the value depends on. It
+/// sees every edit that was over before, and never half of one.
 ///
 /// Cost. Vertices stand in blocks with their positions beside them as 64-bit ticks of a common timescale, so finding,
 /// adding and removing one costs O(log n), evaluation at ascending positions O(1) and allocates nothing.
@@ -417,7 +420,9 @@ private:
     void* vertexWithNormalAt(Tempus const& u, Tempus const& t);
     template <class Offers, class Better>
     double extremeV(double start, Tempus const& t, Tempus* atU, Offers offers, Better better);
-    bool isWholeCurve(std::uint32_t type) const noexcept;
+    static bool isWholeCurve(std::uint32_t type) noexcept {
+        return type == kKFInterpolationBSpline || type == kKFInterpolationXSpline;
+    }
     std::uint32_t commonInterpolation();
 
     // Evaluation (KFSplineEvaluate.cpp). The caller holds the lock or knows that no other thread edits.
@@ -427,11 +432,15 @@ private:
     double valueOfWholeCurve(Tempus const& u, Tempus const& t, bool lock);
     double evaluateByWalk(Tempus const& u, Tempus const& t);
     bool evaluateBetween(Tempus const& u, Tempus const& t, double* result);
-    double valueFromLock(Tempus const& u, Tempus const& t, BXSpinLock& held);
-    double valueWithoutLock(Tempus const& u, Tempus const& t);
+    double readUnderLock(Tempus const& u, Tempus const& t, KFSegmentPlace& place);
+    double readWithoutLock(Tempus const& u, Tempus const& t, KFSegmentPlace& place);
+    bool evaluateAndKeep(Tempus const& u, KFSegmentPlace& place, KFSegmentCache& instead, double* out);
     bool indexServes() const noexcept;
+    bool indexStillServes(KFSegmentCache const& cache) const noexcept;
     bool evaluateIndexed(Tempus const& u, KFSegmentCache& cache, double* out);
+    bool settingsStand(KFSegmentCache const& cache) const noexcept;
     bool segmentStands(KFSegmentCache const& cache) const noexcept;
+    bool segmentStandsWithoutLock(KFSegmentCache const& cache, std::uint64_t version) const noexcept;
     bool evaluateAtVertexOrMove(std::int64_t position, KFSegmentCache& cache, double* out);
     KFVertexIterator placeAtOrAfter(std::int64_t position, KFSegmentCache const& cache) const noexcept;
     bool valueAtVertex(KFVertexIterator place, double* out) const;
@@ -465,7 +474,7 @@ private:
     std::unique_ptr<KFInterpolators> _interpolators;
     std::atomic<KFSplineOwner*> _node{nullptr};
     std::atomic<KFSplineState*> _state;
-    /// What the last evaluation under the lock computed about its segment.
+    /// What the last evaluation under the lock computed about its segment, for threads that have no place for it.
     std::unique_ptr<KFSegmentCache> _segment;
     bool _staticVertices = true;
     /// What `commonInterpolation` found last, and of what: see there.

@@ -16,6 +16,7 @@
 #include "lumenkey/splines/KFSplineInterpolator.h"
 #include "lumenkey/splines/KFSplineOwner.h"
 #include "lumenkey/splines/KFStaticVertex.h"
+#include "lumenkey/splines/KFThreadSegments.h"
 #include "lumenkey/splines/KFVertexStore.h"
 
 namespace {
@@ -43,36 +44,27 @@ void KFSpline::interpolate(Tempus const& t, void* vA, void* vB, Tempus const& u,
     *out = strategy->interpolate(*this, t, vA, vB, u, getState()->parametric, derivative);
 }
 
-double KFSpline::getVertexValue(Tempus const& u, Tempus const& t, bool lock) {
-    if (!lock)
-        return valueWithoutLock(u, t);
-    BXSpinLock& held = guard();
-    held.lock();
-    // One position after another in one segment is what happens most: it is told apart by comparisons alone.
-    KFSegmentCache const& segment = *_segment;
+// The two functions that reading a point spends its time in are flattened: their calls cost as much as what they call.
+
+[[gnu::flatten]] double KFSpline::getVertexValue(Tempus const& u, Tempus const& t, bool lock) {
+    // One position after another in one segment is what happens most: the thread has all that it needs.
+    std::uint64_t const version = _store->acquiredVersion();
+    KFSegmentPlace& place = KFThreadSegments::placeOf(version);
+    KFSegmentCache const& segment = place.segment;
     std::int64_t position = 0;
-    if (u.timescale == segment.scale.timescale && u.flags == kTempusFlagValid && u.epoch == 0 &&
-        !__builtin_mul_overflow(u.value, segment.scale.perUnit, &position) && segment.holds(position) &&
-        segmentStands(segment)) [[likely]] {
-        double const value = segment.valueAt(position);
-        held.unlock();
-        return value;
+    if (segment.scale.stepsOf(u, &position) && segment.holds(position) &&
+        segmentStandsWithoutLock(segment, version)) [[likely]] {
+        return segment.valueAt(position);
     }
-    return valueFromLock(u, t, held);
+    return lock ? readUnderLock(u, t, place) : readWithoutLock(u, t, place);
 }
 
-/// Gives the lock back.
-double KFSpline::valueFromLock(Tempus const& u, Tempus const& t, BXSpinLock& held) {
+[[gnu::noinline]] double KFSpline::readUnderLock(Tempus const& u, Tempus const& t, KFSegmentPlace& place) {
     double value = 0.0;
     bool wholeCurve = false;
-    KFSegmentCache& segment = *_segment;
-    std::int64_t position = 0;
-    bool const moves = u.timescale == segment.scale.timescale && u.flags == kTempusFlagValid &&
-                       u.epoch == 0 && !__builtin_mul_overflow(u.value, segment.scale.perUnit, &position) &&
-                       segmentStands(segment);
-    bool const done =
-        moves ? evaluateAtVertexOrMove(position, segment, &value) : evaluateIndexed(u, segment, &value);
-    if (!done) {
+    BXSpinLock& held = guard();
+    held.lock();
+    if (!evaluateAndKeep(u, place, *_segment, &value)) {
         wholeCurve = drawsWholeCurve();
         if (!wholeCurve)
             value = evaluateByWalk(u, t);
@@ -81,12 +73,25 @@ double KFSpline::valueFromLock(Tempus const& u, Tempus const& t, BXSpinLock& hel
     return wholeCurve ? valueOfWholeCurve(u, t, true) : value;
 }
 
-double KFSpline::valueWithoutLock(Tempus const& u, Tempus const& t) {
+[[gnu::noinline]] double KFSpline::readWithoutLock(Tempus const& u, Tempus const& t, KFSegmentPlace& place) {
     KFSegmentCache own;
     double value = 0.0;
-    if (evaluateIndexed(u, own, &value))
+    if (evaluateAndKeep(u, place, own, &value))
         return value;
     return drawsWholeCurve() ? valueOfWholeCurve(u, t, false) : evaluateByWalk(u, t);
+}
+
+/// Evaluates with the segment that the thread keeps for this spline, or with `instead` while it has no place for one.
+[[gnu::always_inline]] inline bool KFSpline::evaluateAndKeep(Tempus const& u, KFSegmentPlace& place,
+                                                             KFSegmentCache& instead, double* out) {
+    KFSegmentCache* const kept = place.claim(_store->version());
+    if (kept == nullptr)
+        return evaluateIndexed(u, instead, out);
+    bool const done = evaluateIndexed(u, *kept, out);
+    // One of an earlier version names vertices that may be gone.
+    if (kept->version == _store->version())
+        kept->watch();
+    return done;
 }
 
 /// The whole spline is one function of its vertices. Only on a parametric spline whose vertices agree does the
@@ -201,33 +206,46 @@ bool KFSpline::indexServes() const noexcept {
            !isWholeCurve(store.lastValid()->KFVertex::getInterpolation());
 }
 
+/// Whether it did when the cache was prepared, and nothing that decides it has changed since.
+[[gnu::always_inline]] inline bool KFSpline::indexStillServes(KFSegmentCache const& cache) const noexcept {
+    return cache.version == _store->version() && settingsStand(cache) && customInterpolator() == nullptr &&
+           cache.wholeCurveChanges == KFStaticVertex::getWholeCurveChanges();
+}
+
 bool KFSpline::evaluateIndexed(Tempus const& u, KFSegmentCache& cache, double* out) {
+    // Read before what it tells of: a change that comes in between leaves a cache that doesn't stand.
+    std::uint64_t const watchedChanges = KFStaticVertex::getWatchedChanges();
+    std::int64_t position = 0;
+    if (cache.scale.stepsOf(u, &position) && indexStillServes(cache)) {
+        cache.watchedChanges = watchedChanges;
+        if (cache.holds(position) && segmentStands(cache)) {
+            *out = cache.valueAt(position);
+            return true;
+        }
+        return evaluateAtVertexOrMove(position, cache, out);
+    }
     if (!TempusIsNumeric(u) || u.epoch != 0)
         return false;
-    // Read before what it tells of: a change that comes in between leaves a cache that doesn't stand.
-    std::uint32_t const changes = KFStaticVertex::getWholeCurveChanges();
-    if (!indexServes())
+    cache.watchedChanges = watchedChanges;
+    cache.wholeCurveChanges = KFStaticVertex::getWholeCurveChanges();
+    if (!indexServes()) {
+        cache.forget();
         return false;
-    cache.wholeCurveChanges = changes;
+    }
     std::int64_t const tickScale = _store->tickScale();
     if (cache.scale.tickScale != tickScale || cache.scale.timescale != u.timescale) {
         cache.kind = KFSegmentCache::Kind::None;
         if (!cache.scale.prepare(tickScale, u.timescale))
             return false;
     }
-    std::int64_t position = 0;
-    if (__builtin_mul_overflow(u.value, cache.scale.perUnit, &position))
-        return false;
-    if (cache.holds(position) && segmentStands(cache)) {
-        *out = cache.valueAt(position);
-        return true;
-    }
-    return evaluateAtVertexOrMove(position, cache, out);
+    return !__builtin_mul_overflow(u.value, cache.scale.perUnit, &position) &&
+           evaluateAtVertexOrMove(position, cache, out);
 }
 
 /// A vertex exactly at `position` gives its own value; else the cache moves to the segment around it. False outside
 /// the valid vertices, and where the walk must decide.
-bool KFSpline::evaluateAtVertexOrMove(std::int64_t position, KFSegmentCache& cache, double* out) {
+[[gnu::flatten]] bool KFSpline::evaluateAtVertexOrMove(std::int64_t position, KFSegmentCache& cache,
+                                                       double* out) {
     KFVertexStore const& store = *_store;
     auto const end = placeAtOrAfter(position, cache);
     if (end == store.end())
@@ -390,7 +408,8 @@ void takeCubic(double const* polygonU, double const* polygonV, KFSegmentCache& c
     return true;
 }
 
-bool KFSpline::prepareCatmullRom(KFVertexIterator start, KFVertexIterator end, KFSegmentCache& cache) {
+[[gnu::noinline]] bool KFSpline::prepareCatmullRom(KFVertexIterator start, KFVertexIterator end,
+                                                   KFSegmentCache& cache) {
     KFVertexStore const& store = *_store;
     double const span = cache.width / cache.scale.stepsPerSecond;
     if (!(span > KFShape::kShortestCurve))

@@ -10,11 +10,31 @@ inline KFCustomInterpolator* KFSpline::customInterpolator() const noexcept {
     return node == nullptr ? nullptr : node->_customInterpolator.load(std::memory_order_acquire);
 }
 
-/// A segment that was prepared while the index served still stands, and the index still serves.
-[[gnu::always_inline]] inline bool KFSpline::segmentStands(KFSegmentCache const& cache) const noexcept {
+/// While the list of valid vertices holds all enabled ones, at any time, it answers for them; else each is asked.
+inline bool KFSpline::listAnswers() const noexcept {
+    return _staticVertices && _useValidList && _store->validityIsCurrent();
+}
+
+[[gnu::always_inline]] inline bool KFSpline::settingsStand(KFSegmentCache const& cache) const noexcept {
     KFSplineState const& state = *getState();
+    return cache.parametric == state.parametric && cache.sanitizeBezier == state.sanitizeBezier &&
+           cache.defaultType == state.interpolation;
+}
+
+/// A segment that was prepared while the index served still stands, and the index still serves. Under the lock.
+[[gnu::always_inline]] inline bool KFSpline::segmentStands(KFSegmentCache const& cache) const noexcept {
     return cache.kind != KFSegmentCache::Kind::None && cache.version == _store->version() &&
-           cache.parametric == state.parametric && cache.sanitizeBezier == state.sanitizeBezier &&
-           cache.defaultType == state.interpolation && customInterpolator() == nullptr &&
-           cache.readingsStand();
+           settingsStand(cache) && customInterpolator() == nullptr && cache.readingsStand();
+}
+
+/// The same of a segment that the thread keeps; `version` is the store's, acquired.
+[[gnu::always_inline]] inline bool KFSpline::segmentStandsWithoutLock(KFSegmentCache const& cache,
+                                                                      std::uint64_t version) const noexcept {
+    if (cache.version != version || cache.watchedChanges != KFStaticVertex::getWatchedChanges() ||
+        !settingsStand(cache)) {
+        return false;
+    }
+    KFSplineOwner const* const node = getNode();
+    return node == nullptr || (node->_customLock.load(std::memory_order_acquire) == nullptr &&
+                               node->_customInterpolator.load(std::memory_order_acquire) == nullptr);
 }

@@ -3,6 +3,7 @@
 #include "lumenkey/splines/KFInterpolator.h"
 #include "lumenkey/splines/KFSpline.h"
 #include "lumenkey/splines/KFSplineAccess.h"
+#include "lumenkey/splines/KFSplineIndex.h"
 #include "lumenkey/splines/KFVertex.h"
 #include "lumenkey/splines/KFVertexStore.h"
 
@@ -43,11 +44,6 @@ Place enabledBefore(KFVertexStore const& store, Place place, Tempus const& t) {
 }
 
 } // namespace
-
-/// While the list of valid vertices holds all enabled ones, at any time, it answers for them; else each is asked.
-bool KFSpline::listAnswers() const noexcept {
-    return _staticVertices && _useValidList && _store->validityIsCurrent();
-}
 
 // --- Valid vertices ---
 

@@ -21,12 +21,13 @@ bool isWholeCurve(std::uint32_t type) noexcept {
 } // namespace
 
 std::atomic<std::uint32_t> KFStaticVertex::_wholeCurveChanges{0};
+std::atomic<std::uint64_t> KFStaticVertex::_watchedChanges{0};
 
 KFStaticVertex::KFStaticVertex(Tempus const& u, double value) noexcept
-    : KFVertex(u), _enabled(true), _revision(0), _valueV(value), _bias(1.0) {}
+    : KFVertex(u), _enabled(true), _valueV(value), _bias(1.0) {}
 
 KFStaticVertex::KFStaticVertex(KFVertex const* vertex, Tempus const& t)
-    : KFVertex(vertex->getValueU()), _enabled(true), _revision(0), _valueV(vertex->getValueV(t)),
+    : KFVertex(vertex->getValueU()), _enabled(true), _valueV(vertex->getValueV(t)),
       _bias(vertex->getBias(t)) {
     double u = 0.0;
     double v = 0.0;
@@ -126,8 +127,10 @@ bool KFStaticVertex::isFlat() const {
 void KFStaticVertex::setInterpolation(std::uint32_t type) {
     bool const wholeCurve = isWholeCurve(type) || isWholeCurve(KFVertex::getInterpolation());
     KFVertex::setInterpolation(type);
-    if (wholeCurve)
+    if (wholeCurve) {
         _wholeCurveChanges.fetch_add(1, std::memory_order_release);
+        _watchedChanges.fetch_add(1, std::memory_order_release);
+    }
     touch();
 }
 

@@ -48,21 +48,62 @@ public:
     /// Grows with every change of a field that evaluation reads, so that what was computed from the vertex can be
     /// told to be out of date. Meaningful only in comparison with an earlier reading of the same vertex. Who reads it
     /// first and the fields then never takes an old field for one of the new revision.
-    std::uint32_t getRevision() const noexcept { return _revision.getAcquired(); }
+    std::uint32_t getRevision() const noexcept { return _revision.get(); }
     /// Grows whenever any static vertex of the process takes or leaves a type that draws a whole spline as one
     /// function: the types of a spline's ends decide how all of it is evaluated.
     static std::uint32_t getWholeCurveChanges() noexcept {
         return _wholeCurveChanges.load(std::memory_order_acquire);
     }
 
+    /// For who keeps what it computed from a vertex and will not look at the vertex again: from now on each of its
+    /// changes also makes `getWatchedChanges` grow, before the setter returns. Gives `getRevision`.
+    ///
+    /// Who reads `getWatchedChanges`, watches the vertices, finds their revisions to be those with which it read their
+    /// fields, and later finds `getWatchedChanges` to be the same, knows that no vertex has changed in between.
+    std::uint32_t watch() const noexcept { return _revision.watch(); }
+    /// One number for the whole process: grows with each change of a watched vertex, and with `getWholeCurveChanges`.
+    static std::uint64_t getWatchedChanges() noexcept {
+        return _watchedChanges.load(std::memory_order_acquire);
+    }
+
 private:
-    void touch() noexcept { _revision.release(_revision + 1); }
+    /// The number of changes of a vertex, and whether it is watched. Both are one atomic number that is only ever
+    /// exchanged as a whole, so that of a change and a watch that come together one sees the other.
+    class Revision {
+    public:
+        Revision() noexcept = default;
+        Revision(Revision const&) noexcept {} // nobody has seen the copy yet
+
+        std::uint32_t get() const noexcept { return _bits.load(std::memory_order_acquire) / kStep; }
+        std::uint32_t watch() const noexcept {
+            std::uint32_t bits = _bits.load(std::memory_order_acquire);
+            if ((bits & kWatched) == 0)
+                bits = _bits.fetch_or(kWatched, std::memory_order_acq_rel);
+            return bits / kStep;
+        }
+        /// True when it is watched.
+        bool advance() noexcept {
+            return (_bits.fetch_add(kStep, std::memory_order_acq_rel) & kWatched) != 0;
+        }
+
+    private:
+        static constexpr std::uint32_t kWatched = 1;
+        static constexpr std::uint32_t kStep = 2;
+
+        mutable std::atomic<std::uint32_t> _bits{0};
+    };
+
+    void touch() noexcept {
+        if (_revision.advance())
+            _watchedChanges.fetch_add(1, std::memory_order_release);
+    }
     bool isGuarded() const noexcept { return (KFVertex::getFlags() & kKFVertexFlagLocked) != 0; }
 
     static std::atomic<std::uint32_t> _wholeCurveChanges;
+    static std::atomic<std::uint64_t> _watchedChanges;
 
     BXRelaxed<bool> _enabled;
-    BXRelaxed<std::uint32_t> _revision;
+    Revision _revision;
     BXRelaxed<double> _valueV;
     BXRelaxed<double> _bias;
     BXRelaxed<double> _inputTangentU;

@@ -42,8 +42,6 @@ void KFVertex::setDefaultAtCurrentTime(Tempus const&) {}
 
 void KFVertex::setInterpolation(std::uint32_t type) { _interpolation = type; }
 
-std::uint32_t KFVertex::getInterpolation() const { return _interpolation; }
-
 void KFVertex::updateBias() {}
 
 void KFVertex::enableBehavior(bool) {}

@@ -127,3 +127,5 @@ private:
 inline Tempus KFVertex::getValueU() const noexcept {
     return Tempus{_valueUValue, _valueUTimescale, _valueUFlags, _valueUEpoch};
 }
+
+inline std::uint32_t KFVertex::getInterpolation() const { return _interpolation; }

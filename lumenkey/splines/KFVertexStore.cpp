@@ -16,9 +16,8 @@ std::int64_t tickOf(std::int64_t tick) noexcept { return tick; }
 std::int64_t tickOf(KFVertexEntry const& entry) noexcept { return entry.tick; }
 
 /// The first of some ascending ticks that is at or after `tick`, without a branch that depends on the data.
-template <class Item> std::size_t lowerBoundOf(std::vector<Item> const& items, std::int64_t tick) noexcept {
-    Item const* const data = items.data();
-    std::size_t count = items.size();
+template <class Item>
+std::size_t lowerBoundOf(Item const* data, std::size_t count, std::int64_t tick) noexcept {
     std::size_t first = 0;
     while (count > 1) {
         std::size_t const half = count / 2;
@@ -26,6 +25,30 @@ template <class Item> std::size_t lowerBoundOf(std::vector<Item> const& items, s
         count -= half;
     }
     return first + (count == 1 && tickOf(data[first]) < tick ? 1 : 0);
+}
+
+/// The same in a block whose first tick is before `tick` and behind which the next tick is `next`. Keypoints mostly
+/// stand at fairly even distances, so it looks first near where `tick` would stand if they all were equal (Peterson,
+/// "Addressing for Random-Access Storage", 1957), and in most blocks touches two or three lines of memory instead of
+/// six.
+std::size_t lowerBoundInBlock(std::vector<KFVertexEntry> const& entries, std::int64_t tick,
+                              std::int64_t next) noexcept {
+    constexpr std::size_t window = 8;
+    constexpr std::size_t worthGuessing = 4 * window;
+    KFVertexEntry const* const data = entries.data();
+    std::size_t const count = entries.size();
+    double const start = static_cast<double>(data[0].tick);
+    double const span = static_cast<double>(next) - start;
+    if (count >= worthGuessing && span > 0.0) {
+        double const last = static_cast<double>(count - window);
+        double const guess = (static_cast<double>(tick) - start) / span * static_cast<double>(count);
+        // Whatever the roundings, the comparisons below decide.
+        auto const low = static_cast<std::size_t>(std::clamp(guess - 0.5 * window, 1.0, last));
+        std::size_t const high = low + window;
+        if (data[low - 1].tick < tick && (high == count || data[high].tick >= tick))
+            return low + lowerBoundOf(data + low, window, tick);
+    }
+    return lowerBoundOf(data, count, tick);
 }
 
 bool validAtZero(KFVertex const& vertex) { return vertex.isEnabled(kTempusZero); }
@@ -66,11 +89,12 @@ std::size_t KFVertexStore::indexOf(Place place) const noexcept {
 
 KFVertexStore::Place KFVertexStore::lowerBoundTick(std::int64_t tick) const noexcept {
     // Equal positions may run over several blocks: the first of them stands in the last block that starts before them.
-    std::size_t const behind = lowerBoundOf(_firstTicks, tick);
+    std::size_t const behind = lowerBoundOf(_firstTicks.data(), _firstTicks.size(), tick);
     if (behind == 0)
         return begin();
     Block const& block = *_blocks[behind - 1];
-    std::size_t const slot = lowerBoundOf(block.entries, tick);
+    std::int64_t const next = behind < _firstTicks.size() ? _firstTicks[behind] : block.entries.back().tick;
+    std::size_t const slot = lowerBoundInBlock(block.entries, tick, next);
     if (slot == block.entries.size())
         return {static_cast<std::uint32_t>(behind), 0};
     return {static_cast<std::uint32_t>(behind - 1), static_cast<std::uint32_t>(slot)};
@@ -192,7 +216,7 @@ KFVertexStore::Place KFVertexStore::insert(Place place, KFVertex* vertex, bool s
     _firstTicks[place.block] = block.entries.front().tick;
     _size += 1;
     _validCount += isValid ? 1 : 0;
-    _version += 1;
+    _version.advance();
     updateEnds();
     return place;
 }
@@ -242,7 +266,7 @@ KFVertexStore::Place KFVertexStore::remove(Place place) {
     _validCount -= block.valid.test(place.slot) ? 1 : 0;
     block.remove(place.slot);
     _size -= 1;
-    _version += 1;
+    _version.advance();
     if (block.count() == 0) {
         _blocks.erase(_blocks.begin() + place.block);
         _firstTicks.erase(_firstTicks.begin() + place.block);
@@ -294,7 +318,7 @@ void KFVertexStore::clear() {
     _lastValid = nullptr;
     _tickScale = 1;
     _validityCurrent = true;
-    _version += 1;
+    _version.advance();
 }
 
 void KFVertexStore::updateValidity(Place place) {
@@ -302,7 +326,7 @@ void KFVertexStore::updateValidity(Place place) {
     _validCount -= block.validCount;
     block.setValid(place.slot, validAtZero(*block.entries[place.slot].vertex));
     _validCount += block.validCount;
-    _version += 1;
+    _version.advance();
     updateEnds();
 }
 
@@ -315,7 +339,7 @@ void KFVertexStore::refresh() {
         _validCount += block->validCount;
     }
     _validityCurrent = true;
-    _version += 1;
+    _version.advance();
     updateEnds();
 }
 
@@ -396,12 +420,12 @@ void KFVertexStore::updatePosition(Place place) {
     } else {
         _tickScale = 0;
     }
-    _version += 1;
+    _version.advance();
 }
 
 void KFVertexStore::updateAllPositions() {
     _tickScale = 1;
-    _version += 1;
+    _version.advance();
     for (auto const& block : _blocks) {
         for (KFVertexEntry const& entry : block->entries) {
             Tempus const u = entry.vertex->getValueU();

@@ -2,6 +2,7 @@
 #pragma once
 
 #include "lumenkey/foundation/Tempus.h"
+#include "lumenkey/splines/KFStoreVersion.h"
 #include "lumenkey/splines/KFVertexBlock.h"
 #include "lumenkey/splines/KFVertexIterator.h"
 
@@ -39,8 +40,10 @@ public:
     bool empty() const noexcept { return _size == 0; }
     void reserve(std::size_t count);
     std::size_t bytes() const noexcept;
-    /// Grows with each change of the set, order, positions or validity of vertices.
-    std::uint64_t version() const noexcept { return _version; }
+    /// Changes with each change of the set, order, positions or validity of vertices, before the lock is given back.
+    std::uint64_t version() const noexcept { return _version.get(); }
+    /// The same for who doesn't hold the lock.
+    std::uint64_t acquiredVersion() const noexcept { return _version.acquired(); }
 
     // Places: first to last, then `end`.
     Place begin() const noexcept { return {0, 0}; }
@@ -93,7 +96,7 @@ public:
     /// Says that a vertex was enabled or disabled and that the list isn't to follow before the next `refresh`.
     void postponeValidity() noexcept { _validityCurrent = false; }
     /// Says that something changed that evaluation depends on.
-    void touch() noexcept { _version += 1; }
+    void touch() noexcept { _version.advance(); }
     /// Reads all positions again.
     void updateAllPositions();
     /// Reads the validity of all vertices again.
@@ -130,7 +133,7 @@ private:
     KFVertex* _firstValid = nullptr;
     KFVertex* _lastValid = nullptr;
     std::int64_t _tickScale = 1;
-    std::uint64_t _version = 0;
+    KFStoreVersion _version;
     bool _validityCurrent = true;
 };
 

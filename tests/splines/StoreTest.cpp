@@ -7,6 +7,8 @@
 
 #include <algorithm>
 #include <cfloat>
+#include <limits>
+#include <optional>
 #include <random>
 #include <set>
 
@@ -212,6 +214,43 @@ void expectLists(KFSpline& spline, Walks const& walks) {
 }
 
 } // namespace
+
+// Where the positions crowd, a vertex doesn't stand where even distances would put it.
+TEST(KFVertexStore, FindsUnevenPositions) {
+    using Position = std::int64_t (*)(std::int64_t);
+    for (Position const position :
+         {Position{[](std::int64_t i) { return i * i * i; }},
+          Position{[](std::int64_t i) { return i / 100; }},
+          Position{[](std::int64_t i) { return i < 200 ? i : i + 1000000000000; }},
+          Position{[](std::int64_t i) { return (i - 200) * std::abs(i - 200); }}}) {
+        KFVertexStore store;
+        std::vector<std::int64_t> ticks;
+        for (std::int64_t i = 0; i < 400; ++i) {
+            ticks.push_back(position(i));
+            store.append(new KFStaticVertex(TempusMake(ticks.back(), 1), 0.0), false);
+        }
+        for (std::int64_t const tick : ticks) {
+            for (std::int64_t const asked : {tick - 1, tick, tick + 1}) {
+                auto const expected = std::lower_bound(ticks.begin(), ticks.end(), asked) - ticks.begin();
+                ASSERT_EQ(store.indexOf(store.lowerBoundTick(asked)), static_cast<std::size_t>(expected))
+                    << asked;
+            }
+        }
+    }
+}
+
+// What a thread keeps of one spline isn't taken for that of another, which may stand where the first one stood.
+TEST(KFSplineStore, AddressesDontStandForSplines) {
+    KFSplineState state;
+    std::optional<KFSpline> spline;
+    for (int i = 0; i < 40; ++i) {
+        spline.emplace(&state);
+        spline->addVertexNoTangents(kTempusZero, i, kTempusZero, false);
+        spline->addVertexNoTangents(TempusMake(2, 1), i, kTempusZero, false);
+        for (int k = 0; k < 3; ++k)
+            ASSERT_EQ(spline->getVertexValue(TempusMake(1, 1), kTempusZero, k == 0), i);
+    }
+}
 
 TEST(Museum, FindsVerticesAsPlainWalksDo) {
     for (Exhibit const& exhibit : museum()) {

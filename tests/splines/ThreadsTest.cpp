@@ -256,6 +256,41 @@ TEST_F(KFSplineThreads, WhatWasWrittenLastIsRead) {
     }
 }
 
+// Threads keep what they computed, and none may go on with it after an edit that it knows to be over: through a handle,
+// by two threads at once on one vertex, and of the spline.
+TEST_F(KFSplineThreads, EditsReachWhatOtherThreadsKeep) {
+    auto& shared = *static_cast<KFVertex*>(curve->addVertexNoTangents(s(101, 600), 0.0, kTempusZero, false));
+    shared.setInterpolation(0);
+    std::atomic<int> written{0};
+    std::atomic<int> behind{0};
+    Readers readers;
+    for (int i = 0; i < 2; ++i) {
+        readers.add([&](std::mt19937&) {
+            for (int k = 0; k < 50; ++k) {
+                int const known = written.load(std::memory_order_acquire);
+                behind += curve.at(s(103, 600)) < known ? 1 : 0;
+            }
+        });
+    }
+    int const rounds = times(3000);
+    atOnce(2, [&](int thread) {
+        for (int i = 1; i <= rounds; ++i) {
+            if (thread == 1) {
+                shared.setBias(i % 3, kTempusZero);
+                void* const added = curve->addVertexNoTangents(s(9, 2), 0.0, kTempusZero, false);
+                curve->deleteVertex(added, false, kTempusZero);
+                continue;
+            }
+            shared.setValueV(i, kTempusZero);
+            behind += curve.at(s(103, 600)) != i ? 1 : 0;
+            written.store(i, std::memory_order_release);
+            if (i % 50 == 0)
+                readers.awaitReads(1);
+        }
+    });
+    EXPECT_EQ(behind, 0);
+}
+
 TEST_F(KFSplineThreads, WholeCurvesAreReadByManyAtOnce) {
     for (std::uint32_t const type : {10u, 12u}) {
         for (int round = 0; round < times(20); ++round) {

@@ -266,6 +266,7 @@ TEST_F(KFSplineAccessTest, ACustomInterpolatorDrawsWhereItIsActive) {
     EXPECT_TRUE(custom.drawnUnlocked);
     owner._customInterpolator = nullptr;
     EXPECT_EQ(curve.at(s(3, 2)), 15.0);
+    owner._customLock = nullptr; // the curve outlives it, and takes its lock at the end
 }
 
 // Each operation that locks takes the owner's lock and gives it back; a second taking on one thread would never end.
@@ -308,6 +309,7 @@ TEST_F(KFSplineAccessTest, TheOwnersLockIsTakenAndGivenBack) {
         ASSERT_TRUE(shared.tryLock()) << &operation - operations;
         shared.unlock();
     }
+    owner._customLock = nullptr; // the curve outlives it, and takes its lock at the end
 }
 
 #ifdef LUMENKEY_KNOWS_SLOTS
