@@ -1,6 +1,8 @@
 // What a spline finds among its vertices, against walks over all of them.
 
 #include "lumenkey/splines/KFHandleSet.h"
+#include "lumenkey/splines/KFStaticVertex.h"
+#include "lumenkey/splines/KFVertexStore.h"
 #include "tests/splines/museum.h"
 
 #include <gtest/gtest.h>
