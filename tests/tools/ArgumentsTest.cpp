@@ -35,16 +35,34 @@ TEST(TimeArgument, ReadsFractionsSecondsAndFrames) {
         EXPECT_EQ(resolved(text), "refused") << text;
     }
     EXPECT_EQ(resolved("9e18f", TempusMake(1001, 24)), "refused");
+    EXPECT_EQ(resolved("1f", kTempusInvalid), "refused");
     EXPECT_EQ(TimeArgument::parseList("0,1/2,3f").size(), 3U);
     EXPECT_THROW(TimeArgument::parseList("0,,1"), UsageError);
     EXPECT_THROW(TimeArgument::parseList("0,1,"), UsageError);
+}
+
+TEST(StepOfRate, IsExact) {
+    auto const step = [](std::string_view rate) {
+        try {
+            return timeText(stepOfRate(rate));
+        } catch (UsageError const&) {
+            return std::string("refused");
+        }
+    };
+    EXPECT_EQ(step("24"), "1/24");
+    EXPECT_EQ(step("23.976"), "125/2997");
+    EXPECT_EQ(step("30000/1001"), "1001/30000");
+    EXPECT_EQ(step("0.5"), "2/1");
+    for (char const* const rate : {"", "0", "-24", "24f", "1/0", "fast", "2147483648", "0.00000000001"}) {
+        EXPECT_EQ(step(rate), "refused") << rate;
+    }
 }
 
 TEST(NearMatch, FindsWhatWasMeant) {
     auto const meant = [](std::string_view wanted) {
         NearMatch match(wanted);
         for (char const* const name :
-             {"Hips.Xposition", "Hips.Xrotation", "Hips/LeftLeg.Xrotation", "Head.Zrotation"}) {
+             {"Hips.Xposition", "Hips.Xrotation", "Hips.LeftLeg.Xrotation", "Head.Zrotation"}) {
             match.offer(name);
         }
         return match.best();
@@ -52,7 +70,7 @@ TEST(NearMatch, FindsWhatWasMeant) {
     EXPECT_EQ(meant("hips.xrotation"), "Hips.Xrotation");
     EXPECT_EQ(meant("Hisp.Xrotation"), "Hips.Xrotation");
     EXPECT_EQ(meant("Hips.Xrot"), "Hips.Xrotation");
-    EXPECT_EQ(meant("LeftLeg.Xrotation"), "Hips/LeftLeg.Xrotation");
+    EXPECT_EQ(meant("LeftLeg.Xrotation"), "Hips.LeftLeg.Xrotation");
     EXPECT_EQ(meant("Head"), "Head.Zrotation");
     EXPECT_EQ(meant("nothing like it at all"), "");
     EXPECT_EQ(meant(""), "");

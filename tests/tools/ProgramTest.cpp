@@ -51,13 +51,87 @@ TEST_F(ProgramTest, InfoTellsWhatAFileHolds) {
 
     Outcome const table = runLumenkey({"info", _file});
     EXPECT_EQ(table.exit, 0);
-    EXPECT_NE(table.out.find("\nHips.Yposition     units  90.000000  92.000000\n"), std::string::npos)
+    EXPECT_NE(table.out.find("\nHips.Yposition          units  90.000000  92.000000\n"), std::string::npos)
         << table.out;
+}
+
+TEST_F(ProgramTest, TreeListsNodes) {
+    Outcome const table = runLumenkey({"tree", _file, "--depth", "2"});
+    EXPECT_EQ(table.exit, 0);
+    EXPECT_TRUE(table.out.starts_with("name           ID  type         default   at start  keypoints\n"
+                                      "small           1  ObjectRoot\n"
+                                      "  Hips          1  Folder\n"
+                                      "    Xposition   1  Double      0.000000   0.000000          3\n"
+                                      "    Yposition   2  Double      0.000000  90.000000          3\n"))
+        << table.out;
+    EXPECT_EQ(std::count(table.out.begin(), table.out.end(), '\n'), 10);
+
+    Json const nodes = jsonOf({"tree", _file, "--json"})["nodes"];
+    ASSERT_EQ(nodes.size(), 12U);
+    EXPECT_EQ(nodes[8],
+              Json::parse(R"({"path": "./1/7", "depth": 2, "id": 7, "name": "LeftLeg", "type": "Folder",
+                                        "class": "KFChannelFolder"})"));
+    EXPECT_EQ(nodes[2]["class"], "KFChannelDouble");
+    EXPECT_EQ(nodes[10]["path"], "./1/7/2");
+    EXPECT_EQ(nodes[10]["start"].get<double>(), -45 * (std::numbers::pi / 180));
+    EXPECT_EQ(nodes[10]["keypoints"], 3);
+}
+
+TEST_F(ProgramTest, NamesThatFitTwiceAreToldOfAndFoldersStandForTheirChannels) {
+    Outcome const twice = runLumenkey({"keys", _file, "Xrotation", "--json"});
+    EXPECT_EQ(twice.exit, 0);
+    EXPECT_EQ(Json::parse(twice.out)["channel"], "Hips.Xrotation");
+    EXPECT_EQ(twice.err, "lumenkey: warning: 'Xrotation' names ./1/5, which is taken, and also ./1/7/2\n");
+    auto const channelsOf = [this](std::vector<std::string> const& named) {
+        std::vector<std::string> arguments{"sample", _file, "--at", "0", "--json"};
+        arguments.insert(arguments.begin() + 2, named.begin(), named.end());
+        Json const sampled = jsonOf(arguments);
+        std::string all;
+        for (Json const& series : sampled["series"]) {
+            all += series["channel"].get<std::string>() + " ";
+        }
+        return all;
+    };
+    EXPECT_EQ(channelsOf({"LeftLeg", "./1/2"}),
+              "Hips.LeftLeg.Zrotation Hips.LeftLeg.Xrotation Hips.LeftLeg.Yrotation Hips.Yposition ");
+    EXPECT_EQ(channelsOf({}), channelsOf({"./"}));
+    EXPECT_EQ(channelsOf({}), channelsOf({"Hips"}));
+    expectWrongArguments({"keys", _file, "LeftLeg"}, "'LeftLeg' is a folder");
+    std::string const many = _folder.file("many.bvh");
+    runProgramFile(LUMENKEY_MAKE_MOTION, {many, "--frames", "2", "--joints", "40"});
+    expectWrongArguments({"plot", many, "-o", "p.svg"}, "too many to tell apart");
+}
+
+TEST_F(ProgramTest, ReadsTheTablesThatItWrites) {
+    Outcome const written = runLumenkey({"sample", _file, "--rate", "23.976", "--to", "10", "--csv"});
+    ASSERT_EQ(written.exit, 0) << written.err;
+    std::string const table = _folder.write("table.csv", written.out);
+    Json const info = jsonOf({"info", table, "--json"});
+    EXPECT_EQ(info["format"], "CSV");
+    EXPECT_EQ(info["frameDuration"], "125/2997");
+    EXPECT_EQ(info["rows"], 240);
+    EXPECT_EQ(info["keypoints"], 240 * 9);
+    EXPECT_EQ(info["channelNames"][6], "Hips.LeftLeg.Zrotation");
+    EXPECT_EQ(runLumenkey({"sample", table, "--rate", "23.976", "--csv"}).out, written.out);
+    EXPECT_EQ(runLumenkey({"sample", table, "--step", "1f", "--csv"}).out, written.out);
+
+    // Told by its content where its name doesn't tell.
+    std::string const gaps = _folder.write("gaps", "t,X,Y\n0.25,1,\n0.5,2,5\n1.5,,6\n");
+    Json const points = jsonOf({"sample", gaps, "X", "--count", "3", "--json"})["series"][0]["points"];
+    EXPECT_EQ(points[0]["time"], "1/4");
+    EXPECT_EQ(points[2]["time"], "3/2");
+    EXPECT_EQ(points[2]["value"], 2.0);
+    EXPECT_EQ(jsonOf({"info", gaps, "--json"}).contains("frameDuration"), false);
+    EXPECT_EQ(runLumenkey({"plot", gaps, "-o", _folder.file("gaps.svg")}).exit, 0);
+    expectWrongArguments({"sample", gaps, "--at", "1f"}, "aren't frames of one duration");
+    Outcome const faulty = runLumenkey({"tree", _folder.write("faulty.csv", "t,X\n0,high\n")});
+    EXPECT_EQ(faulty.exit, 1);
+    EXPECT_EQ(faulty.err, "lumenkey: " + _folder.file("faulty.csv") + ":2:3: 'high' is not a number\n");
 }
 
 TEST_F(ProgramTest, KeysListsKeypoints) {
     Json const keys = jsonOf({"keys", _file, "LeftLeg.Xrotation", "--json"});
-    EXPECT_EQ(keys["channel"], "LeftLeg.Xrotation");
+    EXPECT_EQ(keys["channel"], "Hips.LeftLeg.Xrotation");
     ASSERT_EQ(keys["keypoints"].size(), 3U);
     Json const& key = keys["keypoints"][1];
     EXPECT_EQ(key["time"], "1/120");
@@ -78,7 +152,7 @@ TEST_F(ProgramTest, SampleReadsAtExactTimes) {
     Json const at = jsonOf({"sample", _file, "Hips.Xposition", "LeftLeg.Zrotation", "--at", "1/240,0.0125,2f",
                             "--slope", "--json"});
     ASSERT_EQ(at["series"].size(), 2U);
-    EXPECT_EQ(at["series"][1]["channel"], "LeftLeg.Zrotation");
+    EXPECT_EQ(at["series"][1]["channel"], "Hips.LeftLeg.Zrotation");
     Json const& points = at["series"][0]["points"];
     ASSERT_EQ(points.size(), 3U);
     EXPECT_EQ(points[0]["time"], "1/240");
@@ -118,7 +192,7 @@ TEST_F(ProgramTest, SampleWritesTheSameNumbersInEveryForm) {
     std::string line;
     std::getline(lines, line);
     EXPECT_EQ(line, "time,seconds,\"Hips, \"\"big\"\".Yposition\",\"Hips, \"\"big\"\".Yposition slope\","
-                    "LeftLeg.Yrotation,LeftLeg.Yrotation slope");
+                    "\"Hips, \"\"big\"\".LeftLeg.Yrotation\",\"Hips, \"\"big\"\".LeftLeg.Yrotation slope\"");
     for (std::size_t i = 0; i < 11; ++i) {
         Json const& first = json["series"][0]["points"][i];
         Json const& second = json["series"][1]["points"][i];
@@ -180,6 +254,7 @@ TEST_F(ProgramTest, FaultyFilesExitWithOneAndOneLine) {
     std::vector<std::vector<std::string>> const calls{
         {"info", faulty},
         {"info", faulty, "--json"},
+        {"tree", faulty},
         {"keys", faulty, "Hips.Xposition"},
         {"sample", faulty, "Hips.Xposition", "--count", "2", "--csv"},
         {"plot", faulty, "Hips.Xposition", "-o", picture},
@@ -223,6 +298,8 @@ TEST_F(ProgramTest, WrongArgumentsExitWithTwoAndTheUsage) {
     expectWrongArguments(with({"--at", "0,,1"}), "'' is no time");
     expectWrongArguments(with({"--at", "0", "--step", "1"}), "--at");
     expectWrongArguments(with({"--step", "1", "--count", "3"}), "--step");
+    expectWrongArguments(with({"--rate", "0"}), "'0' is no rate");
+    expectWrongArguments(with({"--rate", "24", "--step", "1"}), "--rate");
     expectWrongArguments(with({"--step", "0"}), "--step must be above 0");
     expectWrongArguments(with({"--step", "-1/24"}), "--step must be above 0");
     expectWrongArguments(with({"--count", "0"}), "--count");
@@ -257,7 +334,7 @@ TEST_F(ProgramTest, FailuresToWriteExitWithOne) {
 }
 
 TEST_F(ProgramTest, EveryVerbHelpsWithAnExample) {
-    for (char const* const verb : {"info", "keys", "sample", "plot", "gallery"}) {
+    for (char const* const verb : {"info", "tree", "keys", "sample", "plot", "gallery"}) {
         Outcome const help = runLumenkey({verb, "--help"});
         EXPECT_EQ(help.exit, 0);
         EXPECT_NE(help.out.find("Usage: lumenkey " + std::string(verb)), std::string::npos) << help.out;

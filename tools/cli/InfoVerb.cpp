@@ -1,12 +1,11 @@
 #include "tools/cli/Verbs.h"
 
-#include "tools/cli/MotionInput.h"
+#include "tools/cli/ChannelInput.h"
 #include "tools/output/JsonWriter.h"
 #include "tools/output/Table.h"
 #include "tools/output/TextForms.h"
 
 #include <CLI/CLI.hpp>
-#include <algorithm>
 #include <memory>
 
 namespace lumenkey::tools {
@@ -18,34 +17,44 @@ struct InfoOptions {
     bool json = false;
 };
 
-std::uint64_t keypointCount(Motion const& motion) {
-    return std::uint64_t{motion.frameCount} * motion.channels.size();
+bool isMotion(ChannelInput const& input) { return input.file().format == ChannelFormat::Motion; }
+
+std::uint64_t keypointCount(ChannelInput const& input, std::vector<ChannelTree::Node> const& channels) {
+    std::uint64_t count = 0;
+    for (ChannelTree::Node const channel : channels) {
+        count += input.tree().channel(channel).getNumberOfKeyframes();
+    }
+    return count;
 }
 
-void writeJson(MotionInput const& input, OutputSink& out) {
-    Motion const& motion = input.motion();
+void writeJson(ChannelInput const& input, std::vector<ChannelTree::Node> const& channels, OutputSink& out) {
+    ChannelFile const& file = input.file();
     JsonWriter json(out);
     json.beginObject();
     json.key("format");
-    json.string("BVH");
+    json.string(isMotion(input) ? "BVH" : "CSV");
     json.key("channels");
-    json.integer(motion.channels.size());
+    json.integer(channels.size());
     json.key("keypoints");
-    json.integer(keypointCount(motion));
+    json.integer(keypointCount(input, channels));
     json.key("start");
-    json.string(timeText(kTempusZero));
+    json.string(timeText(file.firstTime));
     json.key("duration");
-    json.string(timeText(input.duration()));
-    json.key("frameDuration");
-    json.string(timeText(motion.frameDuration));
-    json.key("joints");
-    json.integer(motion.joints.size());
-    json.key("frames");
-    json.integer(motion.frameCount);
+    json.string(timeText(file.duration));
+    if (TempusIsNumeric(file.frameDuration)) {
+        json.key("frameDuration");
+        json.string(timeText(file.frameDuration));
+    }
+    if (isMotion(input)) {
+        json.key("joints");
+        json.integer(file.joints);
+    }
+    json.key(isMotion(input) ? "frames" : "rows");
+    json.integer(file.rows);
     json.key("channelNames");
     json.beginArray();
-    for (std::size_t i = 0; i < input.channels().count(); ++i) {
-        json.string(input.channels().name(i));
+    for (ChannelTree::Node const channel : channels) {
+        json.string(input.tree().dottedName(channel));
     }
     json.endArray();
     json.endObject();
@@ -66,70 +75,79 @@ std::string rateText(Tempus const& frameDuration) {
     return text;
 }
 
-void writeSummary(MotionInput const& input, OutputSink& out) {
-    Motion const& motion = input.motion();
-    out.write("file       " + printableText(motion.file) + "\n");
-    out.write("format     BVH (motion capture)\n");
-    out.write("joints     " + std::to_string(motion.joints.size()) + "\n");
-    out.write("channels   " + std::to_string(motion.channels.size()) + "\n");
-    out.write("keypoints  " + std::to_string(keypointCount(motion)) + "\n");
-    out.write("frames     " + std::to_string(motion.frameCount) + " at " + rateText(motion.frameDuration) +
-              " frames a second, each " + timeText(motion.frameDuration) + " s\n");
-    out.write("duration   " + tableText(TempusGetSeconds(input.duration())) + " s, exactly " +
-              timeText(input.duration()) + " s\n\n");
-}
-
-struct Extent {
-    double least = 0;
-    double greatest = 0;
-};
-
-std::vector<Extent> extentsOf(MotionInput const& input) {
-    std::vector<Extent> extents(input.channels().count());
-    for (std::size_t frame = 0; frame < input.motion().frameCount; ++frame) {
-        for (std::size_t i = 0; i < extents.size(); ++i) {
-            double const value = input.channels().value(frame, i);
-            extents[i].least = frame == 0 ? value : std::min(extents[i].least, value);
-            extents[i].greatest = frame == 0 ? value : std::max(extents[i].greatest, value);
-        }
+std::string rowsText(ChannelInput const& input) {
+    ChannelFile const& file = input.file();
+    std::string const count = std::to_string(file.rows);
+    if (!TempusIsNumeric(file.frameDuration)) {
+        return "rows       " + count + "\n";
     }
-    return extents;
+    return (isMotion(input) ? "frames     " : "rows       ") + count + " at " + rateText(file.frameDuration) +
+           (isMotion(input) ? " frames" : " rows") + " a second, each " + timeText(file.frameDuration) +
+           " s\n";
 }
 
-void writeChannels(MotionInput const& input, OutputSink& out) {
-    std::vector<Extent> const extents = extentsOf(input);
+void writeSummary(ChannelInput const& input, std::vector<ChannelTree::Node> const& channels,
+                  OutputSink& out) {
+    ChannelFile const& file = input.file();
+    out.write("file       " + printableText(file.file) + "\n");
+    out.write(isMotion(input) ? "format     BVH (motion capture)\n" : "format     CSV (values over time)\n");
+    if (isMotion(input)) {
+        out.write("joints     " + std::to_string(file.joints) + "\n");
+    }
+    out.write("channels   " + std::to_string(channels.size()) + "\n");
+    out.write("keypoints  " + std::to_string(keypointCount(input, channels)) + "\n");
+    out.write(rowsText(input));
+    if (!isMotion(input)) {
+        out.write("start      " + tableText(TempusGetSeconds(file.firstTime)) + " s, exactly " +
+                  timeText(file.firstTime) + " s\n");
+    }
+    out.write("duration   " + tableText(TempusGetSeconds(file.duration)) + " s, exactly " +
+              timeText(file.duration) + " s\n\n");
+}
+
+std::string extremeText(ChannelTree const& tree, ChannelTree::Node channel, bool least) {
+    double value = 0;
+    if (tree.channel(channel).getNumberOfKeyframes() > 0) {
+        least ? tree.curve(channel).getCurrentMinValueV(&value, false)
+              : tree.curve(channel).getCurrentMaxValueV(&value, false);
+    }
+    return tableText(value);
+}
+
+void writeChannels(ChannelTree const& tree, std::vector<ChannelTree::Node> const& channels, OutputSink& out) {
     Table table;
     table.columns = {{"channel"}, {"unit"}, {"least", Align::Right}, {"greatest", Align::Right}};
-    table.rowCount = extents.size();
+    table.rowCount = channels.size();
     table.cell = [&](std::size_t row, std::size_t column) -> std::string {
         switch (column) {
         case 0:
-            return input.channels().name(row);
+            return tree.dottedName(channels[row]);
         case 1:
-            return std::string(input.channels().unit(row));
+            return std::string(tree.unit(channels[row]));
         default:
-            return tableText(column == 2 ? extents[row].least : extents[row].greatest);
+            return extremeText(tree, channels[row], column == 2);
         }
     };
     table.write(out);
 }
 
 void runInfo(InfoOptions const& options, OutputSink& out) {
-    MotionInput const input(options.file);
+    ChannelInput const input(options.file);
+    std::vector<ChannelTree::Node> const channels = input.tree().channelsBelow(ChannelTree::kTop);
     if (options.json) {
-        writeJson(input, out);
+        writeJson(input, channels, out);
         return;
     }
-    writeSummary(input, out);
-    writeChannels(input, out);
+    writeSummary(input, channels, out);
+    writeChannels(input.tree(), channels, out);
 }
 
 } // namespace
 
 Verb declareInfo(CLI::App& program) {
     auto const options = std::make_shared<InfoOptions>();
-    CLI::App* const verb = program.add_subcommand("info", "Tell what a motion file holds");
-    verb->add_option("FILE", options->file, "The motion capture file (BVH)")->option_text(" ")->required();
+    CLI::App* const verb = program.add_subcommand("info", "Tell what a file holds");
+    verb->add_option("FILE", options->file, kFileHelp)->option_text(" ")->required();
     verb->add_flag("--json", options->json,
                    "For programs: counts, exact times and the names of the channels");
     verb->footer("Example: lumenkey info walk.bvh");

@@ -1,6 +1,6 @@
 #include "tools/cli/Verbs.h"
 
-#include "tools/cli/MotionInput.h"
+#include "tools/cli/ChannelInput.h"
 #include "tools/cli/Progress.h"
 #include "tools/curve/Keypoint.h"
 #include "tools/output/JsonWriter.h"
@@ -109,13 +109,13 @@ void writeTable(KFSpline& spline, std::string_view unit, OutputSink& out) {
 }
 
 void runKeys(KeysOptions const& options, OutputSink& out) {
-    MotionInput const input(options.file);
-    std::size_t const channel = input.channelNamed(options.channel);
-    auto const made = input.channels().makeSpline(channel);
+    ChannelInput const input(options.file);
+    ChannelTree::Node const channel = input.channelNamed(options.channel);
+    KFSpline& spline = input.tree().spline(channel);
     if (options.json) {
-        writeJson(input.channels().name(channel), made->spline, out);
+        writeJson(input.tree().dottedName(channel), spline, out);
     } else {
-        writeTable(made->spline, input.channels().unit(channel), out);
+        writeTable(spline, input.tree().unit(channel), out);
     }
 }
 
@@ -124,8 +124,11 @@ void runKeys(KeysOptions const& options, OutputSink& out) {
 Verb declareKeys(CLI::App& program) {
     auto const options = std::make_shared<KeysOptions>();
     CLI::App* const verb = program.add_subcommand("keys", "List the keypoints of a channel");
-    verb->add_option("FILE", options->file, "The motion capture file (BVH)")->option_text(" ")->required();
-    verb->add_option("CHANNEL", options->channel, "Its name, as info lists it")->option_text(" ")->required();
+    verb->add_option("FILE", options->file, kFileHelp)->option_text(" ")->required();
+    verb->add_option("CHANNEL", options->channel,
+                     "Its name with dots, the end of that, or its path of IDs (./1/3)")
+        ->option_text(" ")
+        ->required();
     verb->add_flag("--json", options->json,
                    "For programs: every number in full, handles as [seconds, value]");
     verb->footer("Example: lumenkey keys walk.bvh Hips.Yposition");

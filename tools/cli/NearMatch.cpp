@@ -47,7 +47,7 @@ void NearMatch::offer(std::string const& candidate) {
         return;
     }
     std::string const lower = lowerCase(candidate);
-    bool const isPart = !_wanted.empty() && (lower.starts_with(_wanted) || lower.ends_with("/" + _wanted));
+    bool const isPart = !_wanted.empty() && (lower.starts_with(_wanted) || lower.ends_with("." + _wanted));
     std::size_t const distance = isPart ? 1 : editDistance(_wanted, lower);
     if (distance < _distance) {
         _distance = distance;

@@ -7,7 +7,7 @@
 namespace lumenkey::tools {
 
 /// Finds what was perhaps meant by a name that doesn't exist: the candidate with the fewest letters to
-/// change, without regard to case. The beginning of a name and the end of a path count as near.
+/// change, without regard to case. The beginning of a name and its end behind a dot count as near.
 class NearMatch {
 public:
     explicit NearMatch(std::string_view wanted);

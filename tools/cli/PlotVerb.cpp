@@ -1,6 +1,6 @@
 #include "tools/cli/Verbs.h"
 
-#include "tools/cli/MotionInput.h"
+#include "tools/cli/ChannelInput.h"
 #include "tools/cli/PlotOptions.h"
 #include "tools/cli/Progress.h"
 #include "tools/cli/TimeArgument.h"
@@ -37,11 +37,11 @@ std::optional<TimeArgument> readTime(std::string const& text) {
 }
 
 TimeSpan spanOf(std::optional<TimeArgument> const& from, std::optional<TimeArgument> const& to,
-                MotionInput const& input) {
-    Tempus const frame = input.motion().frameDuration;
-    TimeSpan span{from ? from->resolve(frame) : kTempusZero, to ? to->resolve(frame) : input.lastKeypoint()};
+                ChannelFile const& file) {
+    Tempus const frame = file.frameDuration;
+    TimeSpan span{from ? from->resolve(frame) : file.firstTime, to ? to->resolve(frame) : file.lastTime};
     if (!to && span.to == span.from) {
-        span.to = span.from + frame;
+        span.to = span.from + (TempusIsNumeric(frame) ? frame : TempusMake(1, 1));
     }
     if (span.to <= span.from) {
         throw UsageError{"--to must lie after --from"};
@@ -58,24 +58,25 @@ ChartPanel& panelOfUnit(PlotChart& chart, std::string_view unit) {
     return chart.panels.emplace_back(ChartPanel{std::string(unit), {}});
 }
 
-PlotChart chartOf(MotionInput const& input, std::vector<std::size_t> const& channels, TimeSpan const& span,
-                  double width) {
+PlotChart chartOf(ChannelInput const& input, std::vector<ChannelTree::Node> const& channels,
+                  TimeSpan const& span, double width) {
     Progress bar("plotting");
     PlotChart chart;
-    chart.title = std::filesystem::path(input.motion().file).filename().string();
+    chart.title = std::filesystem::path(input.file().file).filename().string();
     chart.seconds = PlotRange::sound(TempusGetSeconds(span.from), TempusGetSeconds(span.to));
     std::size_t done = 0;
-    for (std::size_t const channel : channels) {
-        auto const made = input.channels().makeSpline(channel);
-        ChartPanel& panel = panelOfUnit(chart, input.channels().unit(channel));
-        panel.curves.push_back({input.channels().name(channel),
-                                traceCurve(made->spline, span.from, span.to, widthOfCurves(width))});
+    for (ChannelTree::Node const channel : channels) {
+        ChartPanel& panel = panelOfUnit(chart, input.tree().unit(channel));
+        panel.curves.push_back(
+            {input.tree().dottedName(channel),
+             traceCurve(input.tree().spline(channel), span.from, span.to, widthOfCurves(width))});
         bar.update(static_cast<double>(++done) / static_cast<double>(channels.size()));
     }
     CurvePicture const& first = chart.panels.front().curves.front().picture;
     bool const areMarked = marksFor(first, widthOfCurves(width)) != KeypointMarks::None;
-    chart.subtitle = std::to_string(first.keypoints.size()) + " keypoints, " +
-                     timeText(input.motion().frameDuration) + " s apart" +
+    Tempus const frame = input.file().frameDuration;
+    chart.subtitle = std::to_string(first.keypoints.size()) + " keypoints" +
+                     (TempusIsNumeric(frame) ? ", " + timeText(frame) + " s apart" : "") +
                      (areMarked ? "" : ", too close to mark");
     return chart;
 }
@@ -84,9 +85,14 @@ void runPlot(PlotOptions const& options) {
     PlotFormat const format = requirePlotFormat(options.output);
     std::optional<TimeArgument> const from = readTime(options.from);
     std::optional<TimeArgument> const to = readTime(options.to);
-    MotionInput const input(options.file);
-    std::vector<std::size_t> const channels = input.channelsNamed(options.channels);
-    PlotChart const chart = chartOf(input, channels, spanOf(from, to, input), options.width);
+    ChannelInput const input(options.file);
+    std::vector<ChannelTree::Node> const channels = input.channelsNamed(options.channels);
+    if (channels.size() > kMostDistinctCurves) {
+        throw UsageError{std::to_string(channels.size()) +
+                         " channels are too many to tell apart in one picture; name " +
+                         std::to_string(kMostDistinctCurves) + " at most, or a folder with no more"};
+    }
+    PlotChart const chart = chartOf(input, channels, spanOf(from, to, input.file()), options.width);
     PlotCanvas canvas(format, options.width, options.height);
     chart.draw(canvas);
     canvas.save(options.output);
@@ -104,14 +110,13 @@ PlotFormat requirePlotFormat(std::string const& file) {
 Verb declarePlot(CLI::App& program) {
     auto const options = std::make_shared<PlotOptions>();
     CLI::App* const verb = program.add_subcommand("plot", "Draw channels over time");
-    verb->add_option("FILE", options->file, "The motion capture file (BVH)")->option_text(" ")->required();
-    verb->add_option("CHANNEL", options->channels, "Names of channels, as info lists them")
-        ->option_text("...")
-        ->required();
+    verb->add_option("FILE", options->file, kFileHelp)->option_text(" ")->required();
+    verb->add_option("CHANNEL", options->channels, kChannelHelp)->option_text("...");
     verb->add_option("-o,--output", options->output, "The picture: OUT.svg, OUT.png or OUT.pdf")
         ->option_text("OUT")
         ->required();
-    verb->add_option("--from", options->from, "The first time (else 0)")->option_text("T");
+    verb->add_option("--from", options->from, "The first time (else that of the first keypoint)")
+        ->option_text("T");
     verb->add_option("--to", options->to, "The last time (else that of the last keypoint)")->option_text("T");
     verb->add_option("--width", options->width, "In pixels; in PDF, in points")
         ->check(CLI::Range(200, 10'000))
@@ -122,9 +127,9 @@ Verb declarePlot(CLI::App& program) {
         ->option_text("N")
         ->capture_default_str();
     verb->footer("A time is VALUE/TIMESCALE (1001/24000), seconds (0.5) or frames of the file (12f).\n"
-                 "Rotations and positions get a panel each. What lies outside the keypoints is dashed.\n\n"
+                 "Rotations and other values get a panel each. What lies outside the keypoints is dashed.\n\n"
                  "Example: lumenkey plot walk.bvh LeftLeg.Xrotation RightLeg.Xrotation -o legs.svg");
-    return {verb, "FILE CHANNEL... -o OUT.svg|png|pdf [--from T] [--to T] [--width N] [--height N]",
+    return {verb, "FILE [CHANNEL...] -o OUT.svg|png|pdf [--from T] [--to T] [--width N] [--height N]",
             [options](OutputSink&) { runPlot(*options); }};
 }
 

@@ -1,6 +1,6 @@
 #include "tools/cli/Verbs.h"
 
-#include "tools/cli/MotionInput.h"
+#include "tools/cli/ChannelInput.h"
 #include "tools/cli/Progress.h"
 #include "tools/cli/TimeArgument.h"
 #include "tools/cli/UsageError.h"
@@ -11,6 +11,7 @@
 #include "tools/output/TextForms.h"
 
 #include <CLI/CLI.hpp>
+#include <algorithm>
 #include <cstdint>
 #include <memory>
 #include <optional>
@@ -19,8 +20,10 @@ namespace lumenkey::tools {
 
 namespace {
 
-/// Values and slopes are held in memory until they are written: eight bytes for each.
+/// Values and slopes are held in memory until they are written: eight bytes for each. CSV goes out in blocks of
+/// times, so there this many times are taken, whatever the number of channels.
 constexpr std::uint64_t kMostValues = 10'000'000;
+constexpr std::size_t kValuesInBlock = 65'536;
 
 struct SampleOptions {
     std::string file;
@@ -29,6 +32,7 @@ struct SampleOptions {
     std::string from;
     std::string to;
     std::string step;
+    std::string rate;
     std::uint64_t count = 0;
     bool slope = false;
     bool json = false;
@@ -47,8 +51,11 @@ struct TimeWishes {
         from = read(options.from);
         to = read(options.to);
         step = read(options.step);
-        if (at.empty() && !step && count == 0) {
-            throw UsageError{"say at which times: --at, --step or --count"};
+        if (!options.rate.empty()) {
+            rateStep = stepOfRate(options.rate);
+        }
+        if (at.empty() && !step && !rateStep && count == 0) {
+            throw UsageError{"say at which times: --at, --step, --rate or --count"};
         }
     }
 
@@ -56,28 +63,30 @@ struct TimeWishes {
     std::optional<TimeArgument> from;
     std::optional<TimeArgument> to;
     std::optional<TimeArgument> step;
+    /// The step that a rate makes.
+    std::optional<Tempus> rateStep;
     std::uint64_t count;
 };
 
 void checkAmount(std::uint64_t times, std::uint64_t columns) {
     if (times > kMostValues / columns) {
         throw UsageError{"that is more than " + std::to_string(kMostValues) +
-                         " values, all channels taken together; take fewer times or channels"};
+                         " values, all channels taken together (as CSV, times); take fewer"};
     }
 }
 
-SampleTimes timesBetween(TimeWishes const& wishes, MotionInput const& input, std::uint64_t columns) {
-    Tempus const frame = input.motion().frameDuration;
-    Tempus const from = wishes.from ? wishes.from->resolve(frame) : kTempusZero;
-    Tempus const to = wishes.to ? wishes.to->resolve(frame) : input.lastKeypoint();
+SampleTimes timesBetween(TimeWishes const& wishes, ChannelFile const& file, std::uint64_t columns) {
+    Tempus const frame = file.frameDuration;
+    Tempus const from = wishes.from ? wishes.from->resolve(frame) : file.firstTime;
+    Tempus const to = wishes.to ? wishes.to->resolve(frame) : file.lastTime;
     if (to < from) {
         throw UsageError{"--to lies before --from"};
     }
-    if (!wishes.step) {
+    if (!wishes.step && !wishes.rateStep) {
         checkAmount(wishes.count, columns);
         return SampleTimes::spread(from, to, wishes.count);
     }
-    Tempus const step = wishes.step->resolve(frame);
+    Tempus const step = wishes.step ? wishes.step->resolve(frame) : *wishes.rateStep;
     if (step <= kTempusZero) {
         throw UsageError{"--step must be above 0"};
     }
@@ -87,13 +96,13 @@ SampleTimes timesBetween(TimeWishes const& wishes, MotionInput const& input, std
     return SampleTimes::row(from, step, steps + 1);
 }
 
-SampleTimes timesFor(TimeWishes const& wishes, MotionInput const& input, std::uint64_t columns) {
+SampleTimes timesFor(TimeWishes const& wishes, ChannelFile const& file, std::uint64_t columns) {
     if (wishes.at.empty()) {
-        return timesBetween(wishes, input, columns);
+        return timesBetween(wishes, file, columns);
     }
     std::vector<Tempus> times;
     for (TimeArgument const& time : wishes.at) {
-        times.push_back(time.resolve(input.motion().frameDuration));
+        times.push_back(time.resolve(file.frameDuration));
     }
     checkAmount(times.size(), columns);
     return SampleTimes::list(std::move(times));
@@ -108,18 +117,15 @@ struct Series {
     std::vector<double> slopes;
 };
 
-std::vector<Series> readSeries(MotionInput const& input, std::vector<std::size_t> const& channels,
+std::vector<Series> readSeries(ChannelTree const& tree, std::vector<ChannelTree::Node> const& channels,
                                SampleTimes const& times, bool slope) {
     Progress bar("sampling");
     std::vector<Series> all;
-    for (std::size_t const channel : channels) {
-        auto const made = input.channels().makeSpline(channel);
-        Series series{input.channels().name(channel),
-                      std::string(input.channels().unit(channel)),
-                      times.values(made->spline),
-                      {}};
+    for (ChannelTree::Node const channel : channels) {
+        Series series{
+            tree.dottedName(channel), std::string(tree.unit(channel)), times.values(tree.curve(channel)), {}};
         if (slope) {
-            series.slopes = times.slopes(made->spline);
+            series.slopes = times.slopes(tree.spline(channel));
         }
         all.push_back(std::move(series));
         bar.update(static_cast<double>(all.size()) / static_cast<double>(channels.size()));
@@ -174,41 +180,66 @@ struct NumberColumn {
     std::vector<double> const& numbers;
 };
 
-std::vector<NumberColumn> columnsOf(std::vector<Series> const& all, bool withUnits) {
+std::vector<NumberColumn> columnsOf(std::vector<Series> const& all) {
     std::vector<NumberColumn> columns;
     for (Series const& series : all) {
-        columns.push_back({series.channel + (withUnits ? " (" + series.unit + ")" : ""), series.values});
+        columns.push_back({series.channel + " (" + series.unit + ")", series.values});
         if (!series.slopes.empty()) {
-            columns.push_back(
-                {withUnits ? "slope (" + series.unit + "/s)" : series.channel + " slope", series.slopes});
+            columns.push_back({"slope (" + series.unit + "/s)", series.slopes});
         }
     }
     return columns;
 }
 
-void writeCsv(std::vector<Series> const& all, SampleTimes const& times, OutputSink& out) {
-    std::vector<NumberColumn> const columns = columnsOf(all, false);
-    Progress bar("writing", ProgressOf::Output);
-    CsvWriter csv(out);
+void writeCsvTitles(CsvWriter& csv, ChannelTree const& tree, std::vector<ChannelTree::Node> const& channels,
+                    bool slope) {
     csv.field("time");
     csv.field("seconds");
-    for (NumberColumn const& column : columns) {
-        csv.field(column.title);
+    for (ChannelTree::Node const channel : channels) {
+        std::string const name = tree.dottedName(channel);
+        csv.field(name);
+        if (slope) {
+            csv.field(name + " slope");
+        }
     }
     csv.endRow();
-    for (std::size_t i = 0; i < times.count(); ++i) {
-        csv.field(timeText(times.at(i)));
-        csv.field(shortestText(TempusGetSeconds(times.at(i))));
-        for (NumberColumn const& column : columns) {
-            csv.field(shortestText(column.numbers[i]));
+}
+
+/// Reads block by block, column by column, and writes row by row.
+void writeCsv(ChannelTree const& tree, std::vector<ChannelTree::Node> const& channels,
+              SampleTimes const& times, bool slope, OutputSink& out) {
+    Progress bar("writing", ProgressOf::Output);
+    CsvWriter csv(out);
+    writeCsvTitles(csv, tree, channels, slope);
+    std::size_t const columns = channels.size() * (slope ? 2 : 1);
+    std::size_t const height = std::min(std::max<std::size_t>(kValuesInBlock / columns, 16), times.count());
+    std::vector<double> block(height * columns);
+    for (std::size_t first = 0; first < times.count(); first += height) {
+        std::size_t const rows = std::min(height, times.count() - first);
+        double* column = block.data();
+        for (ChannelTree::Node const channel : channels) {
+            times.readValues(tree.curve(channel), first, rows, column);
+            column += height;
+            if (slope) {
+                times.readSlopes(tree.spline(channel), first, rows, column);
+                column += height;
+            }
         }
-        csv.endRow();
-        bar.update(static_cast<double>(i) / static_cast<double>(times.count()));
+        for (std::size_t row = 0; row < rows; ++row) {
+            Tempus const time = times.at(first + row);
+            csv.field(timeText(time));
+            csv.number(TempusGetSeconds(time));
+            for (std::size_t i = 0; i < columns; ++i) {
+                csv.number(block[i * height + row]);
+            }
+            csv.endRow();
+        }
+        bar.update(static_cast<double>(first + rows) / static_cast<double>(times.count()));
     }
 }
 
 void writeTable(std::vector<Series> const& all, SampleTimes const& times, OutputSink& out) {
-    std::vector<NumberColumn> const columns = columnsOf(all, true);
+    std::vector<NumberColumn> const columns = columnsOf(all);
     Table table;
     table.columns = {{"time", Align::Right}, {"seconds", Align::Right}};
     for (NumberColumn const& column : columns) {
@@ -233,14 +264,17 @@ void writeTable(std::vector<Series> const& all, SampleTimes const& times, Output
 
 void runSample(SampleOptions const& options, OutputSink& out) {
     TimeWishes const wishes(options);
-    MotionInput const input(options.file);
-    std::vector<std::size_t> const channels = input.channelsNamed(options.channels);
-    SampleTimes const times = timesFor(wishes, input, channels.size() * (options.slope ? 2 : 1));
-    std::vector<Series> const all = readSeries(input, channels, times, options.slope);
+    ChannelInput const input(options.file);
+    std::vector<ChannelTree::Node> const channels = input.channelsNamed(options.channels);
+    std::uint64_t const columns = channels.size() * (options.slope ? 2 : 1);
+    SampleTimes const times = timesFor(wishes, input.file(), options.csv ? 1 : columns);
+    if (options.csv) {
+        writeCsv(input.tree(), channels, times, options.slope, out);
+        return;
+    }
+    std::vector<Series> const all = readSeries(input.tree(), channels, times, options.slope);
     if (options.json) {
         writeJson(all, times, out);
-    } else if (options.csv) {
-        writeCsv(all, times, out);
     } else {
         writeTable(all, times, out);
     }
@@ -251,34 +285,41 @@ void runSample(SampleOptions const& options, OutputSink& out) {
 Verb declareSample(CLI::App& program) {
     auto const options = std::make_shared<SampleOptions>();
     CLI::App* const verb = program.add_subcommand("sample", "Read channels at any times");
-    verb->add_option("FILE", options->file, "The motion capture file (BVH)")->option_text(" ")->required();
-    verb->add_option("CHANNEL", options->channels, "Names of channels, as info lists them")
-        ->option_text("...")
-        ->required();
+    verb->add_option("FILE", options->file, kFileHelp)->option_text(" ")->required();
+    verb->add_option("CHANNEL", options->channels, kChannelHelp)->option_text("...");
     auto* const at =
         verb->add_option("--at", options->at, "Times, with commas between them")->option_text("T[,T...]");
-    auto* const from = verb->add_option("--from", options->from, "The first time (else 0)")->option_text("T");
+    auto* const from =
+        verb->add_option("--from", options->from, "The first time (else that of the first keypoint)")
+            ->option_text("T");
     auto* const to = verb->add_option("--to", options->to, "The last time (else that of the last keypoint)")
                          ->option_text("T");
     auto* const step = verb->add_option("--step", options->step, "Read at every step from the first time on")
                            ->option_text("T");
+    auto* const rate =
+        verb->add_option("--rate", options->rate, "Likewise, so many times a second: 24, 23.976, 24000/1001")
+            ->option_text("R");
     auto* const count = verb->add_option("--count", options->count, "Read so many times, evenly spread")
                             ->check(CLI::PositiveNumber)
                             ->option_text("N");
-    for (CLI::Option* const other : {from, to, step, count}) {
+    for (CLI::Option* const other : {from, to, step, rate, count}) {
         at->excludes(other);
     }
     step->excludes(count);
+    step->excludes(rate);
+    rate->excludes(count);
     verb->add_flag("--slope", options->slope, "Tell the slope too, by the second");
     auto* const json = verb->add_flag("--json", options->json, "For programs: every number in full");
     verb->add_flag("--csv", options->csv, "A row for each time, a column for each channel")->excludes(json);
     verb->footer("A time is VALUE/TIMESCALE (1001/24000), seconds (0.5) or frames of the file (12f).\n"
-                 "At most 10000000 values are read at once.\n\n"
-                 "Example: lumenkey sample walk.bvh Hips.Yposition --step 1/24 --csv");
-    return {verb,
-            "FILE CHANNEL... (--at T[,T...] | [--from T] [--to T] (--step T | --count N)) [--slope] [--json "
-            "| --csv]",
-            [options](OutputSink& out) { runSample(*options, out); }};
+                 "Without CHANNEL all channels are read: at most 10000000 values, as CSV so many times.\n"
+                 "What --csv writes can be read as a FILE.\n\n"
+                 "Example: lumenkey sample walk.bvh Hips.Yposition --rate 24 --csv");
+    return {
+        verb,
+        "FILE [CHANNEL...] (--at T[,T...] | [--from T] [--to T] (--step T | --rate R | --count N)) [--slope] "
+        "[--json | --csv]",
+        [options](OutputSink& out) { runSample(*options, out); }};
 }
 
 } // namespace lumenkey::tools

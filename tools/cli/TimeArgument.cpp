@@ -2,30 +2,16 @@
 
 #include "tools/cli/UsageError.h"
 #include "tools/time/ExactDecimal.h"
+#include "tools/time/TimeFraction.h"
 
-#include <charconv>
 #include <cstdint>
+#include <limits>
 #include <optional>
 #include <string>
 
 namespace lumenkey::tools {
 
 namespace {
-
-template <class Integer> std::optional<Integer> readInteger(std::string_view text) {
-    Integer value = 0;
-    auto const [end, error] = std::from_chars(text.data(), text.data() + text.size(), value);
-    if (error != std::errc{} || end != text.data() + text.size()) {
-        return std::nullopt;
-    }
-    return value;
-}
-
-Tempus readFraction(std::string_view text, std::size_t slash) {
-    auto const value = readInteger<int64_t>(text.substr(0, slash));
-    auto const timescale = readInteger<int32_t>(text.substr(slash + 1));
-    return value && timescale ? TempusReduced(TempusMake(*value, *timescale)) : kTempusInvalid;
-}
 
 [[noreturn]] void failForText(std::string_view text, std::string const& why) {
     throw UsageError{"'" + std::string(text) + "' " + why};
@@ -35,9 +21,8 @@ Tempus readFraction(std::string_view text, std::size_t slash) {
 
 TimeArgument TimeArgument::parse(std::string_view text) {
     TimeArgument argument;
-    std::size_t const slash = text.find('/');
-    if (slash != std::string_view::npos) {
-        argument._amount = readFraction(text, slash);
+    if (text.find('/') != std::string_view::npos) {
+        argument._amount = timeFromFraction(text);
         if (!TempusIsNumeric(argument._amount)) {
             failForText(text,
                         "is no time: both sides of VALUE/TIMESCALE are whole numbers, of 64 and 32 bits, "
@@ -74,12 +59,27 @@ Tempus TimeArgument::resolve(Tempus const& frameDuration) const {
     if (!_countsFrames) {
         return _amount;
     }
+    if (!TempusIsNumeric(frameDuration)) {
+        throw UsageError{
+            "the rows of the file aren't frames of one duration: write seconds or VALUE/TIMESCALE"};
+    }
     Tempus const time = _amount * frameDuration;
     bool const isExact = !TempusHasBeenRounded(time) || TempusHasBeenRounded(frameDuration);
     if (!TempusIsNumeric(time) || !isExact) {
         throw UsageError{"a number of frames goes beyond exact time"};
     }
     return TempusReduced(time);
+}
+
+Tempus stepOfRate(std::string_view text) {
+    Tempus rate = timeFromFraction(text);
+    if (std::optional<ExactDecimal> const number = ExactDecimal::parse(text)) {
+        rate = number->toTempus();
+    }
+    if (!TempusIsNumeric(rate) || rate.value <= 0 || rate.value > std::numeric_limits<int32_t>::max()) {
+        failForText(text, "is no rate: write samples a second above 0, such as 24, 23.976 or 30000/1001");
+    }
+    return TempusMake(rate.timescale, static_cast<int32_t>(rate.value));
 }
 
 } // namespace lumenkey::tools

@@ -21,6 +21,7 @@ struct Verb {
 };
 
 Verb declareInfo(CLI::App& program);
+Verb declareTree(CLI::App& program);
 Verb declareKeys(CLI::App& program);
 Verb declareSample(CLI::App& program);
 Verb declarePlot(CLI::App& program);

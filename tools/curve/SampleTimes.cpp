@@ -43,25 +43,32 @@ Tempus SampleTimes::at(std::size_t i) const {
     return _isRow ? BX_TempusSaferAdd(_start, _step * static_cast<std::uint32_t>(i)) : _list[i];
 }
 
-std::vector<double> SampleTimes::values(KFSpline& spline) const {
-    std::vector<double> values(count());
+void SampleTimes::readValues(KFCurve& curve, std::size_t first, std::size_t number, double* values) const {
     if (_isRow) {
-        auto sampled = static_cast<std::uint32_t>(_count);
-        spline.sampleSpline(_start, _step, sampled, static_cast<Tempus*>(nullptr), values.data(), kTempusZero,
-                            false);
-        return values;
+        auto sampled = static_cast<std::uint32_t>(number);
+        curve.getCurveSamples(at(first), _step, sampled, static_cast<Tempus**>(nullptr), &values);
+        return;
     }
-    for (std::size_t i = 0; i < values.size(); ++i) {
-        values[i] = spline.getVertexValue(_list[i], kTempusZero, true);
+    for (std::size_t i = 0; i < number; ++i) {
+        values[i] = curve.getValue(_list[first + i], 0.0);
     }
+}
+
+void SampleTimes::readSlopes(KFSpline& spline, std::size_t first, std::size_t number, double* slopes) const {
+    for (std::size_t i = 0; i < number; ++i) {
+        slopes[i] = spline.getDerivativeValue(at(first + i), kTempusZero, true);
+    }
+}
+
+std::vector<double> SampleTimes::values(KFCurve& curve) const {
+    std::vector<double> values(count());
+    readValues(curve, 0, count(), values.data());
     return values;
 }
 
 std::vector<double> SampleTimes::slopes(KFSpline& spline) const {
     std::vector<double> slopes(count());
-    for (std::size_t i = 0; i < slopes.size(); ++i) {
-        slopes[i] = spline.getDerivativeValue(at(i), kTempusZero, true);
-    }
+    readSlopes(spline, 0, count(), slopes.data());
     return slopes;
 }
 

@@ -1,5 +1,6 @@
 #pragma once
 
+#include "lumenkey/curves/KFCurve.h"
 #include "lumenkey/splines/KFSpline.h"
 
 #include <cstddef>
@@ -20,8 +21,14 @@ public:
     std::size_t count() const { return _isRow ? _count : _list.size(); }
     Tempus at(std::size_t i) const;
 
-    /// The values of a curve at all these times, or its slopes. A row is read in one walk.
-    std::vector<double> values(KFSpline& spline) const;
+    /// The values of a curve at `number` of these times from time `first` on, into room for as many. A row is
+    /// read in one walk.
+    void readValues(KFCurve& curve, std::size_t first, std::size_t number, double* values) const;
+    /// Likewise the slopes of its spline.
+    void readSlopes(KFSpline& spline, std::size_t first, std::size_t number, double* slopes) const;
+
+    /// At all these times.
+    std::vector<double> values(KFCurve& curve) const;
     std::vector<double> slopes(KFSpline& spline) const;
 
 private:

@@ -2,10 +2,10 @@
 
 #include "lumenkey/foundation/Tempus.h"
 #include "tools/import/InputError.h"
+#include "tools/import/InputText.h"
 
 #include <array>
 #include <cstddef>
-#include <functional>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -69,12 +69,6 @@ struct Motion {
 /// How deep joints may stand in each other, and how long the name of one may be.
 inline constexpr std::size_t kMotionDeepestJoint = 1'000;
 inline constexpr std::size_t kMotionLongestName = 255;
-/// The largest file that is read.
-inline constexpr std::size_t kMotionLargestFile = std::size_t{2} << 30;
-
-/// Told the share of the work done, 0 .. 1, now and then.
-using MotionProgress = std::function<void(double)>;
-
 /// Reads a motion capture file (BVH): HIERARCHY, then MOTION. Throws `InputError` for a file that can't be
 /// opened or is unsound anywhere; nothing is guessed, but these common departures are taken: a byte-order
 /// mark, carriage returns, tabs and blank lines, keywords in any case, braces on any line, names with spaces,
@@ -83,9 +77,9 @@ using MotionProgress = std::function<void(double)>;
 /// A frame is one line. The last line must end with a line end: without it nobody can tell whether the last
 /// number was cut off. Memory is at most the file, eight bytes for each number and some hundred for each
 /// joint.
-Motion readMotionFile(std::string const& file, MotionProgress const& progress = {});
+Motion readMotionFile(std::string const& file, ReadingProgress const& progress = {});
 
 /// The same for the content of a file; `file` is only its name.
-Motion readMotionText(std::string_view text, std::string const& file, MotionProgress const& progress = {});
+Motion readMotionText(std::string_view text, std::string const& file, ReadingProgress const& progress = {});
 
 } // namespace lumenkey::tools

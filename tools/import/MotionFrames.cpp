@@ -12,7 +12,7 @@ namespace {
 
 class FramesReader {
 public:
-    FramesReader(MotionScanner& scanner, Motion& motion, MotionProgress const& progress)
+    FramesReader(MotionScanner& scanner, Motion& motion, ReadingProgress const& progress)
         : _scanner(scanner), _motion(motion), _progress(progress) {}
 
     void read() {
@@ -126,7 +126,7 @@ private:
 
     MotionScanner& _scanner;
     Motion& _motion;
-    MotionProgress const& _progress;
+    ReadingProgress const& _progress;
     std::size_t _frame = 0;
     std::size_t _countPosition = 0;
     bool _endsWithLineEnd = false;
@@ -134,7 +134,7 @@ private:
 
 } // namespace
 
-void readMotionFrames(MotionScanner& scanner, Motion& motion, MotionProgress const& progress) {
+void readMotionFrames(MotionScanner& scanner, Motion& motion, ReadingProgress const& progress) {
     FramesReader(scanner, motion, progress).read();
 }
 

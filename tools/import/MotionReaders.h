@@ -11,6 +11,6 @@ namespace lumenkey::tools {
 void readMotionHierarchy(MotionScanner& scanner, Motion& motion);
 
 /// Reads the rest of the file.
-void readMotionFrames(MotionScanner& scanner, Motion& motion, MotionProgress const& progress);
+void readMotionFrames(MotionScanner& scanner, Motion& motion, ReadingProgress const& progress);
 
 } // namespace lumenkey::tools

@@ -87,7 +87,7 @@ std::string_view MotionScanner::field() {
     return take(end);
 }
 
-double MotionScanner::numberFrom(std::string_view text) const {
+double MotionScanner::numberFrom(std::string_view text, std::size_t position) const {
     std::string_view digits = text;
     if (digits.starts_with('+')) {
         digits.remove_prefix(1);
@@ -99,10 +99,10 @@ double MotionScanner::numberFrom(std::string_view text) const {
     double value = 0;
     auto const [end, error] = std::from_chars(digits.data(), digits.data() + digits.size(), value);
     if (!startsLikeNumber || error == std::errc::invalid_argument || end != digits.data() + digits.size()) {
-        failAtToken(text.empty() ? "a number is missing" : quoted(text) + " is not a number");
+        fail(position, text.empty() ? "a number is missing" : quoted(text) + " is not a number");
     }
     if (error != std::errc{} || !std::isfinite(value)) {
-        failAtToken(quoted(text) + " is out of the range of numbers");
+        fail(position, quoted(text) + " is out of the range of numbers");
     }
     return value;
 }

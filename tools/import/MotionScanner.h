@@ -1,6 +1,6 @@
 #pragma once
 
-// For the readers of motion files only.
+// For the readers of files only.
 
 #include "tools/import/InputError.h"
 
@@ -10,7 +10,7 @@
 
 namespace lumenkey::tools {
 
-/// A place in the text of a motion file, and what can be read there. Only errors count lines, so reading is
+/// A place in the text of an input file, and what can be read there. Only errors count lines, so reading is
 /// quick.
 class MotionScanner {
 public:
@@ -38,8 +38,10 @@ public:
     std::string_view field();
 
     /// Reads the next field, or the next word, as a finite number; fails for anything else.
-    double number() { return numberFrom(field()); }
-    double numberBeforeBrace() { return numberFrom(word()); }
+    double number() { return numberFromToken(field()); }
+    double numberBeforeBrace() { return numberFromToken(word()); }
+    /// All of `text` as a finite number; fails at its `position` for anything else.
+    double numberFrom(std::string_view text, std::size_t position) const;
 
     /// Both fail unless it comes next. Letters are compared without case.
     void expectWord(std::string_view expected);
@@ -55,7 +57,7 @@ public:
 
 private:
     std::string_view take(std::size_t end);
-    double numberFrom(std::string_view text) const;
+    double numberFromToken(std::string_view text) const { return numberFrom(text, _token); }
 
     std::string_view _text;
     std::string const& _file;

@@ -1,10 +1,23 @@
 #include "tools/output/CsvWriter.h"
 
+#include "tools/output/TextForms.h"
+
 namespace lumenkey::tools {
 
-void CsvWriter::field(std::string_view text) {
-    _row += _hasField ? "," : "";
+void CsvWriter::separate() {
+    constexpr std::size_t enough = 65'536; // a row may be as long as a file
+    if (_row.size() >= enough) {
+        _out.write(_row);
+        _row.clear();
+    }
+    if (_hasField) {
+        _row += ',';
+    }
     _hasField = true;
+}
+
+void CsvWriter::field(std::string_view text) {
+    separate();
     if (text.find_first_of(",\"\r\n") == std::string_view::npos) {
         _row += text;
         return;
@@ -17,6 +30,11 @@ void CsvWriter::field(std::string_view text) {
         }
     }
     _row += '"';
+}
+
+void CsvWriter::number(double value) {
+    separate();
+    appendShortest(_row, value);
 }
 
 void CsvWriter::endRow() {

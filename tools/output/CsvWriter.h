@@ -14,10 +14,15 @@ public:
     explicit CsvWriter(OutputSink& out) : _out(out) {}
 
     void field(std::string_view text);
+    /// The shortest decimal that reads back to the same bits.
+    void number(double value);
     void endRow();
 
 private:
+    void separate();
+
     OutputSink& _out;
+    /// What of the row isn't written yet.
     std::string _row;
     bool _hasField = false;
 };

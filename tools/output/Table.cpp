@@ -8,14 +8,11 @@ namespace lumenkey::tools {
 
 namespace {
 
-/// `text` in a cell of `width`; no spaces behind the last one of a row.
-std::string padded(std::string const& text, std::size_t width, Align align, bool isLast) {
+/// `text` in a cell of `width`.
+std::string padded(std::string const& text, std::size_t width, Align align) {
     std::size_t const own = widthOfText(text);
     std::string const space(width > own ? width - own : 0, ' ');
-    if (align == Align::Right) {
-        return space + text;
-    }
-    return isLast ? text : text + space;
+    return align == Align::Right ? space + text : text + space;
 }
 
 } // namespace
@@ -34,8 +31,9 @@ void Table::write(OutputSink& out) const {
         std::string line;
         for (std::size_t i = 0; i < columns.size(); ++i) {
             line += (i == 0 ? "" : "  ");
-            line += padded(printableText(textOf(i)), widths[i], columns[i].align, i + 1 == columns.size());
+            line += padded(printableText(textOf(i)), widths[i], columns[i].align);
         }
+        line.resize(line.find_last_not_of(' ') + 1); // empty cells at the end
         out.write(line + "\n");
     };
     writeRow([&](std::size_t i) { return columns[i].title; });

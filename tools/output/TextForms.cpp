@@ -20,11 +20,19 @@ std::string textOf(NumberBuffer const& buffer, std::to_chars_result result) {
 } // namespace
 
 std::string shortestText(double value) {
+    std::string text;
+    appendShortest(text, value);
+    return text;
+}
+
+void appendShortest(std::string& text, double value) {
     if (std::isnan(value)) {
-        return "nan";
+        text += "nan";
+        return;
     }
-    NumberBuffer buffer{};
-    return textOf(buffer, std::to_chars(buffer.data(), buffer.data() + buffer.size(), value));
+    NumberBuffer buffer;
+    auto const [end, error] = std::to_chars(buffer.data(), buffer.data() + buffer.size(), value);
+    text.append(buffer.data(), end);
 }
 
 std::string tableText(double value) {

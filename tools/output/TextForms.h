@@ -9,6 +9,7 @@ namespace lumenkey::tools {
 
 /// The shortest decimal that reads back to the same bits; `inf`, `-inf` and `nan` for what is no number.
 std::string shortestText(double value);
+void appendShortest(std::string& text, double value);
 
 /// For tables: six decimals, or seven significant digits where those would show nothing or too much.
 std::string tableText(double value);

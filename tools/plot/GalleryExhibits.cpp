@@ -56,8 +56,8 @@ constexpr std::array<Point, 3> kCycle{{{TempusMake(0, 1), 0.1, 0.15, 0.3},
                                        {TempusMake(2, 5), 0.9, 0.15, 0},
                                        {TempusMake(1, 1), 0.45, 0.2, -0.12}}};
 
-template <class Points> std::unique_ptr<ChannelSpline> makeCurve(Points const& points, std::uint32_t type) {
-    auto made = std::make_unique<ChannelSpline>();
+template <class Points> std::unique_ptr<ExhibitSpline> makeCurve(Points const& points, std::uint32_t type) {
+    auto made = std::make_unique<ExhibitSpline>();
     // Types that are one function over the whole spline are made for a running parameter.
     made->state.parametric = type == kKFInterpolationBSpline || type == kKFInterpolationXSpline;
     made->state.deriveTangents = false;

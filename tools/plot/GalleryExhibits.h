@@ -1,6 +1,7 @@
 #pragma once
 
-#include "tools/import/MotionChannels.h"
+#include "lumenkey/splines/KFSpline.h"
+#include "lumenkey/splines/KFSplineState.h"
 
 #include <memory>
 #include <string>
@@ -8,11 +9,17 @@
 
 namespace lumenkey::tools {
 
+/// A spline with the settings it needs by its side.
+struct ExhibitSpline {
+    KFSplineState state;
+    KFSpline spline{&state};
+};
+
 /// A curve that shows one ability of the engine, and the stretch of time to show.
 struct GalleryExhibit {
     std::string number;
     std::string title;
-    std::unique_ptr<ChannelSpline> curve;
+    std::unique_ptr<ExhibitSpline> curve;
     Tempus from{};
     Tempus to{};
 };

@@ -29,6 +29,7 @@ PlotText tickText(PlotAlign align) { return {kSmallText, style::kFaintInk, align
 
 PlotStroke strokeOfCurve(std::size_t index) {
     static std::vector<double> const patterns[] = {{}, {7, 3}, {2, 2.5}, {8, 3, 2, 3}};
+    static_assert(std::size(patterns) * style::kCurves.size() == kMostDistinctCurves);
     std::size_t const round = index / style::kCurves.size();
     return {style::kCurves[index % style::kCurves.size()], style::kCurveWidth,
             patterns[round % std::size(patterns)]};

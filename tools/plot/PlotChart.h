@@ -3,6 +3,7 @@
 #include "tools/plot/CurvePicture.h"
 #include "tools/plot/PlotCanvas.h"
 
+#include <cstddef>
 #include <string>
 #include <vector>
 
@@ -18,6 +19,9 @@ struct ChartPanel {
     std::string unit;
     std::vector<ChartCurve> curves;
 };
+
+/// So many curves of a chart can be told apart: each of the first has a stroke of its own.
+inline constexpr std::size_t kMostDistinctCurves = 28;
 
 /// Values over time: a panel for each unit above a common axis of seconds, with a legend. Curves take their
 /// colours in order, over all panels.

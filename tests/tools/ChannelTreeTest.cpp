@@ -1,0 +1,183 @@
+#include "tools/tree/ChannelTree.h"
+#include "tests/tools/MotionSamples.h"
+#include "tools/curve/Keypoint.h"
+#include "tools/curve/SampleTimes.h"
+#include "tools/import/MotionTree.h"
+
+#include <cmath>
+#include <gtest/gtest.h>
+#include <numbers>
+
+namespace lumenkey::tools {
+namespace {
+
+using samples::kSmallMotion;
+
+std::string const kJoint = "{ OFFSET 0 0 0 CHANNELS 1 Xrotation ";
+
+/// A file with a joint for each name; children are what stands between braces.
+std::unique_ptr<ChannelTree> treeOfJoints(std::string const& joints) {
+    std::string text = "HIERARCHY\nROOT " + joints + "MOTION\nFrames: 0\nFrame Time: 0.04\n";
+    return treeOfMotion(readMotionText(text, "folder/odd.name.bvh"));
+}
+
+/// Path, name and type of all nodes.
+std::string listing(ChannelTree const& tree) {
+    std::string text;
+    for (ChannelTree::Node node = 0; node < tree.count(); ++node) {
+        text += tree.path(node) + " " + tree.base(node).getName().str() + " " +
+                std::string(nodeTypeName(tree.type(node))) + "\n";
+    }
+    return text;
+}
+
+TEST(ChannelTree, HoldsTheJointsInTheOrderOfTheFile) {
+    std::unique_ptr<ChannelTree> const tree = treeOfMotion(readMotionText(kSmallMotion, "small.bvh"));
+    EXPECT_EQ(listing(*tree),
+              "./ small ObjectRoot\n./1 Hips Folder\n./1/1 Xposition Double\n./1/2 Yposition Double\n"
+              "./1/3 Zposition Double\n./1/4 Zrotation Angle\n./1/5 Xrotation Angle\n"
+              "./1/6 Yrotation Angle\n./1/7 LeftLeg Folder\n./1/7/1 Zrotation Angle\n"
+              "./1/7/2 Xrotation Angle\n./1/7/3 Yrotation Angle\n");
+    EXPECT_EQ(tree->base(2).getFrameDuration(), TempusMake(1, 120));
+    EXPECT_EQ(tree->channelsBelow(8), (std::vector<ChannelTree::Node>{9, 10, 11}));
+    EXPECT_EQ(tree->channelsBelow(ChannelTree::kTop).size(), 9U);
+
+    KFSpline& spline = tree->spline(*tree->find("LeftLeg.Yrotation").first);
+    std::vector<void*> const handles = keypointHandles(spline);
+    ASSERT_EQ(handles.size(), 3U);
+    double const degrees[] = {90, 95, 180};
+    for (int i = 0; i < 3; ++i) {
+        Keypoint const key = readKeypoint(spline, handles[static_cast<std::size_t>(i)]);
+        EXPECT_EQ(key.time, TempusMake(i, 120));
+        EXPECT_DOUBLE_EQ(key.value, degrees[i] * std::numbers::pi / 180);
+        EXPECT_EQ(key.interpolation, 1U);
+        EXPECT_TRUE(key.enabled && key.in.isFlat() && key.out.isFlat());
+    }
+
+    // Child joints follow the channels also where the file lists them first.
+    std::unique_ptr<ChannelTree> const late = treeOfMotion(
+        readMotionText("HIERARCHY\nROOT A{ OFFSET 0 0 0 JOINT B" + kJoint + "} JOINT C" + kJoint +
+                           "} CHANNELS 1 Yposition }\nMOTION\nFrames: 0\nFrame Time: 1\n",
+                       "late"));
+    EXPECT_EQ(listing(*late).substr(19),
+              "./1 A Folder\n./1/1 Yposition Double\n./1/2 B Folder\n./1/2/1 Xrotation "
+              "Angle\n./1/3 C Folder\n./1/3/1 Xrotation Angle\n");
+}
+
+TEST(ChannelTree, FindsNodesByNameAndPath) {
+    std::unique_ptr<ChannelTree> const tree = treeOfJoints(
+        "Hips" + kJoint + "JOINT L.Leg" + kJoint + "JOINT Toe" + kJoint + "}} JOINT Right" + kJoint +
+        "JOINT Toe" + kJoint + "} JOINT Toe" + kJoint + "}}}\nROOT Toe" + kJoint + "}\n");
+    struct {
+        char const* text;
+        char const* first;
+        char const* second;
+    } const cases[] = {
+        {"Hips", "./1", ""},
+        {"Hips.Xrotation", "./1/1", ""},
+        {"Hips.L.Leg.Toe.Xrotation", "./1/2/2/1", ""},
+        {"L.Leg.Xrotation", "./1/2/1", ""},
+        {"Leg.Xrotation", "./1/2/1", ""}, // a dot inside a name
+        {"Leg.Toe", "./1/2/2", ""},
+        {"Hips.Right.Toe", "./1/3/2", "./1/3/3"},
+        {"Right.Toe.Xrotation", "./1/3/2/1", "./1/3/3/1"},
+        {"Toe.Xrotation", "./2/1", ""}, // a whole name goes before the ends of others
+        {"Xrotation", "./1/1", "./1/2/1"},
+        {"./", "./", ""},
+        {".", "./", ""},
+        {"./1/3/2", "./1/3/2", ""},
+        {"./1/4", "", ""},
+        {"./1/x", "", ""},
+        {"./01", "./1", ""},
+        {"", "", ""},
+        {"hips", "", ""},
+        {"eg.Xrotation", "", ""},
+        {".Xrotation", "", ""},
+        {"Hips.", "", ""},
+        {"Hips..Xrotation", "", ""},
+        {"odd.name.Hips", "", ""},
+        {"Hips/Right", "", ""},
+        {"Toe#2.Xrotation", "", ""},
+    };
+    auto const pathOf = [&tree](std::optional<ChannelTree::Node> node) {
+        return node ? tree->path(*node) : "";
+    };
+    for (auto const& each : cases) {
+        ChannelTree::Match const match = tree->find(each.text);
+        EXPECT_EQ(pathOf(match.first), each.first) << each.text;
+        EXPECT_EQ(pathOf(match.second), each.second) << each.text;
+    }
+    for (ChannelTree::Node node = 1; node < tree->count(); ++node) {
+        EXPECT_EQ(tree->find(tree->path(node)).first, node);
+        std::string const name = tree->dottedName(node);
+        EXPECT_EQ(tree->dottedName(*tree->find(name).first), name);
+        EXPECT_TRUE(name.ends_with(tree->trailingName(node, 2, 100)));
+    }
+    EXPECT_EQ(tree->trailingName(*tree->find("./1/3/2/1").first, 3, 100), "Right.Toe.Xrotation");
+    EXPECT_EQ(tree->trailingName(*tree->find("./1/3/2/1").first, 3, 10), "");
+    EXPECT_EQ(tree->base(0).getName().str(), "odd.name");
+}
+
+/// Linear interpolation between frames in long doubles, held at both ends.
+double interpolated(Motion const& motion, std::size_t channel, Tempus const& time) {
+    // In frames of frameDuration.
+    long double const place =
+        static_cast<long double>(time.value) * motion.frameDuration.timescale /
+        (static_cast<long double>(time.timescale) * static_cast<long double>(motion.frameDuration.value));
+    long double const held = std::min(std::max(place, 0.0L), static_cast<long double>(motion.frameCount - 1));
+    auto const frame = static_cast<std::size_t>(held);
+    std::size_t const next = std::min(frame + 1, motion.frameCount - 1);
+    long double const share = held - static_cast<long double>(frame);
+    long double const value =
+        motion.value(frame, channel) * (1 - share) + motion.value(next, channel) * share;
+    bool const turns = isRotation(motion.channels[channel].kind);
+    return static_cast<double>(turns ? value * std::numbers::pi_v<long double> / 180 : value);
+}
+
+TEST(SampleTimes, ReadsCurvesAtExactTimes) {
+    Motion const motion = readMotionText(kSmallMotion, "f.bvh");
+    std::unique_ptr<ChannelTree> const tree = treeOfMotion(motion);
+    std::vector<ChannelTree::Node> const channels = tree->channelsBelow(ChannelTree::kTop);
+    struct {
+        char const* what;
+        SampleTimes times;
+    } const cases[] = {
+        {"a row", SampleTimes::row(TempusMake(-1, 120), TempusMake(1, 1'000), 40)},
+        {"a spread", SampleTimes::spread(kTempusZero, TempusMake(1, 60), 12)},
+        {"a spread that no step serves",
+         SampleTimes::spread(TempusMake(1, 2'147'483'647), TempusMake(1, 60), 1'000)},
+        {"a list", SampleTimes::list({TempusMake(1, 240), TempusMake(7, 1'000), kTempusZero})},
+    };
+    for (auto const& each : cases) {
+        SCOPED_TRACE(each.what);
+        for (std::size_t channel = 0; channel < channels.size(); ++channel) {
+            std::vector<double> const values = each.times.values(tree->curve(channels[channel]));
+            ASSERT_EQ(values.size(), each.times.count());
+            for (std::size_t i = 0; i < values.size(); ++i) {
+                double const expected = interpolated(motion, channel, each.times.at(i));
+                EXPECT_NEAR(values[i], expected, 1e-12 * std::max(1.0, std::abs(expected)));
+            }
+            // In blocks the same to the bit.
+            std::vector<double> blocks(values.size());
+            for (std::size_t first = 0; first < values.size(); first += 7) {
+                each.times.readValues(tree->curve(channels[channel]), first,
+                                      std::min<std::size_t>(7, values.size() - first), blocks.data() + first);
+            }
+            EXPECT_EQ(blocks, values);
+        }
+    }
+    EXPECT_EQ(cases[1].times.at(11), TempusMake(1, 60));
+    EXPECT_EQ(cases[2].times.at(999), TempusMake(1, 60));
+    EXPECT_EQ(SampleTimes::spread(TempusMake(1, 3), TempusMake(1, 2), 1).at(0), TempusMake(1, 3));
+
+    // Slopes between keypoints 0, 1, 4 at 120 frames a second, and behind them.
+    std::vector<double> const slopes =
+        SampleTimes::list({TempusMake(1, 240), TempusMake(3, 240), TempusMake(1, 1)})
+            .slopes(tree->spline(channels[0]));
+    EXPECT_NEAR(slopes[0], 120, 1e-6);
+    EXPECT_NEAR(slopes[1], 360, 1e-6);
+    EXPECT_EQ(slopes[2], 0);
+}
+
+} // namespace
+} // namespace lumenkey::tools

@@ -1,0 +1,68 @@
+#include "tools/import/MotionTree.h"
+
+#include <algorithm>
+#include <array>
+#include <filesystem>
+#include <numbers>
+
+namespace lumenkey::tools {
+
+namespace {
+
+/// So many neighbouring columns are gathered at once: a row of them is a line of the processor's cache.
+constexpr std::size_t kColumnsAtOnce = 8;
+
+/// Adds the joints and gives the nodes of all channels, in the order of the columns.
+std::vector<ChannelTree::Node> addJoints(Motion const& motion, ChannelTree& tree) {
+    std::vector<ChannelTree::Node> folders;
+    std::vector<ChannelTree::Node> channels(motion.channels.size());
+    for (MotionJoint const& joint : motion.joints) {
+        bool const isRoot = joint.parent == MotionJoint::kNoParent;
+        folders.push_back(tree.addFolder(isRoot ? ChannelTree::kTop : folders[joint.parent], joint.name));
+        for (std::size_t i = joint.firstChannel; i < joint.firstChannel + joint.channelCount; ++i) {
+            MotionChannelKind const kind = motion.channels[i].kind;
+            channels[i] = tree.addChannel(folders.back(), std::string(motionChannelKindName(kind)),
+                                          isRotation(kind) ? NodeType::Angle : NodeType::Double);
+        }
+    }
+    return channels;
+}
+
+std::vector<Tempus> timesOfFrames(Motion const& motion) {
+    std::vector<Tempus> times;
+    times.reserve(motion.frameCount);
+    for (std::size_t frame = 0; frame < motion.frameCount; ++frame) {
+        times.push_back(motion.timeOfFrame(frame));
+    }
+    return times;
+}
+
+} // namespace
+
+std::unique_ptr<ChannelTree> treeOfMotion(Motion const& motion) {
+    auto tree = std::make_unique<ChannelTree>(std::filesystem::path(motion.file).stem().string(),
+                                              motion.frameDuration);
+    std::vector<ChannelTree::Node> const channels = addJoints(motion, *tree);
+    std::vector<Tempus> const times = timesOfFrames(motion);
+    std::array<std::vector<double>, kColumnsAtOnce> columns;
+    for (std::size_t first = 0; first < channels.size(); first += kColumnsAtOnce) {
+        std::size_t const width = std::min(kColumnsAtOnce, channels.size() - first);
+        std::array<double, kColumnsAtOnce> scales{};
+        for (std::size_t i = 0; i < width; ++i) {
+            columns[i].resize(motion.frameCount);
+            scales[i] = isRotation(motion.channels[first + i].kind) ? std::numbers::pi / 180 : 1;
+        }
+        for (std::size_t frame = 0; frame < motion.frameCount; ++frame) {
+            for (std::size_t i = 0; i < width; ++i) {
+                columns[i][frame] = motion.value(frame, first + i) * scales[i];
+            }
+        }
+        for (std::size_t i = 0; i < width; ++i) {
+            tree->setKeypoints(channels[first + i], times, columns[i]);
+        }
+    }
+    tree->finish({kTempusZero, motion.timeOfFrame(motion.frameCount)});
+    return tree;
+}
+
+} // namespace lumenkey::tools

@@ -1,0 +1,214 @@
+#include "tools/tree/ChannelTree.h"
+
+#include <algorithm>
+
+namespace lumenkey::tools {
+
+namespace {
+
+/// The object that a file is.
+class FileRoot : public KFChannelObjectRootBase {
+public:
+    FileRoot(std::string const& name, Tempus const& frameDuration)
+        : KFChannelObjectRootBase(name, nullptr, 1, 0, 0), _frameDuration(frameDuration) {}
+
+    Tempus getFrameDuration() const override {
+        return TempusIsNumeric(_frameDuration) ? _frameDuration : KFChannelObjectRootBase::getFrameDuration();
+    }
+
+private:
+    Tempus _frameDuration;
+};
+
+} // namespace
+
+std::string_view nodeTypeName(NodeType type) {
+    switch (type) {
+    case NodeType::ObjectRoot:
+        return "ObjectRoot";
+    case NodeType::Folder:
+        return "Folder";
+    case NodeType::Double:
+        return "Double";
+    case NodeType::Angle:
+        return "Angle";
+    }
+    return "";
+}
+
+std::string_view nodeClassName(NodeType type) {
+    switch (type) {
+    case NodeType::ObjectRoot:
+        return "KFChannelObjectRootBase";
+    case NodeType::Folder:
+        return "KFChannelFolder";
+    case NodeType::Double:
+        return "KFChannelDouble";
+    case NodeType::Angle:
+        return "KFChannelAngle";
+    }
+    return "";
+}
+
+// --- Building ---
+
+ChannelTree::ChannelTree(std::string const& name, Tempus const& frameDuration) {
+    _entries.push_back(
+        {std::make_unique<FileRoot>(name, frameDuration), NodeType::ObjectRoot, kTop, 0, 0, kTop + 1});
+}
+
+ChannelTree::~ChannelTree() {
+    // Children before their folders; what a folder still lists then is never looked at.
+    while (!_entries.empty()) {
+        _entries.pop_back();
+    }
+}
+
+unsigned ChannelTree::nextID(Node parent) const {
+    return static_cast<unsigned>(folder(parent).getNumberOfDescendants()) + 1;
+}
+
+ChannelTree::Node ChannelTree::add(Node parent, std::unique_ptr<KFChannelBase> channel, NodeType type) {
+    Entry const& above = _entries[parent];
+    std::size_t const dot = parent == kTop ? 0 : 1;
+    std::size_t const nameLength = above.nameLength + dot + channel->getName().size();
+    _entries.push_back({std::move(channel), type, parent, above.depth + 1, nameLength, _entries.size() + 1});
+    return _entries.size() - 1;
+}
+
+ChannelTree::Node ChannelTree::addFolder(Node parent, std::string const& name) {
+    unsigned const id = nextID(parent);
+    return add(parent, std::make_unique<KFChannelFolder>(name, &folder(parent), id, 0, 0), NodeType::Folder);
+}
+
+ChannelTree::Node ChannelTree::addChannel(Node parent, std::string const& name, NodeType type) {
+    unsigned const id = nextID(parent);
+    std::unique_ptr<KFChannelBase> channel;
+    if (type == NodeType::Angle) {
+        channel = std::make_unique<KFChannelAngle>(name, &folder(parent), id, 0);
+    } else {
+        channel = std::make_unique<KFChannelDouble>(name, &folder(parent), id, 0);
+    }
+    return add(parent, std::move(channel), type);
+}
+
+void ChannelTree::setKeypoints(Node node, std::vector<Tempus> const& times,
+                               std::vector<double> const& values) {
+    // Room for one makes the curve a spline also where no keypoint follows.
+    channel(node).willLoadKeyframes(true, static_cast<int>(std::max<std::size_t>(times.size(), 1)));
+    channel(node).appendKeyframes(static_cast<unsigned>(times.size()), times.data(), values.data(), false);
+    channel(node).willLoadKeyframes(false, 0);
+}
+
+void ChannelTree::finish(BXTimeRange const& extent) {
+    for (Node node = count() - 1; node != kTop; --node) {
+        Entry& above = _entries[_entries[node].parent];
+        above.end = std::max(above.end, _entries[node].end);
+    }
+    static_cast<KFChannelObjectRootBase&>(base(kTop)).setTimeExtent(extent, true);
+    base(kTop).finishInitializing();
+}
+
+std::vector<ChannelTree::Node> ChannelTree::channelsBelow(Node node) const {
+    std::vector<Node> channels;
+    for (Node below = node; below < _entries[node].end; ++below) {
+        if (isChannel(below)) {
+            channels.push_back(below);
+        }
+    }
+    return channels;
+}
+
+// --- Names ---
+
+std::string ChannelTree::dottedName(Node node) const {
+    std::string text(_entries[node].nameLength, '.');
+    // From the end of the text to its start.
+    for (std::size_t end = text.size(); node != kTop; node = _entries[node].parent) {
+        std::string_view const part = name(node);
+        end -= part.size();
+        part.copy(text.data() + end, part.size());
+        end -= end > 0 ? 1 : 0; // the dot
+    }
+    return text;
+}
+
+std::string ChannelTree::trailingName(Node node, std::size_t parts, std::size_t mostBytes) const {
+    std::string text;
+    for (; node != kTop && parts > 0; --parts, node = _entries[node].parent) {
+        std::string_view const part = name(node);
+        if (text.size() + part.size() + 1 > mostBytes) {
+            return {};
+        }
+        text.insert(0, text.empty() ? 0 : 1, '.');
+        text.insert(0, part);
+    }
+    return text;
+}
+
+std::string ChannelTree::path(Node node) const {
+    return node == kTop ? "./" : KFChannelRef(&base(node), &base(kTop)).str();
+}
+
+std::optional<ChannelTree::Node> ChannelTree::atPath(std::string_view path) const {
+    KFChannelBase const* const found = KFChannelRef(BXString(path)).getChannel(&base(kTop));
+    if (found == nullptr) {
+        return std::nullopt;
+    }
+    auto const place = std::find_if(_entries.begin(), _entries.end(),
+                                    [found](Entry const& entry) { return entry.channel.get() == found; });
+    return static_cast<Node>(place - _entries.begin());
+}
+
+ChannelTree::Naming ChannelTree::isCalled(Node node, std::string_view text) const {
+    // From the node upwards, taking names off the end of the text.
+    while (node != kTop) {
+        std::string_view const part = name(node);
+        Node const parent = _entries[node].parent;
+        if (text.size() < part.size()) {
+            bool const isEnd = part.ends_with(text) && part[part.size() - text.size() - 1] == '.';
+            return isEnd ? Naming::ByEnd : Naming::No;
+        }
+        if (!text.ends_with(part)) {
+            return Naming::No;
+        }
+        text.remove_suffix(part.size());
+        if (text.empty()) {
+            return parent == kTop ? Naming::Whole : Naming::ByEnd;
+        }
+        if (text.size() < 2 || !text.ends_with('.')) {
+            return Naming::No;
+        }
+        text.remove_suffix(1);
+        node = parent;
+    }
+    return Naming::No;
+}
+
+ChannelTree::Match ChannelTree::find(std::string_view text) const {
+    if (text.empty()) {
+        return {};
+    }
+    if (text.front() == '.') {
+        if (std::optional<Node> const node = atPath(text)) {
+            return {node, std::nullopt};
+        }
+    }
+    Match whole;
+    Match byEnd;
+    for (Node node = kTop + 1; node < count(); ++node) {
+        Naming const naming = isCalled(node, text);
+        if (naming == Naming::No) {
+            continue;
+        }
+        Match& match = naming == Naming::Whole ? whole : byEnd;
+        if (!match.first) {
+            match.first = node;
+        } else if (!match.second) {
+            match.second = node;
+        }
+    }
+    return whole.first ? whole : byEnd;
+}
+
+} // namespace lumenkey::tools

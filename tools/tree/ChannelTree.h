@@ -1,0 +1,112 @@
+#pragma once
+
+#include "lumenkey/Channels/KFChannelObjectRootBase.h"
+#include "lumenkey/Channels/KFScalarChannels.h"
+#include "lumenkey/curves/KFCurve.h"
+#include "lumenkey/splines/KFSpline.h"
+
+#include <cstddef>
+#include <memory>
+#include <optional>
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace lumenkey::tools {
+
+/// What a node is: the library's class without its `KFChannel` in front and `Base` behind.
+enum class NodeType { ObjectRoot, Folder, Double, Angle };
+
+std::string_view nodeTypeName(NodeType type);
+std::string_view nodeClassName(NodeType type);
+
+/// The channels of a file as a tree of the library, which it owns, and the names of its nodes.
+///
+/// A node is told by its place in tree order: a folder, then all that lies below it. IDs count from 1 among the
+/// children of each folder, in the order in which they are added.
+///
+/// The dotted name of a node is the names from the top's children down to it, with dots between them:
+/// `Hips.LeftLeg.Xrotation`. Names may hold dots themselves. The top has no dotted name.
+class ChannelTree {
+public:
+    using Node = std::size_t;
+    static constexpr Node kTop = 0;
+
+    /// `frameDuration` is what the root answers for it; with an invalid one it answers the library's default.
+    ChannelTree(std::string const& name, Tempus const& frameDuration);
+    ~ChannelTree();
+    ChannelTree(ChannelTree const&) = delete;
+    ChannelTree& operator=(ChannelTree const&) = delete;
+
+    // Building: nodes are added in tree order, so a parent is the node added last or one above it.
+
+    Node addFolder(Node parent, std::string const& name);
+    /// A value channel, `Double` or `Angle`.
+    Node addChannel(Node parent, std::string const& name, NodeType type);
+    /// By the bulk path, in ascending order of time; once for each value channel, also where there are none.
+    void setKeypoints(Node channel, std::vector<Tempus> const& times, std::vector<double> const& values);
+    /// To be called once everything is there, and before anything below.
+    void finish(BXTimeRange const& extent);
+
+    // Nodes.
+
+    std::size_t count() const { return _entries.size(); }
+    NodeType type(Node node) const { return _entries[node].type; }
+    bool isChannel(Node node) const {
+        return type(node) == NodeType::Double || type(node) == NodeType::Angle;
+    }
+    /// 0 for the top.
+    std::size_t depth(Node node) const { return _entries[node].depth; }
+    KFChannelBase& base(Node node) const { return *_entries[node].channel; }
+    /// The value channels at a node or below it, in tree order.
+    std::vector<Node> channelsBelow(Node node) const;
+
+    // Value channels only.
+
+    KFChannel& channel(Node node) const { return static_cast<KFChannel&>(base(node)); }
+    KFCurve& curve(Node node) const { return *channel(node).getCurveInterface(); }
+    KFSpline& spline(Node node) const { return *curve(node).getSpline(); }
+    /// `rad` or `units`.
+    std::string_view unit(Node node) const { return type(node) == NodeType::Angle ? "rad" : "units"; }
+
+    // Names. Each costs as much as the name is long, or the node deep.
+
+    std::string dottedName(Node node) const;
+    /// The last `parts` names of the dotted name; empty where that has more than `mostBytes`.
+    std::string trailingName(Node node, std::size_t parts, std::size_t mostBytes) const;
+    /// The path of IDs from the top, such as `./1/3`; `./` for the top itself.
+    std::string path(Node node) const;
+
+    /// What a text names, and the next that it could name too.
+    struct Match {
+        std::optional<Node> first;
+        std::optional<Node> second;
+    };
+    /// By a path of IDs; else by the whole dotted name; else by the end of a dotted name, from behind one of its dots
+    /// on. Case matters. Of several the first in tree order comes first.
+    Match find(std::string_view text) const;
+
+private:
+    struct Entry {
+        std::unique_ptr<KFChannelBase> channel;
+        NodeType type;
+        Node parent;
+        std::size_t depth;
+        /// Of the dotted name, in bytes.
+        std::size_t nameLength;
+        /// Behind the last node below.
+        Node end;
+    };
+    enum class Naming { No, ByEnd, Whole };
+
+    Node add(Node parent, std::unique_ptr<KFChannelBase> channel, NodeType type);
+    KFChannelFolder& folder(Node node) const { return static_cast<KFChannelFolder&>(base(node)); }
+    unsigned nextID(Node parent) const;
+    std::string_view name(Node node) const { return base(node).getName().view(); }
+    std::optional<Node> atPath(std::string_view path) const;
+    Naming isCalled(Node node, std::string_view text) const;
+
+    std::vector<Entry> _entries;
+};
+
+} // namespace lumenkey::tools
