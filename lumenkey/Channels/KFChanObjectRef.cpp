@@ -20,7 +20,7 @@ KF_DEFINE_CLASS_IMPL(KFChanObjectRef)
 KF_DEFINE_NAMED_FORM(KFChanObjectRef, createKFChanObjectRefImpl(), storeFlags(getFlags() | kObjectRefFlags))
 KF_DEFINE_FACTORY_FORM(KFChanObjectRef, createKFChanObjectRefImpl(), storeFlags(getFlags() | kObjectRefFlags))
 // There is no facade class of its own: the host's subclass names one.
-KF_DEFINE_COPIES_AND_NAME(KFChanObjectRef, "KWChannel")
+KF_DEFINE_COPIES_AND_NAME(KFChanObjectRef, "KWChannel", storeFlags(getFlags() | kObjectRefFlags))
 
 bool KFChanObjectRef::isObjectRef() const { return true; }
 void* KFChanObjectRef::getObjectRef() const { return nullptr; }

@@ -6,6 +6,7 @@
 #include "lumenkey/Channels/KFChannelInfo.h"
 #include "lumenkey/Channels/KFCompoundChannel.h"
 #include "lumenkey/curves/KFCurve.h"
+#include "lumenkey/curves/KFCurveOwner.h"
 
 #include <algorithm>
 
@@ -28,6 +29,15 @@ std::unique_ptr<KFCurve> cloneOf(KFCurve* curve) {
 }
 
 } // namespace
+
+class KFChannel::CurveOwner final : public KFCurveOwner {
+public:
+    explicit CurveOwner(KFChannel const& channel) noexcept : _channel(channel) {}
+    Tempus getFrameDurationForCurve() const override { return _channel.getFrameDuration(); }
+
+private:
+    KFChannel const& _channel;
+};
 
 // --- Construction ---
 
@@ -129,7 +139,7 @@ void KFChannel::installPrototypeCurveInterface() {
     if (_prototypeCurve == nullptr || createLocalChannelImplementation() == nullptr)
         return;
     _impl->setCurve(cloneOf(_prototypeCurve.get()));
-    curve().setOwnerChannel(this);
+    curve().setOwnerChannel(curveOwner());
 }
 
 void KFChannel::setCurveInterface(KFCurveInterface* curve) {
@@ -145,17 +155,22 @@ KFCurveInterface* KFChannel::releaseCurveInterface() {
     if (isLocked(false) || createLocalChannelImplementation() == nullptr)
         return nullptr;
     KFCurve* const released = _impl->releaseCurve().release();
-    if (released != nullptr && released->getOwnerChannel() == this)
+    if (released != nullptr && released->getOwnerChannel() == _curveOwner.get())
         released->setOwnerChannel(nullptr);
     return released;
 }
 
 void KFChannel::setOwnerChannel(KFChannel* owner) {
-    if (curve().getOwnerChannel() != owner)
-        curveToWrite().setOwnerChannel(owner);
+    KFCurveOwner* const wanted = owner == nullptr ? nullptr : owner->curveOwner();
+    if (curve().getOwnerChannel() != wanted)
+        curveToWrite().setOwnerChannel(wanted);
 }
 
-Tempus KFChannel::getFrameDurationForCurve() const { return getFrameDuration(); }
+KFCurveOwner* KFChannel::curveOwner() {
+    if (_curveOwner == nullptr)
+        _curveOwner = std::make_unique<CurveOwner>(*this);
+    return _curveOwner.get();
+}
 
 // --- The record of the slider ---
 
@@ -183,11 +198,11 @@ void KFChannel::resetLocalChannelInfo() {
 }
 
 void KFChannel::setInfo(KFChannelInfo const* source) {
-    if (source == nullptr || source == _info)
+    if (source == nullptr)
         return;
     if (_info == nullptr || _info->shared) {
         _info = new KFChannelInfo(*source);
-    } else {
+    } else if (source != _info) {
         *_info = *source;
     }
 }

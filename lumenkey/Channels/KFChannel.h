@@ -1,7 +1,6 @@
 #pragma once
 
 #include "lumenkey/Channels/KFChannelBase.h"
-#include "lumenkey/curves/KFCurveOwner.h"
 
 #include <cmath>
 
@@ -11,6 +10,7 @@ class KFCompoundChannel;
 class KFCurve;
 class KFCurveInterface;
 class KFCurveNode;
+class KFCurveOwner;
 struct KFFadeBlock;
 
 /// A node of the tree with a value over time.
@@ -27,10 +27,11 @@ struct KFFadeBlock;
 /// `scaleChannel`, the limits, and the switches of the curve's shape. It obeys `resetToDefault`, `setInitialValue`,
 /// `setDefaultValue`, the info setters, `copy` and `assign`.
 ///
-/// Threads: reading values may run on any number of threads beside one that edits keypoints of a channel with a
-/// local record; what exchanges the record or the curve (the first difference, returning to the shared record,
-/// copies) must not run beside reads of that channel.
-class LUMENKEY_API KFChannel : public KFChannelBase, private KFCurveOwner {
+/// Threads: values may be read on any number of threads beside one that edits keypoints or the constant of a channel
+/// with a local record. Not beside reads of that channel may run: what exchanges the record, the curve or its root (the
+/// first difference, returning to the shared record, copies, `setIsSpline`), what creates the first keypoint or deletes
+/// the last, and changes of flags, fades, processing nodes, the owner or the slider.
+class LUMENKEY_API KFChannel : public KFChannelBase {
 public:
     /// Both records may be null only if the class's constructor then calls `usePrototypes`.
     KFChannel(KFFactory* factory, BXString const& name, KFChannelFolder* parent, unsigned int id,
@@ -189,7 +190,7 @@ public:
     void resetLocalChannelImplementation();
     KFChannelInfo* createLocalChannelInfo();
     void resetLocalChannelInfo();
-    /// Makes the info local and assigns. Null does nothing.
+    /// Makes the info local, also for the record in use, and assigns. Null does nothing.
     void setInfo(KFChannelInfo const* source);
     /// Takes the record: a shared one becomes the prototype too, a local one is owned. Null does nothing.
     void replaceInfo(KFChannelInfo* info);
@@ -259,7 +260,9 @@ private:
     /// Doubles that count as equal.
     static bool isSame(double a, double b) noexcept { return a == b || std::fabs(a - b) < 1e-7; }
 
-    Tempus getFrameDurationForCurve() const override;
+    /// As what curves know this channel; not a base, so that derived classes' slots follow on `moveKeyframe`.
+    class CurveOwner;
+    KFCurveOwner* curveOwner();
     unsigned int kindAsAnnounced(unsigned int kind) const;
     /// What turns the other's values into this channel's unit; 1 where the scales are the same or this has none.
     double unitFactor(KFChannel const& other) const;
@@ -289,4 +292,5 @@ private:
     KFChannelInfo* _info;
     KFChannelInfo* _prototypeInfo;
     std::unique_ptr<KFCurve> _prototypeCurve;
+    std::unique_ptr<CurveOwner> _curveOwner; // made when a curve first gets this channel as its owner
 };

@@ -5,7 +5,7 @@
 
 // The factories of the library's classes: KFChannelDouble_Factory for KFChannelDouble, and so on. Each is made on
 // first use by any thread, and lives for the process. Their UUIDs and superclasses stand in one table, in
-// KFChannelFactories.cpp. `create` makes a channel with the class's own records and without a parent,
+// KFChannelFactoryTable.cpp. `create` makes a channel with the class's own records and without a parent,
 // `createCopy` a parentless copy; the caller owns both. `createCopy` of null or of another class gives null.
 
 #define KF_DECLARE_CHANNEL_FACTORY(Channel)                                                                  \

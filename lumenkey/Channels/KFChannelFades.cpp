@@ -129,8 +129,9 @@ double KFChannel::getFadeRatio(Tempus const& t) const {
     Tempus const sinceFirst = BX_TempusSaferSubtract(t, first);
     // Where the two overlap the fade in wins.
     if (fades.fadeInOffset != kTempusZero && sinceFirst < fades.fadeInOffset)
-        return shaped(TempusRatio(sinceFirst, fades.fadeInOffset), fades.fadeInCurve);
+        return shaped(TempusGetSeconds(sinceFirst / fades.fadeInOffset), fades.fadeInCurve);
     if (fades.fadeOutOffset != kTempusZero && t > BX_TempusSaferSubtract(last, fades.fadeOutOffset))
-        return shaped(TempusRatio(BX_TempusSaferSubtract(last, t), fades.fadeOutOffset), fades.fadeOutCurve);
+        return shaped(TempusGetSeconds(BX_TempusSaferSubtract(last, t) / fades.fadeOutOffset),
+                      fades.fadeOutCurve);
     return 1.0;
 }

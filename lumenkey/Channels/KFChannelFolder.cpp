@@ -15,7 +15,7 @@ constexpr std::uint32_t stateOf(std::uint32_t foldFlags) noexcept { return foldF
 
 } // namespace
 
-// Construction -----------------------------------------------------------------------------------------------
+// Construction ----------------------------------------------------------------------------------------------
 
 KFChannelFolder::KFChannelFolder(KFFactory* factory, BXString const& name, KFChannelFolder* parent,
                                  unsigned int id, unsigned int flags, unsigned int capacity)
@@ -28,7 +28,8 @@ KFChannelFolder::KFChannelFolder(KFFactory* factory, BXString const& name, KFCha
     KFChannelFolder::saveStateAsDefault();
 }
 
-KFChannelFolder::KFChannelFolder(KFFactory* factory, BXString const& name, unsigned int id, unsigned int capacity)
+KFChannelFolder::KFChannelFolder(KFFactory* factory, BXString const& name, unsigned int id,
+                                 unsigned int capacity)
     : KFChannelFolder(factory, name, nullptr, id, 0, capacity) {}
 
 KFChannelFolder::KFChannelFolder(BXString const& name, KFChannelFolder* parent, unsigned int id,
@@ -49,7 +50,7 @@ KFChannelBase* KFChannelFolder::clone() const { return new KFChannelFolder(*this
 
 char const* KFChannelFolder::getFacadeWrapperName() { return "KWChannelFolder"; }
 
-// The list ---------------------------------------------------------------------------------------------------
+// The list --------------------------------------------------------------------------------------------------
 
 std::size_t KFChannelFolder::getNumberOfDescendants() const noexcept {
     return _descendants ? _descendants->size() : 0;
@@ -141,7 +142,7 @@ void KFChannelFolder::removeAllDescendants(bool detach) {
     _index.reset();
 }
 
-// The index by ID --------------------------------------------------------------------------------------------
+// The index by ID -------------------------------------------------------------------------------------------
 
 KFChannelBase* KFChannelFolder::getDescendant(unsigned int id) const {
     if (_index) {
@@ -159,8 +160,9 @@ KFChannelBase* KFChannelFolder::getDescendant(unsigned int id) const {
 }
 
 bool KFChannelFolder::comesFirst(KFChannelBase const* child, KFChannelBase const* other) const noexcept {
-    auto const found = std::find_if(_descendants->begin(), _descendants->end(),
-                                    [=](KFChannelBase const* each) { return each == child || each == other; });
+    auto const found =
+        std::find_if(_descendants->begin(), _descendants->end(),
+                     [=](KFChannelBase const* each) { return each == child || each == other; });
     return found != _descendants->end() && *found == child;
 }
 
@@ -231,7 +233,7 @@ void KFChannelFolder::descendantIDChanged(KFChannelBase* child, unsigned int old
     }
 }
 
-// Flags ------------------------------------------------------------------------------------------------------
+// Flags -----------------------------------------------------------------------------------------------------
 
 void KFChannelFolder::setFoldFlags(std::uint32_t flags) {
     if (stateOf(flags) != 0) {
@@ -263,7 +265,7 @@ bool KFChannelFolder::isStateModified() {
     return KFChannelBase::isStateModified() || stateOf(_foldFlags) != _defaultFoldFlags;
 }
 
-// Copies -----------------------------------------------------------------------------------------------------
+// Copies ----------------------------------------------------------------------------------------------------
 
 std::vector<KFChannelBase*> const* KFChannelFolder::matchingList(KFChannelBase const& other) const noexcept {
     if (!other.testFlag(kChannelFlagIsFolder) || !_descendants) {

@@ -6,23 +6,24 @@
 #include <memory>
 #include <unordered_map>
 
-/// An inner node of the tree: an ordered list of children, for which it answers together and to which it passes
-/// most operations on.
+/// An inner node of the tree: an ordered list of children, for which it answers together and to which it
+/// passes most operations on.
 ///
 /// The folder owns the list and never the children: composites hold theirs as members, and every other child
-/// belongs to whoever made it, who removes it (`removeDescendant`) before destroying it. The destructor leaves the
-/// children's parents as they are.
+/// belongs to whoever made it, who removes it (`removeDescendant`) before destroying it. The destructor
+/// leaves the children's parents as they are.
 ///
-/// Cost: appending, and looking up a child by ID, don't depend on the number of children (beyond 32 of them an index
-/// is kept); inserting and removing are linear in it. An index relies on children telling of a new ID through their
-/// parent, so a listed child's parent must be this folder.
+/// Cost: appending, and looking up a child by ID, don't depend on the number of children (beyond 32 of them
+/// an index is kept); inserting and removing are linear in it. An index relies on children telling of a new
+/// ID through their parent, so a listed child's parent must be this folder.
 ///
-/// A child may change the list while an operation is passed on: the operation reaches each child that is listed when
-/// its turn comes.
+/// A child may change the list while an operation is passed on: the operation reaches each child that is
+/// listed when its turn comes.
 ///
 /// Null: a null child or channel does nothing, gives null, or false.
 ///
-/// Threads: one thread changes a tree; any number may look children up and ask questions as long as none changes it.
+/// Threads: one thread changes a tree; any number may look children up and ask questions as long as none
+/// changes it.
 class LUMENKEY_API KFChannelFolder : public KFChannelBase {
 public:
     KFChannelFolder(KFFactory* factory, BXString const& name, KFChannelFolder* parent, unsigned int id,
@@ -36,7 +37,7 @@ public:
     KFChannelFolder(KFChannelFolder const& other, KFChannelFolder* parent);
     ~KFChannelFolder() override;
 
-    // Of KFChannelBase ------------------------------------------------------------------------------------------
+    // Of KFChannelBase --------------------------------------------------------------------------------------
 
     void finishInitializing() override;
     char const* getFacadeWrapperName() override;
@@ -45,7 +46,8 @@ public:
     void setDefaultToCurrentValue() override;
     bool saveWhenAtDefaultState() const override;
     bool isStateModified() override;
-    void beginPlayback(Tempus const& t, unsigned int scope, unsigned int mode, Tempus const& resolution) override;
+    void beginPlayback(Tempus const& t, unsigned int scope, unsigned int mode,
+                       Tempus const& resolution) override;
     void endPlayback(Tempus const& t) override;
     void beginRecording(Tempus const& t) override;
     void endRecording(Tempus const& t) override;
@@ -99,9 +101,10 @@ public:
     /// Walks the tree for classes that override it; changes no flag here.
     virtual void resetTimeIndependentFlagIfNeeded(bool downward, bool upward);
 
-    // Children --------------------------------------------------------------------------------------------------
+    // Children ----------------------------------------------------------------------------------------------
 
-    /// Appends. Null does nothing. A child of another folder leaves that one; a child of this folder is listed twice.
+    /// Appends. Null does nothing. A child of another folder leaves that one; a child of this folder is
+    /// listed twice.
     void push_back(KFChannelBase* child);
     void push_front(KFChannelBase* child);
     /// At the end if the anchor is null or no child of this folder.
@@ -122,19 +125,22 @@ public:
     std::vector<KFChannelBase*> const* getDescendants() const noexcept { return _descendants.get(); }
     std::size_t getNumberOfDescendants() const noexcept;
     unsigned int getNumberOfVisibleDescendants() const noexcept;
-    /// IDs from 10000 up: this folder's, then each child's, and those below child folders (whose own so come twice).
+    /// IDs from 10000 up: this folder's, then each child's, and those below child folders (whose own so come
+    /// twice).
     void getDescendantObjects(std::vector<unsigned int>* out) const;
-    /// The value channels below without a bit of `mask`, passing by folders with one. With `stopAtRoots`, object
-    /// roots among the direct children are passed by too.
-    void getAllDescendantsFlattened(std::vector<KFChannelBase*>& out, KFChannelFlags mask, bool stopAtRoots) const;
+    /// The value channels below without a bit of `mask`, passing by folders with one. With `stopAtRoots`,
+    /// object roots among the direct children are passed by too.
+    void getAllDescendantsFlattened(std::vector<KFChannelBase*>& out, KFChannelFlags mask,
+                                    bool stopAtRoots) const;
 
     // The counterpart, below this folder, of a channel from elsewhere, such as a pasted one.
-    /// This folder itself if it allows the assignment; else the best match below: equal name and ID, then equal name,
-    /// then equal ID. A component is looked for in the counterpart of its compound. A channel without parent whose
-    /// name reads `Compound.component` or `Folder.Compound.component` is looked for in the compound of that full name.
+    /// This folder itself if it allows the assignment; else the best match below: equal name and ID, then
+    /// equal name, then equal ID. A component is looked for in the counterpart of its compound. A channel
+    /// without parent whose name reads `Compound.component` or `Folder.Compound.component` is looked for in
+    /// the compound of that full name.
     KFChannelBase* findMatchingDescendant(KFChannelBase const* channel);
-    /// Fills empty slots with channels that allow the assignment: by index, 1 for an equal ID plus 2 for an equal
-    /// name. `slots` has room for four.
+    /// Fills empty slots with channels that allow the assignment: by index, 1 for an equal ID plus 2 for an
+    /// equal name. `slots` has room for four.
     void findMatchingDescendant(KFChannelBase const* channel, KFChannelBase** slots);
     /// The first compound below with that full display name, regardless of case.
     KFChannelBase* findMatchingCompoundChannel(BXString const& fullDisplayName);
@@ -173,7 +179,8 @@ private:
     void buildIndex();
     void enterIndex(KFChannelBase* child, std::size_t position);
     void leaveIndex(KFChannelBase const* child, unsigned int id, std::size_t count, std::size_t oldPosition);
-    /// The other's children, if it is a folder with as many as this one; null else, and for folders without a list.
+    /// The other's children, if it is a folder with as many as this one; null else, and for folders without a
+    /// list.
     std::vector<KFChannelBase*> const* matchingList(KFChannelBase const& other) const noexcept;
 
     std::unique_ptr<std::vector<KFChannelBase*>> _descendants;

@@ -4,7 +4,7 @@
 
 using Child = KFChannelBase;
 
-// To every child ---------------------------------------------------------------------------------------------
+// To every child --------------------------------------------------------------------------------------------
 
 void KFChannelFolder::finishInitializing() {
     KFChannelBase::finishInitializing();
@@ -57,7 +57,7 @@ void KFChannelFolder::calcHashForState(BXSerializerWriteStream& stream, Tempus c
     forEachChild([&](Child& child) { child.calcHashForState(stream, t); });
 }
 
-// To visible children ----------------------------------------------------------------------------------------
+// To visible children ---------------------------------------------------------------------------------------
 
 void KFChannelFolder::lock(bool on, bool passDown) {
     KFChannelBase::lock(on, true);
@@ -118,15 +118,17 @@ void KFChannelFolder::updateCurrentRecordingTime(Tempus const& t) {
     forEachVisibleChild([&](Child& child) { child.updateCurrentRecordingTime(t); });
 }
 
-void KFChannelFolder::registerRecordingCallback(RecordingCallback function, void* context, bool wantsWrapper) {
-    forEachVisibleChild([=](Child& child) { child.registerRecordingCallback(function, context, wantsWrapper); });
+void KFChannelFolder::registerRecordingCallback(RecordingCallback function, void* context,
+                                                bool wantsWrapper) {
+    forEachVisibleChild(
+        [=](Child& child) { child.registerRecordingCallback(function, context, wantsWrapper); });
 }
 
 void KFChannelFolder::unregisterRecordingCallback(RecordingCallback function, void* context) {
     forEachVisibleChild([=](Child& child) { child.unregisterRecordingCallback(function, context); });
 }
 
-// By a rule of their own -------------------------------------------------------------------------------------
+// By a rule of their own ------------------------------------------------------------------------------------
 
 void KFChannelFolder::setKeyframable(bool on, bool force) {
     forEachChild([=](Child& child) {

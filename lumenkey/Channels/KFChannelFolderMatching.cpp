@@ -26,8 +26,8 @@ KFChannelBase* bestMatch(KFChannelFolder& folder, KFChannelBase const* channel) 
     return nullptr;
 }
 
-/// Where the name of a component begins in a name such as `Compound.component` or `Folder.Compound.component`;
-/// 0 in a plain name.
+/// Where the name of a component begins in a name such as `Compound.component` or
+/// `Folder.Compound.component`; 0 in a plain name.
 std::size_t componentBegin(BXString const& name) noexcept {
     long const first = name.find(".");
     if (first < 0) {
@@ -80,7 +80,7 @@ void KFChannelFolder::getAllDescendantsFlattened(std::vector<KFChannelBase*>& ou
     });
 }
 
-// Counterparts -----------------------------------------------------------------------------------------------
+// Counterparts ----------------------------------------------------------------------------------------------
 
 void KFChannelFolder::findMatchingDescendant(KFChannelBase const* channel, KFChannelBase** slots) {
     if (channel == nullptr || slots == nullptr) {

@@ -24,11 +24,13 @@ bool KFChannelFolder::hasFadeHandles() const {
 }
 
 bool KFChannelFolder::hasKeypoints(unsigned int mask) const {
-    return anyVisibleChild([=](Child const& child) { return !child.testFlag(mask) && child.hasKeypoints(0); });
+    return anyVisibleChild(
+        [=](Child const& child) { return !child.testFlag(mask) && child.hasKeypoints(0); });
 }
 
 bool KFChannelFolder::hasKeypointAt(Tempus const& t, unsigned int mask) const {
-    return anyVisibleChild([&](Child const& child) { return !child.testFlag(mask) && child.hasKeypointAt(t, 0); });
+    return anyVisibleChild(
+        [&](Child const& child) { return !child.testFlag(mask) && child.hasKeypointAt(t, 0); });
 }
 
 bool KFChannelFolder::allHaveKeypointsAt(Tempus const& t) const {
@@ -61,7 +63,7 @@ bool KFChannelFolder::saveWhenAtDefaultState() const {
            anyChild([](Child const& child) { return child.saveWhenAtDefaultState(); });
 }
 
-// Neighbouring keypoints -------------------------------------------------------------------------------------
+// Neighbouring keypoints ------------------------------------------------------------------------------------
 
 bool KFChannelFolder::previousKeypoint(Tempus* t, unsigned int mask) const {
     if (t == nullptr) {

@@ -95,7 +95,7 @@ void KFChannel::deleteKeypoints(Tempus const& from, Tempus const& to) {
         return;
     createLocalChannelImplementation();
     willBeModified(kModifyData);
-    curve().delKeypoints(from, to, true);
+    curveToWrite().delKeypoints(from, to, true); // the host may have reset the channel meanwhile
 }
 
 // --- The curve between and beyond ---

@@ -107,7 +107,7 @@ void KFChannelObjectRootBase::setTimeExtent(BXTimeRange const& range, bool silen
     if (!silent) {
         willBeModified(kModifyData);
     }
-    if (hasFadeHandles()) {
+    if (TempusIsNumeric(_timeExtent.duration) && hasFadeHandles()) { // nothing is a share of an endless extent
         double const factor = TempusRatio(range.duration, _timeExtent.duration);
         if (std::isfinite(factor)) {
             scaleFadeHandles(factor);

@@ -71,7 +71,7 @@ public:
     /// Unless silent announces `kModifyData`.
     void setTimeOffset(Tempus const& offset, bool silent);
     /// Unless silent announces `kModifyData`. Fades below keep their share of the extent; they stay as they
-    /// are where the new duration is no finite multiple of the old one, as when the old extent had none.
+    /// are where the new duration is no finite multiple of the old one, as when the old one was zero or infinite.
     void setTimeExtent(BXTimeRange const& range, bool silent);
     /// Whether documents hold the extent; true at first.
     bool writesTimeRange() const noexcept { return _writesTimeRange; }

@@ -45,7 +45,7 @@ template <class Channel> KFCurve* KFNewClassCurve(double value) {
                         KFClassConstantsOf<Channel>::constants.fineDelta,                                    \
                         KFClassConstantsOf<Channel>::constants.scale,                                        \
                         KFClassConstantsOf<Channel>::constants.suffix),                                      \
-          BXSingleton(kClassRecordRank) {}                                                                     \
+          BXSingleton(kClassRecordRank) {}                                                                   \
     Channel##Info::~Channel##Info() = default;                                                               \
     Channel##Info& Channel##Info::getInstance() { return BXSingletonInstance<Channel##Info>(); }             \
     KFChannelInfo* Channel::create##Channel##Info() { return &Channel##Info::getInstance(); }
@@ -55,12 +55,12 @@ template <class Channel> KFCurve* KFNewClassCurve(double value) {
         : KFChannelImpl(KFNewClassCurve<Channel>(KFClassConstantsOf<Channel>::constants.value),              \
                         KFClassConstantsOf<Channel>::constants.value,                                        \
                         KFClassConstantsOf<Channel>::constants.curveType, true),                             \
-          BXSingleton(kClassRecordRank) {}                                                                     \
+          BXSingleton(kClassRecordRank) {}                                                                   \
     Channel##Impl::~Channel##Impl() = default;                                                               \
     Channel##Impl& Channel##Impl::getInstance() { return BXSingletonInstance<Channel##Impl>(); }             \
     KFChannelImpl* Channel::create##Channel##Impl() { return &Channel##Impl::getInstance(); }
 
-/// The forms of the constructor; `newImpl` makes the class's record for that form. `extra` are statements behind it.
+/// The forms of the constructor; `newImpl` makes the class's record for that form. `extra` is a statement behind it.
 #define KF_DEFINE_NAMED_FORM(Channel, newImpl, extra)                                                        \
     Channel::Channel(BXString const& name, KFChannelFolder* parent, unsigned int id, unsigned int flags,     \
                      KFChannelImpl* impl, KFChannelInfo* info)                                               \
@@ -91,9 +91,9 @@ template <class Channel> KFCurve* KFNewClassCurve(double value) {
         setInitialValue(value, false);                                                                       \
     }
 
-#define KF_DEFINE_COPIES_AND_NAME(Channel, wrapperName)                                                      \
-    Channel::Channel(Channel const& other) : KFChannel(other) {}                                             \
-    Channel::Channel(Channel const& other, KFChannelFolder* parent) : KFChannel(other, parent) {}            \
+#define KF_DEFINE_COPIES_AND_NAME(Channel, wrapperName, extra)                                               \
+    Channel::Channel(Channel const& other) : KFChannel(other) { extra; }                                     \
+    Channel::Channel(Channel const& other, KFChannelFolder* parent) : KFChannel(other, parent) { extra; }    \
     Channel& Channel::operator=(Channel const& other) {                                                      \
         KFChannelBase::operator=(other);                                                                     \
         return *this;                                                                                        \
@@ -108,4 +108,4 @@ template <class Channel> KFCurve* KFNewClassCurve(double value) {
     KF_DEFINE_CLASS_IMPL(Channel)                                                                            \
     KF_DEFINE_NAMED_FORM(Channel, create##Channel##Impl(), )                                                 \
     KF_DEFINE_FACTORY_FORM(Channel, create##Channel##Impl(), )                                               \
-    KF_DEFINE_COPIES_AND_NAME(Channel, wrapperName)
+    KF_DEFINE_COPIES_AND_NAME(Channel, wrapperName, )

@@ -28,7 +28,7 @@ void removeAllValuesFrom(KFChannelBase* child, Tempus const& t) {
 
 } // namespace
 
-// Construction -----------------------------------------------------------------------------------------------
+// Construction ----------------------------------------------------------------------------------------------
 
 KFCompoundChannel::KFCompoundChannel(KFFactory* factory, BXString const& name, KFChannelFolder* parent,
                                      unsigned int id, unsigned int flags, bool, unsigned int capacity)
@@ -54,7 +54,7 @@ char const* KFCompoundChannel::getFacadeWrapperName() { return "KWCompoundChanne
 
 bool KFCompoundChannel::isCompoundChannel() const { return true; }
 
-// As one node ------------------------------------------------------------------------------------------------
+// As one node -----------------------------------------------------------------------------------------------
 
 void KFCompoundChannel::copy(KFChannelBase const* other, bool silent) {
     std::uint32_t const linked = getFoldFlags() & kFoldFlagLinked;
@@ -85,13 +85,15 @@ void KFCompoundChannel::willBeModified(unsigned int kind) {
 // However many components have a keypoint, the compound has one.
 bool KFCompoundChannel::hasOnlyOneKeypointAt(Tempus const& t) const { return hasKeypointAt(t, 0); }
 
-unsigned int KFCompoundChannel::numberOfKeypointsAt(Tempus const& t) const { return hasKeypointAt(t, 0) ? 1 : 0; }
+unsigned int KFCompoundChannel::numberOfKeypointsAt(Tempus const& t) const {
+    return hasKeypointAt(t, 0) ? 1 : 0;
+}
 
 bool KFCompoundChannel::setKeypointInterpolation(KFChannel*, void*, unsigned int, bool) { return false; }
 
 void KFCompoundChannel::setCurveInterpolation(unsigned int) {}
 
-// Linked edits -----------------------------------------------------------------------------------------------
+// Linked edits ----------------------------------------------------------------------------------------------
 
 /// Does `edit` without the flag, or the children would hand their edits back here.
 template <class Edit> void KFCompoundChannel::editUnlinked(Edit const& edit) {
@@ -125,8 +127,8 @@ void KFCompoundChannel::compoundSetIsSpline(KFChannel* child, bool on, bool forc
     editLinked(child, force, [on](KFChannelBase& each) { each.setIsSpline(on); });
 }
 
-Tempus KFCompoundChannel::compoundMoveKeypointTo(KFChannel* child, Tempus const& from, Tempus const& to, bool a,
-                                                 bool b, bool force) {
+Tempus KFCompoundChannel::compoundMoveKeypointTo(KFChannel* child, Tempus const& from, Tempus const& to,
+                                                 bool a, bool b, bool force) {
     if (child == nullptr) {
         return to;
     }
@@ -144,7 +146,7 @@ Tempus KFCompoundChannel::compoundMoveKeypointTo(KFChannel* child, Tempus const&
     return to;
 }
 
-// Values -----------------------------------------------------------------------------------------------------
+// Values ----------------------------------------------------------------------------------------------------
 
 void KFCompoundChannel::setValue(KFChannel* child, Tempus const& t, double value) {
     if (child == nullptr) {

@@ -6,9 +6,9 @@ class KFChannel;
 
 /// A folder that behaves as one value of several components, such as a position.
 ///
-/// With the fold flag `kFoldFlagLinked` an edit of one component is an edit of all, so that all have keypoints at
-/// the same times: a component hands its edit to its linked compound, which clears the flag, does the operation on
-/// every component, announces itself and sets the flag again.
+/// With the fold flag `kFoldFlagLinked` an edit of one component is an edit of all, so that all have
+/// keypoints at the same times: a component hands its edit to its linked compound, which clears the flag,
+/// does the operation on every component, announces itself and sets the flag again.
 class LUMENKEY_API KFCompoundChannel : public KFChannelFolder {
 public:
     /// Sets the fold flags 0xF. The bool is the host's and plays no part.
@@ -31,8 +31,9 @@ public:
     unsigned int numberOfKeypointsAt(Tempus const& t) const override;
     using KFChannelFolder::setValue;
 
-    // Slots behind those of KFChannelFolder. An index outside the list does nothing, nor does a null child where it
-    // alone is meant. Children that have no value are passed by, apart from compounds in `remove...`.
+    // Slots behind those of KFChannelFolder. An index outside the list does nothing, nor does a null child
+    // where it alone is meant. Children that have no value are passed by, apart from compounds in
+    // `remove...`.
 
     /// False, and nothing, here.
     virtual bool setKeypointInterpolation(KFChannel* child, void* handle, unsigned int type, bool force);
@@ -45,13 +46,13 @@ public:
     /// What a component of a linked compound hands over.
     virtual void setValue(KFChannel* child, Tempus const& t, double value);
 
-    // Linked edits, which reach all children if the compound is linked or `force` is set, and the given one alone
-    // else. `force` leaves the compound linked.
+    // Linked edits, which reach all children if the compound is linked or `force` is set, and the given one
+    // alone else. `force` leaves the compound linked.
     virtual void compoundAddKeypointAt(KFChannel* child, Tempus const& t, bool force);
-    /// The others follow to where the child's keypoint came to stand. Answers `to` for a linked edit, else what the
-    /// child answers.
-    virtual Tempus compoundMoveKeypointTo(KFChannel* child, Tempus const& from, Tempus const& to, bool a, bool b,
-                                          bool force);
+    /// The others follow to where the child's keypoint came to stand. Answers `to` for a linked edit, else
+    /// what the child answers.
+    virtual Tempus compoundMoveKeypointTo(KFChannel* child, Tempus const& from, Tempus const& to, bool a,
+                                          bool b, bool force);
     virtual void compoundDeleteKeypointAt(KFChannel* child, Tempus const& t, bool force);
     virtual void compoundReset(KFChannel* child, bool force);
     virtual void compoundSetIsSpline(KFChannel* child, bool on, bool force);

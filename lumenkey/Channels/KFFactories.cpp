@@ -4,6 +4,7 @@
 #include "lumenkey/Channels/KFFactory.h"
 #include "lumenkey/Channels/KFFactoryBase.h"
 #include "lumenkey/Channels/KFFactoryScope.h"
+#include "lumenkey/Channels/KFThreadState.h"
 #include "lumenkey/foundation/BXSerializerStreams.h"
 
 KFFactories& KFFactories::getInstance() {
@@ -58,8 +59,7 @@ KFFactory* KFFactories::findCommonFactory(std::vector<KFFactoryBase*> const& obj
 }
 
 std::map<std::uint32_t, KFFactory*>& KFFactories::getFactoryLoadMap() {
-    thread_local std::map<std::uint32_t, KFFactory*> loadMap;
-    return loadMap;
+    return KFThreadState<std::map<std::uint32_t, KFFactory*>>();
 }
 
 void KFFactories::setFactoryLoadID(std::uint32_t fileID, KFFactory* factory) {

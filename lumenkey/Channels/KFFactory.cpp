@@ -2,6 +2,7 @@
 
 #include "lumenkey/Channels/KFChannelBase.h"
 #include "lumenkey/Channels/KFFactories.h"
+#include "lumenkey/Channels/KFThreadState.h"
 
 #include <map>
 #include <string>
@@ -15,13 +16,13 @@ struct SaveRecord {
 };
 
 SaveRecord& saveRecord(KFFactory const* factory) {
-    thread_local std::unordered_map<KFFactory const*, SaveRecord> records;
-    return records[factory];
+    return KFThreadState<std::unordered_map<KFFactory const*, SaveRecord>>()[factory];
 }
 
+/// Never destroyed: destructors of the host's static objects may still ask.
 std::map<std::string, BXString>& bundlePaths() {
-    static std::map<std::string, BXString> paths;
-    return paths;
+    static auto* const paths = new std::map<std::string, BXString>();
+    return *paths;
 }
 } // namespace
 
@@ -64,7 +65,7 @@ BXString KFFactory::getLibraryIconName() const {
             continue;
         }
         char const* const bundleID = at->getBundleID();
-        auto const found = bundlePaths().find(bundleID);
+        auto const found = bundlePaths().find(bundleID != nullptr ? bundleID : "");
         if (found == bundlePaths().end()) {
             return {};
         }

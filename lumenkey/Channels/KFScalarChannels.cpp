@@ -108,7 +108,7 @@ KF_DEFINE_NAMED_FORM(KFChannelPercent, createKFChannelPercent100Impl(), )
 KF_DEFINE_FACTORY_FORM(KFChannelPercent, createKFChannelPercent0Impl(), )
 KF_DEFINE_FACTORY_WITH_PARENT_FORM(KFChannelPercent, createKFChannelPercent100Impl(), )
 KF_DEFINE_VALUE_FORM(KFChannelPercent, double, percentRecordFor(value))
-KF_DEFINE_COPIES_AND_NAME(KFChannelPercent, "KWChannelPercent")
+KF_DEFINE_COPIES_AND_NAME(KFChannelPercent, "KWChannelPercent", )
 
 KFChannelImpl* KFChannelBool::createKFChannelBoolTrueImpl() { return recordAt<KFChannelBool, 100>(); }
 KFChannelImpl* KFChannelBool::createKFChannelBoolFalseImpl() { return recordAt<KFChannelBool, 0>(); }
@@ -121,7 +121,7 @@ KF_DEFINE_NAMED_FORM(KFChannelBool, createKFChannelBoolFalseImpl(), )
 KF_DEFINE_FACTORY_FORM(KFChannelBool, createKFChannelBoolFalseImpl(), )
 KF_DEFINE_FACTORY_WITH_PARENT_FORM(KFChannelBool, createKFChannelBoolFalseImpl(), )
 KF_DEFINE_VALUE_FORM(KFChannelBool, int, boolRecordFor(value))
-KF_DEFINE_COPIES_AND_NAME(KFChannelBool, "KWChannelBool")
+KF_DEFINE_COPIES_AND_NAME(KFChannelBool, "KWChannelBool", )
 
 // --- Never saved ---
 

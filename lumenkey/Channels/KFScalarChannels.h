@@ -147,7 +147,7 @@ class LUMENKEY_API KFChannelBool : public KFChannel {
     static KFCurve* createKFChannelBoolCurve(double value);
 };
 
-/// A value between 0 and 1 that is never saved. The form from a value takes no notice of it.
+/// How far a task of the host is; never saved, and without limits. The form from a value takes no notice of it.
 KF_DECLARE_CLASS_INFO(KFChannelProgress);
 KF_DECLARE_CLASS_IMPL(KFChannelProgress);
 class LUMENKEY_API KFChannelProgress : public KFChannel {

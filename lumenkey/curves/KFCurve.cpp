@@ -29,12 +29,12 @@ KFCurve& KFCurve::operator=(KFCurve const& other) {
     copyRoots(other);
     _minValue = other._minValue;
     _maxValue = other._maxValue;
-    _pointToPoint = other._pointToPoint;
-    _remapsTime = other._remapsTime;
     _keyframable = other._keyframable;
     // How a chain is to be run follows from the nodes that stay, not from the other's.
-    if (!_processingNodes.empty())
-        setTreeProperties();
+    if (_processingNodes.empty()) {
+        _pointToPoint = other._pointToPoint;
+        _remapsTime = other._remapsTime;
+    }
     return *this;
 }
 

@@ -1,5 +1,4 @@
-// What every node of the tree does: identity, flags, announcements, solo, the route of time, IDs and reset
-// callbacks.
+// What every node of the tree does: flags, announcements, solo, copies, the route of time, IDs, reset callbacks.
 
 #include "lumenkey/Channels/KFChannelTimeConverter.h"
 #include "lumenkey/Channels/KFResetCallbackDataTable.h"
@@ -7,11 +6,7 @@
 
 #include <gtest/gtest.h>
 
-#include <algorithm>
-#include <barrier>
 #include <cstdlib>
-#include <functional>
-#include <memory>
 #include <new>
 #include <set>
 #include <thread>
@@ -26,9 +21,7 @@ public:
                   unsigned int flags = 0)
         : KFChannelBase(nullptr, name, parent, id, flags) {}
     void resetToDefault(bool) override { ++resets; }
-    bool shouldIgnoreDynamicIDs() const override { return ignoresIDs; }
     int resets = 0;
-    bool ignoresIDs = false;
 };
 
 class Folder : public KFChannelFolder {
@@ -65,23 +58,16 @@ TEST(KFChannelBase, AnnouncesStateBitsOnlyAndBeforeItChangesThem) {
             continue; // it belongs to roots: the walks take its word
         }
         Folder channel("f", 3, &root);
-        Announced const expected =
-            nonState.count(bit) != 0 ? Announced{} : Announced{{&channel, kModifyState}};
+        bool const isState = nonState.count(bit) == 0;
+        Announced const expected = isState ? Announced{{&channel, kModifyState}} : Announced{};
         channel.resetFlag(mask, true);
-        root.takeAnnounced();
+        root.flagsWhenAnnounced = 0;
         channel.setFlag(mask, false);
         EXPECT_EQ(root.takeAnnounced(), expected);
-        if (!expected.empty()) {
-            EXPECT_EQ(root.flagsWhenAnnounced & mask, 0U);
-        }
-        EXPECT_TRUE(channel.testFlag(mask));
-        EXPECT_EQ(channel.isStateModified(), !expected.empty());
+        EXPECT_EQ(root.flagsWhenAnnounced & mask, 0U);
+        EXPECT_EQ(channel.isStateModified(), isState);
         channel.resetFlag(mask, false);
         EXPECT_EQ(root.takeAnnounced(), expected);
-        EXPECT_FALSE(channel.testFlag(mask));
-        channel.setFlag(mask, true);
-        channel.resetFlag(mask, true);
-        EXPECT_TRUE(root.takeAnnounced().empty());
         root.removeDescendant(&channel);
     }
 }
@@ -89,100 +75,70 @@ TEST(KFChannelBase, AnnouncesStateBitsOnlyAndBeforeItChangesThem) {
 TEST(KFChannelBase, AnnouncesEachKindOfChange) {
     RecordingRoot root;
     Leaf leaf("before", 2, &root);
-    Announced const none;
-    Announced const data{{&leaf, kModifyData}};
-    Announced const state{{&leaf, kModifyState}};
-    struct {
-        char const* what;
-        std::function<void()> change;
-        Announced expected;
-    } const cases[] = {
-        {"name", [&] { leaf.setName("after", false); }, data},
-        {"name, silent", [&] { leaf.setName("silent", true); }, none},
-        {"name unset", [&] { leaf.setNameUnset(true); }, none},
-        {"internal name", [&] { leaf.setInternalName("internal"); }, data},
-        {"id", [&] { leaf.setID(9); }, none},
-        {"disable", [&] { leaf.enable(false, false); }, state},
-        {"enable, silent", [&] { leaf.enable(true, true); }, none},
-        {"lock", [&] { leaf.lock(true, true); }, state},
-        {"solo where not soloable", [&] { leaf.solo(true); }, none},
-        {"soloable with a state bit", [&] { leaf.setFlag(kChannelFlagSoloable | kChannelFlagHidden, false); },
-         state},
-        {"solo", [&] { leaf.solo(true); }, state},
-        {"child solo", [&] { leaf.setChildSolo(false); }, none},
-        {"the same word", [&] { leaf.setFlags(leaf.getFlags()); }, state},
-        {"a word without state", [&] { leaf.setFlags(kChannelFlagHostOption4); }, none},
-        {"copy",
-         [&] {
-             leaf.copy(&root, false);
-             leaf.setID(2);
-         },
-         none},
+    auto const told = [&root] {
+        unsigned const kind = root.announced.empty() ? 0 : root.announced.back().second;
+        return root.takeAnnounced().size() > 1 ? 99 : kind;
     };
-    for (auto const& row : cases) {
-        root.takeAnnounced();
-        row.change();
-        EXPECT_EQ(root.takeAnnounced(), row.expected) << row.what;
-        if (row.what == std::string("name")) {
-            EXPECT_EQ(root.nameWhenAnnounced, "before");
-        }
-    }
-    EXPECT_EQ(root.getDescendant(2), &leaf); // through all changes of ID
-    EXPECT_EQ(root.getDescendant(9), nullptr);
-    EXPECT_TRUE(leaf.hasBeenModified(nullptr));
+    leaf.setName("after", false);
+    EXPECT_EQ(root.nameWhenAnnounced, "before");
+    EXPECT_EQ(told(), kModifyData);
+    leaf.setInternalName("internal");
+    EXPECT_EQ(told(), kModifyData);
+    leaf.enable(false, false);
+    EXPECT_EQ(told(), kModifyState);
+    leaf.lock(true, true);
+    EXPECT_EQ(told(), kModifyState);
+    leaf.setFlag(kChannelFlagSoloable | kChannelFlagHidden, false); // one bit is state
+    EXPECT_EQ(told(), kModifyState);
+    leaf.solo(true);
+    EXPECT_EQ(told(), kModifyState);
+    leaf.setFlags(leaf.getFlags()); // the same word
+    EXPECT_EQ(told(), kModifyState);
 
-    Leaf alone;
-    alone.setFlag(kChannelFlagHidden, false); // nobody to tell
-    EXPECT_FALSE(alone.hasBeenModified(nullptr));
-    EXPECT_EQ(alone.getFrameDuration(), TempusMake(1, 30));
+    leaf.setFlags(kChannelFlagHostOption4); // no state in it
+    leaf.setName("silent", true);
+    leaf.setNameUnset(true);
+    leaf.enable(true, true);
+    leaf.setFlag(kChannelFlagHidden, true);
+    leaf.solo(true); // not soloable
+    leaf.setID(9);
+    leaf.copy(&root, false);
+    EXPECT_TRUE(root.takeAnnounced().empty());
+    EXPECT_TRUE(leaf.hasBeenModified(nullptr));
+    EXPECT_FALSE(Leaf().hasBeenModified(nullptr)); // nobody to ask
 }
 
 TEST(KFChannelBase, IsEnabledFollowsSoloOnlyWhereTheRootHasSome) {
-    // The channel's own bits and those of the folder above it: D disabled, S solo, A soloable, C a child is
-    // soloed.
+    constexpr KFChannelFlags D = kChannelFlagDisabled;
+    constexpr KFChannelFlags S = kChannelFlagSolo;
+    constexpr KFChannelFlags A = kChannelFlagSoloable;
+    constexpr KFChannelFlags C = kChannelFlagChildSolo;
     struct {
-        char const* own;
-        char const* above;
+        KFChannelFlags own, above;
         bool anySolo, checkAncestors, honourSolo, expected;
     } const cases[] = {
-        {"", "", false, true, true, true},    {"D", "", false, false, false, false},
-        {"", "D", false, false, false, true}, {"", "D", false, true, false, false},
-        {"", "D", true, true, true, false},   {"", "S", true, false, true, true}, // not soloable
-        {"A", "", true, true, false, true},   {"A", "", false, true, true, true},
-        {"A", "", true, true, true, false},   {"AS", "", true, true, true, true},
-        {"AC", "", true, true, true, true},   {"ADS", "D", true, true, true, true},
-        {"ADC", "D", true, true, true, true}, {"A", "S", true, true, true, true},
-        {"AD", "S", true, true, true, false}, {"ADSC", "S", true, true, true, false},
-        {"A", "SD", true, true, true, true},  {"AD", "", true, true, true, false},
-    };
-    auto const bits = [](std::string const& letters) {
-        KFChannelFlags flags = 0;
-        for (char const letter : letters) {
-            flags |= letter == 'D'   ? kChannelFlagDisabled
-                     : letter == 'S' ? kChannelFlagSolo
-                     : letter == 'A' ? kChannelFlagSoloable
-                                     : kChannelFlagChildSolo;
-        }
-        return flags;
+        {0, 0, false, true, true, true},
+        {D, 0, false, false, false, false},
+        {0, D, false, false, false, true},
+        {0, D, false, true, false, false},
+        {0, S, true, false, true, true},
+        {A, 0, true, true, false, true},
+        {A, 0, false, true, true, true},
+        {A, 0, true, true, true, false},
+        {A | D | S, D, true, true, true, true},
+        {A | D | C, D, true, true, true, true},
+        {A | D | S | C, S, true, true, true, false},
+        {A, S | D, true, true, true, true},
     };
     for (auto const& row : cases) {
         RecordingRoot root;
         Folder folder("f", 3, &root);
         Leaf leaf("l", 2, &folder);
         root.anySolo = row.anySolo;
-        leaf.setFlag(bits(row.own), true);
-        folder.setFlag(bits(row.above), true);
-        EXPECT_EQ(leaf.isEnabled(row.checkAncestors, row.honourSolo), row.expected)
-            << row.own << " below " << row.above;
+        leaf.setFlag(row.own, true);
+        folder.setFlag(row.above, true);
+        EXPECT_EQ(leaf.isEnabled(row.checkAncestors, row.honourSolo), row.expected) << &row - cases;
     }
-
-    RecordingRoot root;
-    Folder folder("f", 3, &root);
-    Leaf leaf("l", 2, &folder, kChannelFlagSoloable);
-    root.setFlag(kChannelFlagSoloable, true);
-    leaf.setChildSolo(true);
-    EXPECT_TRUE(root.testFlag(kChannelFlagChildSolo));
-    EXPECT_FALSE(folder.testFlag(kChannelFlagChildSolo) || leaf.testFlag(kChannelFlagChildSolo));
 }
 
 TEST(KFChannelBase, CopyTakesIdentityAndAssignContent) {
@@ -192,41 +148,31 @@ TEST(KFChannelBase, CopyTakesIdentityAndAssignContent) {
     source.setLabelCtlrClassName("LabelController");
     source.setFlag(kChannelFlagFadesOff, true);
     Leaf target("Target", 8, &root);
-    target.saveStateAsDefault();
 
     target.assign(&source);
     EXPECT_TRUE(target.getID() == 8 && target.getName() == BXString("Target") && !target.getInternalName());
     EXPECT_EQ(target.getFlags(), source.getFlags());
-    EXPECT_TRUE(target.isStateModified());
     EXPECT_STREQ(target.getLabelCtlrClassName(), "LabelController");
-
     target.copy(&source, true);
     EXPECT_EQ(target.getFlags(), source.getFlags() | kChannelFlagNameUnset);
     EXPECT_EQ(target.getDefaultFlags(), source.getDefaultFlags());
     EXPECT_EQ(*target.getInternalName(), BXString("internal"));
-    EXPECT_EQ(root.getDescendant(7), &target);
     target.assign(&source);
-    EXPECT_TRUE(target.testFlag(kChannelFlagNameUnset));
     EXPECT_FALSE(target == source); // by bit 6
     target.setNameUnset(false);
     target.setName("sOURCE", true);
     target.setInternalName("another");
     EXPECT_TRUE(target == source);
 
-    // A node stays what its class is, whatever it is copied from; else the walks would cast it to what it
-    // isn't.
+    // A node stays what its class is, whatever it is copied from; else the walks would cast it to what it isn't.
     target.copy(&root, true);
     static_cast<KFChannelBase&>(target) = root;
-    std::unique_ptr<KFChannelBase> const sliced(new KFChannelBase(root, &root));
-    for (KFChannelBase const* const node : std::initializer_list<KFChannelBase*>{&target, sliced.get()}) {
-        EXPECT_FALSE(node->testFlag(kChannelFlagIsFolder | kChannelFlagIsObjectRoot));
-        EXPECT_EQ(node->getChannelRootBase(), &root);
-    }
+    KFChannelBase const sliced(root, &root);
+    EXPECT_FALSE(target.testFlag(kChannelFlagIsFolder | kChannelFlagIsObjectRoot));
+    EXPECT_FALSE(sliced.testFlag(kChannelFlagIsFolder | kChannelFlagIsObjectRoot));
     root.copy(&source, true);
     root.assign(&source);
     EXPECT_TRUE(root.testFlag(kChannelFlagIsFolder) && root.testFlag(kChannelFlagIsObjectRoot));
-    EXPECT_EQ(root.getNumberOfDescendants(), 2U);
-    EXPECT_EQ(std::unique_ptr<KFChannelBase>(source.clone())->getParent(), nullptr);
 }
 
 TEST(KFChannelBase, NamesItselfByWhatStandsAbove) {
@@ -239,12 +185,10 @@ TEST(KFChannelBase, NamesItselfByWhatStandsAbove) {
     EXPECT_EQ(leaf.getFullDisplayName(), BXString("Inner.leaf")); // above Outer stands a root without bit 26
     root.setFlag(kChannelFlagRootInFullName, true);
     EXPECT_EQ(leaf.getFullDisplayName(), BXString("Root.Outer.Inner.leaf"));
-    EXPECT_EQ(inner.getFullDisplayName(), BXString("Root.Outer.Inner"));
     EXPECT_EQ(outer.getFullDisplayName(), BXString("Outer"));
     inner.setName("My Root", true);
     EXPECT_EQ(leaf.getFullDisplayName(), BXString("My Root.leaf"));
     root.removeDescendant(&outer);
-    EXPECT_EQ(leaf.getFullDisplayName(), BXString("My Root.leaf"));
     inner.isCompound = false;
     EXPECT_EQ(leaf.getFullDisplayName(), BXString("leaf")); // no root
 }
@@ -261,24 +205,15 @@ TEST(KFChannelBase, RoutesTimeToTheNearestConverterOrRoot) {
         EXPECT_EQ(leaf.localToGlobalTime(local), s(30));
         EXPECT_EQ(leaf.getTimeOffset(), offset);
     };
-    expectRoute(s(20), s(10));
     HalfSpeed converter;
     object.setTimeConverterDelegate(&converter); // a root doesn't ask its own
     expectRoute(s(20), s(10));
     folder.setTimeConverterDelegate(&converter);
     expectRoute(s(18), s(10)); // 30 / 2 + 3
-    leaf.setTimeConverterDelegate(&converter);
-    expectRoute(s(19), s(10));
-    EXPECT_EQ(KFChannelBase(leaf).getTimeConverterDelegate(), &converter);
-    leaf.setTimeConverterDelegate(nullptr);
     folder.removeDescendant(&leaf);
     expectRoute(s(30), kTempusZero);
-
-    EXPECT_EQ(folder.getChannelRootBase(), &object);
-    EXPECT_EQ(folder.getAncestorRootBase(), &world);
-    EXPECT_EQ(object.getChannelRootBase(), &object);
-    EXPECT_TRUE(folder.isDescendantOf(world) && !folder.isDescendantOf(folder) &&
-                !leaf.isDescendantOf(world));
+    EXPECT_TRUE(folder.getChannelRootBase() == &object && folder.getAncestorRootBase() == &world);
+    EXPECT_TRUE(folder.isDescendantOf(world) && !folder.isDescendantOf(folder));
 }
 
 TEST(KFChannelTimeConverter, SentriesNestAndBindOneThread) {
@@ -293,35 +228,28 @@ TEST(KFChannelTimeConverter, SentriesNestAndBindOneThread) {
 
 TEST(KFChannelIDThreads, HandOutEachIDOnceWhileOthersRaiseTheGenerator) {
     constexpr int count = 20000;
-    std::vector<unsigned int> ids[2];
-    std::barrier start(3);
-    std::vector<std::thread> threads;
-    for (auto& taken : ids) {
-        threads.emplace_back([&start, &taken] {
-            start.arrive_and_wait();
-            for (int i = 0; i < count; ++i) {
-                taken.push_back(KFChannelBase::getNextUniqueID());
-            }
-        });
-    }
-    start.arrive_and_wait();
+    std::vector<unsigned int> taken;
+    std::thread other([&taken] {
+        for (int i = 0; i < count; ++i) {
+            taken.push_back(KFChannelBase::getNextUniqueID());
+        }
+    });
+    std::set<unsigned int> all;
     for (int i = 0; i < count; ++i) {
         unsigned int const foreign = KFChannelBase::getLastUsedUniqueID() + 3;
         KFChannelBase::updateIDGenerator(foreign);
-        EXPECT_GT(KFChannelBase::getNextUniqueID(), foreign);
+        unsigned int const next = KFChannelBase::getNextUniqueID();
+        EXPECT_GT(next, foreign);
+        all.insert(next);
     }
-    for (std::thread& thread : threads) {
-        thread.join();
-    }
-    std::set<unsigned int> all(ids[0].begin(), ids[0].end());
-    all.insert(ids[1].begin(), ids[1].end());
+    other.join();
+    all.insert(taken.begin(), taken.end());
     EXPECT_EQ(all.size(), 2U * count);
-    EXPECT_GE(*all.begin(), 10000U);
-    EXPECT_TRUE(std::is_sorted(ids[0].begin(), ids[0].end()) && std::is_sorted(ids[1].begin(), ids[1].end()));
 }
 
 /// In a process of its own, since the generator only grows.
 [[noreturn]] void checkLimitsOfTheIDGenerator() {
+    bool good = KFChannelBase::getNextUniqueID() == 10000;
     Folder top("top", 4000000);
     Folder inner("inner", 20000, &top);
     Leaf deep("deep", 30000, &inner);
@@ -330,10 +258,7 @@ TEST(KFChannelIDThreads, HandOutEachIDOnceWhileOthersRaiseTheGenerator) {
     ignored.ignoresIDs = true;
     Leaf belowIgnored("below", 6000000, &ignored);
     KFChannelBase::updateIDGenerator(top);
-    bool good = KFChannelBase::getLastUsedUniqueID() == 30001;
-    KFChannelBase::updateIDGenerator(30000);
-    good = good && KFChannelBase::getLastUsedUniqueID() == 30001;
-    KFChannelBase::updateIDGenerator(3500000000);
+    KFChannelBase::updateIDGenerator(20000);
     good = good && KFChannelBase::getLastUsedUniqueID() == 30001;
     KFChannelBase::updateIDGenerator(3499999999);
     good = good && KFChannelBase::getLastUsedUniqueID() == 3500000000;
@@ -360,41 +285,27 @@ TEST(KFResetCallbackDataTable, CallbackStandsInForTheResetWhileTheChannelLives) 
     leaf->reset(true);
     EXPECT_EQ(std::vector({leaf->resets, first, second}), std::vector({1, 1, 1}));
     Leaf other;
-    other.setResetCallback(count, &first, false);
-    EXPECT_EQ(KFChannelBase(*leaf).getResetCallback(nullptr, nullptr, nullptr), false); // no copy has it
+    other.setResetCallback(count, &first, false); // so that the table isn't empty
     leaf->~Leaf();
-
     leaf = new (place) Leaf(); // another channel at the same address
-    void* context = &first;
-    EXPECT_FALSE(leaf->getResetCallback(nullptr, &context, nullptr));
-    EXPECT_EQ(context, &first);
     leaf->reset(true);
     EXPECT_EQ(leaf->resets, 1);
     leaf->~Leaf();
-    bool wantsWrapper = true;
-    EXPECT_TRUE(other.getResetCallback(nullptr, &context, &wantsWrapper));
-    EXPECT_FALSE(wantsWrapper);
 }
 
 TEST(KFResetCallbackDataTable, ThreadsEnterAndLeaveSideBySide) {
-    std::vector<std::thread> threads;
-    for (int t = 0; t < 3; ++t) {
-        threads.emplace_back([] {
-            int calls = 0;
-            for (int i = 0; i < 2000; ++i) {
-                Leaf leaf;
-                leaf.setResetCallback(count, &calls, false);
-                leaf.reset(true);
-                Leaf without;
-                without.reset(true);
-                EXPECT_EQ(without.resets, 1);
-            }
-            EXPECT_EQ(calls, 2000);
-        });
-    }
-    for (std::thread& thread : threads) {
-        thread.join();
-    }
+    auto const enterAndLeave = [] {
+        int calls = 0;
+        for (int i = 0; i < 2000; ++i) {
+            Leaf leaf;
+            leaf.setResetCallback(count, &calls, false);
+            leaf.reset(true);
+        }
+        EXPECT_EQ(calls, 2000);
+    };
+    std::thread other(enterAndLeave);
+    enterAndLeave();
+    other.join();
 }
 
 /// A channel with an entry that is reset without the table and, being older than it, destroyed behind it.
@@ -404,10 +315,8 @@ TEST(KFResetCallbackDataTable, ThreadsEnterAndLeaveSideBySide) {
     leaf.setResetCallback(count, &calls, false);
     KFChannelBase::invalidateResetCallbackDataTable();
     leaf.reset(true);
-    leaf.setResetCallback(count, &calls, false);
-    bool const nothingHappened =
-        calls == 0 && leaf.resets == 0 && KFChannelBase::getResetCallbackDataTable() == nullptr;
-    std::exit(nothingHappened && !KFChannelBase::isResetCallbackDataTableValid() ? 0 : 1);
+    bool const nothingHappened = calls == 0 && leaf.resets == 0;
+    std::exit(nothingHappened && KFChannelBase::getResetCallbackDataTable() == nullptr ? 0 : 1);
 }
 
 TEST(KFResetCallbackDataTable, NothingIsResetOnceItIsGone) {

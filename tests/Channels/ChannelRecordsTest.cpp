@@ -8,6 +8,8 @@
 
 #include <gtest/gtest.h>
 
+#include <tuple>
+
 namespace {
 
 Tempus s(std::int64_t value) { return TempusMake(value, 1); }
@@ -19,69 +21,43 @@ struct Double : KFChannelDouble {
 };
 
 TEST(KFChannelRecords, DepartAtTheFirstDifferenceAndReturnOnReset) {
-    struct {
-        char const* name;
-        void (*edit)(KFChannel&);
-        bool returns;
-    } const edits[] = {
+    std::tuple<char const*, void (*)(KFChannel&), bool> const edits[] = {
         {"value", [](KFChannel& c) { c.setValue(kTempusZero, 5.0, false); }, true},
-        {"initial value", [](KFChannel& c) { c.setInitialValue(5.0, false); }, true},
         {"keypoint", [](KFChannel& c) { c.addKeypointAt(s(1)); }, true},
         {"fade", [](KFChannel& c) { c.setFadeInOffset(s(1), false); }, true},
-        {"fade shape", [](KFChannel& c) { c.setFadeOutCurve(2); }, true},
         {"default", [](KFChannel& c) { c.setDefaultValue(5.0); }, false},
         {"limit", [](KFChannel& c) { c.setMin(-1.0); }, false},
-        {"discrete", [](KFChannel& c) { c.setDiscrete(false, false); }, false},
-        {"parametric", [](KFChannel& c) { c.setParametric(true); }, false},
-        {"tangents", [](KFChannel& c) { c.setShouldCreateTangents(false); }, false},
         {"constant", [](KFChannel& c) { c.setKeyframable(false, false); }, false},
-        {"owner", [](KFChannel& c) { c.setOwnerChannel(&c); }, false},
         {"node", [](KFChannel& c) { c.appendCurveProcessingNode(new AddingNode(1.0)); }, false},
     };
     for (auto const& [name, edit, returns] : edits) {
         SCOPED_TRACE(name);
         Double channel;
-        EXPECT_EQ(channel.getImpl(), shared());
         edit(channel);
-        EXPECT_NE(channel.getImpl(), shared());
         EXPECT_FALSE(channel.getImpl()->isShared());
-        EXPECT_EQ(Double().getImpl()->getFades(), nullptr);
-        EXPECT_TRUE(Double().compare(std::make_unique<Double>().get()));
+        EXPECT_EQ(Double().getInitialValue(), 0.0);
         channel.resetToDefault(false);
         EXPECT_EQ(channel.getImpl() == shared(), returns);
     }
-    // What changes nothing allocates nothing.
-    Double same;
-    same.setValue(kTempusZero, 5.0, false);
-    Double untouched;
+    Double untouched; // what changes nothing allocates nothing
     untouched.setInitialValue(5e-8, false);
     untouched.setDefaultValue(-5e-8);
-    untouched.setMax(untouched.getMax());
     untouched.setKeyframable(true, false);
-    untouched.setFadeInOffset(kTempusZero, true);
     untouched.setFadeOutCurve(0);
-    untouched.deleteCurveProcessingNode(nullptr);
-    untouched.resetLocalChannelImplementation();
     EXPECT_EQ(untouched.getImpl(), shared());
-    EXPECT_FALSE(untouched.compare(&same));
 }
 
 TEST(KFChannelRecords, FollowCopiesAndAssignments) {
     Double local;
     local.setValue(kTempusZero, 5.0, false);
     local.setSliderMax(7.0);
-    local.setName("local", false);
     Double target;
     target.copy(&local, false);
-    EXPECT_NE(target.getImpl(), local.getImpl());
     EXPECT_TRUE(target.compare(&local));
     EXPECT_EQ(target.getSliderMax(), 7.0);
-    EXPECT_EQ(target.getName(), BXString("local"));
     Double const atClassState;
     target.copy(&atClassState, false);
     EXPECT_EQ(target.getImpl(), shared());
-    EXPECT_EQ(target.getInfo(), sharedInfo());
-
     target.assign(&local);
     EXPECT_EQ(target.getInitialValue(), 5.0);
     EXPECT_EQ(target.getInfo(), sharedInfo());
@@ -90,26 +66,19 @@ TEST(KFChannelRecords, FollowCopiesAndAssignments) {
     target.assign(&atClassState);
     EXPECT_EQ(target.getImpl(), record) << "a curve that knows its owner is written in place";
     EXPECT_EQ(target.getInitialValue(), 0.0);
-    target.assign(&target);
-    target.copy(&target, false);
-    EXPECT_EQ(target.getImpl(), record);
-
+    local.setName("local", false);
     KFChannelDouble const blank(local);
     EXPECT_EQ(blank.getID(), local.getID());
     EXPECT_TRUE(blank.getName().empty());
     EXPECT_TRUE(blank.compare(&local));
-    EXPECT_NE(blank.getInfo(), local.getInfo());
-    target = local;
-    EXPECT_EQ(target.getInitialValue(), 5.0);
+    EXPECT_FALSE(blank.compare(&atClassState));
 }
 
 TEST(KFChannelRecords, AreReplacedAndFreedByTheirOwner) {
-    auto const localRecord = [] {
-        return new KFChannelImpl(KFChannelDouble::createKFChannelDoubleCurve(2.0), 2.0, 1, false);
-    };
+    auto* const record = new KFChannelImpl(new KFCurveDouble(2.0), 2.0, 1, false);
     std::unique_ptr<KFChannelBase> clone;
     {
-        KFChannelDouble given("", nullptr, 1, 0, localRecord(), new KFChannelInfo(*sharedInfo()));
+        KFChannelDouble given("", nullptr, 1, 0, record, new KFChannelInfo(*sharedInfo()));
         given.setValue(kTempusZero, 3.0, false);
         given.resetToDefault(false);
         given.resetLocalChannelInfo();
@@ -126,15 +95,13 @@ TEST(KFChannelRecords, AreReplacedAndFreedByTheirOwner) {
 
     KFChannelInfo own(0.0, 1.0, 0.1, 0.01, 2.0, "px");
     Double channel;
-    channel.setInfo(&own);
-    EXPECT_TRUE(*channel.getInfo() == own);
-    EXPECT_FALSE(channel.getInfo()->shared);
+    channel.setInfo(channel.getInfo());
+    EXPECT_FALSE(channel.getInfo()->shared) << "also from the record in use";
     channel.replaceInfo(&own); // shared: now the class's record of this channel
     channel.setSuffix("em");
     EXPECT_EQ(channel.getScale(), 2.0);
     EXPECT_EQ(own.suffix, BXString("px"));
     channel.setSuffix("px");
-    EXPECT_NE(channel.getInfo(), &own) << "only a reset returns";
     channel.resetLocalChannelInfo();
     EXPECT_EQ(channel.getInfo(), &own);
 }
@@ -147,23 +114,17 @@ TEST(KFChannelRecords, TakeAndGiveCurves) {
     channel.lock(true, false);
     channel.setCurveInterface(prototype);
     EXPECT_EQ(channel.releaseCurveInterface(), nullptr);
-    EXPECT_EQ(channel.getImpl(), shared());
     channel.lock(false, false);
-    channel.setCurveInterface(nullptr);
     channel.setCurveInterface(channel.getCurveInterface());
     EXPECT_EQ(channel.getImpl(), shared());
     channel.setCurveInterface(prototype);
-    EXPECT_NE(channel.getCurveInterface(), prototype);
     EXPECT_EQ(channel.getCurveInterface()->getFrameDuration(), TempusMake(1, 24));
-    EXPECT_EQ(channel.getValueAsDouble(kTempusZero, 0.0), 4.0);
     channel.resetToDefault(false);
     EXPECT_FALSE(channel.getImpl()->isShared());
 
     std::unique_ptr<KFCurveInterface> const released(channel.releaseCurveInterface());
     EXPECT_EQ(dynamic_cast<KFCurve&>(*released).getOwnerChannel(), nullptr);
     EXPECT_EQ(channel.getValueAsDouble(kTempusZero, 0.0), 0.0);
-    EXPECT_FALSE(channel.hasKeypoints(0));
-    channel.setName("without a curve", false);
     channel.setCurveInterface(new KFCurveDouble(6.0));
     EXPECT_EQ(channel.getInitialValue(), 6.0);
 }

@@ -10,8 +10,10 @@
 
 #include <gtest/gtest.h>
 
+#include <array>
 #include <cmath>
 #include <limits>
+#include <tuple>
 
 namespace {
 
@@ -58,45 +60,24 @@ TEST(KFChannelValue, IsReadThroughTimeNodesAndFlags) {
 
     KFCurveNode* const node = new AddingNode(0.5);
     EXPECT_TRUE(channel.appendCurveProcessingNode(node));
-    EXPECT_FALSE(channel.appendCurveProcessingNode(node));
     EXPECT_EQ(channel.getValueAsDouble(s(1), 100.0), 103.5);
-    EXPECT_EQ(channel.getCurveValue(s(1), true), 3.5);
-    EXPECT_EQ(channel.getCurveValue(s(1), false), 3.0);
     EXPECT_EQ(channel.getCurveValueForNode(s(1), node, 0.0), 3.5);
-    channel.setFlag(kChannelFlagBehaviorsOff, false);
-    EXPECT_EQ(channel.getValueAsDouble(s(1), 100.0), 3.0);
-    channel.resetFlag(kChannelFlagBehaviorsOff, false);
     channel.setValueOffsetByBehaviors(s(1), 10.0);
     EXPECT_EQ(channel.getInitialValue(), 9.5);
-    EXPECT_EQ(channel.enumerateCurveProcessingNodes(), std::vector<KFCurveNode*>{node});
+    channel.setFlag(kChannelFlagBehaviorsOff, false);
+    EXPECT_EQ(channel.getValueAsDouble(s(1), 100.0), 9.5);
     EXPECT_TRUE(channel.removeCurveProcessingNode(node));
     EXPECT_TRUE(channel.insertCurveProcessingNode(node, nullptr));
     EXPECT_TRUE(channel.deleteCurveProcessingNode(node));
-    EXPECT_EQ(channel.getNumberOfCurveProcessingNodes(), 0U);
-
-    channel.addKeypointAt(s(0));
-    channel.addKeypointAt(s(2));
-    converter.count = 0;
-    EXPECT_EQ(channel.getValueAsDouble(s(1), 0.0), 9.5);
-    EXPECT_EQ(converter.count, 1);
 }
 
 TEST(KFChannelValue, IsTruncatedWithinTheRangeOfIntegers) {
     double const infinity = std::numeric_limits<double>::infinity();
-    struct {
-        double value;
-        int asInt;
-        unsigned asUint;
-    } const cases[] = {
-        {2.9, 2, 2U},
-        {-2.9, -2, 0U},
-        {-0.5, 0, 0U},
-        {3e9, 2147483647, 3000000000U},
-        {1e300, 2147483647, 4294967295U},
-        {-infinity, -2147483647 - 1, 0U},
-        {infinity, 2147483647, 4294967295U},
-        {std::nan(""), 0, 0U},
-    };
+    std::tuple<double, int, unsigned> const cases[] = {{-2.9, -2, 0U},
+                                                       {3e9, 2147483647, 3000000000U},
+                                                       {-infinity, -2147483647 - 1, 0U},
+                                                       {NAN, 0, 0U},
+                                                       {infinity, 2147483647, 4294967295U}};
     for (auto const& [value, asInt, asUint] : cases) {
         KFChannelDouble const channel(value, "", nullptr, 1, 0);
         EXPECT_EQ(channel.getValueAsInt(kTempusZero, 0.0), asInt) << value;
@@ -109,30 +90,19 @@ TEST(KFChannelValue, AnnouncesTheCompoundFirstAndConstantsAsState) {
     KFChannel& component = tree.component;
     Announced const data = {{&tree.compound, kModifyData}, {&component, kModifyData}};
     Announced const state = {{&tree.compound, kModifyState}, {&component, kModifyState}};
-    Announced twice = state;
-    twice.insert(twice.end(), state.begin(), state.end());
-    struct {
-        char const* name;
-        void (*edit)(KFChannel&);
-        Announced expected;
-    } const cases[] = {
+    Announced const twice = {state[0], state[1], state[0], state[1]};
+    std::tuple<char const*, void (*)(KFChannel&), Announced> const cases[] = {
         {"set", [](KFChannel& c) { c.setValue(s(5), 4.0, false); }, data},
         {"set silently", [](KFChannel& c) { c.setValue(s(5), 6.0, true); }, {}},
-        {"initial, the same", [](KFChannel& c) { c.setInitialValue(6.0, false); }, {}},
         {"initial", [](KFChannel& c) { c.setInitialValue(7.0, false); }, data},
-        {"default", [](KFChannel& c) { c.setDefaultValue(7.0); }, {}},
-        {"fade of nothing", [](KFChannel& c) { c.setFadeInOffset(s(-1), true); }, {}},
         {"fade", [](KFChannel& c) { c.setFadeInOffset(s(1), true); }, data},
         {"add", [](KFChannel& c) { c.addKeypointAt(s(5)); }, data},
         {"remove what isn't there", [](KFChannel& c) { EXPECT_FALSE(c.removeValue(s(7), true)); }, data},
-        {"limit", [](KFChannel& c) { c.setMax(50.0); }, {}},
         {"lock", [](KFChannel& c) { c.lock(true, false); }, twice},
-        {"set while locked", [](KFChannel& c) { c.setValue(s(5), 9.0, false); }, {}},
-        {"delete while locked", [](KFChannel& c) { c.deleteKeypointAt(s(5)); }, {}},
+        {"fade while locked", [](KFChannel& c) { c.setFadeInOffset(s(3), false); }, {}},
         {"reset while locked", [](KFChannel& c) { c.resetToDefault(false); }, data},
         {"unlock", [](KFChannel& c) { c.lock(false, false); }, twice},
-        {"constant", [](KFChannel& c) { c.setKeyframable(false, false); }, {}},
-        {"set a constant", [](KFChannel& c) { c.setValue(s(5), 4.0, false); }, state},
+        {"constant", [](KFChannel& c) { c.setIsSpline(false); }, {}},
         {"as a component", [](KFChannel& c) { c.parentWillBeModified(kModifyData); }, {state[1]}},
     };
     for (auto const& [name, edit, expected] : cases) {
@@ -150,61 +120,31 @@ TEST(KFChannelValue, IsKeyedWhileAnimatedAndAConstantOtherwise) {
     KFChannel& channel = tree.component;
     tree.root.addsKeypointAt0 = true;
     channel.setValue(s(6), 1.0, false);
-    EXPECT_EQ(channel.getNumberOfKeyframes(), 0U);
-    EXPECT_EQ(channel.getInitialValue(), 1.0);
     {
         Animated const animated;
         channel.setValue(s(6), 9.0, false);
         channel.setValue(s(8));
     }
     // The old value at the start of the extent, all at the object's own time.
-    struct {
-        std::int64_t local;
-        double value;
-    } const keypoints[] = {{1, 1.0}, {4, 9.0}, {6, 9.0}};
-    EXPECT_EQ(channel.getNumberOfKeyframes(), std::size(keypoints));
-    for (auto const& [local, value] : keypoints) {
+    EXPECT_EQ(channel.getNumberOfKeyframes(), 3U);
+    for (auto const& [local, value] : {std::pair{1, 1.0}, std::pair{4, 9.0}, std::pair{6, 9.0}}) {
         EXPECT_TRUE(channel.hasKeypointAt(s(local + 2), 0)) << local;
-        EXPECT_EQ(channel.numberOfKeypointsAt(s(2 * local + 7)), 0U);
         EXPECT_DOUBLE_EQ(channel.getCurveValue(s(local), true), value);
     }
     Tempus t = s(0);
     EXPECT_TRUE(channel.nextKeypoint(&t, 0));
     EXPECT_EQ(t, s(3));
-    EXPECT_FALSE(channel.previousKeypoint(&t, 0));
-    EXPECT_EQ(t, s(3));
     EXPECT_EQ(channel.moveKeypointTo(s(6), s(7), false, false), s(7));
     EXPECT_EQ(channel.moveKeypointTo(s(6), s(5), false, false), s(5)) << "none there";
     EXPECT_TRUE(channel.moveValue(s(7), s(6), true));
     EXPECT_TRUE(channel.removeValue(s(6), true));
-    EXPECT_FALSE(channel.hasKeypointAt(s(6), 0));
     channel.lock(true, false);
     EXPECT_EQ(channel.moveKeypointTo(s(8), s(9), false, false), s(8));
-    channel.removeAllValues(s(8), true);
-    EXPECT_TRUE(channel.hasMoreThanOneKeypoint());
+    channel.deleteKeypoints(s(0), s(9));
+    EXPECT_EQ(channel.getNumberOfKeyframes(), 2U);
     channel.lock(false, false);
     channel.removeAllValues(s(8), true);
     EXPECT_FALSE(channel.hasKeypoints(0));
-    EXPECT_EQ(channel.getValueAsDouble(s(0), 0.0), 9.0);
-}
-
-TEST(KFChannelValue, PassesEditsToALinkedCompound) {
-    Tree tree;
-    KFChannelDouble other("other", &tree.compound, 5, 0);
-    tree.compound.setFoldFlag(kFoldFlagLinked);
-    Animated const animated;
-    tree.component.setValue(s(6), 9.0, false);
-    EXPECT_TRUE(other.hasKeypointAt(s(6), 0));
-    tree.component.moveKeypointTo(s(6), s(7), false, false);
-    EXPECT_TRUE(other.hasKeypointAt(s(7), 0));
-    tree.component.deleteKeypointAt(s(7));
-    EXPECT_FALSE(other.hasKeypoints(0));
-    tree.component.setIsSpline(false);
-    EXPECT_FALSE(other.isSpline());
-    other.setInitialValue(3.0, false);
-    tree.component.resetToDefault(false);
-    EXPECT_EQ(other.getInitialValue(), 0.0);
-    tree.compound.removeDescendant(&other);
 }
 
 TEST(KFChannelValue, KeepsItsLimitsAndUnitWhenItTakesAnother) {
@@ -218,26 +158,17 @@ TEST(KFChannelValue, KeepsItsLimitsAndUnitWhenItTakesAnother) {
     EXPECT_EQ(target.getSliderMax(), 40.0);
     EXPECT_FALSE(target.allowsAssignment(&source));
     target.setValue(source);
-    EXPECT_DOUBLE_EQ(target.getValueAsDouble(s(1), 0.0), 40.0);
     EXPECT_EQ(target.getMax(), 40.0);
     target.setMax(60.0);
-    EXPECT_TRUE(target.allowsAssignment(&source));
     target.assign(&source);
     EXPECT_DOUBLE_EQ(target.getValueAsDouble(s(1), 0.0), 50.0);
-    EXPECT_EQ(target.getScale(), 1.0);
+    EXPECT_FALSE(KFChannelBool("", nullptr, 1, 0).allowsAssignment(&source)) << "keypoints";
 
-    KFChannelBool const flag(1, "", nullptr, 1, 0);
-    KFChannelBool other("", nullptr, 1, 0);
-    EXPECT_FALSE(other.allowsAssignment(&source)) << "keypoints";
-    EXPECT_TRUE(other.allowsAssignment(&flag));
-    EXPECT_FALSE(other.allowsAssignment(&other));
-    EXPECT_FALSE(other.allowsAssignment(nullptr));
-
-    target.setSliderMin(0.0);
     target.setMin(-5.0);
     EXPECT_EQ(target.getSliderMin(), 0.0);
     target.setMin(5.0);
     EXPECT_EQ(target.getSliderMin(), 5.0);
+    target.setDefaultValue(5.0);
     EXPECT_FALSE(target.testFlag(kChannelFlagSaveWhenAtDefault));
     target.finishInitializing();
     target.setDefaultValue(6.0);
@@ -245,33 +176,22 @@ TEST(KFChannelValue, KeepsItsLimitsAndUnitWhenItTakesAnother) {
 }
 
 TEST(KFChannelValue, FindsItsExtremes) {
-    KFChannelDouble channel(2.0, "", nullptr, 1, 0);
-    double low = 0.0;
-    double high = 0.0;
-    EXPECT_FALSE(channel.getCurrentMinAndMax(s(0), s(1), nullptr, nullptr));
-    EXPECT_TRUE(channel.getCurrentMinAndMax(s(0), s(1), &low, &high));
-    EXPECT_EQ(low, 2.0);
-    EXPECT_EQ(high, 2.0);
-    Tempus const times[] = {s(0), s(1), s(2)};
-    double const values[] = {0.0, 10.0, 4.0};
+    KFChannelDouble channel("", nullptr, 1, 0);
     channel.willLoadKeyframes(true, 3);
-    channel.appendKeyframes(3, times, values, false);
+    channel.appendKeyframes(3, std::array{s(0), s(1), s(2)}.data(), std::array{0.0, 10.0, 4.0}.data(), false);
     channel.willLoadKeyframes(false, 0);
-    EXPECT_TRUE(channel.getCurrentMinAndMax(s(5), s(1, 4), &low, &high));
-    EXPECT_DOUBLE_EQ(low, 2.5);
-    EXPECT_EQ(high, 10.0);
     // A Bezier segment that overshoots, against a dense walk.
-    KFCurve& curve = *channel.getCurveInterface();
     void* first = nullptr;
-    ASSERT_TRUE(curve.getKeypointHandle(s(0), &first));
-    curve.setKeypointInterpolation(first, 4, true);
-    curve.setKeypointOutputHandles(first, 0.4, -20.0, true);
-    double lowest = 0.0;
+    channel.getCurveInterface()->getKeypointHandle(s(0), &first);
+    channel.getCurveInterface()->setKeypointInterpolation(first, 4, true);
+    channel.getCurveInterface()->setKeypointOutputHandles(first, 0.4, -20.0, true);
+    double low = 0.0, high = 0.0, lowest = 0.0;
     for (int i = 0; i <= 100000; ++i)
         lowest = std::min(lowest, channel.getCurveValue(s(i, 100000), false));
-    EXPECT_TRUE(channel.getCurrentMinAndMax(s(0), s(2), &low, nullptr));
+    EXPECT_TRUE(channel.getCurrentMinAndMax(s(2), s(0), &low, &high));
     EXPECT_LT(lowest, -1.0);
     EXPECT_NEAR(low, lowest, 1e-6);
+    EXPECT_EQ(high, 10.0);
 }
 
 TEST(KFChannelFades, StayWithinTheExtent) {
@@ -287,23 +207,12 @@ TEST(KFChannelFades, StayWithinTheExtent) {
     channel.setFadeOutOffset(s(5), true);
     EXPECT_EQ(channel.getFadeOutOffset(), s(3));
     channel.setFadeInOffset(s(8), false);
-    EXPECT_EQ(channel.getFadeInOffset(), s(8));
     channel.scaleFadeHandles(0.5);
     EXPECT_EQ(channel.getFadeInOffset(), s(4));
-    EXPECT_EQ(channel.getFadeOutOffset(), s(3, 2));
-    root.setTimeExtent({s(0), s(20)}, true);
-    EXPECT_EQ(channel.getFadeInOffset(), s(8));
-    EXPECT_TRUE(channel.isModified(false));
-    channel.lock(true, false);
-    channel.setFadeInOffset(s(1), false);
-    channel.setFadeInCurve(3);
-    EXPECT_EQ(channel.getFadeInOffset(), s(8));
-    EXPECT_EQ(channel.getFadeInCurve(), 0U);
-    channel.lock(false, false);
-    channel.setFadeInOffset(s(-1), false);
     channel.setFadeOutOffset(kTempusZero, false);
+    EXPECT_TRUE(channel.isModified(false));
+    channel.setFadeInOffset(s(-1), false);
     EXPECT_FALSE(channel.hasFadeHandles());
-    EXPECT_NE(channel.getImpl()->getFades(), nullptr);
 }
 
 TEST(KFChannelFades, ScaleTheValueAtTheEndsOfTheExtent) {
@@ -313,39 +222,27 @@ TEST(KFChannelFades, ScaleTheValueAtTheEndsOfTheExtent) {
     root.setTimeOffset(s(5), true);          // which the fade ratio, in local time, sees at -4 .. 5
     KFChannelDouble channel(2.0, "", &root, 1, 0);
     double const half = std::sqrt(0.5);
-    struct {
-        unsigned shape;
-        double middle; // half way through a fade
-    } const shapes[] = {{0, 0.5}, {1, half}, {2, 1.0 - half}, {3, 0.5}, {7, 0.5}};
+    std::pair<unsigned, double> const shapes[] = {{0, 0.5}, {1, half}, {2, 1.0 - half}, {3, 0.5}, {7, 0.5}};
     for (auto const& [shape, middle] : shapes) {
         channel.setFadeInOffset(s(2), true);
         channel.setFadeOutOffset(s(4), true);
         channel.setFadeInCurve(shape);
         channel.setFadeOutCurve(shape);
-        struct {
-            std::int64_t global;
-            double ratio;
-        } const times[] = {{-3, 0.0}, {1, 0.0},    {2, middle}, {3, 1.0},
-                           {6, 1.0},  {8, middle}, {10, 0.0},   {12, 0.0}};
+        std::pair<std::int64_t, double> const times[] = {{-3, 0.0}, {1, 0.0},    {2, middle}, {3, 1.0},
+                                                         {6, 1.0},  {8, middle}, {10, 0.0},   {12, 0.0}};
         for (auto const& [global, ratio] : times) {
             EXPECT_NEAR(channel.getValueAsDouble(s(global), 0.0), 2.0 * ratio, 1e-12)
                 << shape << " " << global;
-            EXPECT_NEAR(channel.getFadeRatio(s(global - 5)), ratio, 1e-12);
-            EXPECT_EQ(channel.getCurveValue(s(global), true), 2.0);
         }
-        channel.setFlag(kChannelFlagFadesOff, true);
-        EXPECT_EQ(channel.getValueAsDouble(s(1), 0.0), 2.0);
-        channel.resetFlag(kChannelFlagFadesOff, true);
     }
+    channel.setFlag(kChannelFlagFadesOff, true);
+    EXPECT_EQ(channel.getValueAsDouble(s(1), 0.0), 2.0);
     channel.setFadeInOffset(s(20), false); // over the fade out, where it wins
     channel.setFadeInCurve(0);
     EXPECT_NEAR(channel.getFadeRatio(s(4)), 8.0 / 20.0, 1e-12);
     CountingConverter converter;
     channel.setTimeConverterDelegate(&converter); // with the extent in local time
     EXPECT_NEAR(channel.getFadeRatio(s(4)), 3.0 / 20.0, 1e-12);
-    converter.count = 0;
-    channel.getValueAsDouble(s(4), 0.0);
-    EXPECT_EQ(converter.count, 1);
     root.removeDescendant(&channel);
     EXPECT_EQ(channel.getFadeRatio(s(4)), 1.0);
 }

@@ -114,9 +114,13 @@ TEST(KFCompoundChannel, AnnouncesItselfAroundALinkedEdit) {
     EXPECT_EQ(namesOf(root.takeAnnounced()), "cxyz");
     point.x.addKeypointAt(s(1));
     // The link goes, each component edits (a component announces its compound first), the link comes back.
-    EXPECT_EQ(namesOf(root.takeAnnounced()), "cxyz" "cxcycz" "cxyz");
+    EXPECT_EQ(namesOf(root.takeAnnounced()), "cxyz"
+                                             "cxcycz"
+                                             "cxyz");
     point.compoundMoveKeypointTo(&point.y, s(1), s(2), false, false, false);
-    EXPECT_EQ(namesOf(root.takeAnnounced()), "cxyz" "cycxcz" "cxyz"); // the moved one first
+    EXPECT_EQ(namesOf(root.takeAnnounced()), "cxyz"
+                                             "cycxcz"
+                                             "cxyz"); // the moved one first
 }
 
 TEST(KFCompoundChannel, SetsAndRemovesValuesByIndex) {
@@ -169,7 +173,8 @@ TEST(KFCompoundChannel, CopiesTheLinkButNeverClearsIt) {
     EXPECT_FALSE(linked == plain || plain == linked);
     std::unique_ptr<KFChannelBase> const copy(linked.clone());
     EXPECT_TRUE(copy->isCompoundChannel());
-    EXPECT_EQ(static_cast<KFCompoundChannel&>(*copy).getFoldFlags(), kFoldFlagLinked | kFoldFlagsCompoundDefault);
+    EXPECT_EQ(static_cast<KFCompoundChannel&>(*copy).getFoldFlags(),
+              kFoldFlagLinked | kFoldFlagsCompoundDefault);
     EXPECT_EQ(static_cast<KFCompoundChannel&>(*copy).getDescendants(), nullptr);
     linked.copy(&plain, true);
     EXPECT_TRUE(linked.isLinked());

@@ -7,6 +7,7 @@
 
 #include <gtest/gtest.h>
 
+#include <cstdlib>
 #include <memory>
 #include <set>
 #include <string>
@@ -145,6 +146,8 @@ class HostFactory : public KFChannelFactory {
 public:
     HostFactory() : KFChannelFactory({{1, 2, 3, 4}}, KFChannelFactoryUUID("KFChannelDouble"), 1) {}
     BXString getIconNameInternal() const override { return "HostIcon"; }
+    BXString getLibraryIconNameInternal() const override { return "LibraryIcon"; }
+    char const* getBundleID() const override { return nullptr; }
 };
 class UntitledHostFactory : public KFChannelFactory {
 public:
@@ -161,5 +164,33 @@ TEST(KFFactories, AHostsClassFindsItsSuperclassOnceThatIsRegistered) {
     EXPECT_TRUE(derived.isKindOfClass(KFChannelFactoryUUID("KFChannel")));
     EXPECT_EQ(derived.getIconName(), "HostIcon");
     EXPECT_EQ(derived.getIconID(), KFFactory::kNoIconID);
-    EXPECT_EQ(derived.getLibraryIconName(), "");
+    EXPECT_EQ(derived.getLibraryIconName(), ""); // the bundle has no name
+}
+
+namespace {
+/// Its destructor runs when those of the main thread's own objects are through.
+struct ReadsAndWritesAtTheEnd {
+    HostFactory factory;
+    ~ReadsAndWritesAtTheEnd() {
+        bool const startsAnew = !factory.needsSaving() && registry().lookupFactory(3) == nullptr;
+        factory.setNeedsSaving(true);
+        registry().setFactoryLoadID(3, &factory);
+        if (!startsAnew || !factory.needsSaving() || registry().lookupFactory(3) != &factory) {
+            std::_Exit(1);
+        }
+    }
+};
+
+[[noreturn]] void readAndWriteAtTheEnd() {
+    registry(); // torn down behind the object
+    static ReadsAndWritesAtTheEnd object;
+    object.factory.setNeedsSaving(true);
+    registry().setFactoryLoadID(3, &object.factory);
+    std::exit(0);
+}
+} // namespace
+
+TEST(KFFactories, MarksAndNumbersServeDestructorsOfStaticObjects) {
+    testing::GTEST_FLAG(death_test_style) = "threadsafe";
+    EXPECT_EXIT(readAndWriteAtTheEnd(), testing::ExitedWithCode(0), "");
 }

@@ -1,5 +1,5 @@
-// The folder: which children an operation reaches, answers over children, the list and its look-up by ID, copies,
-// counterparts in other trees.
+// The folder: which children an operation reaches, answers over children, the list and its look-up by ID,
+// copies, counterparts in other trees.
 
 #include "lumenkey/Channels/KFCompoundChannel.h"
 #include "lumenkey/Channels/KFScalarChannels.h"
@@ -31,8 +31,12 @@ public:
     void beginRecording(Tempus const&) override { note("beginRecording"); }
     void endRecording(Tempus const&) override { note("endRecording"); }
     void updateCurrentRecordingTime(Tempus const&) override { note("updateCurrentRecordingTime"); }
-    void registerRecordingCallback(RecordingCallback, void*, bool) override { note("registerRecordingCallback"); }
-    void unregisterRecordingCallback(RecordingCallback, void*) override { note("unregisterRecordingCallback"); }
+    void registerRecordingCallback(RecordingCallback, void*, bool) override {
+        note("registerRecordingCallback");
+    }
+    void unregisterRecordingCallback(RecordingCallback, void*) override {
+        note("unregisterRecordingCallback");
+    }
     void reset(bool silent) override {
         note("reset");
         KFChannelBase::reset(silent);
@@ -41,7 +45,9 @@ public:
         note("lockFromParent");
         lockedFromParent = on;
     }
-    void copyKeyframesFromChannel(Tempus const&, KFChannelBase*) override { note("copyKeyframesFromChannel"); }
+    void copyKeyframesFromChannel(Tempus const&, KFChannelBase*) override {
+        note("copyKeyframesFromChannel");
+    }
     void undoWillReplace() override { note("undoWillReplace"); }
     void undoDidReplace() override { note("undoDidReplace"); }
     void bake(BXTimeRange const&, Tempus const&) override { note("bake"); }
@@ -100,7 +106,10 @@ TEST(KFChannelFolder, PassesEachOperationToTheChildrenItIsFor) {
         {"copyKeyframesFromChannel", "phnkb", [](Folder& f) { f.copyKeyframesFromChannel(s(1), &f); }},
         {"undoWillReplace", "phnkb", [](Folder& f) { f.undoWillReplace(); }},
         {"undoDidReplace", "phnkb", [](Folder& f) { f.undoDidReplace(); }},
-        {"bake", "phnkb", [](Folder& f) { f.bake({s(0), s(1)}, s(1)); }},
+        {"bake", "phnkb",
+         [](Folder& f) {
+             f.bake({s(0), s(1)}, s(1));
+         }},
         {"simplify", "phnkb", [](Folder& f) { f.simplify(s(0), s(1), s(1), 0.0, 0, 0, false); }},
         {"setExtrapolation", "phnkb", [](Folder& f) { f.setExtrapolation(0, 0); }},
         {"generateKeys", "phnkb", [](Folder& f) { f.generateKeys(0, 0); }},
@@ -124,8 +133,10 @@ TEST(KFChannelFolder, PassesEachOperationToTheChildrenItIsFor) {
         {"beginRecording", "pnk", [](Folder& f) { f.beginRecording(s(1)); }},
         {"endRecording", "pnk", [](Folder& f) { f.endRecording(s(1)); }},
         {"updateCurrentRecordingTime", "pnk", [](Folder& f) { f.updateCurrentRecordingTime(s(1)); }},
-        {"registerRecordingCallback", "pnk", [](Folder& f) { f.registerRecordingCallback(nullptr, nullptr, false); }},
-        {"unregisterRecordingCallback", "pnk", [](Folder& f) { f.unregisterRecordingCallback(nullptr, nullptr); }},
+        {"registerRecordingCallback", "pnk",
+         [](Folder& f) { f.registerRecordingCallback(nullptr, nullptr, false); }},
+        {"unregisterRecordingCallback", "pnk",
+         [](Folder& f) { f.unregisterRecordingCallback(nullptr, nullptr); }},
         {"setKeyframable", "pnk", [](Folder& f) { f.setKeyframable(true, false); }},
         {"setKeyframable", "phnkb", [](Folder& f) { f.setKeyframable(true, true); }},
         {"retimeKeypoints", "phk", [](Folder& f) { f.retimeKeypoints(2.0, s(1)); }},
@@ -174,13 +185,20 @@ TEST(KFChannelFolder, AnswersForItsVisibleChildren) {
     KFChannelFolder folder("Folder", nullptr, 1, 0, 0);
     auto const answers = [&folder] {
         KFChannelFolder const& f = folder;
-        return std::vector<bool>{f.isSpline(), f.isKeyframable(), f.hasMoreThanOneKeypoint(), f.hasFadeHandles(),
-                                 f.hasKeypoints(0), f.hasKeypointAt(s(1), 0), f.allHaveKeypointsAt(s(1)),
-                                 f.hasOnlyOneKeypointAt(s(1)), f.isModified(true)};
+        return std::vector<bool>{f.isSpline(),
+                                 f.isKeyframable(),
+                                 f.hasMoreThanOneKeypoint(),
+                                 f.hasFadeHandles(),
+                                 f.hasKeypoints(0),
+                                 f.hasKeypointAt(s(1), 0),
+                                 f.allHaveKeypointsAt(s(1)),
+                                 f.hasOnlyOneKeypointAt(s(1)),
+                                 f.isModified(true)};
     };
     std::vector<bool> const none{false, false, false, false, false, false, false, true, false};
     EXPECT_EQ(answers(), none);
-    Probe hidden(&folder, "h", 1, kChannelFlagHidden), a(&folder, "a", 2, kChannelFlagDisabled), b(&folder, "b", 3);
+    Probe hidden(&folder, "h", 1, kChannelFlagHidden), a(&folder, "a", 2, kChannelFlagDisabled),
+        b(&folder, "b", 3);
     hidden.answer = true;
     EXPECT_EQ(answers(), (std::vector<bool>{false, false, false, false, false, false, false, true, true}));
     a.answer = true;
@@ -225,7 +243,10 @@ TEST(KFChannelFolder, KeepsAMovedKeypointFromPassingItsNeighbours) {
     struct {
         Tempus from, to, result;
     } const moves[] = {
-        {s(1), s(5), s(89, 30)}, {s(89, 30), s(0), s(0)}, {s(3), s(-1), s(1, 30)}, {s(0), s(0), s(0)},
+        {s(1), s(5), s(89, 30)},
+        {s(89, 30), s(0), s(0)},
+        {s(3), s(-1), s(1, 30)},
+        {s(0), s(0), s(0)},
     };
     for (auto const& move : moves) {
         EXPECT_EQ(folder.moveKeypointTo(move.from, move.to, false, false), move.result);
@@ -236,7 +257,7 @@ TEST(KFChannelFolder, KeepsAMovedKeypointFromPassingItsNeighbours) {
     EXPECT_EQ(folder.moveKeypointTo(s(0), s(1), false, false), s(1, 30)); // no frame without a root
 }
 
-// The list ---------------------------------------------------------------------------------------------------
+// The list --------------------------------------------------------------------------------------------------
 
 /// What the list should be, and a plain scan over it.
 struct ListModel {
@@ -281,9 +302,15 @@ TEST(KFChannelFolder, KeepsItsOrderAndFindsTheFirstChildOfAnID) {
             }
             auto const place = std::find(list.begin(), list.end(), anchor);
             switch (operation % 4) {
-            case 0: list.push_back(child), folder.push_back(child); break;
-            case 1: list.insert(list.begin(), child), folder.push_front(child); break;
-            case 2: list.insert(place, child), folder.insertDescendantBefore(anchor, child); break;
+            case 0:
+                list.push_back(child), folder.push_back(child);
+                break;
+            case 1:
+                list.insert(list.begin(), child), folder.push_front(child);
+                break;
+            case 2:
+                list.insert(place, child), folder.insertDescendantBefore(anchor, child);
+                break;
             default:
                 list.insert(place == list.end() ? list.begin() : place + 1, child);
                 folder.insertDescendantAfter(anchor, child);
@@ -305,7 +332,8 @@ TEST(KFChannelFolder, KeepsItsOrderAndFindsTheFirstChildOfAnID) {
             folder.removeAllDescendants(true);
         }
         for (int i = 0; i < 2; ++i) {
-            ASSERT_TRUE(folders[i].getDescendants() == nullptr || *folders[i].getDescendants() == models[i].list);
+            ASSERT_TRUE(folders[i].getDescendants() == nullptr ||
+                        *folders[i].getDescendants() == models[i].list);
             for (unsigned id = 0; id < 70; ++id) {
                 ASSERT_EQ(folders[i].getDescendant(id), models[i].find(id)) << step;
             }
@@ -369,7 +397,7 @@ TEST(KFChannelFolder, AnnouncesChangesOfItsStateFlags) {
     EXPECT_EQ(folder.getFoldFlags(), kFoldFlagChildrenNotSaved);
 }
 
-// Copies and counterparts ------------------------------------------------------------------------------------
+// Copies and counterparts -----------------------------------------------------------------------------------
 
 TEST(KFChannelFolder, ComparesAndAssignsPairByPair) {
     KFChannelFolder a("F", nullptr, 1, 0, 0), b("f", nullptr, 1, 0, 0);

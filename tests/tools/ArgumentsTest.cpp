@@ -3,7 +3,6 @@
 #include "tools/cli/UsageError.h"
 #include "tools/output/TextForms.h"
 #include "tools/plot/PlotAxis.h"
-#include "tools/plot/PlotCanvas.h"
 
 #include <cmath>
 #include <gtest/gtest.h>
@@ -74,15 +73,6 @@ TEST(NearMatch, FindsWhatWasMeant) {
     EXPECT_EQ(meant("Head"), "Head.Zrotation");
     EXPECT_EQ(meant("nothing like it at all"), "");
     EXPECT_EQ(meant(""), "");
-}
-
-TEST(PlotFormat, FollowsTheEndingOfTheFile) {
-    EXPECT_EQ(plotFormatOf("a.svg"), PlotFormat::Svg);
-    EXPECT_EQ(plotFormatOf("a.b/C.PNG"), PlotFormat::Png);
-    EXPECT_EQ(plotFormatOf("a.pdf"), PlotFormat::Pdf);
-    for (char const* const file : {"", "svg", ".svg", "a.svg.txt", "a.jpeg", "a"}) {
-        EXPECT_EQ(plotFormatOf(file), std::nullopt) << file;
-    }
 }
 
 TEST(PlotAxis, PutsTicksAtRoundNumbersOfAnyRange) {

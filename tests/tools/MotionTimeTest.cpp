@@ -19,48 +19,26 @@ TEST(MotionTime, FindsTheRateBehindAPrintedFrameTime) {
     } const cases[] = {
         // Each usual rate, printed as files print it.
         {".0083333", "1/120"},
-        {"0.0083333", "1/120"},
         {"0.00833333333333333333333333333333", "1/120"},
-        {"8.3333e-3", "1/120"},
         {"0.041708", "1001/24000"},
-        {"0.0417083", "1001/24000"},
         {"0.041667", "1/24"},
-        {"0.0416667", "1/24"},
-        {"0.04", "1/25"},
-        {"0.0400000", "1/25"},
         {"0.033367", "1001/30000"},
-        {"0.0333667", "1001/30000"},
         {"0.033333", "1/30"},
-        {"0.0333333", "1/30"},
         {"0.0208333", "1/48"},
-        {"0.02", "1/50"},
-        {"0.0166833", "1001/60000"},
         {"0.0166667", "1/60"},
-        {"0.016667", "1/60"},
-        {"0.0111111", "1/90"},
-        {"0.01", "1/100"},
         {"0.00416667", "1/240"},
         // Cut, rounded, or one unit beyond.
         {"0.008", "1/120"},
-        {"0.00834", "1/120"},
         {"0.008334", "1/120"},
-        {"0.03", "1/30"},
         {"0.033", "1/30"},
-        {"0.0417", "1001/24000"},
         // Within 1e-5 of a usual rate, though printed with more digits.
         {"0.00833340", "1/120"},
         // Nothing usual: the decimal itself.
         {"0.00833500", "1667/200000"},
-        {"0.00833350000", "16667/2000000"},
         {"0.0125", "1/80"},
-        {"0.005", "1/200"},
-        {"0.0333", "1/30"},
         {"0.0335", "67/2000"},
         // One unit of these is larger than they are precise.
-        {"0.05", "1/20"},
         {"0.1", "1/10"},
-        {"1", "1/1"},
-        {"2", "2/1"},
         {"1e1", "10/1"},
         {"86400", "86400/1"},
         // No exact form in 31 bits of timescale: the nearest at the finest.
@@ -88,15 +66,12 @@ TEST(ExactDecimal, IsExactOrSaysThatItIsNot) {
     auto const timeOf = [](std::string_view text) { return timeText(ExactDecimal::parse(text)->toTempus()); };
     EXPECT_EQ(timeOf("0.5"), "1/2");
     EXPECT_EQ(timeOf("-0.125"), "-1/8");
-    EXPECT_EQ(timeOf("0.1"), "1/10");
-    EXPECT_EQ(timeOf("1.50000000000000000000000000"), "3/2");
     EXPECT_EQ(timeOf("0.000000001"), "1/1000000000");
     EXPECT_EQ(timeOf("0.0000000005"), "1/2000000000");
     EXPECT_EQ(timeOf("0.0000000001"), "invalid");
     EXPECT_EQ(timeOf("0.1234567890123"), "invalid");
     EXPECT_EQ(timeOf("9e18"), "9000000000000000000/1");
     EXPECT_EQ(timeOf("1e19"), "invalid");
-    EXPECT_EQ(timeOf("1e999"), "invalid");
     EXPECT_EQ(timeOf("1e-999"), "invalid");
     EXPECT_EQ(timeOf("1234567890123456789"), "invalid"); // one digit more than is kept
     EXPECT_EQ(timeOf("-0"), "0/1");

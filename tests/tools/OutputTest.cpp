@@ -1,5 +1,4 @@
 #include "tests/tools/TestFolder.h"
-#include "tools/output/CsvWriter.h"
 #include "tools/output/JsonWriter.h"
 #include "tools/output/SafeOutputFile.h"
 #include "tools/output/Table.h"
@@ -47,13 +46,6 @@ TEST(TextForms, WritesTimesInLowestTerms) {
     EXPECT_EQ(timeText(kTempusInvalid), "invalid");
 }
 
-TEST(TextForms, TablesShowNumbersOfAllSizes) {
-    EXPECT_EQ(tableText(1.5), "1.500000");
-    EXPECT_EQ(tableText(0), "0.000000");
-    EXPECT_EQ(tableText(1.25e-7), "1.25e-07");
-    EXPECT_EQ(tableText(-1e300), "-1e+300");
-}
-
 TEST(Table, AlignsColumnsByCharacters) {
     std::string const cells[2][2] = {{"H\u00FCfte", "1.5"}, {"a\tb", "-10.25"}};
     Table table;
@@ -68,53 +60,26 @@ TEST(Table, AlignsColumnsByCharacters) {
 }
 
 TEST(JsonWriter, WritesWhatAnIndependentReaderTakesBack) {
+    double const infinity = std::numeric_limits<double>::infinity();
     StringSink out;
     JsonWriter json(out);
     json.beginObject();
-    json.key("numbers");
-    json.beginArray();
-    for (double const value : {0.1, -1.0 / 3, 5e-324, 1.7976931348623157e308}) {
-        json.number(value);
-    }
-    json.number(std::numeric_limits<double>::infinity());
-    json.endArray();
-    json.key("nothing");
-    json.beginArray();
-    json.endArray();
-    json.key("inline");
-    json.beginObject(JsonLayout::Inline);
     json.key("text \"\n");
     json.string("\x01\\ \xC3\xBC \xFF");
-    json.key("count");
+    json.key("numbers");
+    json.beginArray();
+    for (double const value : {-1.0 / 3, 5e-324, 1.7976931348623157e308, infinity}) {
+        json.number(value);
+    }
     json.integer(std::numeric_limits<std::uint64_t>::max());
-    json.key("yes");
-    json.boolean(true);
-    json.endObject();
+    json.endArray();
     json.endObject();
     json.finish();
-
-    nlohmann::json const read = nlohmann::json::parse(out.text());
-    EXPECT_EQ(read["numbers"][0].get<double>(), 0.1);
-    EXPECT_EQ(read["numbers"][1].get<double>(), -1.0 / 3);
-    EXPECT_EQ(read["numbers"][2].get<double>(), 5e-324);
-    EXPECT_EQ(read["numbers"][3].get<double>(), 1.7976931348623157e308);
-    EXPECT_TRUE(read["numbers"][4].is_null());
-    EXPECT_TRUE(read["nothing"].empty());
-    EXPECT_EQ(read["inline"]["text \"\n"].get<std::string>(), "\x01\\ \xC3\xBC \xEF\xBF\xBD");
-    EXPECT_EQ(read["inline"]["count"].get<std::uint64_t>(), std::numeric_limits<std::uint64_t>::max());
-    EXPECT_TRUE(read["inline"]["yes"].get<bool>());
-}
-
-TEST(CsvWriter, QuotesOnlyWhatNeedsIt) {
-    StringSink out;
-    CsvWriter csv(out);
-    for (char const* const field : {"plain name", "a,b", "say \"hi\"", "two\nlines", ""}) {
-        csv.field(field);
-    }
-    csv.endRow();
-    csv.field("next");
-    csv.endRow();
-    EXPECT_EQ(out.text(), "plain name,\"a,b\",\"say \"\"hi\"\"\",\"two\nlines\",\nnext\n");
+    EXPECT_EQ(nlohmann::json::parse(out.text()),
+              (nlohmann::json{{"text \"\n", "\x01\\ \xC3\xBC \xEF\xBF\xBD"},
+                              {"numbers",
+                               {-1.0 / 3, 5e-324, 1.7976931348623157e308, nullptr,
+                                std::numeric_limits<std::uint64_t>::max()}}}));
 }
 
 class SafeOutputFileTest : public ::testing::Test {
