@@ -9,8 +9,16 @@
 #include "lumenkey/Channels/KFChannelObjectRootBase.h"
 #include "lumenkey/Channels/KFScalarChannels.h"
 #include "lumenkey/curves/KFCurve.h"
+#include "tools/cli/Verbs.h"
+#include "tools/import/ChannelFile.h"
+
+#include <CLI/CLI.hpp>
+#include <cstdio>
+#include <filesystem>
+#include <fstream>
 
 #include <memory>
+#include <random>
 #include <string>
 #include <utility>
 #include <vector>
@@ -40,7 +48,15 @@ struct DeepChannel {
         channel.willLoadKeyframes(true, static_cast<int>(keys.size()));
         channel.appendKeyframes(static_cast<unsigned int>(keys.size()), times.data(), values.data(), true);
         channel.willLoadKeyframes(false, 0);
-        channel.getCurveInterface()->setCurveInterpolation(kKFInterpolationBezier);
+        KFCurve& curve = *channel.getCurveInterface();
+        curve.setCurveInterpolation(kKFInterpolationBezier);
+        std::vector<void*> handles;
+        curve.getKeypointHandleList(handles);
+        for (std::size_t i = 0; i < handles.size(); ++i) {
+            KFSpline& spline = *curve.getSpline();
+            spline.setVertexInputHandles(handles[i], keys[i].in.u, keys[i].in.v, kTempusZero, true);
+            spline.setVertexOutputHandles(handles[i], keys[i].out.u, keys[i].out.v, kTempusZero, true);
+        }
     }
 };
 
@@ -60,7 +76,9 @@ Contest keyedChannel(Bench const& bench, std::size_t size) {
     auto const queries = std::make_shared<Queries>(everyFrame(keys));
     auto const global = std::make_shared<std::vector<Tempus>>(globalTimes(*deep, *queries));
     KFSpline* const spline = deep->channel.getCurveInterface()->getSpline();
-    auto const ours = [deep, global](std::size_t i) { return deep->channel.getValueAsDouble((*global)[i], 0.0); };
+    auto const ours = [deep, global](std::size_t i) {
+        return deep->channel.getValueAsDouble((*global)[i], 0.0);
+    };
     auto const alone = [spline, queries](std::size_t i) {
         return spline->getVertexValue(queries->times[i], kTempusZero, true);
     };
@@ -161,18 +179,74 @@ std::function<void()> lookUpPath(std::size_t siblings) {
     };
 }
 
+// The program ------------------------------------------------------------------------------------------------
+
+/// A motion of 96 channels and 524 frames, in a file that goes with it.
+class MotionOnDisk {
+public:
+    MotionOnDisk() {
+        std::ofstream file(_path);
+        file << "HIERARCHY\nROOT J0\n";
+        for (int joint = 0; joint < kJoints; ++joint) {
+            file << "{\nOFFSET 0 1 0\nCHANNELS 3 Zrotation Xrotation Yrotation\n";
+            file << (joint + 1 < kJoints ? "JOINT J" + std::to_string(joint + 1) : std::string("End Site"))
+                 << '\n';
+        }
+        file << "{\nOFFSET 0 1 0\n}\n";
+        for (int joint = 0; joint < kJoints; ++joint)
+            file << "}\n";
+        file << "MOTION\nFrames: " << kFramesInFile << "\nFrame Time: 0.0083333\n";
+        std::mt19937_64 random(9);
+        std::uniform_int_distribution<int> tenThousandths(-1800000, 1800000);
+        for (int frame = 0; frame < kFramesInFile; ++frame) {
+            for (int channel = 0; channel < 3 * kJoints; ++channel)
+                file << tenThousandths(random) / 10000 << '.' << 1000 + frame
+                     << (channel + 1 < 3 * kJoints ? ' ' : '\n');
+        }
+    }
+    ~MotionOnDisk() { std::remove(_path.c_str()); }
+    MotionOnDisk(MotionOnDisk const&) = delete;
+    MotionOnDisk& operator=(MotionOnDisk const&) = delete;
+
+    std::string const& path() const noexcept { return _path; }
+
+private:
+    static constexpr int kJoints = 32;
+    static constexpr int kFramesInFile = 524;
+
+    std::string _path = std::filesystem::temp_directory_path() / "lumenkey-bench.bvh";
+};
+
+/// The whole verb, and the part of it that reads the file into a tree.
+Contest sampleVerb(Bench const& bench) {
+    auto const file = std::make_shared<MotionOnDisk>();
+    auto const sample = [file] {
+        CLI::App app;
+        lumenkey::tools::Verb const verb = lumenkey::tools::declareSample(app);
+        app.parse("sample " + file->path() + " --count 1000 --csv");
+        lumenkey::tools::StringSink text;
+        verb.run(text);
+        benchmark::DoNotOptimize(text.text().size());
+    };
+    auto const read = [file] {
+        benchmark::DoNotOptimize(lumenkey::tools::openChannelFile(file->path()).rows);
+    };
+    return {timePerItem(bench, 1, sample), timePerItem(bench, 1, read)};
+}
+
 ContestEntry nanosecondsAbove(std::string name, std::string const& against, double bound,
                               std::function<Contest()> prepare) {
     std::string const width = std::to_string(static_cast<int>(bound));
-    ContestEntry entry{std::move(name), against + "; ratio: (ours - it) / " + width + " ns", Bound::atMost(1.0),
-                       std::move(prepare)};
+    ContestEntry entry{std::move(name), against + "; ratio: (ours - it) / " + width + " ns",
+                       Bound::atMost(1.0), std::move(prepare)};
     entry.ratio = [bound](double subject, double limit) { return (subject - limit) / bound; };
     return entry;
 }
 
 ContestEntry measuredOnce(std::string name, char const* unit, double bound, Measurement subject) {
-    ContestEntry entry{std::move(name), "as it is", Bound::atMost(bound),
-                       [subject] { return Contest{subject, subject}; }};
+    ContestEntry entry{std::move(name), "as it is", Bound::atMost(bound), [subject] {
+                           return Contest{subject, subject};
+                       }};
     entry.unit = unit;
     entry.ratio = [](double figure, double) { return figure; };
     entry.repeats = false;
@@ -183,8 +257,8 @@ ContestEntry measuredOnce(std::string name, char const* unit, double bound, Meas
 
 void registerTree(Bench& bench) {
     for (std::size_t const size : kSizes) {
-        registerContest(bench, nanosecondsAbove(withSize("channel/keyed Bezier", size), "the spline alone", 25.0,
-                                                [&bench, size] { return keyedChannel(bench, size); }));
+        registerContest(bench, nanosecondsAbove(withSize("channel/keyed Bezier", size), "the spline alone",
+                                                25.0, [&bench, size] { return keyedChannel(bench, size); }));
     }
     registerContest(bench, nanosecondsAbove("channel/constant", "an array look-up", 15.0,
                                             [&bench] { return constantChannel(bench); }));
@@ -198,12 +272,17 @@ void registerTree(Bench& bench) {
                             [&bench] { return building(bench, 1000000, 100, 10000); }});
     registerContest(bench, {"tree/100000 in one folder", "10000 in one folder", Bound::atMost(2.0),
                             [&bench] { return building(bench, 100000, 1000000, 10000); }});
+    ContestEntry verb{"lumenkey sample/96 channels at 1000 times", "reading the file; ratio: the rest to it",
+                      Bound::atMost(1.0), [&bench] { return sampleVerb(bench); }};
+    verb.ratio = [](double whole, double reading) { return (whole - reading) / reading; };
+    registerContest(bench, std::move(verb));
     registerContest(bench, {"look-up/ID among 100000", "among 100", Bound::atMost(1.5), [&bench] {
                                 return Contest{timePerItem(bench, 64, lookUpIDs(100000)),
                                                timePerItem(bench, 64, lookUpIDs(100))};
                             }});
-    registerContest(bench, {"look-up/path, four deep, among 100000", "among 10", Bound::atMost(1.5), [&bench] {
-                                return Contest{timePerItem(bench, 64, lookUpPath(100000)),
-                                               timePerItem(bench, 64, lookUpPath(10))};
-                            }});
+    registerContest(bench,
+                    {"look-up/path, four deep, among 100000", "among 10", Bound::atMost(1.5), [&bench] {
+                         return Contest{timePerItem(bench, 64, lookUpPath(100000)),
+                                        timePerItem(bench, 64, lookUpPath(10))};
+                     }});
 }

@@ -77,6 +77,20 @@ std::size_t KFChannelFolder::positionOf(KFChannelBase const* child) const noexce
                                     _descendants->begin());
 }
 
+std::size_t KFChannelFolder::positionBehind(KFChannelBase const* child, KFChannelBase const* next,
+                                            std::size_t position) const noexcept {
+    std::size_t const count = getNumberOfDescendants();
+    if (position < count && (*_descendants)[position] == child) {
+        return position + 1;
+    }
+    // The visit took the child out, or changed the list in front of it.
+    if (std::size_t const ofNext = positionOf(next); ofNext < count) {
+        return ofNext;
+    }
+    std::size_t const ofChild = positionOf(child);
+    return ofChild < count ? ofChild + 1 : position;
+}
+
 void KFChannelFolder::insertAt(std::size_t position, KFChannelBase* child) {
     allocateDescendants();
     _descendants->insert(_descendants->begin() + static_cast<std::ptrdiff_t>(position), child);
@@ -116,6 +130,7 @@ void KFChannelFolder::removeDescendant(KFChannelBase* child) {
     if (position >= getNumberOfDescendants()) {
         return;
     }
+    bool const hasTold = child->getParent() == this; // of each new ID
     child->unregisterParent(this);
     _descendants->erase(_descendants->begin() + static_cast<std::ptrdiff_t>(position));
     if (!_index) {
@@ -123,10 +138,9 @@ void KFChannelFolder::removeDescendant(KFChannelBase* child) {
     }
     auto const behind = _descendants->begin() + static_cast<std::ptrdiff_t>(position);
     auto const entry = _index->find(child->getID());
-    bool const isUnknown = entry == _index->end(); // it changed its ID without a parent to tell
-    if (isUnknown ||
+    if (!hasTold || entry == _index->end() ||
         (entry->second.count > 1 && std::find(behind, _descendants->end(), child) != _descendants->end())) {
-        _index.reset(); // or it has a second entry and now no parent, and won't tell of a new ID
+        _index.reset(); // the last case: it has a second entry and now no parent to tell
     } else {
         leaveIndex(child, child->getID(), 1, position);
     }

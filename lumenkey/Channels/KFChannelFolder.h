@@ -17,8 +17,8 @@
 /// an index is kept); inserting and removing are linear in it. An index relies on children telling of a new
 /// ID through their parent, so a listed child's parent must be this folder.
 ///
-/// A child may change the list while an operation is passed on: the operation reaches each child that is
-/// listed when its turn comes.
+/// A child may change the list while an operation is passed on: the operation goes on behind that child and
+/// reaches each one that is listed when its turn comes.
 ///
 /// Null: a null child or channel does nothing, gives null, or false.
 ///
@@ -41,7 +41,8 @@ public:
 
     void finishInitializing() override;
     char const* getFacadeWrapperName() override;
-    void lock(bool on, bool passDown) override;
+    /// Also locks or unlocks the visible children, as `lockFromParent`.
+    void lock(bool on, bool checkAncestors) override;
     void saveStateAsDefault() override;
     void setDefaultToCurrentValue() override;
     bool saveWhenAtDefaultState() const override;
@@ -60,7 +61,9 @@ public:
     void assign(KFChannelBase const* other) override;
     bool allowsAssignment(KFChannelBase const* other) override;
     void resetToDefault(bool silent) override;
-    void lockFromParent(bool on, bool passDown) override;
+    /// Leaves this folder's own lock. Visible children are locked if `on`, or if this folder (with
+    /// `checkAncestors` also one above it) is locked; else unlocked.
+    void lockFromParent(bool on, bool checkAncestors) override;
     void copyKeyframesFromChannel(Tempus const& t, KFChannelBase* other) override;
     void setValue(KFChannelBase const& other) override;
     void undoWillReplace() override;
@@ -145,7 +148,7 @@ public:
     /// The first compound below with that full display name, regardless of case.
     KFChannelBase* findMatchingCompoundChannel(BXString const& fullDisplayName);
 
-    // Fold flags: set, add, clear. Announce `kModifyData` first if a state bit is touched.
+    // Fold flags: set, add, clear. Announce `kModifyData` first if the argument has a state bit.
     void setFoldFlags(std::uint32_t flags);
     void setFoldFlag(std::uint32_t mask);
     void resetFoldFlag(std::uint32_t mask);
@@ -175,6 +178,9 @@ private:
 
     void insertAt(std::size_t position, KFChannelBase* child);
     std::size_t positionOf(KFChannelBase const* child) const noexcept;
+    /// Where a walk goes on that visited `child` at `position`, in front of `next`. Either may be gone.
+    std::size_t positionBehind(KFChannelBase const* child, KFChannelBase const* next,
+                               std::size_t position) const noexcept;
     bool comesFirst(KFChannelBase const* child, KFChannelBase const* other) const noexcept;
     void buildIndex();
     void enterIndex(KFChannelBase* child, std::size_t position);
@@ -191,13 +197,10 @@ private:
 
 template <class Visit> void KFChannelFolder::forEachChild(Visit const& visit) const {
     for (std::size_t i = 0; i < getNumberOfDescendants();) {
-        std::size_t const count = getNumberOfDescendants();
         KFChannelBase* const child = (*_descendants)[i];
+        KFChannelBase const* const next = i + 1 < _descendants->size() ? (*_descendants)[i + 1] : nullptr;
         visit(*child);
-        std::size_t const left = getNumberOfDescendants();
-        // Where the visit took children out, down to this one, the next has moved up.
-        bool const movedUp = left < count && (i >= left || (*_descendants)[i] != child);
-        i += movedUp ? 0 : 1;
+        i = positionBehind(child, next, i);
     }
 }
 

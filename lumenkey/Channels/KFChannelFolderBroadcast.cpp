@@ -59,14 +59,14 @@ void KFChannelFolder::calcHashForState(BXSerializerWriteStream& stream, Tempus c
 
 // To visible children ---------------------------------------------------------------------------------------
 
-void KFChannelFolder::lock(bool on, bool passDown) {
+void KFChannelFolder::lock(bool on, bool checkAncestors) {
     KFChannelBase::lock(on, true);
-    forEachVisibleChild([=](Child& child) { child.lockFromParent(on, passDown); });
+    forEachVisibleChild([=](Child& child) { child.lockFromParent(on, checkAncestors); });
 }
 
-void KFChannelFolder::lockFromParent(bool on, bool passDown) {
-    bool const locks = isLocked(passDown) || on;
-    forEachVisibleChild([=](Child& child) { child.lockFromParent(locks, passDown); });
+void KFChannelFolder::lockFromParent(bool on, bool checkAncestors) {
+    bool const locks = isLocked(checkAncestors) || on;
+    forEachVisibleChild([=](Child& child) { child.lockFromParent(locks, checkAncestors); });
 }
 
 void KFChannelFolder::setIsSpline(bool on) {

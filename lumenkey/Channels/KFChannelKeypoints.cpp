@@ -6,7 +6,8 @@
 #include "lumenkey/curves/KFCurve.h"
 
 unsigned int KFChannel::getNumberOfKeyframes() const {
-    return _impl == nullptr || _impl->getCurve() == nullptr ? 0 : curve().getNumberOfKeypoints();
+    KFCurve const* const used = _impl == nullptr ? nullptr : _impl->getCurve();
+    return used == nullptr ? 0 : used->keypointCount();
 }
 
 bool KFChannel::moveKeyframe(void* handle, Tempus const& t, bool a, bool b) {

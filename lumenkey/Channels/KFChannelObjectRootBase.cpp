@@ -89,11 +89,11 @@ KFChannelObjectRootBase& KFChannelObjectRootBase::operator=(KFChannelObjectRootB
 Tempus KFChannelObjectRootBase::getTimeOffset() const { return _timeOffset; }
 
 Tempus KFChannelObjectRootBase::globalToLocalTime(Tempus const& t) const {
-    return globalToLocalTime(t, _timeOffset);
+    return BX_TempusSaferSubtract(t, _timeOffset);
 }
 
 Tempus KFChannelObjectRootBase::localToGlobalTime(Tempus const& t) const {
-    return localToGlobalTime(t, _timeOffset);
+    return BX_TempusSaferAdd(t, _timeOffset);
 }
 
 void KFChannelObjectRootBase::setTimeOffset(Tempus const& offset, bool silent) {
@@ -107,7 +107,8 @@ void KFChannelObjectRootBase::setTimeExtent(BXTimeRange const& range, bool silen
     if (!silent) {
         willBeModified(kModifyData);
     }
-    if (TempusIsNumeric(_timeExtent.duration) && hasFadeHandles()) { // nothing is a share of an endless extent
+    if (TempusIsNumeric(_timeExtent.duration) &&
+        hasFadeHandles()) { // nothing is a share of an endless extent
         double const factor = TempusRatio(range.duration, _timeExtent.duration);
         if (std::isfinite(factor)) {
             scaleFadeHandles(factor);

@@ -26,20 +26,17 @@ double KFChannel::getValueAsDouble(Tempus const& t, double input) const {
     if (_impl == nullptr || _impl->getCurve() == nullptr)
         return 0.0;
     KFCurve& curve = *_impl->getCurve();
-    bool const faded = hasFadeHandles() && !testFlag(kChannelFlagFadesOff);
-    std::uint32_t nodes = 0;
-    bool const constant =
-        getNumberOfKeyframes() == 0 && curve.getNumCurveProcessingNodes(&nodes) && nodes == 0;
-    double result = 0.0;
-    if (constant) {
-        curve.getCurveInitialValue(&result);
+    bool const faded = !testFlag(kChannelFlagFadesOff) && hasFadeHandles();
+    if (!curve.hasProcessingNodes() && getNumberOfKeyframes() == 0) {
+        double const result = curve.clampedInitialValue();
         return faded ? result * getFadeRatio(globalToLocalTime(t)) : result;
     }
     Tempus const local = globalToLocalTime(t);
+    double result = 0.0;
     if (testFlag(kChannelFlagBehaviorsOff)) {
         curve.getPointWithoutBehavior(local, input, &result);
     } else {
-        curve.getPoint(local, input, &result);
+        result = curve.getValue(local, input);
     }
     return faded ? result * getFadeRatio(local) : result;
 }

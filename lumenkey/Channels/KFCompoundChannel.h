@@ -31,9 +31,9 @@ public:
     unsigned int numberOfKeypointsAt(Tempus const& t) const override;
     using KFChannelFolder::setValue;
 
-    // Slots behind those of KFChannelFolder. An index outside the list does nothing, nor does a null child
-    // where it alone is meant. Children that have no value are passed by, apart from compounds in
-    // `remove...`.
+    // Slots behind those of KFChannelFolder. An index outside the list or a null child does nothing, unless
+    // the operation is for all children alike. Children that have no value are passed by, apart from compounds
+    // in `remove...`.
 
     /// False, and nothing, here.
     virtual bool setKeypointInterpolation(KFChannel* child, void* handle, unsigned int type, bool force);

@@ -251,7 +251,7 @@ bool KFCurve::setCurveDefaultValue(double value) {
     return true;
 }
 
-bool KFCurve::getCurveInitialValue(double* out) { return answer(out, clamped(_rootNode->getInitialValue())); }
+bool KFCurve::getCurveInitialValue(double* out) { return answer(out, clampedInitialValue()); }
 
 bool KFCurve::setCurveInitialValue(double value) {
     _constantNode.setInitialValue(value);
@@ -282,14 +282,6 @@ bool KFCurve::setAbsoluteMaxValueV(double value) {
 bool KFCurve::setAbsoluteMinValueV(double value) {
     _minValue = value;
     return true;
-}
-
-double KFCurve::clamped(double value) const noexcept {
-    double const maximum = _maxValue;
-    if (value > maximum)
-        return maximum;
-    double const minimum = _minValue;
-    return value < minimum ? minimum : value;
 }
 
 Tempus KFCurve::getFrameDuration() const {

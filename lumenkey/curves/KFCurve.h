@@ -4,11 +4,11 @@
 #include "lumenkey/curves/KFCurveInterface.h"
 #include "lumenkey/curves/KFCurveNodeParam.h"
 #include "lumenkey/curves/KFSplineNode.h"
+#include "lumenkey/splines/KFSpline.h"
 
 #include <memory>
 
 class KFCurveOwner;
-class KFSpline;
 class KFSplineState;
 
 /// A value over time: a root node, a chain of processing nodes behind it, and a clamp.
@@ -305,6 +305,10 @@ public:
     /// A spline root; the constant node takes `value`, and so does the spline node unless it has keypoints.
     void setRootNode(Tempus const& t, double value);
 
+    bool hasProcessingNodes() const noexcept { return !_processingNodes.empty(); }
+    // What `getNumberOfKeypoints` and `getCurveInitialValue` answer, for those who read values all the time.
+    std::uint32_t keypointCount() const noexcept;
+    double clampedInitialValue() const { return clamped(_rootNode->getInitialValue()); }
     /// Keyframable, and animated by the process-wide switch or by a keypoint.
     bool isAnimated() const;
     /// Whether keypoints may be edited: keyframable, and animated or forced.
@@ -357,7 +361,13 @@ public:
 
 protected:
     /// The value as stored where a node produced `value`.
-    double clamped(double value) const noexcept;
+    double clamped(double value) const noexcept {
+        double const maximum = _maxValue;
+        if (value > maximum)
+            return maximum;
+        double const minimum = _minValue;
+        return value < minimum ? minimum : value;
+    }
 
 private:
     // Guards of keypoint operations: each answers the spline, or null to refuse.
@@ -406,3 +416,8 @@ private:
     KFSplineState* _splineState = nullptr;
     std::uint32_t _rootKind = kRootConstant;
 };
+
+inline std::uint32_t KFCurve::keypointCount() const noexcept {
+    KFSpline const* const spline = isSpline() ? getSpline() : nullptr;
+    return spline == nullptr ? 0 : static_cast<std::uint32_t>(spline->getNumberOfVertices());
+}

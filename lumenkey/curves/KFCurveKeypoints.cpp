@@ -161,13 +161,7 @@ bool KFCurve::getKeypointValidHandleList(std::vector<void*>& out) {
     return spline != nullptr && spline->getAllValidVerticesHandles(out, kTempusZero);
 }
 
-std::uint32_t KFCurve::getNumberOfKeypoints() {
-    KFSpline const* const spline = rootSpline();
-    if (spline == nullptr)
-        return 0;
-    KFSplineAccess const access(*spline);
-    return static_cast<std::uint32_t>(spline->getNumberOfVertices());
-}
+std::uint32_t KFCurve::getNumberOfKeypoints() { return keypointCount(); }
 
 // --- Time and value ---
 

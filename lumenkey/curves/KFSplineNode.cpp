@@ -141,12 +141,7 @@ Tempus KFSplineNode::getFrameDuration() const {
     return _curve == nullptr ? TempusMake(1, 30) : _curve->getFrameDuration();
 }
 
-bool KFSplineNode::hasVertices() const {
-    if (_spline == nullptr)
-        return false;
-    KFSplineAccess const access(*_spline);
-    return _spline->getNumberOfVertices() != 0;
-}
+bool KFSplineNode::hasVertices() const { return _spline != nullptr && _spline->getNumberOfVertices() != 0; }
 
 void KFSplineNode::createSpline() { allocKFSpline(nullptr); }
 

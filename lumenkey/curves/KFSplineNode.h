@@ -66,7 +66,7 @@ public:
     /// Destroys the spline without touching the value.
     void destroySpline() noexcept;
 
-    /// Under the lock of the spline.
+    /// Takes no lock; may run beside one thread that edits.
     bool hasVertices() const;
 
     /// What applies to a spline whose curve is null or has no settings record: the defaults, shared.

@@ -63,13 +63,20 @@ Tempus fromSigned(Wide numerator, UWide denominator, ResultTraits const& traits)
 /// The two numbers over the least common multiple of their timescales.
 struct CommonScale {
     CommonScale(Tempus const& a, Tempus const& b) noexcept {
-        int64_t const divisor = std::gcd(a.timescale, b.timescale);
-        left = Wide{a.value} * (b.timescale / divisor);
-        right = Wide{b.value} * (a.timescale / divisor);
-        timescale = a.timescale / divisor * b.timescale;
+        auto const scaleA = static_cast<uint32_t>(a.timescale);
+        auto const scaleB = static_cast<uint32_t>(b.timescale);
+        uint32_t const divisor = std::gcd(scaleA, scaleB);
+        left = Wide{a.value} * (scaleB / divisor);
+        right = Wide{b.value} * (scaleA / divisor);
+        timescale = int64_t{scaleA / divisor} * scaleB;
     }
     Tempus make(Wide numerator, uint32_t flags, int64_t epoch) const noexcept {
         bool const fits = timescale <= std::numeric_limits<int32_t>::max();
+        // Without a division of wide numbers.
+        if (constexpr Wide most = std::numeric_limits<int64_t>::max();
+            fits && numerator <= most && numerator >= -most) {
+            return {static_cast<int64_t>(numerator), static_cast<int32_t>(timescale), flags, epoch};
+        }
         return fromSigned(numerator, static_cast<UWide>(timescale),
                           {flags, epoch, fits ? static_cast<int32_t>(timescale) : 0});
     }
@@ -78,6 +85,30 @@ struct CommonScale {
     Wide right;
     int64_t timescale;
 };
+
+/// The usual sum of two timescales, in 64 bits: one divides the other, and nothing overflows. `sign` is 1 or -1. False,
+/// with `result` as it was, for any other.
+bool sumOverOneTimescale(Tempus const& a, Tempus const& b, int64_t sign, Tempus& result) noexcept {
+    if (!TempusIsNumeric(a) || !TempusIsNumeric(b) || (a.epoch | b.epoch) != 0) {
+        return false;
+    }
+    auto const scaleA = static_cast<uint32_t>(a.timescale);
+    auto const scaleB = static_cast<uint32_t>(b.timescale);
+    bool const isOverA = scaleA % scaleB == 0;
+    if (!isOverA && scaleB % scaleA != 0) {
+        return false;
+    }
+    int64_t left = a.value;
+    int64_t right = 0;
+    int64_t sum = 0;
+    if (__builtin_mul_overflow(b.value, sign * (isOverA ? scaleA / scaleB : 1), &right) ||
+        (!isOverA && __builtin_mul_overflow(left, int64_t{scaleB / scaleA}, &left)) ||
+        __builtin_add_overflow(left, right, &sum) || sum == std::numeric_limits<int64_t>::min()) {
+        return false;
+    }
+    result = {sum, isOverA ? a.timescale : b.timescale, commonFlags(a, b), 0};
+    return true;
+}
 
 Tempus sumOfNumbers(Tempus const& a, Tempus const& b, bool subtract, int64_t epoch) noexcept {
     CommonScale const common(a, b);
@@ -243,6 +274,9 @@ Tempus KFChronoForChannelSeconds(double seconds, uint32_t timescale) noexcept {
 
 Tempus TempusDetail::add(Tempus const& a, Tempus const& b) noexcept {
     Tempus result;
+    if (sumOverOneTimescale(a, b, 1, result)) {
+        return result;
+    }
     if (isUndefined(a, b, result)) {
         return result;
     }
@@ -255,6 +289,9 @@ Tempus TempusDetail::add(Tempus const& a, Tempus const& b) noexcept {
 }
 
 Tempus TempusDetail::subtract(Tempus const& a, Tempus const& b) noexcept {
+    if (Tempus result; sumOverOneTimescale(a, b, -1, result)) {
+        return result;
+    }
     int64_t epoch = 0;
     if (TempusIsNumeric(a) && TempusIsNumeric(b)) {
         return subtractEpochs(a, b, epoch) ? sumOfNumbers(a, b, true, epoch) : kTempusInvalid;

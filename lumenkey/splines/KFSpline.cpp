@@ -25,6 +25,7 @@ KFSpline::KFSpline(KFSpline const& other, KFSplineState* state) : KFSpline(state
          place = other._store->next(place)) {
         _store->append(other._store->at(place)->clone(), false);
     }
+    publishVertexCount();
 }
 
 KFSpline& KFSpline::operator=(KFSpline const& other) {
@@ -60,6 +61,7 @@ void KFSpline::copy(KFSpline& other, void* first, void* last) {
     }
     *_interpolators = *other._interpolators;
     markEdited();
+    publishVertexCount();
 }
 
 bool KFSpline::operator==(KFSpline const& other) const {
@@ -85,8 +87,17 @@ void KFSpline::preSplineAccess(bool lock) const {
 }
 
 void KFSpline::postSplineAccess(bool lock) const {
-    if (lock)
-        guard().unlock();
+    if (!lock)
+        return;
+    publishVertexCount();
+    guard().unlock();
+}
+
+void KFSpline::publishVertexCount() const noexcept {
+    std::size_t const count = _store->size();
+    // Most who give the lock back have changed nothing, and others read on.
+    if (_vertexCount.load(std::memory_order_relaxed) != count)
+        _vertexCount.store(count, std::memory_order_release);
 }
 
 void KFSpline::setDirty(bool dirty) {
@@ -114,8 +125,6 @@ bool KFSpline::suppressesRefresh() const noexcept {
     KFSplineOwner const* const node = getNode();
     return node != nullptr && node->_suppressRefresh.load(std::memory_order_relaxed);
 }
-
-std::size_t KFSpline::getNumberOfVertices() const noexcept { return _store->size(); }
 
 std::size_t KFSpline::getStoreBytes() const noexcept { return _store->bytes(); }
 

@@ -137,7 +137,10 @@ public:
     void setDirty(bool dirty);
     bool isDirty() const noexcept { return _dirty; }
     bool isClosed() const noexcept { return _closed; }
-    std::size_t getNumberOfVertices() const noexcept;
+    /// May run beside one thread that edits: what the last edit that was over left, never a number on the way there.
+    std::size_t getNumberOfVertices() const noexcept {
+        return _vertexCount.load(std::memory_order_acquire);
+    }
     /// Bytes of memory that the store asks for beyond the vertices themselves: what a vertex costs in the store.
     std::size_t getStoreBytes() const noexcept;
 
@@ -412,6 +415,8 @@ private:
     friend class KFSplineSampler;
     friend class KFControlVertices;
 
+    /// Lets others see how many vertices there are: when the lock is given back, and at the end of an edit without it.
+    void publishVertexCount() const noexcept;
     /// The lock by which the spline is guarded now.
     BXSpinLock& guard() const noexcept;
     bool suppressesRefresh() const noexcept;
@@ -470,6 +475,7 @@ private:
                              Tempus const& maxU, double fallback);
 
     mutable BXSpinLock _lock;
+    mutable std::atomic<std::size_t> _vertexCount{0};
     std::unique_ptr<KFVertexStore> _store;
     std::unique_ptr<KFInterpolators> _interpolators;
     std::atomic<KFSplineOwner*> _node{nullptr};

@@ -18,7 +18,7 @@ inline bool KFSpline::listAnswers() const noexcept {
 [[gnu::always_inline]] inline bool KFSpline::settingsStand(KFSegmentCache const& cache) const noexcept {
     KFSplineState const& state = *getState();
     return cache.parametric == state.parametric && cache.sanitizeBezier == state.sanitizeBezier &&
-           cache.defaultType == state.interpolation;
+           cache.defaultType == state.interpolation && _useValidList.load(std::memory_order_relaxed);
 }
 
 /// A segment that was prepared while the index served still stands, and the index still serves. Under the lock.

@@ -60,11 +60,11 @@ std::uint32_t KFSpline::commonInterpolation() {
     constexpr std::uint32_t answers[] = {kKFInterpolationMixed, kKFInterpolationBSpline,
                                          kKFInterpolationXSpline};
     constexpr std::uint64_t answerMask = 3;
-    std::uint32_t const first = _store->front()->getInterpolation();
-    bool const keeps = _staticVertices && isWholeCurve(first);
-    // Read before what they tell of.
+    // Read before any type: one that changes in between, by its handle, leaves an answer that isn't found again.
     std::uint64_t const counts = std::uint64_t{KFStaticVertex::getWholeCurveChanges()} << 32 |
                                  static_cast<std::uint32_t>(_store->version() << 2);
+    std::uint32_t const first = _store->front()->getInterpolation();
+    bool const keeps = _staticVertices && isWholeCurve(first);
     std::uint64_t const kept = _commonInterpolation;
     if (keeps && (kept & ~answerMask) == counts && (kept & answerMask) != 0)
         return answers[(kept & answerMask) - 1];

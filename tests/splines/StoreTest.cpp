@@ -254,6 +254,23 @@ TEST(KFSplineStore, AddressesDontStandForSplines) {
     }
 }
 
+// What was kept while the list answered doesn't stand where each vertex is asked.
+TEST(KFSplineStore, KeptSegmentsEndWithTheList) {
+    KFSplineState state;
+    AskingSpline spline(&state);
+    for (int i = 0; i < 3; ++i)
+        spline.addVertexNoTangents(TempusMake(2 * i, 1), i % 2, kTempusZero, false);
+    void* middle = nullptr;
+    spline.getVertexHandle(TempusMake(2, 1), &middle, false);
+    auto const value = [&] { return spline.getVertexValue(TempusMake(1, 1), kTempusZero, true); };
+    value();
+    EXPECT_EQ(value(), 0.5);
+    static_cast<KFVertex*>(middle)->setEnabled(false, kTempusZero); // past the list
+    EXPECT_EQ(value(), 0.5);
+    spline.keepList(false);
+    EXPECT_EQ(value(), 0.0);
+}
+
 TEST(Museum, FindsVerticesAsPlainWalksDo) {
     for (Exhibit const& exhibit : museum()) {
         SCOPED_TRACE(exhibit.name);

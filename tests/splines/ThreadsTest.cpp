@@ -291,6 +291,49 @@ TEST_F(KFSplineThreads, EditsReachWhatOtherThreadsKeep) {
     EXPECT_EQ(behind, 0);
 }
 
+// What the vertices have in common is kept too, and a reader may meet a type that changes by its handle.
+TEST_F(KFSplineThreads, TypesInCommonFollowHandles) {
+    MuseumSpline whole;
+    auto& vertex = *static_cast<KFVertex*>(whole->addVertexNoTangents(s(0), 0.0, kTempusZero, false));
+    auto const common = [&] {
+        std::uint32_t type = 0;
+        whole->getInterpolation(&type, nullptr, nullptr);
+        return type;
+    };
+    Readers readers;
+    for (int i = 0; i < 2; ++i) {
+        readers.add([&](std::mt19937&) {
+            for (int k = 0; k < 1000; ++k)
+                common();
+        });
+    }
+    for (int i = 0; i < times(200000); ++i) {
+        std::uint32_t const type = i % 2 == 0 ? kKFInterpolationBSpline : kKFInterpolationXSpline;
+        vertex.setInterpolation(type);
+        ASSERT_EQ(common(), type) << i;
+    }
+}
+
+// Moving takes a vertex out and puts it in again, and copying all of them: nobody may see how many that leaves.
+TEST_F(KFSplineThreads, NobodyCountsHalfAnEdit) {
+    MuseumSpline moved;
+    void* const vertex = moved->addVertexNoTangents(s(0), 0.0, kTempusZero, false);
+    std::atomic<int> wrong{0};
+    Readers readers;
+    readers.add([&](std::mt19937&) {
+        for (int k = 0; k < 1000; ++k)
+            wrong += moved->getNumberOfVertices() != 1 ? 1 : 0;
+    });
+    for (int i = 1; i <= times(20000); ++i) {
+        moved->moveVertex(vertex, s(i), kTempusZero, false, false, false);
+        if (i % 1000 == 0)
+            readers.awaitReads(1);
+    }
+    EXPECT_EQ(wrong, 0);
+    *curve = *moved;
+    EXPECT_EQ(curve->getNumberOfVertices(), 1u);
+}
+
 TEST_F(KFSplineThreads, WholeCurvesAreReadByManyAtOnce) {
     for (std::uint32_t const type : {10u, 12u}) {
         for (int round = 0; round < times(20); ++round) {

@@ -2,6 +2,7 @@
 
 #include "tools/cli/ChannelInput.h"
 #include "tools/cli/Progress.h"
+#include "tools/cli/Stretches.h"
 #include "tools/cli/TimeArgument.h"
 #include "tools/cli/UsageError.h"
 #include "tools/curve/SampleTimes.h"
@@ -23,7 +24,7 @@ namespace {
 /// Values and slopes are held in memory until they are written: eight bytes for each. CSV goes out in blocks of
 /// times, so there this many times are taken, whatever the number of channels.
 constexpr std::uint64_t kMostValues = 10'000'000;
-constexpr std::size_t kValuesInBlock = 65'536;
+constexpr std::size_t kValuesInBlock = 131'072;
 
 struct SampleOptions {
     std::string file;
@@ -205,36 +206,69 @@ void writeCsvTitles(CsvWriter& csv, ChannelTree const& tree, std::vector<Channel
     csv.endRow();
 }
 
-/// Reads block by block, column by column, and writes row by row.
-void writeCsv(ChannelTree const& tree, std::vector<ChannelTree::Node> const& channels,
-              SampleTimes const& times, bool slope, OutputSink& out) {
-    Progress bar("writing", ProgressOf::Output);
-    CsvWriter csv(out);
-    writeCsvTitles(csv, tree, channels, slope);
-    std::size_t const columns = channels.size() * (slope ? 2 : 1);
-    std::size_t const height = std::min(std::max<std::size_t>(kValuesInBlock / columns, 16), times.count());
-    std::vector<double> block(height * columns);
-    for (std::size_t first = 0; first < times.count(); first += height) {
-        std::size_t const rows = std::min(height, times.count() - first);
-        double* column = block.data();
-        for (ChannelTree::Node const channel : channels) {
-            times.readValues(tree.curve(channel), first, rows, column);
-            column += height;
+/// A stretch of the times, all columns: `values[column * height + row]`.
+struct CsvBlock {
+    std::size_t first = 0;
+    std::size_t rows = 0;
+    std::size_t height = 0;
+    std::size_t columns = 0;
+    std::vector<double> values;
+};
+
+/// Fewer values than these aren't worth a thread.
+constexpr std::size_t kValuesForAThread = 4'096;
+
+void readBlock(CsvBlock& block, ChannelTree const& tree, std::vector<ChannelTree::Node> const& channels,
+               SampleTimes const& times, bool slope) {
+    std::size_t const each = block.columns / channels.size();
+    std::size_t const least = kValuesForAThread / (block.rows * each) + 1;
+    auto const readChannels = [&](std::size_t, std::size_t begin, std::size_t end) {
+        for (std::size_t i = begin; i < end; ++i) {
+            double* const column = block.values.data() + i * each * block.height;
+            times.readValues(tree.curve(channels[i]), block.first, block.rows, column);
             if (slope) {
-                times.readSlopes(tree.spline(channel), first, rows, column);
-                column += height;
+                times.readSlopes(tree.spline(channels[i]), block.first, block.rows, column + block.height);
             }
         }
-        for (std::size_t row = 0; row < rows; ++row) {
-            Tempus const time = times.at(first + row);
+    };
+    forStretches(channels.size(), stretchesFor(channels.size(), least), readChannels);
+}
+
+void writeBlock(CsvBlock const& block, SampleTimes const& times, OutputSink& out) {
+    std::size_t const stretches = stretchesFor(block.rows, kValuesForAThread / block.columns + 1);
+    std::vector<StringSink> texts(stretches);
+    forStretches(block.rows, stretches, [&](std::size_t stretch, std::size_t begin, std::size_t end) {
+        CsvWriter csv(texts[stretch]);
+        for (std::size_t row = begin; row < end; ++row) {
+            Tempus const time = times.at(block.first + row);
             csv.field(timeText(time));
             csv.number(TempusGetSeconds(time));
-            for (std::size_t i = 0; i < columns; ++i) {
-                csv.number(block[i * height + row]);
+            for (std::size_t i = 0; i < block.columns; ++i) {
+                csv.number(block.values[i * block.height + row]);
             }
             csv.endRow();
         }
-        bar.update(static_cast<double>(first + rows) / static_cast<double>(times.count()));
+    });
+    for (StringSink const& text : texts) {
+        out.write(text.text());
+    }
+}
+
+/// Reads block by block, column by column, and writes row by row, on all processors.
+void writeCsv(ChannelTree const& tree, std::vector<ChannelTree::Node> const& channels,
+              SampleTimes const& times, bool slope, OutputSink& out) {
+    Progress bar("writing", ProgressOf::Output);
+    CsvWriter titles(out);
+    writeCsvTitles(titles, tree, channels, slope);
+    CsvBlock block;
+    block.columns = channels.size() * (slope ? 2 : 1);
+    block.height = std::min(std::max<std::size_t>(kValuesInBlock / block.columns, 16), times.count());
+    block.values.resize(block.height * block.columns);
+    for (; block.first < times.count(); block.first += block.height) {
+        block.rows = std::min(block.height, times.count() - block.first);
+        readBlock(block, tree, channels, times, slope);
+        writeBlock(block, times, out);
+        bar.update(static_cast<double>(block.first + block.rows) / static_cast<double>(times.count()));
     }
 }
 
