@@ -68,8 +68,8 @@ bool KFCompoundChannel::compare(KFChannelBase const* other) const {
            KFChannelFolder::compare(other);
 }
 
-// The class fixes what the children are: their factories need no mark.
 void KFCompoundChannel::markFactoriesForSerialization(BXSerializerWriteStream& stream, bool all) {
+    // NOLINTNEXTLINE(bugprone-parent-virtual-call): the class fixes what the children are; they need no mark.
     KFChannelBase::markFactoriesForSerialization(stream, all);
 }
 

@@ -33,7 +33,7 @@ KFFactory::~KFFactory() = default;
 
 BXString KFFactory::getIconName() const {
     for (KFFactory const* at = this; at != nullptr; at = at->getSuperFactory()) {
-        if (BXString const name = at->getIconNameInternal(); !name.empty()) {
+        if (BXString name = at->getIconNameInternal(); !name.empty()) {
             return name;
         }
     }
@@ -42,7 +42,7 @@ BXString KFFactory::getIconName() const {
 
 BXString KFFactory::getIconNameBW() const {
     for (KFFactory const* at = this; at != nullptr; at = at->getSuperFactory()) {
-        if (BXString const name = at->getIconNameBWInternal(); !name.empty()) {
+        if (BXString name = at->getIconNameBWInternal(); !name.empty()) {
             return name;
         }
     }
