@@ -103,8 +103,10 @@ namespace {
 
 /// Copy on write of one setting.
 template <class Value> void change(KFCurve& curve, BXRelaxed<Value> KFSplineState::*setting, Value value) {
-    if ((curve.settings().*setting).get() != value)
-        curve.createLocalSplineState()->*setting = value;
+    if ((curve.settings().*setting).get() == value)
+        return;
+    if (KFSplineState* const local = curve.createLocalSplineState(); local != nullptr)
+        local->*setting = value;
 }
 
 template <class Value> bool answer(Value* out, Value value) {

@@ -92,17 +92,15 @@ bool sumOverOneTimescale(Tempus const& a, Tempus const& b, int64_t sign, Tempus&
     if (!TempusIsNumeric(a) || !TempusIsNumeric(b) || (a.epoch | b.epoch) != 0) {
         return false;
     }
-    auto const scaleA = static_cast<uint32_t>(a.timescale);
-    auto const scaleB = static_cast<uint32_t>(b.timescale);
-    bool const isOverA = scaleA % scaleB == 0;
-    if (!isOverA && scaleB % scaleA != 0) {
+    bool const isOverA = a.timescale % b.timescale == 0;
+    if (!isOverA && b.timescale % a.timescale != 0) {
         return false;
     }
     int64_t left = a.value;
     int64_t right = 0;
     int64_t sum = 0;
-    if (__builtin_mul_overflow(b.value, sign * (isOverA ? scaleA / scaleB : 1), &right) ||
-        (!isOverA && __builtin_mul_overflow(left, int64_t{scaleB / scaleA}, &left)) ||
+    if (__builtin_mul_overflow(b.value, sign * (isOverA ? a.timescale / b.timescale : 1), &right) ||
+        (!isOverA && __builtin_mul_overflow(left, int64_t{b.timescale / a.timescale}, &left)) ||
         __builtin_add_overflow(left, right, &sum) || sum == std::numeric_limits<int64_t>::min()) {
         return false;
     }
