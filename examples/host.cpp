@@ -116,8 +116,10 @@ int main() {
     // [behaviour]
     rotation.appendCurveProcessingNode(new Swing(0.25)); // the curve owns it now
     // [behaviour]
-    good &= check(std::abs(rotation.getValueAsDouble(TempusMake(1, 4), 0.0) - 0.25) < 1e-12, "the behaviour swings");
-    good &= check(rotation.getCurveValue(TempusMake(1, 4), false) == 0.0, "the keypoints below it are untouched");
+    good &= check(std::abs(rotation.getValueAsDouble(TempusMake(1, 4), 0.0) - 0.25) < 1e-12,
+                  "the behaviour swings");
+    good &=
+        check(rotation.getCurveValue(TempusMake(1, 4), false) == 0.0, "the keypoints below it are untouched");
 
     // [threads]
     // The keypoints of a channel may be edited while others read it: each read sees the curve before or after an

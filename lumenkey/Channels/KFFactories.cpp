@@ -7,13 +7,9 @@
 #include "lumenkey/Channels/KFThreadState.h"
 #include "lumenkey/foundation/BXSerializerStreams.h"
 
-KFFactories& KFFactories::getInstance() {
-    return BXSingletonInstance<KFFactories>();
-}
+KFFactories& KFFactories::getInstance() { return BXSingletonInstance<KFFactories>(); }
 
-KFFactories::KFFactories() : BXSingleton(0) {
-    addChannelFactories();
-}
+KFFactories::KFFactories() : BXSingleton(0) { addChannelFactories(); }
 
 KFFactories::~KFFactories() = default;
 
@@ -48,7 +44,8 @@ bool isOneOrAncestorOf(KFFactory const* candidate, KFFactory const* factory) {
 } // namespace
 
 KFFactory* KFFactories::findCommonFactory(std::vector<KFFactoryBase*> const& objects) const {
-    KFFactory* candidate = objects.empty() || objects.front() == nullptr ? nullptr : objects.front()->getFactory();
+    KFFactory* candidate =
+        objects.empty() || objects.front() == nullptr ? nullptr : objects.front()->getFactory();
     for (KFFactoryBase const* object : objects) {
         KFFactory const* const factory = object == nullptr ? nullptr : object->getFactory();
         while (candidate != nullptr && !isOneOrAncestorOf(candidate, factory)) {
@@ -72,9 +69,7 @@ KFFactory* KFFactories::lookupFactory(std::uint32_t fileID) {
     return found == loadMap.end() ? nullptr : found->second;
 }
 
-void KFFactories::clearFactoryLoadIDs() {
-    getFactoryLoadMap().clear();
-}
+void KFFactories::clearFactoryLoadIDs() { getFactoryLoadMap().clear(); }
 
 void KFFactories::saveFactories(BXSerializerWriteStream& stream) {
     stream.pushScope(KFFactoryScope);

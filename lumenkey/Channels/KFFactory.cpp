@@ -109,94 +109,50 @@ bool KFFactory::isKindOfClass(BXUUID const& uuid) const {
     return false;
 }
 
-bool KFFactory::needsSaving() const {
-    return saveRecord(this).needsSaving;
-}
+bool KFFactory::needsSaving() const { return saveRecord(this).needsSaving; }
 
-void KFFactory::setNeedsSaving(bool needsSaving) const {
-    saveRecord(this).needsSaving = needsSaving;
-}
+void KFFactory::setNeedsSaving(bool needsSaving) const { saveRecord(this).needsSaving = needsSaving; }
 
-std::uint32_t KFFactory::fileRefID() const {
-    return saveRecord(this).fileRefID;
-}
+std::uint32_t KFFactory::fileRefID() const { return saveRecord(this).fileRefID; }
 
-void KFFactory::setFileRefID(std::uint32_t id) const {
-    saveRecord(this).fileRefID = id;
-}
+void KFFactory::setFileRefID(std::uint32_t id) const { saveRecord(this).fileRefID = id; }
 
 // KFChannelFactory -------------------------------------------------------------------------------------------
 
 KFChannelFactory::~KFChannelFactory() = default;
 
-KFFactoryBase* KFChannelFactory::create(BXString const&, unsigned int) {
-    return nullptr;
-}
+KFFactoryBase* KFChannelFactory::create(BXString const&, unsigned int) { return nullptr; }
 
-KFFactoryBase* KFChannelFactory::createCopy(KFFactoryBase*, unsigned int) {
-    return nullptr;
-}
+KFFactoryBase* KFChannelFactory::createCopy(KFFactoryBase*, unsigned int) { return nullptr; }
 
-KFFactoryBase* KFChannelFactory::createInstance(KFFactoryBase*) {
-    return nullptr;
-}
+KFFactoryBase* KFChannelFactory::createInstance(KFFactoryBase*) { return nullptr; }
 
-BXString KFChannelFactory::description() {
-    return "Channel";
-}
+BXString KFChannelFactory::description() { return "Channel"; }
 
-BXString KFChannelFactory::unlocalizedDescription() {
-    return description();
-}
+BXString KFChannelFactory::unlocalizedDescription() { return description(); }
 
-BXString KFChannelFactory::manufacturer() {
-    return "Arbor";
-}
+BXString KFChannelFactory::manufacturer() { return "Arbor"; }
 
-unsigned int KFChannelFactory::version() {
-    return 1;
-}
+unsigned int KFChannelFactory::version() { return 1; }
 
-unsigned int KFChannelFactory::revision() {
-    return 0;
-}
+unsigned int KFChannelFactory::revision() { return 0; }
 
-BXString KFChannelFactory::getCategoryName() const {
-    return {};
-}
+BXString KFChannelFactory::getCategoryName() const { return {}; }
 
-BXString KFChannelFactory::getEnglishCategoryName() const {
-    return {};
-}
+BXString KFChannelFactory::getEnglishCategoryName() const { return {}; }
 
-char const* KFChannelFactory::getBundleID() const {
-    return "";
-}
+char const* KFChannelFactory::getBundleID() const { return ""; }
 
-BXString KFChannelFactory::getIconNameInternal() const {
-    return {};
-}
+BXString KFChannelFactory::getIconNameInternal() const { return {}; }
 
-BXString KFChannelFactory::getIconNameBWInternal() const {
-    return {};
-}
+BXString KFChannelFactory::getIconNameBWInternal() const { return {}; }
 
-std::uint32_t KFChannelFactory::getIconIDInternal() const {
-    return kNoIconID;
-}
+std::uint32_t KFChannelFactory::getIconIDInternal() const { return kNoIconID; }
 
-BXString KFChannelFactory::getLibraryIconNameInternal() const {
-    return {};
-}
+BXString KFChannelFactory::getLibraryIconNameInternal() const { return {}; }
 
-KFChannelBase* KFChannelFactory::createChannel(BXString const&, unsigned int) {
-    return nullptr;
-}
+KFChannelBase* KFChannelFactory::createChannel(BXString const&, unsigned int) { return nullptr; }
 
-KFChannelBase* KFChannelFactory::createChannelCopy(KFChannelBase*, unsigned int) {
-    return nullptr;
-}
+KFChannelBase* KFChannelFactory::createChannelCopy(KFChannelBase*, unsigned int) { return nullptr; }
 
-KFChannelBase* KFChannelFactory::createChannelInstance(KFChannelBase*) {
-    return nullptr;
-}
+KFChannelBase* KFChannelFactory::createChannelInstance(KFChannelBase*) { return nullptr; }

@@ -20,9 +20,7 @@ BXString KFFactoryBase::getLibraryIconName() const {
     return _factory == nullptr ? BXString() : _factory->getLibraryIconName();
 }
 
-BXString KFFactoryBase::description() {
-    return _factory == nullptr ? BXString() : _factory->description();
-}
+BXString KFFactoryBase::description() { return _factory == nullptr ? BXString() : _factory->description(); }
 
 KFFactory* KFFactoryBase::getFactoryForSerialization(BXSerializerWriteStream&, bool) const {
     return _factory;

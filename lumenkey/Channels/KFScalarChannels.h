@@ -140,8 +140,8 @@ class LUMENKEY_API KFChannelBool : public KFChannel {
     KF_SCALAR_CHANNEL_BODY(KFChannelBool);
     KFChannelBool(KFFactory* factory, BXString const& name, KFChannelFolder* parent, unsigned int id,
                   unsigned int flags, KFChannelImpl* impl = nullptr, KFChannelInfo* info = nullptr);
-    KFChannelBool(int value, BXString const& name, KFChannelFolder* parent, unsigned int id, unsigned int flags,
-                  KFChannelImpl* impl = nullptr, KFChannelInfo* info = nullptr);
+    KFChannelBool(int value, BXString const& name, KFChannelFolder* parent, unsigned int id,
+                  unsigned int flags, KFChannelImpl* impl = nullptr, KFChannelInfo* info = nullptr);
     static KFChannelImpl* createKFChannelBoolTrueImpl();
     static KFChannelImpl* createKFChannelBoolFalseImpl();
     static KFCurve* createKFChannelBoolCurve(double value);
@@ -153,8 +153,8 @@ KF_DECLARE_CLASS_IMPL(KFChannelProgress);
 class LUMENKEY_API KFChannelProgress : public KFChannel {
 public:
     KFChannelProgress(BXString const& name, KFChannelFolder* parent, unsigned int id, unsigned int flags);
-    KFChannelProgress(KFFactory* factory, BXString const& name, unsigned int id, KFChannelImpl* impl = nullptr,
-                      KFChannelInfo* info = nullptr);
+    KFChannelProgress(KFFactory* factory, BXString const& name, unsigned int id,
+                      KFChannelImpl* impl = nullptr, KFChannelInfo* info = nullptr);
     KFChannelProgress(KFFactory* factory, BXString const& name, KFChannelFolder* parent, unsigned int id,
                       unsigned int flags, KFChannelImpl* impl = nullptr, KFChannelInfo* info = nullptr);
     KFChannelProgress(double value, BXString const& name, KFChannelFolder* parent, unsigned int id,

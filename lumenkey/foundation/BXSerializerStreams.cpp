@@ -2,6 +2,4 @@
 
 BXSerializerWriteStream::~BXSerializerWriteStream() = default;
 
-bool BXSerializerWriteStream::isHashStream() const {
-    return false;
-}
+bool BXSerializerWriteStream::isHashStream() const { return false; }

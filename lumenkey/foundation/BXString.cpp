@@ -85,13 +85,9 @@ BXString::BXString(std::string_view text) : _text(text) {}
 BXString::BXString(std::string text) noexcept : _text(std::move(text)) {}
 BXString::BXString(BXStringKey key) : _text(BXStringBundleText(key.key)) {}
 
-void BXString::set(std::string_view text) {
-    _text.assign(text);
-}
+void BXString::set(std::string_view text) { _text.assign(text); }
 
-void BXString::append(std::string_view text) {
-    _text.append(text);
-}
+void BXString::append(std::string_view text) { _text.append(text); }
 
 void BXString::insert(std::size_t position, std::string_view text) {
     _text.insert(std::min(position, _text.size()), text);
@@ -102,9 +98,7 @@ long BXString::find(std::string_view text, std::size_t from) const noexcept {
     return at == std::string::npos ? -1 : static_cast<long>(at);
 }
 
-int BXString::compare(BXString const& other) const noexcept {
-    return _text.compare(other._text);
-}
+int BXString::compare(BXString const& other) const noexcept { return _text.compare(other._text); }
 
 int BXString::caseInsensitiveCompare(BXString const& other) const {
     FoldedText left(_text);
@@ -129,9 +123,7 @@ char* BXString::createCStr() const {
     return made;
 }
 
-BXString BXString::substrTo(std::size_t end) const {
-    return BXString(view().substr(0, end));
-}
+BXString BXString::substrTo(std::size_t end) const { return BXString(view().substr(0, end)); }
 
 BXString BXString::substrFrom(std::size_t begin) const {
     return BXString(view().substr(std::min(begin, _text.size())));

@@ -138,9 +138,7 @@ public:
     bool isDirty() const noexcept { return _dirty; }
     bool isClosed() const noexcept { return _closed; }
     /// May run beside one thread that edits: what the last edit that was over left, never a number on the way there.
-    std::size_t getNumberOfVertices() const noexcept {
-        return _vertexCount.load(std::memory_order_acquire);
-    }
+    std::size_t getNumberOfVertices() const noexcept { return _vertexCount.load(std::memory_order_acquire); }
     /// Bytes of memory that the store asks for beyond the vertices themselves: what a vertex costs in the store.
     std::size_t getStoreBytes() const noexcept;
 

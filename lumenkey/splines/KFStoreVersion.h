@@ -30,7 +30,9 @@ public:
 private:
     static constexpr std::uint64_t kRun = 4096;
 
-    static std::uint64_t drawRun() noexcept { return _nextRun.fetch_add(1, std::memory_order_relaxed) * kRun; }
+    static std::uint64_t drawRun() noexcept {
+        return _nextRun.fetch_add(1, std::memory_order_relaxed) * kRun;
+    }
 
     static inline std::atomic<std::uint64_t> _nextRun{1};
 

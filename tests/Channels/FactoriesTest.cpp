@@ -47,9 +47,7 @@ public:
     int depth = 0;
 };
 
-KFFactories& registry() {
-    return KFFactories::getInstance();
-}
+KFFactories& registry() { return KFFactories::getInstance(); }
 
 } // namespace
 
@@ -111,7 +109,7 @@ TEST(KFFactories, TheNearestCommonClass) {
 }
 
 TEST(KFFactories, MarksBecomeNumbersInTheOrderOfUUIDs) {
-    KFFactory* const later = getKFChannelDouble_FactoryBase();  // FDC1...
+    KFFactory* const later = getKFChannelDouble_FactoryBase(); // FDC1...
     KFFactory* const earlier = getKFChannelBool_FactoryBase(); // 0B00...
     later->setNeedsSaving(true);
     earlier->setNeedsSaving(true);

@@ -16,7 +16,7 @@ TEST(BXString, FoldsCaseByUnicodeAndKeepsOtherBytesApart) {
         {"", "", true},
         {"Opacity", "oPACITY", true},
         {"Opacity", "Opacit", false},
-        {"STRASSE", "stra\u00DFe", true},              // one letter folds into two
+        {"STRASSE", "stra\u00DFe", true},                   // one letter folds into two
         {"\u03A3\u03C3\u03C2", "\u03C3\u03C3\u03C3", true}, // all three sigmas
         {"\u00C4", "\u00E4", true},
         {"\u00C4", "A\u0308", false}, // folding doesn't compose
@@ -50,7 +50,8 @@ TEST(BXString, ToleratesPositionsBehindTheEnd) {
 TEST(BXString, KeysNameTextsAndUnknownOnesThemselves) {
     EXPECT_EQ(BXString(BXStringKey("Channel X")), "X");
     EXPECT_EQ(BXString(BXStringKey("no such key")), "no such key");
-    EXPECT_EQ(BXString::intern("UQSliderTransformer"), BXString::intern(std::string("UQSlider") + "Transformer"));
+    EXPECT_EQ(BXString::intern("UQSliderTransformer"),
+              BXString::intern(std::string("UQSlider") + "Transformer"));
 }
 
 TEST(BXUUID, ReadsItsOwnTextAndNothingElse) {

@@ -220,11 +220,10 @@ void expectLists(KFSpline& spline, Walks const& walks) {
 // Where the positions crowd, a vertex doesn't stand where even distances would put it.
 TEST(KFVertexStore, FindsUnevenPositions) {
     using Position = std::int64_t (*)(std::int64_t);
-    for (Position const position :
-         {Position{[](std::int64_t i) { return i * i * i; }},
-          Position{[](std::int64_t i) { return i / 100; }},
-          Position{[](std::int64_t i) { return i < 200 ? i : i + 1000000000000; }},
-          Position{[](std::int64_t i) { return (i - 200) * std::abs(i - 200); }}}) {
+    for (Position const position : {Position{[](std::int64_t i) { return i * i * i; }},
+                                    Position{[](std::int64_t i) { return i / 100; }},
+                                    Position{[](std::int64_t i) { return i < 200 ? i : i + 1000000000000; }},
+                                    Position{[](std::int64_t i) { return (i - 200) * std::abs(i - 200); }}}) {
         KFVertexStore store;
         std::vector<std::int64_t> ticks;
         for (std::int64_t i = 0; i < 400; ++i) {

@@ -22,10 +22,12 @@ void expect(bool condition, char const* what) {
 void useThroughLibrary(PluginInterface const& plugin) {
     plugin.root->push_back(plugin.channel);
     plugin.channel->setValue(kTempusZero, 3.0, false);
-    expect(plugin.channel->getValueAsDouble(kTempusZero, 0.0) == 3.0, "a plug-in's channel doesn't keep its value");
+    expect(plugin.channel->getValueAsDouble(kTempusZero, 0.0) == 3.0,
+           "a plug-in's channel doesn't keep its value");
     plugin.channel->appendCurveProcessingNode(plugin.makeNode());
     expect(plugin.channel->getValueAsDouble(kTempusZero, 0.0) == 6.0, "a plug-in's node isn't run");
-    expect(plugin.channel->getTimeOffset() == TempusMake(1, 2), "a plug-in's root isn't asked for its offset");
+    expect(plugin.channel->getTimeOffset() == TempusMake(1, 2),
+           "a plug-in's root isn't asked for its offset");
     expect(plugin.channel->KFChannelBase::getFrameDuration() == TempusMake(1, 25),
            "a plug-in's root isn't asked for its frame duration");
     plugin.root->removeDescendant(plugin.channel);

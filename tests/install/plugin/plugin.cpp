@@ -75,7 +75,8 @@ PluginInterface makeInterface() {
     made.root = &root;
     made.channel = &channel;
     made.makeNode = [] { return static_cast<KFCurveNode*>(new HostNode()); };
-    auto const add = [&made](char const* name, unsigned int slot, void* object, void (*call)(void*, unsigned int)) {
+    auto const add = [&made](char const* name, unsigned int slot, void* object,
+                             void (*call)(void*, unsigned int)) {
         made.slots.push_back({name, slot, object, call});
     };
     auto const onNothing = [](void* object, unsigned int slot) { callAs<void>(object, slot); };
@@ -123,7 +124,8 @@ PluginInterface makeInterface() {
         callAs<double, Tempus const*, double, double>(object, slot, &zero, 0.0, 1.0);
     });
     add("getUForValue", 4, &node, [](void* object, unsigned int slot) {
-        callAs<bool, double, void*, void*, void*, std::uint32_t>(object, slot, 0.0, nullptr, nullptr, nullptr, 0);
+        callAs<bool, double, void*, void*, void*, std::uint32_t>(object, slot, 0.0, nullptr, nullptr, nullptr,
+                                                                 0);
     });
     add("compare", 17, &node, onPointers);
     add("isPointToPoint", 22, &node, onNothing);
