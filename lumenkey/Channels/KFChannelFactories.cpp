@@ -5,6 +5,7 @@
 #include "lumenkey/Channels/KFChannelObjectRootBase.h"
 #include "lumenkey/Channels/KFCompoundChannel.h"
 #include "lumenkey/Channels/KFScalarChannels.h"
+#include "lumenkey/Channels/KFVectorChannels.h"
 
 #include <type_traits>
 
@@ -14,6 +15,9 @@ constexpr std::uint32_t kUsualKind = 1;
 
 /// Number of children for which a class with children makes room.
 template <class Channel> constexpr unsigned int kCapacity = 0;
+template <> constexpr unsigned int kCapacity<KFChannel2D> = KFChannel2D::kNumberOfComponents;
+template <> constexpr unsigned int kCapacity<KFChannel3D> = KFChannel3D::kNumberOfComponents;
+template <> constexpr unsigned int kCapacity<KFChannelBool3D> = KFChannelBool3D::kNumberOfComponents;
 
 template <class Channel> Channel* make(KFFactory* factory, BXString const& name, unsigned int id) {
     if constexpr (std::is_base_of_v<KFChannelFolder, Channel>) {
@@ -74,6 +78,9 @@ KF_DEFINE_CHANNEL_FACTORY(KFChannelAspectRatioFootage)
 KF_DEFINE_CHANNEL_FACTORY(KFChannelGammaFootage)
 KF_DEFINE_CHANNEL_FACTORY(KFChannelFolder)
 KF_DEFINE_CHANNEL_FACTORY(KFCompoundChannel)
+KF_DEFINE_CHANNEL_FACTORY(KFChannel2D)
+KF_DEFINE_CHANNEL_FACTORY(KFChannelBool3D)
+KF_DEFINE_CHANNEL_FACTORY(KFChannel3D)
 KF_DEFINE_CHANNEL_FACTORY(KFChannelObjectRootBase)
 KF_DEFINE_CHANNEL_FACTORY(KFChannelUint16)
 KF_DEFINE_CHANNEL_FACTORY(KFChannelSeed)

@@ -1,0 +1,241 @@
+// The vector compounds: their components, copies, linked edits, the shape of keypoints, switches.
+
+#include "lumenkey/Channels/KFVectorChannels.h"
+#include "lumenkey/curves/KFCurve.h"
+#include "lumenkey/splines/KFCoreGlobals.h"
+#include "lumenkey/splines/KFInterpolation.h"
+#include "tests/Channels/AddingNode.h"
+#include "tests/Channels/RecordingRoot.h"
+
+#include <gtest/gtest.h>
+
+#include <array>
+#include <memory>
+
+namespace {
+
+Tempus s(std::int64_t value) { return TempusMake(value, 1); }
+
+/// While one exists, a value that is set is keyed, also on a curve without keypoints.
+struct Animating {
+    Animating() { KFCoreGlobals::getInstance().animate = true; }
+    ~Animating() { KFCoreGlobals::getInstance().animate = false; }
+};
+
+/// "name:id" of each child.
+std::string children(KFChannelFolder const& folder) {
+    std::string list;
+    for (KFChannelBase const* child : *folder.getDescendants()) {
+        EXPECT_EQ(child->getParent(), &folder);
+        list += child->getName().str() + ":" + std::to_string(child->getID()) + " ";
+    }
+    return list;
+}
+
+std::array<double, 3> valuesAt(KFChannel3D const& point, std::int64_t t) {
+    std::array<double, 3> values{};
+    point.getValue(s(t), &values[0], &values[1], &values[2], 0.0);
+    return values;
+}
+
+void* keypointAt(KFChannel& channel, std::int64_t t) {
+    void* handle = nullptr;
+    channel.getCurveInterface()->getKeypointHandle(s(t), &handle);
+    return handle;
+}
+
+/// Input time and value, output time and value.
+std::array<double, 4> handlesAt(KFChannel& channel, std::int64_t t) {
+    std::array<double, 4> handles{};
+    KFCurve& curve = *channel.getCurveInterface();
+    curve.getKeypointInputHandles(keypointAt(channel, t), &handles[0], &handles[1]);
+    curve.getKeypointOutputHandles(keypointAt(channel, t), &handles[2], &handles[3]);
+    return handles;
+}
+
+TEST(KFVectorChannels, ComponentsHaveTheirNamesAndIDs) {
+    KFChannelFolder folder("f", nullptr, 1, 0, 0);
+    KFChannel2D plane("p", &folder, 2, 0);
+    EXPECT_EQ(children(plane), "X:1 Y:2 ");
+    EXPECT_EQ(children(KFChannel2D("u", "v", "p", nullptr, 2, 0)), "u:1 v:2 ");
+    EXPECT_EQ(children(KFChannel3D("s", &folder, 3, 0)), "X:1 Y:2 Z:3 ");
+    EXPECT_EQ(children(KFChannelBool3D(nullptr, "b", 4, 3)), "X:1 Y:2 Z:3 ");
+    EXPECT_EQ(plane.getFoldFlags(), kFoldFlagsCompoundDefault);
+    folder.removeAllDescendants(true);
+}
+
+TEST(KFVectorChannels, EachComponentGetsTheRecordsThatAreGiven) {
+    KFChannelImpl* const shared = KFChannelPercent::createKFChannelPercent50Impl();
+    KFChannel3D sharing("s", nullptr, 1, 0, 3, shared);
+    EXPECT_TRUE(sharing.x.getImpl() == shared && sharing.y.getImpl() == shared &&
+                sharing.z.getImpl() == shared);
+    KFChannelImpl* const local = new KFChannelImpl(*shared);
+    KFChannel3D owning("s", nullptr, 1, 0, 3, local, new KFChannelInfo(*sharing.x.getInfo()));
+    EXPECT_EQ(owning.x.getImpl(), local);
+    owning.x.setInitialValue(0.75, true);
+    owning.x.setScale(2.0);
+    EXPECT_EQ(valuesAt(owning, 0), (std::array{0.75, 0.5, 0.5}));
+    EXPECT_TRUE(owning.y.getScale() == 1.0 && owning.z.getScale() == 1.0);
+}
+
+TEST(KFVectorChannels, CopiesHaveComponentsOfTheirOwn) {
+    KFChannel3D point("s", nullptr, 1, 0), target("t", nullptr, 1, 0);
+    point.setValue(s(0), 1.0, 2.0, 3.0);
+    point.setFoldFlag(kFoldFlagLinked);
+    KFChannelFolder folder("f", nullptr, 1, 0, 0);
+    KFChannel3D const child(point, &folder);
+    EXPECT_TRUE(child.getParent() == &folder && children(child) == "X:1 Y:2 Z:3 ");
+    std::unique_ptr<KFChannelBase> const clone(point.clone());
+    target.copy(&point, true);
+    EXPECT_TRUE(target.testFoldFlag(kFoldFlagLinked));
+    point.setValue(s(0), 4.0, 5.0, 6.0);
+    for (KFChannel3D const* copy :
+         {&child, static_cast<KFChannel3D const*>(clone.get()), &std::as_const(target)}) {
+        EXPECT_EQ(valuesAt(*copy, 0), (std::array{1.0, 2.0, 3.0}));
+        EXPECT_EQ(children(*copy), "X:1 Y:2 Z:3 ");
+    }
+    KFChannel2D plane("p", nullptr, 1, 0);
+    plane.setValue(s(0), 8.0, 9.0, false);
+    point.copy(&plane, true); // has no z
+    point.copy(nullptr, true);
+    EXPECT_EQ(valuesAt(point, 0), (std::array{8.0, 9.0, 6.0}));
+    folder.removeAllDescendants(false);
+}
+
+TEST(KFVectorChannels, ALinkedPointIsKeyedWithAnyOfItsComponents) {
+    Animating const animating;
+    KFChannel3D point("s", nullptr, 1, 0);
+    point.y.setValue(s(1), 5.0, false);
+    EXPECT_FALSE(point.x.hasKeypointAt(s(1), 0) || point.z.hasKeypointAt(s(1), 0));
+    point.setFoldFlag(kFoldFlagLinked);
+    point.y.setValue(s(2), 6.0, false);
+    EXPECT_TRUE(point.allHaveKeypointsAt(s(2)) && point.numberOfKeypointsAt(s(2)) == 1);
+    point.setValue(s(2), 1.0, 2.0, 3.0);
+    EXPECT_EQ(valuesAt(point, 2), (std::array{1.0, 2.0, 3.0}));
+    EXPECT_TRUE(point.testFoldFlag(kFoldFlagLinked));
+    double only = 0.0;
+    point.getValue(s(2), nullptr, nullptr, &only, 0.0);
+    EXPECT_EQ(only, 3.0);
+}
+
+TEST(KFVectorChannels, OffsetsReadEverythingBeforeTheFirstWrite) {
+    /// While x is written, y gets one more node, which a later read would take into account.
+    struct Changing : RecordingRoot {
+        void willModifyChannel(KFChannelBase* channel, unsigned int) override {
+            if (watched != nullptr && channel == &watched->x) {
+                std::exchange(watched, nullptr)->y.appendCurveProcessingNode(new AddingNode(100.0));
+            }
+        }
+        KFChannel3D* watched = nullptr;
+    } root;
+    KFChannel3D point("s", &root, 1, 0);
+    point.x.appendCurveProcessingNode(new AddingNode(10.0));
+    point.y.appendCurveProcessingNode(new AddingNode(20.0));
+    point.setValueOffsetByBehaviors(s(0), 1.0, 2.0, 3.0);
+    EXPECT_EQ(valuesAt(point, 0), (std::array{1.0, 2.0, 3.0}));
+    EXPECT_EQ(point.y.getInitialValue(), -18.0);
+    root.watched = &point;
+    point.setValueOffsetByBehaviors(s(0), 4.0, 5.0, 6.0);
+    EXPECT_EQ(valuesAt(point, 0), (std::array{4.0, 105.0, 6.0}));
+    root.watched = &point;
+    point.KFChannel2D::setValueOffsetByBehaviors(s(0), 7.0, 8.0);
+    EXPECT_EQ(valuesAt(point, 0), (std::array{7.0, 108.0, 6.0}));
+}
+
+TEST(KFVectorChannels, FlattensAndStraightensTheKeypointsOfXAndY) {
+    RecordingRoot root;
+    KFChannel3D point("s", &root, 1, 0);
+    std::array<KFChannel*, 3> const all{&point.x, &point.y, &point.z};
+    for (KFChannel* channel : all) {
+        for (std::int64_t const t : {0, 1, 2}) {
+            channel->addKeypointAt(s(t));
+        }
+        channel->getCurveInterface()->setKeypointOutputHandles(keypointAt(*channel, 1), 0.25, 3.0, true);
+        channel->getCurveInterface()->breakKeypointHandles(keypointAt(*channel, 1), true, true);
+    }
+    root.takeAnnounced();
+    auto const shape = [](KFChannel& channel) {
+        bool broken = false;
+        std::uint32_t type = 0;
+        channel.getCurveInterface()->areHandlesBroken(keypointAt(channel, 1), &broken);
+        channel.getCurveInterface()->getKeypointInterpolation(keypointAt(channel, 1), &type, nullptr);
+        return std::pair{broken, type};
+    };
+    auto const before = shape(point.z);
+    auto const handlesBefore = handlesAt(point.z, 1);
+    point.y.lock(true, false);
+    root.takeAnnounced();
+    point.flattenAtTime(s(1));
+    EXPECT_EQ(handlesAt(point.y, 1), handlesBefore);
+    point.y.lock(false, false);
+    point.flattenAtTime(s(1));
+    point.flattenAtTime(s(7)); // no keypoint
+    root.takeAnnounced();
+    point.setLinearAtTime(s(7));
+    EXPECT_TRUE(root.takeAnnounced().empty());
+    EXPECT_EQ(handlesAt(point.x, 1), (std::array{0.0, 0.0, 0.0, 0.0}));
+    EXPECT_EQ(handlesAt(point.y, 1), (std::array{0.0, 0.0, 0.0, 0.0}));
+    EXPECT_FALSE(shape(point.x).first);
+    point.setLinearAtTime(s(1));
+    EXPECT_FALSE(root.takeAnnounced().empty());
+    EXPECT_EQ(shape(point.y).second, kKFInterpolationLinear);
+    EXPECT_EQ(shape(point.z), before);
+    EXPECT_EQ(handlesAt(point.z, 1), handlesBefore);
+    EXPECT_EQ(point.x.getNumberOfKeyframes(), 3U);
+}
+
+TEST(KFVectorChannels, DerivesHandlesAlongThePath) {
+    for (auto const& [hasPrevious, hasNext] : {std::pair{true, true}, {true, false}, {false, true}}) {
+        KFChannel2D plane("p", nullptr, 1, 0);
+        plane.setIsSpline(true);
+        auto const key = [](KFChannel& channel, std::int64_t t, double value) {
+            channel.createLocalChannelImplementation();
+            channel.getCurveInterface()->setKeypoint(s(t), value, true);
+        };
+        plane.y.setInitialValue(4.0, true);
+        if (hasPrevious) {
+            key(plane.x, 0, -6.0);
+        }
+        key(plane.x, 1, 3.0);
+        if (hasNext) {
+            key(plane.x, 3, 18.0);
+        }
+        plane.deriveChannel(s(1)); // keys y, which has no other keypoint
+        EXPECT_EQ(plane.y.getCurveValue(s(1), true), 4.0);
+        double const rise = hasPrevious && hasNext ? 4.0 : hasPrevious ? 3.0 : 5.0;
+        ASSERT_NE(keypointAt(plane.y, 1), nullptr);
+        auto const ofX = handlesAt(plane.x, 1);
+        auto const ofY = handlesAt(plane.y, 1);
+        EXPECT_NEAR(ofX[1], -rise, 1e-12);
+        EXPECT_NEAR(ofX[3], rise, 1e-12);
+        EXPECT_TRUE(ofY[1] == 0.0 && ofY[3] == 0.0);
+    }
+}
+
+TEST(KFVectorChannels, SwitchesReadBackAsTheyWereSet) {
+    KFChannelBool3D axes("b", nullptr, 1, 0);
+    for (unsigned int bits = 0; bits < 8; ++bits) {
+        bool const wanted[] = {(bits & 1) != 0, (bits & 2) != 0, (bits & 4) != 0};
+        axes.setValue(s(0), wanted[0], wanted[1], wanted[2]);
+        bool x = !wanted[0], y = !wanted[1], z = !wanted[2];
+        axes.getValue(s(0), &x, &y, &z, 0.0);
+        EXPECT_TRUE(x == wanted[0] && y == wanted[1] && z == wanted[2]) << bits;
+        BXVector3<double> vector;
+        axes.getValue(s(0), &vector, 0.0);
+        EXPECT_EQ(vector, (BXVector3<double>{x ? 1.0 : 0.0, y ? 1.0 : 0.0, z ? 1.0 : 0.0}));
+    }
+    axes.setValue(s(0), BXVector3<double>{0.25, 0.0, -1.0}); // any but 0 is on
+    EXPECT_TRUE(axes.getX(s(0), 0.0) && !axes.getY(s(0), 0.0) && axes.getZ(s(0), 0.0));
+    axes.setX(s(0), false), axes.setY(s(0), true), axes.setZ(s(0), false);
+    EXPECT_TRUE(!axes.getX(s(0), 0.0) && axes.getY(s(0), 0.0) && !axes.getZ(s(0), 0.0));
+    axes.setDefaultValue(true, false, true);
+    KFChannelBool3D target("b", nullptr, 1, 0);
+    target.copy(&axes, true);
+    target.getValue(s(0), nullptr, nullptr, nullptr, 0.0);
+    EXPECT_TRUE(target.getY(s(0), 0.0) && target.x.getDefaultValue() == 1.0 &&
+                target.y.getDefaultValue() == 0.0);
+    target.resetToDefault(true);
+    EXPECT_TRUE(target.getX(s(0), 0.0) && !target.getY(s(0), 0.0) && target.getZ(s(0), 0.0));
+}
+
+} // namespace
