@@ -35,9 +35,7 @@ template <class Channel> Channel* makeCopy(KFFactoryBase* source) {
     return channel == nullptr ? nullptr : new Channel(*channel, static_cast<KFChannelFolder*>(nullptr));
 }
 
-KFChannelFactoryRow const& rowOf(char const* className) noexcept {
-    return KFChannelFactoryRowOf(className);
-}
+KFChannelFactoryRow const& rowOf(char const* className) noexcept { return KFChannelFactoryRowOf(className); }
 } // namespace
 
 #define KF_DEFINE_FACTORY_IDENTITY(Channel)                                                                  \

@@ -105,9 +105,7 @@ BXUUID KFChannelFactoryRow::identity() const noexcept {
     return read;
 }
 
-std::span<KFChannelFactoryRow const> KFChannelFactoryTable() noexcept {
-    return kTable;
-}
+std::span<KFChannelFactoryRow const> KFChannelFactoryTable() noexcept { return kTable; }
 
 KFChannelFactoryRow const& KFChannelFactoryRowOf(std::string_view className) noexcept {
     return *findRow(className);
