@@ -88,6 +88,17 @@ public:
     void adjustToFrameDuration(Tempus const& frameDuration) override;
     void setInterpolation(unsigned int type) override;
     void setExtrapolation(unsigned int mode, unsigned int which) override;
+    /// Turns the effect of the processing nodes into keypoints, at the step of `getBakeParameters`; `step` isn't used.
+    /// Only where the object root says that selected behaviors affect the channel, else nothing and no announcement.
+    /// The nodes stay: it is for the caller to take them out.
+    void bake(BXTimeRange const& range, Tempus const& step) override;
+    /// `KFCurve::simplifyCurve` between two global times; `step` isn't converted. The tolerance is `percent` of what
+    /// the curve's values span, the fine delta where they span nothing, and with `clampToCoarse` at most the coarse
+    /// delta. `mode1` is the curve's mode, `mode2` its radius.
+    void simplify(Tempus const& a, Tempus const& b, Tempus const& step, double percent, unsigned int mode1,
+                  unsigned int mode2, bool clampToCoarse) override;
+    /// `KFCurve::generateKeypoints`.
+    void generateKeys(unsigned int first, unsigned int second) override;
     /// In curve time; a linked compound's other components keep theirs.
     void deleteKeypoints(Tempus const& from, Tempus const& to) override;
     bool hasFadeHandles() const override;
@@ -220,6 +231,22 @@ public:
     /// With `inPlace` and a shared record the curve of the whole class is changed.
     void setDiscrete(bool on, bool inPlace);
     void setShouldCreateTangents(bool on);
+    // Ignored by a locked channel. Not announced.
+    void closeParametricCurve();
+    void reparametrizeChannel();
+    /// The curve's owner becomes this channel, whose frame duration it uses.
+    void setUseRetimingExtrapolation(bool on);
+    /// The default as a constant, without keypoints; then `resetLocalChannelImplementation`.
+    void resetCurve();
+    // The curve's operations on a stretch, in curve time; ignored by a locked channel, not announced.
+    void reduceKeyframes(Tempus const& a, Tempus const& b, Tempus const& step, double tolerance, double range,
+                         unsigned int mode, int radius);
+    void smoothKeyframes(Tempus const& a, Tempus const& b, Tempus const& step);
+    // The curve's operations on a segment, in curve time, forced and announced. Nothing, and false, on a locked channel
+    // and without a curve.
+    bool createCurveSegment(Tempus const& a, Tempus const& b, Tempus const& c, bool eased);
+    /// With `bounded` within the slider's range.
+    void setCurveSegmentValue(Tempus const& t, double value, bool bounded);
 
     /// The bulk path: `willLoadKeyframes(true, n)`, any number of `appendKeyframes` in ascending curve time, then
     /// `willLoadKeyframes(false, 0)`. Ignored by a locked channel.
@@ -272,6 +299,7 @@ private:
     KFCurve& curveToWrite();
     /// The checks and the announcement in front of an edit; false to stop.
     bool beginEdit();
+    double spanOfValues() const;
     void* keypointAt(Tempus const& t) const;
     /// Keys the old value at the start of the extent, if the root wants that: as the channel reads, or as the curve has
     /// it.

@@ -32,6 +32,14 @@ public:
     static constexpr std::uint32_t kRootConstant = 0;
     static constexpr std::uint32_t kRootSpline = 1;
 
+    /// Modes of `simplifyCurve`.
+    static constexpr std::uint32_t kSimplifyByFit = 2;
+    static constexpr std::uint32_t kSimplifyToExtremes = 4;
+    /// A stretch of more samples isn't reshaped, and a continuation of more keypoints isn't written: no call may take
+    /// all the memory there is.
+    static constexpr std::int64_t kMostShapeSamples = std::int64_t{1} << 24;
+    static constexpr std::uint64_t kMostGeneratedKeypoints = std::uint64_t{1} << 22;
+
     /// The initial value goes to the constant node; the spline node starts at 0. The settings record is null until
     /// `setSplineState`.
     KFCurve(double minimum, double maximum, double initialValue);
@@ -112,7 +120,36 @@ public:
     // each limited to the absolute minimum and maximum. `warpCurveLinear` and `forceRetimeCurve` need a spline; the
     // latter asks no more than that the curve be keyframable, and moves locked keypoints too. `loadVertices` brackets
     // the reading of many keypoints: true makes room for `count` (a hint) and puts off the list of valid ones, false
-    // ends it.
+    // ends it. `generateCurveFromDynamicCurve` gives false and does nothing.
+    //
+    // Reshaping needs a spline root: `bakeCurve` makes the spline, `simplifyCurve` and `smoothCurve` want two
+    // keypoints. It is false, with nothing changed, without those, for times that aren't numbers, a step that isn't
+    // above zero and more samples than `kMostShapeSamples`; in the latter two, but for the thinning to extremes, also
+    // for an end before the start, and in baking for a scale of 0 or that isn't finite and a node that isn't in the
+    // chain. A stretch is cut into the whole steps that fit, so that its very end is no sample; the fit is that of
+    // `BXCurveFit`, and what it gives are Bezier keypoints, whatever type those before had. Samples that aren't finite
+    // are left out of it. Locked keypoints stay. Where nothing fits, the stretch is left without keypoints.
+    //
+    // `bakeCurve` replaces the keypoints after `start` up to `end` by what the chain up to `node` gives (null: the
+    // root), `tolerance` being hundredths of the curve's unit times `scale`. All keypoints of the curve become Bezier,
+    // and `sanitizeBezier` is cleared in the settings, which become local first.
+    // `simplifyCurve` does by `mode`, others than these nothing:
+    // - `kSimplifyByFit` on a curve that isn't linear, or with a `radius` that isn't 0: a fit to the root within
+    //   `tolerance` / 100 / `range`, of the moving average over 2 * `radius` + 1 samples where that is above 0. A
+    //   stretch of at most one step is cut into 1000, unless the tolerance is above 1. On a linear curve with `radius`
+    //   0 keypoints on a straight line go, and the ends of the stretch get keypoints.
+    // - `kSimplifyToExtremes`: in the stretch only keypoints stay that are higher, or lower, than the last one that
+    //   stayed and the next one.
+    // `smoothCurve` leaves one keypoint with flat handles for each sample, filtered by the quadratic kernel over seven
+    // of Savitzky and Golay, "Smoothing and Differentiation of Data by Simplified Least Squares Procedures", Analytical
+    // Chemistry 36 (1964); samples beyond the ends are those at the ends. A stretch of at most one step gives 1000.
+    //
+    // `createCurveSegment` is `KFSpline::createSegment`, and makes the spline. `setCurveSegmentValue` moves the two
+    // keypoints around `t` so that the curve takes the value there, within the curve's limits, and
+    // `setCurveSegmentValueBounded` by the same amount, within the given ones (a constant root knows only its own);
+    // without keypoints the constant takes it. Both give true also where they may not edit.
+    // `generateKeypoints` is `KFSpline::generateExtrapolatedVertices`, as 0 or 1; 0 with nothing changed where
+    // `cycles` times the keypoints is above `kMostGeneratedKeypoints`.
     bool bakeCurve(void* node, Tempus const& start, Tempus const& step, Tempus const& end, double tolerance,
                    double scale) override;
     bool getCurveSamples(Tempus const& start, Tempus const& step, std::uint32_t& count,
@@ -393,6 +430,7 @@ private:
     std::unique_ptr<KFCurveNode> takeOutNode(KFCurveNode const* node);
     void writeConstant(Tempus const& t, double clampedValue);
     void writeAt(Tempus const& t, double value, bool mayAdd, bool withTangents);
+    void writeSegment(Tempus const& t, double value, double low, double high, bool keepShape);
     bool settleAfterDeletion();
     bool readFlag(void* handle, std::uint32_t flag, bool* out) const;
     double handleScale() const;

@@ -1,0 +1,45 @@
+// Segments of a curve: vertices around a stretch, the value of the segment at a time, and the continuation of the curve
+// written out as keypoints.
+
+#include "lumenkey/curves/KFCurve.h"
+
+#include "lumenkey/splines/KFSpline.h"
+
+bool KFCurve::createCurveSegment(Tempus const& a, Tempus const& b, Tempus const& c, bool eased, bool force) {
+    return isSpline() && canModifyCurve(force) && splineForNewKeypoints()->createSegment(a, b, c, eased);
+}
+
+bool KFCurve::setCurveSegmentValue(Tempus const& t, double value, bool force) {
+    if (canModifyCurve(force))
+        writeSegment(t, clamped(value), _minValue, _maxValue, false);
+    return true;
+}
+
+bool KFCurve::setCurveSegmentValueBounded(Tempus const& t, double value, double low, double high,
+                                          bool force) {
+    if (!canModifyCurve(force))
+        return true;
+    double const bounded = value > high ? high : value < low ? low : value;
+    writeSegment(t, isSpline() ? bounded : clamped(value), low, high, true);
+    return true;
+}
+
+/// The limits hold for the two vertices around `t`; `keepShape` moves both alike.
+void KFCurve::writeSegment(Tempus const& t, double value, double low, double high, bool keepShape) {
+    KFSpline* const spline = getSpline();
+    if (!isSpline()) {
+        writeConstant(kTempusZero, value);
+    } else if (spline != nullptr && spline->getNumberOfVertices() > 0) {
+        spline->offsetSpline(t, value, high, low, true, keepShape, kTempusZero);
+    } else {
+        // A spline without vertices has no segment: it is the node's constant that is read.
+        _splineNode.storeValue(value);
+    }
+}
+
+std::uint32_t KFCurve::generateKeypoints(std::uint32_t side, std::uint32_t cycles, bool force) {
+    KFSpline* const spline = modifiableSpline(force);
+    if (spline == nullptr || spline->getNumberOfVertices() * std::uint64_t{cycles} > kMostGeneratedKeypoints)
+        return 0;
+    return spline->generateExtrapolatedVertices(side, cycles, kTempusZero) ? 1 : 0;
+}
