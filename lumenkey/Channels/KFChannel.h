@@ -4,6 +4,7 @@
 
 #include <cmath>
 
+class BXSpinLock;
 class KFChannelImpl;
 class KFChannelInfo;
 class KFCompoundChannel;
@@ -11,6 +12,8 @@ class KFCurve;
 class KFCurveInterface;
 class KFCurveNode;
 class KFCurveOwner;
+class KFCustomInterpolator;
+class KFDynamicCurve;
 struct KFFadeBlock;
 
 /// A node of the tree with a value over time.
@@ -66,6 +69,10 @@ public:
     /// Takes the whole curve of a value channel, in this channel's unit (where that has a scale) and within its
     /// limits. Announces nothing.
     void setValue(KFChannelBase const& other) override;
+    /// Pastes the other's keypoints with their spacing, the first at `t`, in this channel's unit (where that has a
+    /// scale). One that would fall on a locked keypoint is left out. From a channel without keypoints this one is reset
+    /// and takes its value. Nothing for null and for what is no value channel.
+    void copyKeyframesFromChannel(Tempus const& t, KFChannelBase* other) override;
     /// A change to what isn't both keyframable and a spline counts as one of state. A compound parent is announced
     /// first.
     void willBeModified(unsigned int kind) override;
@@ -74,6 +81,11 @@ public:
     bool isModified(bool skipHidden) const override;
     void setKeyframable(bool on, bool force) override;
     bool isKeyframable() const override;
+    /// What the curve lists as drawing the range (`getKeyframesTimeAndValue`), which may hold neighbours already; those
+    /// asked for stand around it.
+    std::vector<Tempus> visibleKeypoints(TempusRange range, bool withNeighbours, unsigned int mask) override;
+    /// Adds this channel, with the keypoints in the range, if there are any. Their times are curve times.
+    void keyframesWithChannels(TempusRange range, KeyframesByChannel& out) override;
     bool hasKeypoints(unsigned int mask) const override;
     bool hasMoreThanOneKeypoint() const override;
     bool hasKeypointAt(Tempus const& t, unsigned int mask) const override;
@@ -262,6 +274,129 @@ public:
     std::vector<KFCurveNode*> enumerateCurveProcessingNodes() const;
     unsigned int getNumberOfCurveProcessingNodes() const;
 
+    // Keyframes: keypoints by handle, in curve time -------------------------------------------------------------
+    //
+    // A handle is that of the curve's keypoint, null for none; a null one, and one of another curve, is refused by
+    // setters and reads as zero or false. Setters act although nothing is animated yet (but not on what isn't
+    // keyframable), take no account of a linked compound, and announce nothing but where said: who calls them in a row
+    // announces first. A locked channel ignores them; none reports a refusal. What they do is the curve's: see
+    // `KFCurve`. Tangents are handles, or with `handles` false those as stored.
+
+    void setKeyframe(Tempus const& t, double value, bool withTangents);
+    /// Keys the value that the curve has.
+    void setKeyframe(Tempus const& t);
+    /// The same, but only on what is animated.
+    void setKeyframeIfRecording(Tempus const& t);
+    void setKeyframe(void* handle, Tempus const& t, double value);
+    void appendKeyframe(Tempus const& t, double value, bool unused);
+    void cloneKeyframe(void* handle, Tempus const& t);
+    void setKeyframeValue(void* handle, double value);
+    void setKeyframesValue(double value);
+    void setKeyframeFlags(void* handle, unsigned int flags);
+    void deleteAllKeyframes(Tempus const& t);
+    void offsetKeyframe(void* handle, Tempus const& t);
+    void generateKeyframesFromDynamicCurve(Tempus const& t, KFDynamicCurve* dynamicCurve);
+    void linearTimeWarp(double factor, Tempus const& t);
+    void reverseKeyframes(void* first, void* last);
+    void deriveKeyframe(void* handle);
+    void smoothKeyframe(void* handle, bool on);
+    void setKeyframeInputTangents(void* handle, double dx, double dy, bool handles);
+    void setKeyframeOutputTangents(void* handle, double dx, double dy, bool handles);
+    void setKeyframeBias(void* handle, double bias);
+    void setKeyframeNormal(void* handle, double normal);
+    void setKeyframeNormal(Tempus const& t, double normal);
+    void setKeyframeEnabled(void* handle, bool on);
+    void setKeyframeSelected(void* handle, bool on);
+    void setKeyframeLocked(void* handle, bool on);
+    void setKeyframeTangentsBroken(void* handle, bool on);
+    void setKeyframeTangentsScaled(void* handle, bool on);
+    void setKeyframeTangentsFlat(void* handle);
+    void setCustomInterpolator(KFCustomInterpolator* interpolator, BXSpinLock* lock);
+    // These announce `kModifyData`.
+    void deleteKeyframe(void* handle);
+    void setKeyframeInterpolation(void* handle, unsigned int type);
+    void setCurveSegmentSpeed(void* handle, unsigned int speed);
+    void offsetCurveSegmentSpeed(void* handle, double delta);
+    /// Also on a locked channel, and on the record in use.
+    void purgeKeyframes();
+
+    /// In ascending order; with `valid` those only that take part in the curve.
+    std::vector<void*> getKeyframes(bool valid) const;
+    bool getKeyframe(void* handle, Tempus* t, double* value) const;
+    void* getKeyframe(Tempus const& t) const;
+    bool getNextKeyframe(Tempus const& t, Tempus* found, double* value) const;
+    bool getPreviousKeyframe(Tempus const& t, Tempus* found, double* value) const;
+    /// With false, zeros.
+    bool getFirstKeyframe(Tempus* found, double* value) const;
+    bool getLastKeyframe(Tempus* found, double* value) const;
+    void* getNextEnabledKeyframe(Tempus const& t) const;
+    void* getNextEnabledKeyframe(void* handle) const;
+    void* getPreviousEnabledKeyframe(Tempus const& t) const;
+    void* getPreviousEnabledKeyframe(void* handle) const;
+    void* getFirstEnabledKeyframe() const;
+    void* getLastEnabledKeyframe() const;
+    bool getKeyframeInputTangents(void* handle, double* dx, double* dy, bool handles) const;
+    bool getKeyframeOutputTangents(void* handle, double* dx, double* dy, bool handles) const;
+    unsigned int getKeyframeInterpolation(void* handle) const;
+    bool getKeyframeInterpolationUsesTangents(void* handle) const;
+    /// Linear, or Bezier with both handles at zero.
+    bool isSmoothKeyframe(void* handle) const;
+    unsigned int getKeyframeFlags(void* handle) const;
+    bool getKeyframeEnabled(void* handle) const;
+    bool getKeyframeLocked(void* handle) const;
+    double getKeyframeBias(void* handle) const;
+    double getKeyframeNormal(void* handle) const;
+    double getKeyframeNormal(Tempus const& t) const;
+    bool getKeyframeTangentsBroken(void* handle) const;
+    bool getKeyframeTangentsScaled(void* handle) const;
+    unsigned int getCurveSegmentSpeed(void* handle) const;
+
+    // The whole curve, in curve time: what `KFCurve` answers ----------------------------------------------------
+
+    Tempus getKeyframeMinTime() const;
+    Tempus getKeyframeMaxTime() const;
+    Tempus getKeyframeTimeRange() const;
+    Tempus getKeyframeParametricRange() const;
+    double getKeyframeMinValue(bool withTangents) const;
+    double getKeyframeMaxValue(bool withTangents) const;
+    bool getSamples(Tempus const& start, Tempus const& step, unsigned int& count, std::vector<Tempus>* times,
+                    std::vector<double>* values) const;
+    bool getSamples(void* node, Tempus const& start, Tempus const& step, unsigned int& count,
+                    std::vector<Tempus>* times, std::vector<double>* values) const;
+    bool getSamples(double start, double step, unsigned int& count, double** times, double** values,
+                    double operand) const;
+    bool getSamples(double start, double step, unsigned int& count, std::vector<double>* times,
+                    std::vector<double>* values) const;
+    bool getSamples(void* node, Tempus const& start, Tempus const& step, unsigned int& count, Tempus** times,
+                    double** values) const;
+    bool getSamples(Tempus const& start, Tempus const& step, unsigned int& count, Tempus** times,
+                    double** values) const;
+    bool getCurveDerivativesSamples(Tempus const& start, Tempus const& step, unsigned int& count,
+                                    std::vector<Tempus>* times, std::vector<double>* values) const;
+    bool getCurveInputTangents(Tempus const& t, double* dx, double* dy, bool scaled) const;
+    bool getCurveOutputTangents(Tempus const& t, double* dx, double* dy, bool scaled) const;
+    bool getKeyframesTimeAndValue(TempusRange range,
+                                  std::vector<std::pair<Tempus, std::pair<double, unsigned>>>& out,
+                                  Tempus* first, Tempus* last) const;
+    unsigned int getInterpolation() const;
+    bool hasInterpolation(unsigned int type) const;
+    unsigned int getExtrapolation(unsigned int which) const;
+    bool isParametricCurveClosed() const;
+    bool useRetimingExtrapolation() const;
+    /// Null for the first node.
+    KFCurveNode* getPreviousProcessingNode(void* node) const;
+
+    // Keyframes in a range, and pasting -------------------------------------------------------------------------
+
+    // Of the keypoints from `from` to `to`, in global time. Without one, the curve's value at `from`.
+    double getKeyframeMinValueInRange(Tempus const& from, Tempus const& to) const;
+    double getKeyframeMaxValueInRange(Tempus const& from, Tempus const& to) const;
+    /// Shifts the values of those keypoints alike, so that the curve would pass through `value` at global time `t`.
+    void offsetKeyframesValuesInRange(Tempus const& from, Tempus const& to, Tempus const& t, double value);
+    /// Pastes records with their spacing, the first at curve time `t`, over whatever keypoints are there. Takes no
+    /// account of scales, and announces nothing.
+    void setKeyframesWithInfo(Tempus const& t, std::vector<_KFKeyframeInfo> const& keyframes);
+
     // Fades -----------------------------------------------------------------------------------------------------
 
     Tempus getFadeInOffset() const;
@@ -301,6 +436,21 @@ private:
     bool beginEdit();
     double spanOfValues() const;
     void* keypointAt(Tempus const& t) const;
+    /// Edits the curve on a local record; nothing on a locked channel.
+    template <class Edit> void editKeyframes(Edit edit) {
+        if (!isLocked(false))
+            edit(curveToWrite());
+    }
+    /// The same with an announcement, to which the host may answer by resetting the channel.
+    template <class Edit> void announceAndEditKeyframes(Edit edit) {
+        if (isLocked(false))
+            return;
+        createLocalChannelImplementation();
+        willBeModified(kModifyData);
+        edit(curveToWrite());
+    }
+    std::vector<double> valuesInRange(Tempus const& from, Tempus const& to) const;
+    _KFKeyframeInfo keyframeInfo(void* handle, bool withHandles) const;
     /// Keys the old value at the start of the extent, if the root wants that: as the channel reads, or as the curve has
     /// it.
     void keyStartOfExtentIfWanted(KFChannelObjectRootBase& root, Tempus const& t, bool atCurveValue);

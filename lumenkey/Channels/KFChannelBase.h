@@ -155,7 +155,10 @@ public:
     virtual void setKeyframable(bool on, bool force);
     virtual bool isKeyframable() const;
 
-    // Gathering of keypoints.
+    // Gathering of keypoints, in a range of global time (its start and end included). With neighbours the lists also
+    // hold the keypoint in front and the one behind, the former, in `keypoints`, behind one at the start, which then
+    // stands in the list twice. Records have their channel's curve time; references are relative to this node, and an
+    // entry that is in `out` already is replaced. Hidden children give no records.
     virtual std::vector<Tempus> keypoints(TempusRange range, bool withNeighbours, unsigned int mask);
     virtual std::vector<Tempus> visibleKeypoints(TempusRange range, bool withNeighbours, unsigned int mask);
     virtual void keyframesWithChannels(TempusRange range, KeyframesByChannel& out);
@@ -180,6 +183,8 @@ public:
     virtual bool hasFadeHandles() const;
     virtual void scaleFadeHandles(double factor);
     virtual void deleteKeypoints(Tempus const& from, Tempus const& to);
+    /// Moves the keypoints from `start` to `end`; the offset by which it did, zero if there were none. With `constrain`
+    /// the offset is lowered to what leaves `gap` to the neighbour ahead; `a` and it go to `moveKeypointTo`.
     virtual Tempus offsetKeyframesInRange(Tempus const& start, Tempus const& end, Tempus const& offset,
                                           Tempus const& gap, bool a, bool constrain);
     /// Whether the ID generator passes this node and what lies below by.
@@ -265,6 +270,14 @@ public:
     static Tempus globalToLocalTime(Tempus const& t, Tempus const& offset);
     static Tempus localToGlobalTime(Tempus const& t, Tempus const& offset);
 
+    // Keyframes ---------------------------------------------------------------------------------------------
+
+    /// Pastes what `keyframesWithChannelRef` gathered, with the channels' offsets to each other and the earliest
+    /// keypoint of all at curve time `t`. With `clear` each channel first loses its keypoints over that stretch,
+    /// but for one at `t` itself. Entries that don't lead to a value channel are passed by.
+    void setKeyframesWithChannelRef(Tempus const& t, Tempus const& unused, KeyframesByRef const& keyframes,
+                                    bool clear);
+
     // The ID generator. Any thread.
     static unsigned int getNextUniqueID() noexcept;
     /// The ID that will be handed out next.
@@ -300,6 +313,8 @@ public:
 protected:
     /// The flag word, without an announcement: for constructors.
     void storeFlags(KFChannelFlags flags) noexcept { _flags = flags; }
+    /// Of the keypoints from `from` to `to`, both in global time, in ascending order.
+    std::vector<Tempus> keypointTimesInRange(Tempus const& from, Tempus const& to) const;
     /// Without an announcement.
     void storeInternalName(BXString const& name);
 

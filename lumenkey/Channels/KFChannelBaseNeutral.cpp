@@ -47,10 +47,7 @@ bool KFChannelBase::isModified(bool) const { return false; }
 void KFChannelBase::setKeyframable(bool, bool) {}
 bool KFChannelBase::isKeyframable() const { return true; }
 
-std::vector<Tempus> KFChannelBase::keypoints(TempusRange, bool, unsigned int) { return {}; }
-std::vector<Tempus> KFChannelBase::visibleKeypoints(TempusRange, bool, unsigned int) { return {}; }
 void KFChannelBase::keyframesWithChannels(TempusRange, KeyframesByChannel&) {}
-void KFChannelBase::keyframesWithChannelRef(TempusRange, KeyframesByRef&) {}
 
 bool KFChannelBase::hasKeypoints(unsigned int) const { return false; }
 bool KFChannelBase::hasMoreThanOneKeypoint() const { return false; }
@@ -69,8 +66,4 @@ void KFChannelBase::setInterpolation(unsigned int) {}
 bool KFChannelBase::hasFadeHandles() const { return false; }
 void KFChannelBase::scaleFadeHandles(double) {}
 void KFChannelBase::deleteKeypoints(Tempus const&, Tempus const&) {}
-Tempus KFChannelBase::offsetKeyframesInRange(Tempus const&, Tempus const&, Tempus const&, Tempus const&, bool,
-                                             bool) {
-    return kTempusZero;
-}
 bool KFChannelBase::shouldIgnoreDynamicIDs() const { return false; }

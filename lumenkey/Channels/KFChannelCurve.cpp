@@ -1,12 +1,10 @@
-// The shape switches of a channel's curve, its lock, its processing nodes, and the bulk path.
+// The shape switches of a channel's curve, its lock, and its processing nodes.
 
 #include "lumenkey/Channels/KFChannel.h"
 #include "lumenkey/Channels/KFChannelImpl.h"
 #include "lumenkey/Channels/KFChannelObjectRootBase.h"
 #include "lumenkey/Channels/KFCompoundChannel.h"
 #include "lumenkey/curves/KFCurve.h"
-
-#include <algorithm>
 
 // --- Spline or constant ---
 
@@ -129,19 +127,6 @@ unsigned int KFChannel::getNumberOfCurveProcessingNodes() const {
     std::uint32_t count = 0;
     curve().getNumCurveProcessingNodes(&count);
     return count;
-}
-
-// --- The bulk path ---
-
-void KFChannel::willLoadKeyframes(bool loading, int count) {
-    if (!isLocked(false))
-        curveToWrite().loadVertices(loading, static_cast<std::uint32_t>(std::max(count, 0)));
-}
-
-void KFChannel::appendKeyframes(unsigned int count, Tempus const* times, double const* values, bool) {
-    if (isLocked(false) || count == 0 || times == nullptr || values == nullptr)
-        return;
-    curveToWrite().appendKeypointsNoTangents(count, times, values, true);
 }
 
 // --- Takes ---

@@ -1,4 +1,4 @@
-// Keypoints: the family that takes global time, and what of the family in curve time the slots ask for.
+// Keypoints: the family that takes global time.
 
 #include "lumenkey/Channels/KFChannel.h"
 #include "lumenkey/Channels/KFChannelImpl.h"
@@ -8,10 +8,6 @@
 unsigned int KFChannel::getNumberOfKeyframes() const {
     KFCurve const* const used = _impl == nullptr ? nullptr : _impl->getCurve();
     return used == nullptr ? 0 : used->keypointCount();
-}
-
-bool KFChannel::moveKeyframe(void* handle, Tempus const& t, bool a, bool b) {
-    return !isLocked(false) && curveToWrite().moveKeypoint(handle, t, a, b, false);
 }
 
 // --- Looking ---
