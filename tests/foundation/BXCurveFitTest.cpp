@@ -148,7 +148,8 @@ TEST(BXCurveFit, HoldsTheToleranceInThePlane) {
         circle.push_back({std::cos(angle), std::sin(angle)});
         spiral.push_back(Point{std::cos(angle * 4), std::sin(angle * 4)} * angle);
         cloud.push_back({normal(engine), normal(engine)});
-        doubled.push_back({static_cast<double>(i / 2), std::sin(i / 2)});
+        int const half = i / 2; // each twice
+        doubled.push_back({static_cast<double>(half), std::sin(half)});
     }
     Points const still(20, Point{1.0, 1.0});
     Points const museum[] = {circle, spiral, cloud, doubled};
