@@ -7,8 +7,12 @@
 #include <gtest/gtest.h>
 
 #include <array>
+#include <atomic>
+#include <cstdlib>
+#include <thread>
 #include <tuple>
 #include <typeinfo>
+#include <vector>
 
 namespace {
 
@@ -132,6 +136,36 @@ TEST(ScalarChannels, ChronoCountsUnitsDownward) {
     KFChannelChrono const five(TempusMake(5, 1), "", nullptr, 1, 0);
     EXPECT_EQ(five.getDefaultValue(), 5.0);
     EXPECT_FALSE(five.compare(make<KFChannelDouble>().get()));
+}
+
+/// Both threads make the first channel of every class at once, in a process that has made none.
+[[noreturn]] void makeFirstChannelsOnTwoThreads() {
+    std::atomic<int> waiting{2};
+    std::array<std::vector<std::unique_ptr<KFChannel>>, 2> made;
+    auto const work = [&](std::size_t thread) {
+        for (--waiting; waiting != 0;) {
+        }
+        for (auto const makeOne :
+             {make<KFChannelDouble>, make<KFChannelAngle>, make<KFChannelPercent>, make<KFChannelBool>,
+              make<KFChannelSeed>, make<KFChannelUint32>, make<KFChannelAspectRatio>})
+            made[thread].push_back(makeOne());
+    };
+    std::thread other(work, 1);
+    work(0);
+    other.join();
+    bool alike = true;
+    for (std::size_t i = 0; i < made[0].size(); ++i) {
+        alike &=
+            made[0][i]->getImpl() == made[1][i]->getImpl() && made[0][i]->getInfo() == made[1][i]->getInfo();
+        alike &= made[0][i]->getImpl()->isShared();
+    }
+    made = {};
+    std::exit(alike ? 0 : 1);
+}
+
+TEST(ScalarChannelsThreadsDeathTest, ShareTheRecordsThatTheFirstOfTwoThreadsMakes) {
+    testing::GTEST_FLAG(death_test_style) = "threadsafe"; // starts anew, without any records
+    EXPECT_EXIT(makeFirstChannelsOnTwoThreads(), testing::ExitedWithCode(0), "^$");
 }
 
 } // namespace
