@@ -92,7 +92,8 @@ void KFChannel::freeLocalImpl() noexcept {
 }
 
 KFChannelImpl* KFChannel::createLocalChannelImplementation() {
-    if (_impl != nullptr)
+    // The pointer is written only when the record changes: others may be reading through a local one.
+    if (_impl != nullptr && _impl->isShared())
         _impl = _impl->createLocalCopy();
     return _impl;
 }
