@@ -85,15 +85,16 @@ KF_DECLARE_SCALAR_CHANNEL(KFChannelGammaFootage);
 
 // The forms from a value set it as default and as initial value; those with a factory and a parent are for derived
 // classes.
+#define KF_SCALAR_CHANNEL_FORM(Channel, first)                                                               \
+    Channel(first, BXString const& name, KFChannelFolder* parent, unsigned int id, unsigned int flags,       \
+            KFChannelImpl* impl = nullptr, KFChannelInfo* info = nullptr)
 
 KF_DECLARE_CLASS_INFO(KFChannelDouble);
 KF_DECLARE_CLASS_IMPL(KFChannelDouble);
 class LUMENKEY_API KFChannelDouble : public KFChannel {
     KF_SCALAR_CHANNEL_BODY(KFChannelDouble);
-    KFChannelDouble(KFFactory* factory, BXString const& name, KFChannelFolder* parent, unsigned int id,
-                    unsigned int flags, KFChannelImpl* impl = nullptr, KFChannelInfo* info = nullptr);
-    KFChannelDouble(double value, BXString const& name, KFChannelFolder* parent, unsigned int id,
-                    unsigned int flags, KFChannelImpl* impl = nullptr, KFChannelInfo* info = nullptr);
+    KF_SCALAR_CHANNEL_FORM(KFChannelDouble, KFFactory* factory);
+    KF_SCALAR_CHANNEL_FORM(KFChannelDouble, double value);
     static KFChannelImpl* createKFChannelDoubleImpl();
     /// A new curve, which the caller owns.
     static KFCurve* createKFChannelDoubleCurve(double value);
@@ -103,10 +104,8 @@ KF_DECLARE_CLASS_INFO(KFChannelAngle);
 KF_DECLARE_CLASS_IMPL(KFChannelAngle);
 class LUMENKEY_API KFChannelAngle : public KFChannel {
     KF_SCALAR_CHANNEL_BODY(KFChannelAngle);
-    KFChannelAngle(KFFactory* factory, BXString const& name, KFChannelFolder* parent, unsigned int id,
-                   unsigned int flags, KFChannelImpl* impl = nullptr, KFChannelInfo* info = nullptr);
-    KFChannelAngle(double value, BXString const& name, KFChannelFolder* parent, unsigned int id,
-                   unsigned int flags, KFChannelImpl* impl = nullptr, KFChannelInfo* info = nullptr);
+    KF_SCALAR_CHANNEL_FORM(KFChannelAngle, KFFactory* factory);
+    KF_SCALAR_CHANNEL_FORM(KFChannelAngle, double value);
     static KFChannelImpl* createKFChannelAngleImpl();
     static KFCurve* createKFChannelAngleCurve(double value);
 };
@@ -115,8 +114,7 @@ KF_DECLARE_CLASS_INFO(KFChannelShearAngle);
 KF_DECLARE_CLASS_IMPL(KFChannelShearAngle);
 class LUMENKEY_API KFChannelShearAngle : public KFChannel {
     KF_SCALAR_CHANNEL_BODY(KFChannelShearAngle);
-    KFChannelShearAngle(double value, BXString const& name, KFChannelFolder* parent, unsigned int id,
-                        unsigned int flags, KFChannelImpl* impl = nullptr, KFChannelInfo* info = nullptr);
+    KF_SCALAR_CHANNEL_FORM(KFChannelShearAngle, double value);
     static KFChannelImpl* createKFChannelShearAngleImpl();
 };
 
@@ -125,10 +123,8 @@ class LUMENKEY_API KFChannelShearAngle : public KFChannel {
 KF_DECLARE_CLASS_INFO(KFChannelPercent);
 class LUMENKEY_API KFChannelPercent : public KFChannel {
     KF_SCALAR_CHANNEL_BODY(KFChannelPercent);
-    KFChannelPercent(KFFactory* factory, BXString const& name, KFChannelFolder* parent, unsigned int id,
-                     unsigned int flags, KFChannelImpl* impl = nullptr, KFChannelInfo* info = nullptr);
-    KFChannelPercent(double value, BXString const& name, KFChannelFolder* parent, unsigned int id,
-                     unsigned int flags, KFChannelImpl* impl = nullptr, KFChannelInfo* info = nullptr);
+    KF_SCALAR_CHANNEL_FORM(KFChannelPercent, KFFactory* factory);
+    KF_SCALAR_CHANNEL_FORM(KFChannelPercent, double value);
     static KFChannelImpl* createKFChannelPercent100Impl();
     static KFChannelImpl* createKFChannelPercent50Impl();
     static KFChannelImpl* createKFChannelPercent0Impl();
@@ -138,10 +134,8 @@ class LUMENKEY_API KFChannelPercent : public KFChannel {
 KF_DECLARE_CLASS_INFO(KFChannelBool);
 class LUMENKEY_API KFChannelBool : public KFChannel {
     KF_SCALAR_CHANNEL_BODY(KFChannelBool);
-    KFChannelBool(KFFactory* factory, BXString const& name, KFChannelFolder* parent, unsigned int id,
-                  unsigned int flags, KFChannelImpl* impl = nullptr, KFChannelInfo* info = nullptr);
-    KFChannelBool(int value, BXString const& name, KFChannelFolder* parent, unsigned int id,
-                  unsigned int flags, KFChannelImpl* impl = nullptr, KFChannelInfo* info = nullptr);
+    KF_SCALAR_CHANNEL_FORM(KFChannelBool, KFFactory* factory);
+    KF_SCALAR_CHANNEL_FORM(KFChannelBool, int value);
     static KFChannelImpl* createKFChannelBoolTrueImpl();
     static KFChannelImpl* createKFChannelBoolFalseImpl();
     static KFCurve* createKFChannelBoolCurve(double value);
@@ -155,10 +149,8 @@ public:
     KFChannelProgress(BXString const& name, KFChannelFolder* parent, unsigned int id, unsigned int flags);
     KFChannelProgress(KFFactory* factory, BXString const& name, unsigned int id,
                       KFChannelImpl* impl = nullptr, KFChannelInfo* info = nullptr);
-    KFChannelProgress(KFFactory* factory, BXString const& name, KFChannelFolder* parent, unsigned int id,
-                      unsigned int flags, KFChannelImpl* impl = nullptr, KFChannelInfo* info = nullptr);
-    KFChannelProgress(double value, BXString const& name, KFChannelFolder* parent, unsigned int id,
-                      unsigned int flags, KFChannelImpl* impl = nullptr, KFChannelInfo* info = nullptr);
+    KF_SCALAR_CHANNEL_FORM(KFChannelProgress, KFFactory* factory);
+    KF_SCALAR_CHANNEL_FORM(KFChannelProgress, double value);
     KFChannelProgress(KFChannelProgress const& other);
     KFChannelProgress(KFChannelProgress const& other, KFChannelFolder* parent);
     KFChannelProgress& operator=(KFChannelProgress const& other);
