@@ -331,8 +331,8 @@ Verb declareSample(CLI::App& program) {
     auto* const from =
         verb->add_option("--from", options->from, "The first time (else the first of the file)")
             ->option_text("T");
-    auto* const to = verb->add_option("--to", options->to, "The last time (else the last of the file)")
-                         ->option_text("T");
+    auto* const to =
+        verb->add_option("--to", options->to, "The last time (else the last of the file)")->option_text("T");
     auto* const step = verb->add_option("--step", options->step, "Read at every step from the first time on")
                            ->option_text("T");
     auto* const rate =

@@ -103,9 +103,7 @@ void writeTable(ChannelInput const& input, std::vector<Node> const& nodes, Outpu
     table.rowCount = nodes.size();
     Progress bar("writing", ProgressOf::Output);
     table.progress = [&bar](double share) { bar.update(share); };
-    table.cell = [&](std::size_t row, std::size_t column) {
-        return cellOf(input, nodes[row], column);
-    };
+    table.cell = [&](std::size_t row, std::size_t column) { return cellOf(input, nodes[row], column); };
     table.write(out);
 }
 
