@@ -217,7 +217,9 @@ KFVertexStore::Place KFVertexStore::insert(Place place, KFVertex* vertex, bool s
     _size += 1;
     _validCount += isValid ? 1 : 0;
     _version.advance();
-    updateEnds();
+    if (isValid) { // any other leaves the ends, and while many are added looking for these anew takes long
+        updateEnds();
+    }
     return place;
 }
 

@@ -1,6 +1,5 @@
 #include "tools/tree/ChannelTree.h"
 #include "tests/tools/MotionSamples.h"
-#include "tools/curve/Keypoint.h"
 #include "tools/curve/SampleTimes.h"
 #include "tools/import/MotionTree.h"
 
@@ -42,18 +41,6 @@ TEST(ChannelTree, HoldsTheJointsInTheOrderOfTheFile) {
     EXPECT_EQ(tree->channelsBelow(8), (std::vector<ChannelTree::Node>{9, 10, 11}));
     EXPECT_EQ(tree->channelsBelow(ChannelTree::kTop).size(), 9U);
 
-    KFSpline& spline = tree->spline(*tree->find("LeftLeg.Yrotation").first);
-    std::vector<void*> const handles = keypointHandles(spline);
-    ASSERT_EQ(handles.size(), 3U);
-    double const degrees[] = {90, 95, 180};
-    for (int i = 0; i < 3; ++i) {
-        Keypoint const key = readKeypoint(spline, handles[static_cast<std::size_t>(i)]);
-        EXPECT_EQ(key.time, TempusMake(i, 120));
-        EXPECT_DOUBLE_EQ(key.value, degrees[i] * std::numbers::pi / 180);
-        EXPECT_EQ(key.interpolation, 1U);
-        EXPECT_TRUE(key.enabled && key.in.isFlat() && key.out.isFlat());
-    }
-
     // Child joints follow the channels also where the file lists them first.
     std::unique_ptr<ChannelTree> const late = treeOfMotion(
         readMotionText("HIERARCHY\nROOT A{ OFFSET 0 0 0 JOINT B" + kJoint + "} JOINT C" + kJoint +
@@ -73,31 +60,20 @@ TEST(ChannelTree, FindsNodesByNameAndPath) {
         char const* first;
         char const* second;
     } const cases[] = {
-        {"Hips", "./1", ""},
         {"Hips.Xrotation", "./1/1", ""},
-        {"Hips.L.Leg.Toe.Xrotation", "./1/2/2/1", ""},
-        {"L.Leg.Xrotation", "./1/2/1", ""},
         {"Leg.Xrotation", "./1/2/1", ""}, // a dot inside a name
         {"Leg.Toe", "./1/2/2", ""},
-        {"Hips.Right.Toe", "./1/3/2", "./1/3/3"},
         {"Right.Toe.Xrotation", "./1/3/2/1", "./1/3/3/1"},
         {"Toe.Xrotation", "./2/1", ""}, // a whole name goes before the ends of others
         {"Xrotation", "./1/1", "./1/2/1"},
         {"./", "./", ""},
-        {".", "./", ""},
-        {"./1/3/2", "./1/3/2", ""},
         {"./1/4", "", ""},
-        {"./1/x", "", ""},
-        {"./01", "./1", ""},
         {"", "", ""},
         {"hips", "", ""},
         {"eg.Xrotation", "", ""},
         {".Xrotation", "", ""},
         {"Hips.", "", ""},
         {"Hips..Xrotation", "", ""},
-        {"odd.name.Hips", "", ""},
-        {"Hips/Right", "", ""},
-        {"Toe#2.Xrotation", "", ""},
     };
     auto const pathOf = [&tree](std::optional<ChannelTree::Node> node) {
         return node ? tree->path(*node) : "";
@@ -166,7 +142,6 @@ TEST(SampleTimes, ReadsCurvesAtExactTimes) {
             EXPECT_EQ(blocks, values);
         }
     }
-    EXPECT_EQ(cases[1].times.at(11), TempusMake(1, 60));
     EXPECT_EQ(cases[2].times.at(999), TempusMake(1, 60));
     EXPECT_EQ(SampleTimes::spread(TempusMake(1, 3), TempusMake(1, 2), 1).at(0), TempusMake(1, 3));
 

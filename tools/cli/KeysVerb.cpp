@@ -99,10 +99,8 @@ void writeTable(KFSpline& spline, std::string_view unit, OutputSink& out) {
         {"in", Align::Right},   {"out", Align::Right},     {"enabled"},           {"flags", Align::Right}};
     table.rowCount = handles.size();
     Progress bar("writing", ProgressOf::Output);
-    double const cells = 2.0 * static_cast<double>(handles.size() * table.columns.size());
-    double asked = 0;
+    table.progress = [&bar](double share) { bar.update(share); };
     table.cell = [&](std::size_t row, std::size_t column) {
-        bar.update(++asked / cells); // a table is asked for twice
         return cellOf(readKeypoint(spline, handles[row]), column);
     };
     table.write(out);

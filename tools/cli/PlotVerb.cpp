@@ -32,10 +32,6 @@ struct TimeSpan {
     Tempus to;
 };
 
-std::optional<TimeArgument> readTime(std::string const& text) {
-    return text.empty() ? std::nullopt : std::optional(TimeArgument::parse(text));
-}
-
 TimeSpan spanOf(std::optional<TimeArgument> const& from, std::optional<TimeArgument> const& to,
                 ChannelFile const& file) {
     Tempus const frame = file.frameDuration;
@@ -83,8 +79,8 @@ PlotChart chartOf(ChannelInput const& input, std::vector<ChannelTree::Node> cons
 
 void runPlot(PlotOptions const& options) {
     PlotFormat const format = requirePlotFormat(options.output);
-    std::optional<TimeArgument> const from = readTime(options.from);
-    std::optional<TimeArgument> const to = readTime(options.to);
+    std::optional<TimeArgument> const from = TimeArgument::parseIfGiven(options.from);
+    std::optional<TimeArgument> const to = TimeArgument::parseIfGiven(options.to);
     ChannelInput const input(options.file);
     std::vector<ChannelTree::Node> const channels = input.channelsNamed(options.channels);
     if (channels.size() > kMostDistinctCurves) {
@@ -115,9 +111,9 @@ Verb declarePlot(CLI::App& program) {
     verb->add_option("-o,--output", options->output, "The picture: OUT.svg, OUT.png or OUT.pdf")
         ->option_text("OUT")
         ->required();
-    verb->add_option("--from", options->from, "The first time (else that of the first keypoint)")
+    verb->add_option("--from", options->from, "The first time (else the first of the file)")
         ->option_text("T");
-    verb->add_option("--to", options->to, "The last time (else that of the last keypoint)")->option_text("T");
+    verb->add_option("--to", options->to, "The last time (else the last of the file)")->option_text("T");
     verb->add_option("--width", options->width, "In pixels; in PDF, in points")
         ->check(CLI::Range(200, 10'000))
         ->option_text("N")

@@ -24,7 +24,7 @@ namespace {
 /// Values and slopes are held in memory until they are written: eight bytes for each. CSV goes out in blocks of
 /// times, so there this many times are taken, whatever the number of channels.
 constexpr std::uint64_t kMostValues = 10'000'000;
-constexpr std::size_t kValuesInBlock = 131'072;
+constexpr std::size_t kValuesInBlock = 65'536;
 
 struct SampleOptions {
     std::string file;
@@ -43,15 +43,12 @@ struct SampleOptions {
 /// The options about times once their texts are read, which is before any file is.
 struct TimeWishes {
     explicit TimeWishes(SampleOptions const& options) : count(options.count) {
-        auto const read = [](std::string const& text) {
-            return text.empty() ? std::nullopt : std::optional(TimeArgument::parse(text));
-        };
         if (!options.at.empty()) {
             at = TimeArgument::parseList(options.at);
         }
-        from = read(options.from);
-        to = read(options.to);
-        step = read(options.step);
+        from = TimeArgument::parseIfGiven(options.from);
+        to = TimeArgument::parseIfGiven(options.to);
+        step = TimeArgument::parseIfGiven(options.step);
         if (!options.rate.empty()) {
             rateStep = stepOfRate(options.rate);
         }
@@ -204,6 +201,7 @@ void writeCsvTitles(CsvWriter& csv, ChannelTree const& tree, std::vector<Channel
         }
     }
     csv.endRow();
+    csv.finish();
 }
 
 /// A stretch of the times, all columns: `values[column * height + row]`.
@@ -213,6 +211,8 @@ struct CsvBlock {
     std::size_t height = 0;
     std::size_t columns = 0;
     std::vector<double> values;
+    /// The rows as text, a stretch of them for each thread.
+    std::vector<StringSink> texts;
 };
 
 /// Fewer values than these aren't worth a thread.
@@ -234,11 +234,16 @@ void readBlock(CsvBlock& block, ChannelTree const& tree, std::vector<ChannelTree
     forStretches(channels.size(), stretchesFor(channels.size(), least), readChannels);
 }
 
-void writeBlock(CsvBlock const& block, SampleTimes const& times, OutputSink& out) {
+void writeBlock(CsvBlock& block, SampleTimes const& times, OutputSink& out) {
+    constexpr std::size_t usualBytes = 20; // of a number
     std::size_t const stretches = stretchesFor(block.rows, kValuesForAThread / block.columns + 1);
-    std::vector<StringSink> texts(stretches);
+    block.texts.resize(stretches);
+    for (StringSink& text : block.texts) {
+        text.clear();
+        text.reserve((block.rows / stretches + 1) * (block.columns + 2) * usualBytes);
+    }
     forStretches(block.rows, stretches, [&](std::size_t stretch, std::size_t begin, std::size_t end) {
-        CsvWriter csv(texts[stretch]);
+        CsvWriter csv(block.texts[stretch]);
         for (std::size_t row = begin; row < end; ++row) {
             Tempus const time = times.at(block.first + row);
             csv.field(timeText(time));
@@ -248,8 +253,9 @@ void writeBlock(CsvBlock const& block, SampleTimes const& times, OutputSink& out
             }
             csv.endRow();
         }
+        csv.finish();
     });
-    for (StringSink const& text : texts) {
+    for (StringSink const& text : block.texts) {
         out.write(text.text());
     }
 }
@@ -281,11 +287,10 @@ void writeTable(std::vector<Series> const& all, SampleTimes const& times, Output
     }
     table.rowCount = times.count();
     Progress bar("writing", ProgressOf::Output);
-    double asked = 0;
+    table.progress = [&bar](double share) { bar.update(share); };
     table.cell = [&](std::size_t row, std::size_t column) {
         switch (column) {
         case 0:
-            bar.update(++asked / (2 * static_cast<double>(times.count()))); // a table is asked for twice
             return timeText(times.at(row));
         case 1:
             return tableText(TempusGetSeconds(times.at(row)));
@@ -324,10 +329,10 @@ Verb declareSample(CLI::App& program) {
     auto* const at =
         verb->add_option("--at", options->at, "Times, with commas between them")->option_text("T[,T...]");
     auto* const from =
-        verb->add_option("--from", options->from, "The first time (else that of the first keypoint)")
+        verb->add_option("--from", options->from, "The first time (else the first of the file)")
             ->option_text("T");
-    auto* const to = verb->add_option("--to", options->to, "The last time (else that of the last keypoint)")
-                         ->option_text("T");
+    auto* const to =
+        verb->add_option("--to", options->to, "The last time (else the last of the file)")->option_text("T");
     auto* const step = verb->add_option("--step", options->step, "Read at every step from the first time on")
                            ->option_text("T");
     auto* const rate =
@@ -347,7 +352,7 @@ Verb declareSample(CLI::App& program) {
     verb->add_flag("--csv", options->csv, "A row for each time, a column for each channel")->excludes(json);
     verb->footer("A time is VALUE/TIMESCALE (1001/24000), seconds (0.5) or frames of the file (12f).\n"
                  "Without CHANNEL all channels are read: at most 10000000 values, as CSV so many times.\n"
-                 "What --csv writes can be read as a FILE.\n\n"
+                 "What --csv writes of ascending times can be read as a FILE.\n\n"
                  "Example: lumenkey sample walk.bvh Hips.Yposition --rate 24 --csv");
     return {
         verb,

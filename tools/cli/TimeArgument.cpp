@@ -6,7 +6,6 @@
 
 #include <cstdint>
 #include <limits>
-#include <optional>
 #include <string>
 
 namespace lumenkey::tools {
@@ -41,6 +40,10 @@ TimeArgument TimeArgument::parse(std::string_view text) {
         failForText(text, "has more digits than exact time can hold; VALUE/TIMESCALE may say it better");
     }
     return argument;
+}
+
+std::optional<TimeArgument> TimeArgument::parseIfGiven(std::string_view text) {
+    return text.empty() ? std::nullopt : std::optional(parse(text));
 }
 
 std::vector<TimeArgument> TimeArgument::parseList(std::string_view text) {

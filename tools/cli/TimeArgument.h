@@ -2,6 +2,7 @@
 
 #include "lumenkey/foundation/Tempus.h"
 
+#include <optional>
 #include <string_view>
 #include <vector>
 
@@ -13,6 +14,8 @@ class TimeArgument {
 public:
     /// Throws `UsageError`.
     static TimeArgument parse(std::string_view text);
+    /// Nothing for an empty text.
+    static std::optional<TimeArgument> parseIfGiven(std::string_view text);
     /// Several, with commas between them.
     static std::vector<TimeArgument> parseList(std::string_view text);
 

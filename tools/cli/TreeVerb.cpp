@@ -102,12 +102,8 @@ void writeTable(ChannelInput const& input, std::vector<Node> const& nodes, Outpu
                      {"keypoints", Align::Right}};
     table.rowCount = nodes.size();
     Progress bar("writing", ProgressOf::Output);
-    double const cells = 2.0 * static_cast<double>(nodes.size() * table.columns.size());
-    double asked = 0;
-    table.cell = [&](std::size_t row, std::size_t column) {
-        bar.update(++asked / cells); // a table is asked for twice
-        return cellOf(input, nodes[row], column);
-    };
+    table.progress = [&bar](double share) { bar.update(share); };
+    table.cell = [&](std::size_t row, std::size_t column) { return cellOf(input, nodes[row], column); };
     table.write(out);
 }
 

@@ -29,8 +29,8 @@ struct CsvFile {
 /// rounded. If the first two columns are called `time` and `seconds`, the second repeats the first and is skipped.
 ///
 /// Taken are a byte-order mark, both kinds of line ends, a last line without one, blank lines, blanks around cells
-/// without quotation marks, a plus sign before a number, and empty cells (no value at that time). Commas alone part
-/// cells.
+/// without quotation marks, a plus sign before a number, and empty cells (no value at that time). Only commas
+/// part cells.
 CsvFile readCsvFile(std::string const& file, ReadingProgress const& progress = {});
 
 /// The same for the content of a file; `file` is only its name.

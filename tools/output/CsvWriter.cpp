@@ -6,12 +6,11 @@ namespace lumenkey::tools {
 
 void CsvWriter::separate() {
     constexpr std::size_t enough = 65'536; // a row may be as long as a file
-    if (_row.size() >= enough) {
-        _out.write(_row);
-        _row.clear();
+    if (_pending.size() >= enough) {
+        finish();
     }
     if (_hasField) {
-        _row += ',';
+        _pending += ',';
     }
     _hasField = true;
 }
@@ -19,29 +18,32 @@ void CsvWriter::separate() {
 void CsvWriter::field(std::string_view text) {
     separate();
     if (text.find_first_of(",\"\r\n") == std::string_view::npos) {
-        _row += text;
+        _pending += text;
         return;
     }
-    _row += '"';
+    _pending += '"';
     for (char const c : text) {
-        _row += c;
+        _pending += c;
         if (c == '"') {
-            _row += c;
+            _pending += c;
         }
     }
-    _row += '"';
+    _pending += '"';
 }
 
 void CsvWriter::number(double value) {
     separate();
-    appendShortest(_row, value);
+    appendShortest(_pending, value);
 }
 
 void CsvWriter::endRow() {
-    _row += '\n';
-    _out.write(_row);
-    _row.clear();
+    _pending += '\n';
     _hasField = false;
+}
+
+void CsvWriter::finish() {
+    _out.write(_pending);
+    _pending.clear();
 }
 
 } // namespace lumenkey::tools

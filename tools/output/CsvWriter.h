@@ -17,13 +17,15 @@ public:
     /// The shortest decimal that reads back to the same bits.
     void number(double value);
     void endRow();
+    /// The last of the text is out only after this.
+    void finish();
 
 private:
     void separate();
 
     OutputSink& _out;
-    /// What of the row isn't written yet.
-    std::string _row;
+    /// What isn't written yet.
+    std::string _pending;
     bool _hasField = false;
 };
 

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <cstddef>
 #include <string>
 #include <string_view>
 
@@ -29,6 +30,9 @@ class StringSink : public OutputSink {
 public:
     void write(std::string_view text) override { _text += text; }
     std::string const& text() const { return _text; }
+    /// Makes room, which emptying it keeps.
+    void reserve(std::size_t bytes) { _text.reserve(bytes); }
+    void clear() { _text.clear(); }
 
 private:
     std::string _text;

@@ -7,6 +7,16 @@
 
 namespace lumenkey::tools {
 
+namespace {
+
+void failFor(int error) {
+    if (error != 0) {
+        throw OutputError{"standard output", systemErrorText(error)};
+    }
+}
+
+} // namespace
+
 int writeFully(int descriptor, std::string_view text) noexcept {
     while (!text.empty()) {
         ssize_t const count = ::write(descriptor, text.data(), text.size());
@@ -20,6 +30,11 @@ int writeFully(int descriptor, std::string_view text) noexcept {
 
 void StandardOutput::write(std::string_view text) {
     constexpr std::size_t enough = 65'536;
+    if (text.size() >= enough) {
+        flush();
+        failFor(writeFully(STDOUT_FILENO, text));
+        return;
+    }
     _buffer += text;
     if (_buffer.size() >= enough) {
         flush();
@@ -29,9 +44,7 @@ void StandardOutput::write(std::string_view text) {
 void StandardOutput::flush() {
     int const error = writeFully(STDOUT_FILENO, _buffer);
     _buffer.clear();
-    if (error != 0) {
-        throw OutputError{"standard output", systemErrorText(error)};
-    }
+    failFor(error);
 }
 
 } // namespace lumenkey::tools

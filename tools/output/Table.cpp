@@ -22,7 +22,13 @@ void Table::write(OutputSink& out) const {
     for (TableColumn const& column : columns) {
         widths.push_back(widthOfText(column.title));
     }
+    auto const tell = [&](std::size_t rows) {
+        if (progress) {
+            progress(static_cast<double>(rows) / (2 * static_cast<double>(rowCount)));
+        }
+    };
     for (std::size_t row = 0; row < rowCount; ++row) {
+        tell(row);
         for (std::size_t i = 0; i < columns.size(); ++i) {
             widths[i] = std::max(widths[i], widthOfText(printableText(cell(row, i))));
         }
@@ -38,6 +44,7 @@ void Table::write(OutputSink& out) const {
     };
     writeRow([&](std::size_t i) { return columns[i].title; });
     for (std::size_t row = 0; row < rowCount; ++row) {
+        tell(rowCount + row);
         writeRow([&](std::size_t i) { return cell(row, i); });
     }
 }

@@ -23,6 +23,8 @@ struct Table {
     /// The text of a cell by row and column. Asked for twice, first for its width, so that no table is held
     /// in memory.
     std::function<std::string(std::size_t, std::size_t)> cell;
+    /// Told the share of the work done, 0 .. 1, for each row.
+    std::function<void(double)> progress;
 
     void write(OutputSink& out) const;
 };

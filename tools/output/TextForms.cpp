@@ -32,7 +32,7 @@ void appendShortest(std::string& text, double value) {
     }
     NumberBuffer buffer;
     auto const [end, error] = std::to_chars(buffer.data(), buffer.data() + buffer.size(), value);
-    text.append(buffer.data(), end);
+    text.append(buffer.data(), static_cast<std::size_t>(end - buffer.data()));
 }
 
 std::string tableText(double value) {

@@ -36,18 +36,8 @@ std::string_view nodeTypeName(NodeType type) {
     return "";
 }
 
-std::string_view nodeClassName(NodeType type) {
-    switch (type) {
-    case NodeType::ObjectRoot:
-        return "KFChannelObjectRootBase";
-    case NodeType::Folder:
-        return "KFChannelFolder";
-    case NodeType::Double:
-        return "KFChannelDouble";
-    case NodeType::Angle:
-        return "KFChannelAngle";
-    }
-    return "";
+std::string nodeClassName(NodeType type) {
+    return "KFChannel" + std::string(nodeTypeName(type)) + (type == NodeType::ObjectRoot ? "Base" : "");
 }
 
 // --- Building ---

@@ -18,7 +18,7 @@ namespace lumenkey::tools {
 enum class NodeType { ObjectRoot, Folder, Double, Angle };
 
 std::string_view nodeTypeName(NodeType type);
-std::string_view nodeClassName(NodeType type);
+std::string nodeClassName(NodeType type);
 
 /// The channels of a file as a tree of the library, which it owns, and the names of its nodes.
 ///
