@@ -15,14 +15,6 @@ namespace {
 /// What a limit must lie within to count as one.
 constexpr double kUnlimited = 3.4028234663852886e38;
 
-KFChannelImpl* sharedOrCopied(KFChannelImpl* record) {
-    return record == nullptr || record->isShared() ? record : new KFChannelImpl(*record);
-}
-
-KFChannelInfo* sharedOrCopied(KFChannelInfo* record) {
-    return record == nullptr || record->shared ? record : new KFChannelInfo(*record);
-}
-
 std::unique_ptr<KFCurve> cloneOf(KFCurve* curve) {
     // What `KFCurve` and its classes clone is a `KFCurve` again.
     return std::unique_ptr<KFCurve>(curve == nullptr ? nullptr : static_cast<KFCurve*>(curve->cloneCurve()));
@@ -52,16 +44,16 @@ KFChannel::KFChannel(KFFactory* factory, BXString const& name, unsigned int id, 
 
 // A source's own local record isn't a prototype for the copy: it goes with the source.
 KFChannel::KFChannel(KFChannel const& other)
-    : KFChannelBase(nullptr, BXString(), nullptr, other.getID(), 0), _impl(sharedOrCopied(other._impl)),
+    : KFChannelBase(nullptr, BXString(), nullptr, other.getID(), 0), _impl(KFChannelImpl::sharedOrCopied(other._impl)),
       _prototypeImpl(other._prototypeImpl == other._impl ? _impl : other._prototypeImpl),
-      _info(sharedOrCopied(other._info)),
+      _info(KFChannelInfo::sharedOrCopied(other._info)),
       _prototypeInfo(other._prototypeInfo == other._info ? _info : other._prototypeInfo),
       _prototypeCurve(cloneOf(other._prototypeCurve.get())) {}
 
 KFChannel::KFChannel(KFChannel const& other, KFChannelFolder* parent)
-    : KFChannelBase(other, parent), _impl(sharedOrCopied(other._impl)),
+    : KFChannelBase(other, parent), _impl(KFChannelImpl::sharedOrCopied(other._impl)),
       _prototypeImpl(other._prototypeImpl == other._impl ? _impl : other._prototypeImpl),
-      _info(sharedOrCopied(other._info)),
+      _info(KFChannelInfo::sharedOrCopied(other._info)),
       _prototypeInfo(other._prototypeInfo == other._info ? _info : other._prototypeInfo),
       _prototypeCurve(cloneOf(other._prototypeCurve.get())) {}
 
@@ -116,7 +108,7 @@ void KFChannel::takeImplOf(KFChannel const& other) {
         freeLocalImpl();
         _impl = nullptr;
     } else if (_impl == nullptr) {
-        _impl = sharedOrCopied(source);
+        _impl = KFChannelImpl::sharedOrCopied(source);
     } else if (source->isShared() && !_impl->shouldKeepLocalCopy()) {
         freeLocalImpl();
         _impl = source;

@@ -34,6 +34,10 @@ bool KFChannelImpl::operator==(KFChannelImpl const& other) const {
 
 KFChannelImpl* KFChannelImpl::createLocalCopy() { return _shared ? new KFChannelImpl(*this) : this; }
 
+KFChannelImpl* KFChannelImpl::sharedOrCopied(KFChannelImpl* record) {
+    return record == nullptr || record->isShared() ? record : new KFChannelImpl(*record);
+}
+
 bool KFChannelImpl::shouldKeepLocalCopy() const {
     if (_shared || _curve == nullptr)
         return false;

@@ -43,6 +43,8 @@ public:
 
     /// This record when it isn't shared, else a new local copy, which the caller owns.
     KFChannelImpl* createLocalCopy();
+    /// For one channel more: a shared record (or null) itself, of a local one, which has one owner, a copy.
+    static KFChannelImpl* sharedOrCopied(KFChannelImpl* record);
     /// A local record whose curve holds processing nodes or knows its owner can't be given up for the shared one.
     bool shouldKeepLocalCopy() const;
     /// Assigns the source's curve to the one in use where both allow it, else takes a clone of it. Null frees the

@@ -26,6 +26,10 @@ KFChannelInfo& KFChannelInfo::operator=(KFChannelInfo const& other) {
 
 KFChannelInfo::~KFChannelInfo() = default;
 
+KFChannelInfo* KFChannelInfo::sharedOrCopied(KFChannelInfo* record) {
+    return record == nullptr || record->shared ? record : new KFChannelInfo(*record);
+}
+
 bool KFChannelInfo::operator==(KFChannelInfo const& other) const noexcept {
     return sliderMax == other.sliderMax && sliderMin == other.sliderMin && fineDelta == other.fineDelta &&
            coarseDelta == other.coarseDelta && scale == other.scale && offset == other.offset &&

@@ -19,6 +19,9 @@ public:
     KFChannelInfo& operator=(KFChannelInfo const& other);
     virtual ~KFChannelInfo();
 
+    /// For one channel more: a shared record (or null) itself, of a local one, which has one owner, a copy.
+    static KFChannelInfo* sharedOrCopied(KFChannelInfo* record);
+
     /// The six numbers exactly, the suffix and the transformer's name.
     bool operator==(KFChannelInfo const& other) const noexcept;
 

@@ -180,11 +180,16 @@ void KFChannel::offsetCurveSegmentSpeed(Handle h, double delta) {
 // --- Ranges ---
 
 void KFChannel::offsetKeyframesValuesInRange(Time from, Time to, Time t, double value) {
+    std::vector<Tempus> const times = keypointTimesInRange(from, to);
+    if (times.empty())
+        return;
     double const delta = value - getCurveValue(globalToLocalTime(t), true);
-    for (Tempus const& time : keypointTimesInRange(from, to)) {
-        void* const handle = keypointAt(time);
-        double old = 0.0;
-        if (getKeyframe(handle, nullptr, &old))
-            setKeyframeValue(handle, old + delta);
-    }
+    editKeyframes([&](KFCurve& c) { // on whose record the handles are looked up
+        for (Tempus const& time : times) {
+            void* const handle = keypointAt(time);
+            double old = 0.0;
+            if (c.getKeypoint(handle, nullptr, &old))
+                c.setKeypointValue(handle, old + delta, true);
+        }
+    });
 }

@@ -17,11 +17,8 @@ void* KFChannel::keypointAt(Tempus const& t) const {
     return curve().getKeypointHandle(globalToLocalTime(t), &handle) ? handle : nullptr;
 }
 
-bool KFChannel::hasKeypoints(unsigned int) const {
-    return _impl != nullptr && _impl->getCurve() != nullptr && curve().getNumberOfKeypoints() > 0;
-}
-
-bool KFChannel::hasMoreThanOneKeypoint() const { return curve().getNumberOfKeypoints() > 1; }
+bool KFChannel::hasKeypoints(unsigned int) const { return KFChannel::getNumberOfKeyframes() > 0; }
+bool KFChannel::hasMoreThanOneKeypoint() const { return KFChannel::getNumberOfKeyframes() > 1; }
 bool KFChannel::hasKeypointAt(Tempus const& t, unsigned int) const { return keypointAt(t) != nullptr; }
 bool KFChannel::allHaveKeypointsAt(Tempus const& t) const { return keypointAt(t) != nullptr; }
 unsigned int KFChannel::numberOfKeypointsAt(Tempus const& t) const { return keypointAt(t) != nullptr; }

@@ -1,7 +1,6 @@
 #include "lumenkey/Channels/KFVectorChannels.h"
 
 #include "lumenkey/Channels/KFChannelFactories.h"
-#include "lumenkey/curves/KFCurve.h"
 #include "lumenkey/splines/KFInterpolation.h"
 
 namespace {
@@ -10,15 +9,6 @@ enum ComponentID : unsigned int { kX = 1, kY = 2, kZ = 3 };
 
 BXString nameOf(ComponentID id) {
     return BXString(BXStringKey(id == kX ? "Channel X" : id == kY ? "Channel Y" : "Channel Z"));
-}
-
-// A local record has one owner.
-KFChannelImpl* another(KFChannelImpl* impl) {
-    return impl == nullptr || impl->isShared() ? impl : new KFChannelImpl(*impl);
-}
-
-KFChannelInfo* another(KFChannelInfo* info) {
-    return info == nullptr || info->shared ? info : new KFChannelInfo(*info);
 }
 
 /// What `setValue` needs so that the value behind the processing nodes becomes `target`.
@@ -47,37 +37,26 @@ void write(KFChannel& channel, Tempus const& t, bool on) { channel.setValue(t, o
 
 // Keypoints in curve time ------------------------------------------------------------------------------------
 
-void* keypointAt(KFChannel& channel, Tempus const& t) {
-    void* handle = nullptr;
-    KFCurve* const curve = channel.getCurveInterface();
-    return curve != nullptr && curve->getKeypointHandle(t, &handle) ? handle : nullptr;
-}
-
 /// On a local record, where handles are others than on the shared one. Null if locked or without a keypoint.
 void* keypointToEdit(KFChannel& channel, Tempus const& t) {
-    if (!channel.canModifyChannelData() || keypointAt(channel, t) == nullptr) {
+    if (!channel.canModifyChannelData() || channel.getKeyframe(t) == nullptr) {
         return nullptr;
     }
     channel.createLocalChannelImplementation();
-    return keypointAt(channel, t);
+    return channel.getKeyframe(t);
 }
 
 void flatten(KFChannel& channel, Tempus const& t) {
     if (void* const handle = keypointToEdit(channel, t)) {
-        KFCurve& curve = *channel.getCurveInterface();
-        curve.setKeypointOutputHandles(handle, 0.0, 0.0, true);
-        curve.setKeypointInputHandles(handle, 0.0, 0.0, true);
-        curve.breakKeypointHandles(handle, false, true);
+        channel.setKeyframeOutputTangents(handle, 0.0, 0.0, true);
+        channel.setKeyframeInputTangents(handle, 0.0, 0.0, true);
+        channel.setKeyframeTangentsBroken(handle, false);
     }
 }
 
 void setLinear(KFChannel& channel, Tempus const& t) {
-    if (keypointToEdit(channel, t) == nullptr) {
-        return;
-    }
-    channel.willBeModified(kModifyData);
-    if (void* const handle = keypointToEdit(channel, t)) { // the host may have changed the channel meanwhile
-        channel.getCurveInterface()->setKeypointInterpolation(handle, kKFInterpolationLinear, true);
+    if (void* const handle = keypointToEdit(channel, t)) {
+        channel.setKeyframeInterpolation(handle, kKFInterpolationLinear);
     }
 }
 
@@ -98,20 +77,14 @@ struct PathComponent {
 /// Keys the channel at its value if it has no keypoint there.
 PathComponent keyedComponent(KFChannel& channel, Tempus const& t) {
     PathComponent component{channel, 0.0};
-    if (void* const handle = keypointAt(channel, t)) {
-        channel.getCurveInterface()->getKeypoint(handle, nullptr, &component.value);
-    } else {
+    if (!channel.getKeyframe(channel.getKeyframe(t), nullptr, &component.value)) {
         component.value = channel.getCurveValue(t, true);
-        if (channel.canModifyChannelData()) {
-            channel.createLocalChannelImplementation();
-            channel.getCurveInterface()->setKeypoint(t, component.value, true);
-        }
+        channel.setKeyframe(t, component.value, true);
     }
-    KFCurve& curve = *channel.getCurveInterface();
     Neighbour& previous = component.previous;
     Neighbour& next = component.next;
-    previous.exists = curve.getPreviousKeypoint(t, &previous.t, &previous.value);
-    next.exists = curve.getNextKeypoint(t, &next.t, &next.value);
+    previous.exists = channel.getPreviousKeyframe(t, &previous.t, &previous.value);
+    next.exists = channel.getNextKeyframe(t, &next.t, &next.value);
     return component;
 }
 
@@ -139,13 +112,11 @@ void setHandleRise(KFChannel& channel, Tempus const& t, double rise) {
     if (handle == nullptr) {
         return;
     }
-    KFCurve& curve = *channel.getCurveInterface();
     double width = 0.0;
-    double unused = 0.0;
-    curve.getKeypointOutputHandles(handle, &width, &unused);
-    curve.setKeypointOutputHandles(handle, width, rise, true);
-    curve.getKeypointInputHandles(handle, &width, &unused);
-    curve.setKeypointInputHandles(handle, width, -rise, true);
+    channel.getKeyframeOutputTangents(handle, &width, nullptr, true);
+    channel.setKeyframeOutputTangents(handle, width, rise, true);
+    channel.getKeyframeInputTangents(handle, &width, nullptr, true);
+    channel.setKeyframeInputTangents(handle, width, -rise, true);
 }
 
 } // namespace
@@ -160,17 +131,19 @@ KFChannel2D::KFChannel2D(BXString const& xName, BXString const& yName, BXString 
                          KFChannelFolder* parent, unsigned int id, unsigned int flags, unsigned int capacity,
                          KFChannelImpl* impl, KFChannelInfo* info)
     : KFCompoundChannel(getKFChannel2D_FactoryBase(), name, parent, id, flags, false, capacity),
-      x(xName, this, kX, 0, impl, info), y(yName, this, kY, 0, another(impl), another(info)) {}
+      x(xName, this, kX, 0, impl, info),
+      y(yName, this, kY, 0, KFChannelImpl::sharedOrCopied(impl), KFChannelInfo::sharedOrCopied(info)) {}
 
 KFChannel2D::KFChannel2D(KFFactory* factory, BXString const& name, unsigned int id, unsigned int capacity,
                          KFChannelImpl* impl, KFChannelInfo* info)
     : KFCompoundChannel(factory, name, id, capacity), x(nameOf(kX), this, kX, 0, impl, info),
-      y(nameOf(kY), this, kY, 0, another(impl), another(info)) {}
+      y(nameOf(kY), this, kY, 0, KFChannelImpl::sharedOrCopied(impl), KFChannelInfo::sharedOrCopied(info)) {}
 
 KFChannel2D::KFChannel2D(KFFactory* factory, BXString const& name, KFChannelFolder* parent, unsigned int id,
                          unsigned int flags, unsigned int capacity, KFChannelImpl* impl, KFChannelInfo* info)
     : KFCompoundChannel(factory, name, parent, id, flags, false, capacity),
-      x(nameOf(kX), this, kX, 0, impl, info), y(nameOf(kY), this, kY, 0, another(impl), another(info)) {}
+      x(nameOf(kX), this, kX, 0, impl, info),
+      y(nameOf(kY), this, kY, 0, KFChannelImpl::sharedOrCopied(impl), KFChannelInfo::sharedOrCopied(info)) {}
 
 KFChannel2D::KFChannel2D(KFChannel2D const& other) : KFChannel2D(other, nullptr) {}
 
@@ -208,7 +181,7 @@ void KFChannel2D::deriveChannel(Tempus const& t) {
     bool const hasNext = pairUp(x, ofX.next, y, ofY.next);
     for (PathComponent const* component : {&ofX, &ofY}) {
         if (void* const handle = keypointToEdit(component->channel, t)) {
-            component->channel.getCurveInterface()->deriveKeypoint(handle);
+            component->channel.deriveKeyframe(handle);
         }
     }
     if (hasPrevious || hasNext) {
@@ -238,12 +211,12 @@ KFChannel3D::KFChannel3D(BXString const& name, KFChannelFolder* parent, unsigned
 KFChannel3D::KFChannel3D(KFFactory* factory, BXString const& name, unsigned int id, unsigned int capacity,
                          KFChannelImpl* impl, KFChannelInfo* info)
     : KFChannel2D(factory, name, id, capacity, impl, info),
-      z(nameOf(kZ), this, kZ, 0, another(impl), another(info)) {}
+      z(nameOf(kZ), this, kZ, 0, KFChannelImpl::sharedOrCopied(impl), KFChannelInfo::sharedOrCopied(info)) {}
 
 KFChannel3D::KFChannel3D(KFFactory* factory, BXString const& name, KFChannelFolder* parent, unsigned int id,
                          unsigned int flags, unsigned int capacity, KFChannelImpl* impl, KFChannelInfo* info)
     : KFChannel2D(factory, name, parent, id, flags, capacity, impl, info),
-      z(nameOf(kZ), this, kZ, 0, another(impl), another(info)) {}
+      z(nameOf(kZ), this, kZ, 0, KFChannelImpl::sharedOrCopied(impl), KFChannelInfo::sharedOrCopied(info)) {}
 
 KFChannel3D::KFChannel3D(KFChannel3D const& other) : KFChannel3D(other, nullptr) {}
 
@@ -296,15 +269,16 @@ KFChannelBool3D::KFChannelBool3D(BXString const& name, KFChannelFolder* parent, 
 KFChannelBool3D::KFChannelBool3D(KFFactory* factory, BXString const& name, unsigned int id,
                                  unsigned int capacity, KFChannelImpl* impl, KFChannelInfo* info)
     : KFCompoundChannel(factory, name, id, capacity), x(nameOf(kX), this, kX, 0, impl, info),
-      y(nameOf(kY), this, kY, 0, another(impl), another(info)),
-      z(nameOf(kZ), this, kZ, 0, another(impl), another(info)) {}
+      y(nameOf(kY), this, kY, 0, KFChannelImpl::sharedOrCopied(impl), KFChannelInfo::sharedOrCopied(info)),
+      z(nameOf(kZ), this, kZ, 0, KFChannelImpl::sharedOrCopied(impl), KFChannelInfo::sharedOrCopied(info)) {}
 
 KFChannelBool3D::KFChannelBool3D(KFFactory* factory, BXString const& name, KFChannelFolder* parent,
                                  unsigned int id, unsigned int flags, unsigned int capacity,
                                  KFChannelImpl* impl, KFChannelInfo* info)
     : KFCompoundChannel(factory, name, parent, id, flags, false, capacity),
-      x(nameOf(kX), this, kX, 0, impl, info), y(nameOf(kY), this, kY, 0, another(impl), another(info)),
-      z(nameOf(kZ), this, kZ, 0, another(impl), another(info)) {}
+      x(nameOf(kX), this, kX, 0, impl, info),
+      y(nameOf(kY), this, kY, 0, KFChannelImpl::sharedOrCopied(impl), KFChannelInfo::sharedOrCopied(info)),
+      z(nameOf(kZ), this, kZ, 0, KFChannelImpl::sharedOrCopied(impl), KFChannelInfo::sharedOrCopied(info)) {}
 
 KFChannelBool3D::KFChannelBool3D(KFChannelBool3D const& other) : KFChannelBool3D(other, nullptr) {}
 

@@ -15,30 +15,40 @@
 // Setting goes component by component, x first: each announces itself, obeys its own lock, and hands its write to the
 // compound while that is linked.
 
-class LUMENKEY_API KFChannel2D : public KFCompoundChannel {
-public:
-    static constexpr unsigned int kNumberOfComponents = 2;
+// The part that is alike in all of them.
+#define KF_VECTOR_CHANNEL_BODY(Channel, components)                                                          \
+public:                                                                                                      \
+    static constexpr unsigned int kNumberOfComponents = components;                                          \
+    Channel(BXString const& name, KFChannelFolder* parent, unsigned int id, unsigned int flags,              \
+            unsigned int capacity = components, KFChannelImpl* impl = nullptr,                               \
+            KFChannelInfo* info = nullptr);                                                                  \
+    Channel(KFFactory* factory, BXString const& name, unsigned int id, unsigned int capacity,                \
+            KFChannelImpl* impl = nullptr, KFChannelInfo* info = nullptr);                                   \
+    Channel(KFFactory* factory, BXString const& name, KFChannelFolder* parent, unsigned int id,              \
+            unsigned int flags, unsigned int capacity, KFChannelImpl* impl = nullptr,                        \
+            KFChannelInfo* info = nullptr);                                                                  \
+    Channel(Channel const& other);                                                                           \
+    Channel(Channel const& other, KFChannelFolder* parent);                                                  \
+    ~Channel() override;                                                                                     \
+    char const* getFacadeWrapperName() override;                                                             \
+    void copy(KFChannelBase const* other, bool silent) override;                                             \
+    KFChannelBase* clone() const override;                                                                   \
+    using KFCompoundChannel::setValue
 
-    KFChannel2D(BXString const& name, KFChannelFolder* parent, unsigned int id, unsigned int flags,
-                unsigned int capacity = kNumberOfComponents, KFChannelImpl* impl = nullptr,
-                KFChannelInfo* info = nullptr);
+class LUMENKEY_API KFChannel2D : public KFCompoundChannel {
+    KF_VECTOR_CHANNEL_BODY(KFChannel2D, 2);
     /// With names of its own for the components.
     KFChannel2D(BXString const& xName, BXString const& yName, BXString const& name, KFChannelFolder* parent,
                 unsigned int id, unsigned int flags, unsigned int capacity = kNumberOfComponents,
                 KFChannelImpl* impl = nullptr, KFChannelInfo* info = nullptr);
-    KFChannel2D(KFFactory* factory, BXString const& name, unsigned int id, unsigned int capacity,
-                KFChannelImpl* impl = nullptr, KFChannelInfo* info = nullptr);
-    KFChannel2D(KFFactory* factory, BXString const& name, KFChannelFolder* parent, unsigned int id,
-                unsigned int flags, unsigned int capacity, KFChannelImpl* impl = nullptr,
-                KFChannelInfo* info = nullptr);
-    KFChannel2D(KFChannel2D const& other);
-    KFChannel2D(KFChannel2D const& other, KFChannelFolder* parent);
-    ~KFChannel2D() override;
 
-    char const* getFacadeWrapperName() override;
-    void copy(KFChannelBase const* other, bool silent) override;
-    KFChannelBase* clone() const override;
-    using KFCompoundChannel::setValue;
+    /// Each component by itself, then the components are aligned: where one has a keypoint from curve time `a` to `b`
+    /// and the other has none, the other is keyed at its value. In the mode `KFCurve::kSimplifyToExtremes` what stays
+    /// instead are the keypoints in front of `a`, behind `b`, at both ends, and those where the path turns: where `y`
+    /// over `x` goes from rising to falling or back. The one behind a removed keypoint isn't looked at. Before that the
+    /// compound is keyed (`addKeypointAt`, so at what then are global times) where not all components have keypoints.
+    void simplify(Tempus const& a, Tempus const& b, Tempus const& step, double percent, unsigned int mode1,
+                  unsigned int mode2, bool clampToCoarse) override;
 
     // Slots behind those of KFCompoundChannel. In curve time, on x and y; a component that is locked or has no
     // keypoint at `t` stays as it is.
@@ -61,26 +71,8 @@ public:
 
 /// `flattenAtTime` and `setLinearAtTime` are for x and y alone here.
 class LUMENKEY_API KFChannel3D : public KFChannel2D {
-public:
-    static constexpr unsigned int kNumberOfComponents = 3;
-
-    KFChannel3D(BXString const& name, KFChannelFolder* parent, unsigned int id, unsigned int flags,
-                unsigned int capacity = kNumberOfComponents, KFChannelImpl* impl = nullptr,
-                KFChannelInfo* info = nullptr);
-    KFChannel3D(KFFactory* factory, BXString const& name, unsigned int id, unsigned int capacity,
-                KFChannelImpl* impl = nullptr, KFChannelInfo* info = nullptr);
-    KFChannel3D(KFFactory* factory, BXString const& name, KFChannelFolder* parent, unsigned int id,
-                unsigned int flags, unsigned int capacity, KFChannelImpl* impl = nullptr,
-                KFChannelInfo* info = nullptr);
-    KFChannel3D(KFChannel3D const& other);
-    KFChannel3D(KFChannel3D const& other, KFChannelFolder* parent);
-    ~KFChannel3D() override;
-
-    char const* getFacadeWrapperName() override;
-    void copy(KFChannelBase const* other, bool silent) override;
-    KFChannelBase* clone() const override;
-    using KFChannelFolder::simplify;
-    using KFCompoundChannel::setValue;
+    KF_VECTOR_CHANNEL_BODY(KFChannel3D, 3);
+    using KFChannel2D::simplify;
 
     /// The slot behind those of KFChannel2D: nothing here.
     virtual void simplify(double a, double b, double step, unsigned int mode, bool unused);
@@ -99,25 +91,7 @@ public:
 
 /// Three switches, such as one for each axis. A component is on where its value isn't 0.
 class LUMENKEY_API KFChannelBool3D : public KFCompoundChannel {
-public:
-    static constexpr unsigned int kNumberOfComponents = 3;
-
-    KFChannelBool3D(BXString const& name, KFChannelFolder* parent, unsigned int id, unsigned int flags,
-                    unsigned int capacity = kNumberOfComponents, KFChannelImpl* impl = nullptr,
-                    KFChannelInfo* info = nullptr);
-    KFChannelBool3D(KFFactory* factory, BXString const& name, unsigned int id, unsigned int capacity,
-                    KFChannelImpl* impl = nullptr, KFChannelInfo* info = nullptr);
-    KFChannelBool3D(KFFactory* factory, BXString const& name, KFChannelFolder* parent, unsigned int id,
-                    unsigned int flags, unsigned int capacity, KFChannelImpl* impl = nullptr,
-                    KFChannelInfo* info = nullptr);
-    KFChannelBool3D(KFChannelBool3D const& other);
-    KFChannelBool3D(KFChannelBool3D const& other, KFChannelFolder* parent);
-    ~KFChannelBool3D() override;
-
-    char const* getFacadeWrapperName() override;
-    void copy(KFChannelBase const* other, bool silent) override;
-    KFChannelBase* clone() const override;
-    using KFCompoundChannel::setValue;
+    KF_VECTOR_CHANNEL_BODY(KFChannelBool3D, 3);
 
     // At global time `t`; `input` goes to the processing nodes. Outputs may be null. As a vector, on is 1 and off 0.
     bool getX(Tempus const& t, double input) const;
@@ -137,3 +111,5 @@ public:
     KFChannelBool y;
     KFChannelBool z;
 };
+
+#undef KF_VECTOR_CHANNEL_BODY

@@ -38,19 +38,23 @@ std::array<double, 3> valuesAt(KFChannel3D const& point, std::int64_t t) {
     return values;
 }
 
-void* keypointAt(KFChannel& channel, std::int64_t t) {
-    void* handle = nullptr;
-    channel.getCurveInterface()->getKeypointHandle(s(t), &handle);
-    return handle;
-}
-
 /// Input time and value, output time and value.
 std::array<double, 4> handlesAt(KFChannel& channel, std::int64_t t) {
     std::array<double, 4> handles{};
-    KFCurve& curve = *channel.getCurveInterface();
-    curve.getKeypointInputHandles(keypointAt(channel, t), &handles[0], &handles[1]);
-    curve.getKeypointOutputHandles(keypointAt(channel, t), &handles[2], &handles[3]);
+    void* const keypoint = channel.getKeyframe(s(t));
+    channel.getKeyframeInputTangents(keypoint, &handles[0], &handles[1], true);
+    channel.getKeyframeOutputTangents(keypoint, &handles[2], &handles[3], true);
     return handles;
+}
+
+std::string keyedSeconds(KFChannel const& channel) {
+    std::string list;
+    for (void* const handle : channel.getKeyframes(false)) {
+        Tempus time;
+        channel.getKeyframe(handle, &time, nullptr);
+        list += std::to_string(time.value / time.timescale) + " ";
+    }
+    return list;
 }
 
 TEST(KFVectorChannels, ComponentsHaveTheirNamesAndIDs) {
@@ -144,71 +148,92 @@ TEST(KFVectorChannels, OffsetsReadEverythingBeforeTheFirstWrite) {
 TEST(KFVectorChannels, FlattensAndStraightensTheKeypointsOfXAndY) {
     RecordingRoot root;
     KFChannel3D point("s", &root, 1, 0);
-    std::array<KFChannel*, 3> const all{&point.x, &point.y, &point.z};
-    for (KFChannel* channel : all) {
+    for (KFChannel* channel : {static_cast<KFChannel*>(&point.x), static_cast<KFChannel*>(&point.y),
+                               static_cast<KFChannel*>(&point.z)}) {
         for (std::int64_t const t : {0, 1, 2}) {
-            channel->addKeypointAt(s(t));
+            channel->setKeyframe(s(t), 0.0, true);
         }
-        channel->getCurveInterface()->setKeypointOutputHandles(keypointAt(*channel, 1), 0.25, 3.0, true);
-        channel->getCurveInterface()->breakKeypointHandles(keypointAt(*channel, 1), true, true);
+        channel->setKeyframeTangentsBroken(channel->getKeyframe(s(1)), true);
+        channel->setKeyframeOutputTangents(channel->getKeyframe(s(1)), 0.25, 3.0, true);
     }
-    root.takeAnnounced();
-    auto const shape = [](KFChannel& channel) {
-        bool broken = false;
-        std::uint32_t type = 0;
-        channel.getCurveInterface()->areHandlesBroken(keypointAt(channel, 1), &broken);
-        channel.getCurveInterface()->getKeypointInterpolation(keypointAt(channel, 1), &type, nullptr);
-        return std::pair{broken, type};
-    };
-    auto const before = shape(point.z);
-    auto const handlesBefore = handlesAt(point.z, 1);
+    auto const isBroken = [](KFChannel& c) { return c.getKeyframeTangentsBroken(c.getKeyframe(s(1))); };
+    auto const type = [](KFChannel& c) { return c.getKeyframeInterpolation(c.getKeyframe(s(1))); };
+    auto const typeBefore = type(point.z);
+    auto const before = handlesAt(point.z, 1);
     point.y.lock(true, false);
-    root.takeAnnounced();
     point.flattenAtTime(s(1));
-    EXPECT_EQ(handlesAt(point.y, 1), handlesBefore);
+    EXPECT_EQ(handlesAt(point.y, 1), before);
     point.y.lock(false, false);
+    root.takeAnnounced();
     point.flattenAtTime(s(1));
     point.flattenAtTime(s(7)); // no keypoint
-    root.takeAnnounced();
     point.setLinearAtTime(s(7));
     EXPECT_TRUE(root.takeAnnounced().empty());
     EXPECT_EQ(handlesAt(point.x, 1), (std::array{0.0, 0.0, 0.0, 0.0}));
     EXPECT_EQ(handlesAt(point.y, 1), (std::array{0.0, 0.0, 0.0, 0.0}));
-    EXPECT_FALSE(shape(point.x).first);
+    EXPECT_TRUE(!isBroken(point.x) && isBroken(point.z));
     point.setLinearAtTime(s(1));
     EXPECT_FALSE(root.takeAnnounced().empty());
-    EXPECT_EQ(shape(point.y).second, kKFInterpolationLinear);
-    EXPECT_EQ(shape(point.z), before);
-    EXPECT_EQ(handlesAt(point.z, 1), handlesBefore);
-    EXPECT_EQ(point.x.getNumberOfKeyframes(), 3U);
+    EXPECT_TRUE(type(point.y) == kKFInterpolationLinear && type(point.z) == typeBefore);
+    EXPECT_EQ(handlesAt(point.z, 1), before);
+    EXPECT_EQ(keyedSeconds(point.x), "0 1 2 ");
 }
 
 TEST(KFVectorChannels, DerivesHandlesAlongThePath) {
     for (auto const& [hasPrevious, hasNext] : {std::pair{true, true}, {true, false}, {false, true}}) {
         KFChannel2D plane("p", nullptr, 1, 0);
         plane.setIsSpline(true);
-        auto const key = [](KFChannel& channel, std::int64_t t, double value) {
-            channel.createLocalChannelImplementation();
-            channel.getCurveInterface()->setKeypoint(s(t), value, true);
-        };
         plane.y.setInitialValue(4.0, true);
         if (hasPrevious) {
-            key(plane.x, 0, -6.0);
+            plane.x.setKeyframe(s(0), -6.0, true);
         }
-        key(plane.x, 1, 3.0);
+        plane.x.setKeyframe(s(1), 3.0, true);
         if (hasNext) {
-            key(plane.x, 3, 18.0);
+            plane.x.setKeyframe(s(3), 18.0, true);
         }
         plane.deriveChannel(s(1)); // keys y, which has no other keypoint
         EXPECT_EQ(plane.y.getCurveValue(s(1), true), 4.0);
         double const rise = hasPrevious && hasNext ? 4.0 : hasPrevious ? 3.0 : 5.0;
-        ASSERT_NE(keypointAt(plane.y, 1), nullptr);
+        ASSERT_EQ(keyedSeconds(plane.y), "1 ");
         auto const ofX = handlesAt(plane.x, 1);
         auto const ofY = handlesAt(plane.y, 1);
         EXPECT_NEAR(ofX[1], -rise, 1e-12);
         EXPECT_NEAR(ofX[3], rise, 1e-12);
         EXPECT_TRUE(ofY[1] == 0.0 && ofY[3] == 0.0);
     }
+}
+
+TEST(KFVectorChannels, SimplifyingKeepsTheKeypointsWhereThePathTurns) {
+    for (bool const inRange : {true, false}) {
+        RecordingRoot root;
+        KFChannel2D plane("p", &root, 1, 0);
+        for (int t = 0; t < 7; ++t) {
+            plane.x.setKeyframe(s(t), t, false);
+            if (t != 5) { // which is keyed by the way
+                plane.y.setKeyframe(s(t), t < 4 ? t : 6 - t, false);
+            }
+        }
+        plane.y.setKeyframe(s(9), 0.0, false); // x is keyed there, too
+        plane.simplify(inRange ? s(0) : s(3), s(4), s(1), 1.0, KFCurve::kSimplifyToExtremes, 0, false);
+        // 1 goes, so 2 isn't looked at; 3 is where the path turns.
+        EXPECT_EQ(keyedSeconds(plane.x), inRange ? "0 2 3 5 6 9 " : "0 1 2 3 5 6 9 ");
+        EXPECT_EQ(keyedSeconds(plane.y), keyedSeconds(plane.x));
+    }
+}
+
+TEST(KFVectorChannels, SimplifyingLeavesBothComponentsWithTheSameKeypoints) {
+    RecordingRoot root;
+    root.setTimeOffset(s(10), true);
+    KFChannel2D plane("p", &root, 1, 0);
+    for (int const t : {0, 3, 6}) {
+        plane.x.setKeyframe(s(t), t % 2, false);
+    }
+    for (int const t : {0, 2, 6}) {
+        plane.y.setKeyframe(s(t), t % 4, false);
+    }
+    plane.simplify(s(0), s(6), s(1), 0.0, 0, 0, false); // none lies in this range of global time
+    EXPECT_EQ(keyedSeconds(plane.x), "0 2 3 6 ");
+    EXPECT_EQ(keyedSeconds(plane.y), "0 2 3 6 ");
 }
 
 TEST(KFVectorChannels, SwitchesReadBackAsTheyWereSet) {
