@@ -44,7 +44,8 @@ KFChannel::KFChannel(KFFactory* factory, BXString const& name, unsigned int id, 
 
 // A source's own local record isn't a prototype for the copy: it goes with the source.
 KFChannel::KFChannel(KFChannel const& other)
-    : KFChannelBase(nullptr, BXString(), nullptr, other.getID(), 0), _impl(KFChannelImpl::sharedOrCopied(other._impl)),
+    : KFChannelBase(nullptr, BXString(), nullptr, other.getID(), 0),
+      _impl(KFChannelImpl::sharedOrCopied(other._impl)),
       _prototypeImpl(other._prototypeImpl == other._impl ? _impl : other._prototypeImpl),
       _info(KFChannelInfo::sharedOrCopied(other._info)),
       _prototypeInfo(other._prototypeInfo == other._info ? _info : other._prototypeInfo),

@@ -63,6 +63,11 @@ void callAs(void* object, unsigned int slot, Arguments... arguments) {
     table[slot](object, arguments...);
 }
 
+template <class Result> void callInto(Result& result, void* object, unsigned int slot) {
+    using Operation = Result* (*)(Result*, void*);
+    (*static_cast<Operation* const*>(object))[slot](&result, object);
+}
+
 Tempus const zero = kTempusZero;
 
 HostRoot root;
@@ -70,15 +75,6 @@ HostChannel channel;
 HostNode node;
 
 PluginInterface makeInterface() {
-    PluginInterface made;
-    made.lastAsked = &lastAsked;
-    made.root = &root;
-    made.channel = &channel;
-    made.makeNode = [] { return static_cast<KFCurveNode*>(new HostNode()); };
-    auto const add = [&made](char const* name, unsigned int slot, void* object,
-                             void (*call)(void*, unsigned int)) {
-        made.slots.push_back({name, slot, object, call});
-    };
     auto const onNothing = [](void* object, unsigned int slot) { callAs<void>(object, slot); };
     auto const onPointers = [](void* object, unsigned int slot) {
         callAs<bool, void*, void*>(object, slot, nullptr, nullptr);
@@ -86,51 +82,51 @@ PluginInterface makeInterface() {
     auto const onKind = [](void* object, unsigned int slot) {
         callAs<void, unsigned int>(object, slot, kModifyData);
     };
+    // A result in memory: its address comes first.
     auto const answersTime = [](void* object, unsigned int slot) {
-        // A result in memory: its address comes first.
         Tempus result;
-        using Operation = Tempus* (*)(Tempus*, void*);
-        (*static_cast<Operation* const*>(object))[slot](&result, object);
+        callInto(result, object, slot);
+    };
+    auto const answersRange = [](void* object, unsigned int slot) {
+        BXTimeRange result;
+        callInto(result, object, slot);
+    };
+    auto const movesKeyframe = [](void* object, unsigned int slot) {
+        callAs<bool, void*, Tempus const*, bool, bool>(object, slot, nullptr, &zero, false, false);
+    };
+    auto const solves = [](void* object, unsigned int slot) {
+        callAs<double, Tempus const*, double, double>(object, slot, &zero, 0.0, 1.0);
+    };
+    auto const asksForTimes = [](void* object, unsigned int slot) {
+        callAs<bool, double, void*, void*, void*, unsigned>(object, slot, 0, nullptr, nullptr, nullptr, 0);
     };
 
-    // KFChannelBase, with the destructors as slots 0 and 1.
-    add("getInstanceID", 7, &root, onNothing);
-    add("finishInitializing", 10, &root, onNothing);
-    add("copy", 29, &root, onPointers);
-    add("getTimeOffset", 40, &root, answersTime);
-    add("willBeModified", 58, &channel, onKind);
-    add("hasBeenModified", 59, &root, onPointers);
-    add("hasKeypoints", 69, &root, onKind);
-    add("shouldIgnoreDynamicIDs", 87, &root, onNothing);
-    // KFChannelFolder and KFChannelObjectRootBase.
-    add("resetTimeIndependentFlagIfNeeded", 88, &root, onPointers);
-    add("getTimeExtent", 89, &root, [](void* object, unsigned int slot) {
-        BXTimeRange result;
-        using Operation = BXTimeRange* (*)(BXTimeRange*, void*);
-        (*static_cast<Operation* const*>(object))[slot](&result, object);
-    });
-    add("willModifyChannel", 97, &root, onPointers);
-    add("checkSolo", 99, &root, onNothing);
-    add("getFrameDuration", 110, &root, answersTime);
-    // KFChannel.
-    add("parentWillBeModified", 88, &channel, onKind);
-    add("getSliderMax", 101, &channel, onNothing);
-    add("getNumberOfKeyframes", 104, &channel, onNothing);
-    add("moveKeyframe", 105, &channel, [](void* object, unsigned int slot) {
-        callAs<bool, void*, Tempus const*, bool, bool>(object, slot, nullptr, &zero, false, false);
-    });
-    // KFCurveNode.
-    add("solveNode", 2, &node, [](void* object, unsigned int slot) {
-        callAs<double, Tempus const*, double, double>(object, slot, &zero, 0.0, 1.0);
-    });
-    add("getUForValue", 4, &node, [](void* object, unsigned int slot) {
-        callAs<bool, double, void*, void*, void*, std::uint32_t>(object, slot, 0.0, nullptr, nullptr, nullptr,
-                                                                 0);
-    });
-    add("compare", 17, &node, onPointers);
-    add("isPointToPoint", 22, &node, onNothing);
-    add("reset", 25, &node, onNothing);
-    return made;
+    // The destructors of channels are slots 0 and 1.
+    std::vector<PluginSlot> const slots = {
+        {"getInstanceID", 7, &root, onNothing},
+        {"finishInitializing", 10, &root, onNothing},
+        {"copy", 29, &root, onPointers},
+        {"getTimeOffset", 40, &root, answersTime},
+        {"willBeModified", 58, &channel, onKind},
+        {"hasBeenModified", 59, &root, onPointers},
+        {"hasKeypoints", 69, &root, onKind},
+        {"shouldIgnoreDynamicIDs", 87, &root, onNothing},
+        {"resetTimeIndependentFlagIfNeeded", 88, &root, onPointers},
+        {"getTimeExtent", 89, &root, answersRange},
+        {"willModifyChannel", 97, &root, onPointers},
+        {"checkSolo", 99, &root, onNothing},
+        {"getFrameDuration", 110, &root, answersTime},
+        {"parentWillBeModified", 88, &channel, onKind},
+        {"getSliderMax", 101, &channel, onNothing},
+        {"getNumberOfKeyframes", 104, &channel, onNothing},
+        {"moveKeyframe", 105, &channel, movesKeyframe},
+        {"solveNode", 2, &node, solves},
+        {"getUForValue", 4, &node, asksForTimes},
+        {"compare", 17, &node, onPointers},
+        {"isPointToPoint", 22, &node, onNothing},
+        {"reset", 25, &node, onNothing},
+    };
+    return {slots, &lastAsked, &root, &channel, [] { return static_cast<KFCurveNode*>(new HostNode()); }};
 }
 
 } // namespace
