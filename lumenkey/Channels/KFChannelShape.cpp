@@ -6,6 +6,7 @@
 #include "lumenkey/curves/KFCurve.h"
 
 #include <algorithm>
+#include <cmath>
 
 namespace {
 

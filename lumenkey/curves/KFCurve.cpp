@@ -105,8 +105,7 @@ namespace {
 template <class Value> void change(KFCurve& curve, BXRelaxed<Value> KFSplineState::*setting, Value value) {
     if ((curve.settings().*setting).get() == value)
         return;
-    if (KFSplineState* const local = curve.createLocalSplineState(); local != nullptr)
-        local->*setting = value;
+    curve.createLocalSplineState()->*setting = value;
 }
 
 template <class Value> bool answer(Value* out, Value value) {

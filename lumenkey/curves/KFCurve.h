@@ -32,6 +32,9 @@ public:
     static constexpr std::uint32_t kRootConstant = 0;
     static constexpr std::uint32_t kRootSpline = 1;
 
+    /// On a curve that isn't parametric a handle is this many times the tangent that the spline stores.
+    static constexpr double kHandleScale = 12.0;
+
     /// Modes of `simplifyCurve`.
     static constexpr std::uint32_t kSimplifyByFit = 2;
     static constexpr std::uint32_t kSimplifyToExtremes = 4;
@@ -128,7 +131,9 @@ public:
     // for an end before the start, and in baking for a scale of 0 or that isn't finite and a node that isn't in the
     // chain. A stretch is cut into the whole steps that fit, so that its very end is no sample; the fit is that of
     // `BXCurveFit`, and what it gives are Bezier keypoints, whatever type those before had. Samples that aren't finite
-    // are left out of it. Locked keypoints stay. Where nothing fits, the stretch is left without keypoints.
+    // are left out of it. A keypoint for the first one stands exactly there, others at the nearest tick of
+    // `kKFChannelTimescale` (of the step, in `simplifyCurve`). Locked keypoints keep time and value. Where nothing
+    // fits, the stretch is left without keypoints.
     //
     // `bakeCurve` replaces the keypoints after `start` up to `end` by what the chain up to `node` gives (null: the
     // root), `tolerance` being hundredths of the curve's unit times `scale`. All keypoints of the curve become Bezier,
@@ -430,7 +435,9 @@ private:
     std::unique_ptr<KFCurveNode> takeOutNode(KFCurveNode const* node);
     void writeConstant(Tempus const& t, double clampedValue);
     void writeAt(Tempus const& t, double value, bool mayAdd, bool withTangents);
-    void writeSegment(Tempus const& t, double value, double low, double high, bool keepShape);
+    /// The limits hold for the vertices that move, all or the two around `t`; `keepShape` moves them alike.
+    void offsetRoot(Tempus const& t, double value, double low, double high, bool neighboursOnly,
+                    bool keepShape);
     bool settleAfterDeletion();
     bool readFlag(void* handle, std::uint32_t flag, bool* out) const;
     double handleScale() const;

@@ -9,9 +9,6 @@
 
 namespace {
 
-/// Of curves that aren't parametric paths: a handle is this many times the stored tangent.
-constexpr double kHandleScale = 12.0;
-
 bool writeFlag(KFSpline* spline, void* handle, std::uint32_t flag, bool on) {
     return spline != nullptr &&
            (on ? spline->setVertexFlag(handle, flag) : spline->resetVertexFlag(handle, flag));
@@ -55,8 +52,8 @@ bool givePointTangents(KFSpline* spline, PointTangents tangents, Tempus const& t
                        bool scaled) {
     if (!underLock(spline, [&](KFSpline& s) { return (s.*tangents)(t, dt, dv, kTempusZero); }))
         return false;
-    multiply(dt, scaled ? kHandleScale : 1.0);
-    multiply(dv, scaled ? kHandleScale : 1.0);
+    multiply(dt, scaled ? KFCurve::kHandleScale : 1.0);
+    multiply(dv, scaled ? KFCurve::kHandleScale : 1.0);
     return true;
 }
 

@@ -1,5 +1,5 @@
 // Operations that this curve refuses: it takes part in no takes, follows no dynamic curve and stores nothing of itself.
-// Each answers false and changes nothing.
+// None changes anything, and those with an answer give false.
 
 #include "lumenkey/curves/KFCurve.h"
 

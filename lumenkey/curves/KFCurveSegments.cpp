@@ -11,7 +11,7 @@ bool KFCurve::createCurveSegment(Tempus const& a, Tempus const& b, Tempus const&
 
 bool KFCurve::setCurveSegmentValue(Tempus const& t, double value, bool force) {
     if (canModifyCurve(force))
-        writeSegment(t, clamped(value), _minValue, _maxValue, false);
+        offsetRoot(t, clamped(value), _minValue, _maxValue, true, false);
     return true;
 }
 
@@ -20,21 +20,8 @@ bool KFCurve::setCurveSegmentValueBounded(Tempus const& t, double value, double 
     if (!canModifyCurve(force))
         return true;
     double const bounded = value > high ? high : value < low ? low : value;
-    writeSegment(t, isSpline() ? bounded : clamped(value), low, high, true);
+    offsetRoot(t, isSpline() ? bounded : clamped(value), low, high, true, true);
     return true;
-}
-
-/// The limits hold for the two vertices around `t`; `keepShape` moves both alike.
-void KFCurve::writeSegment(Tempus const& t, double value, double low, double high, bool keepShape) {
-    KFSpline* const spline = getSpline();
-    if (!isSpline()) {
-        writeConstant(kTempusZero, value);
-    } else if (spline != nullptr && spline->getNumberOfVertices() > 0) {
-        spline->offsetSpline(t, value, high, low, true, keepShape, kTempusZero);
-    } else {
-        // A spline without vertices has no segment: it is the node's constant that is read.
-        _splineNode.storeValue(value);
-    }
 }
 
 std::uint32_t KFCurve::generateKeypoints(std::uint32_t side, std::uint32_t cycles, bool force) {

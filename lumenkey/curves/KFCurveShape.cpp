@@ -17,8 +17,6 @@ using Point = BXVector2<double>;
 
 /// Where no more than one step fits, a stretch is cut into so many.
 constexpr std::int64_t kSamplesOfShortStretch = 1000;
-/// Handles as a curve gives them are so many times the tangents that the spline stores.
-constexpr double kHandleScale = 12.0;
 /// Slopes that differ by less are the same line.
 constexpr double kSlopeTolerance = 1e-7;
 
@@ -42,6 +40,7 @@ struct FitUnits {
     double scale; // the fit's values are the curve's times this
 
     double seconds() const { return TempusGetSeconds(time); }
+    double of(Tempus const& u) const { return TempusGetSeconds(u) / seconds(); }
 };
 
 bool canBeCut(Tempus const& start, Tempus const& end, Tempus const& step) {
@@ -79,24 +78,27 @@ bool sampleRoot(KFCurve& curve, Tempus const& end, bool finely, Row& row) {
 /// The fit begins and ends at the first and last finite sample, bit for bit.
 std::vector<Point> fit(Row const& row, FitUnits const& units, double tolerance) {
     std::vector<Point> points(row.values.size());
-    double const unit = units.seconds();
     for (std::size_t i = 0; i < points.size(); ++i)
-        points[i] = {TempusGetSeconds(row.timeOf(i)) / unit, row.values[i] * units.scale};
+        points[i] = {units.of(row.timeOf(i)), row.values[i] * units.scale};
     std::vector<Point> fitted;
     BXCurveFit::getInstance().FitCurve(points, fitted, tolerance);
     return fitted;
 }
 
 /// Keypoint, out-handle, in-handle, keypoint, ..., keypoint. They are Bezier whatever the settings of the curve: the
-/// fit is good for no other type.
-void placeFitted(KFSpline& spline, std::vector<Point> const& fitted, FitUnits const& units) {
+/// fit is good for no other type. The first sample's time isn't rounded: a keypoint may have stayed there, and a second
+/// one a tick beside it would leave the old value in the curve.
+void placeFitted(KFSpline& spline, std::vector<Point> const& fitted, Row const& row, FitUnits const& units) {
     auto const handle = [&units](Point const& from, Point const& to) {
         Point const way = to - from;
-        return Point{way.x * units.seconds() / kHandleScale, way.y / kHandleScale / units.scale};
+        return Point{way.x * units.seconds() / KFCurve::kHandleScale,
+                     way.y / KFCurve::kHandleScale / units.scale};
     };
     for (std::size_t k = 0; k < fitted.size(); k += 3) {
         Point const& keypoint = fitted[k];
-        Tempus const u = KFChronoForChannelSeconds(keypoint.x, kKFChannelTimescale) * units.time;
+        Tempus const u = keypoint.x == units.of(row.start)
+                             ? row.start
+                             : KFChronoForChannelSeconds(keypoint.x, kKFChannelTimescale) * units.time;
         void* const vertex = spline.addVertexNoTangents(u, keypoint.y / units.scale, kTempusZero, true);
         std::uint32_t flags = 0;
         if (spline.getVertexFlags(vertex, &flags) && (flags & kKFVertexFlagLocked) == 0)
@@ -165,20 +167,22 @@ bool refit(KFCurve& curve, Tempus const& start, Tempus const& end, Tempus const&
     FitUnits const units{step, 1.0};
     std::vector<Point> const fitted = fit(row, units, tolerance);
     deleteStretch(*curve.getSpline(), start, end);
-    placeFitted(*curve.getSpline(), fitted, units);
+    placeFitted(*curve.getSpline(), fitted, row, units);
     return true;
 }
 
-void addVertexOnCurve(KFSpline& spline, Tempus const& u) {
+/// Returns the value there.
+double addVertexOnCurve(KFSpline& spline, Tempus const& u) {
+    double const value = spline.getVertexValue(u, kTempusZero, true);
     if (!spline.getVertexHandle(u, nullptr, true))
-        spline.addVertex(u, spline.getVertexValue(u, kTempusZero, true), kTempusZero, true);
+        spline.addVertex(u, value, kTempusZero, true);
+    return value;
 }
 
 /// Deletes vertices of straight lines, but for the ends of the stretch.
 void deleteCollinear(KFSpline& spline, Tempus const& start, Tempus const& end) {
     Tempus anchorTime = start;
-    double anchorValue = spline.getVertexValue(start, kTempusZero, true);
-    addVertexOnCurve(spline, start);
+    double anchorValue = addVertexOnCurve(spline, start);
     void* present = nullptr;
     void* next = nullptr;
     spline.getNextValidVertexWithLock(start, &present, kTempusZero, false);
@@ -245,7 +249,7 @@ bool KFCurve::bakeCurve(void* node, Tempus const& start, Tempus const& step, Tem
     KFSpline& spline = *splineForNewKeypoints();
     spline.deleteVertices(start, end);
     spline.setInterpolation(kKFInterpolationBezier);
-    placeFitted(spline, fitted, units);
+    placeFitted(spline, fitted, row, units);
     return true;
 }
 

@@ -145,17 +145,21 @@ bool KFCurve::setKeypointValue(void* handle, double value, bool force) {
 
 // --- The whole curve ---
 
-bool KFCurve::setCurveOffset(Tempus const& t, double value) {
-    double const stored = clamped(value);
+void KFCurve::offsetRoot(Tempus const& t, double value, double low, double high, bool neighboursOnly,
+                         bool keepShape) {
     KFSpline* const spline = getSpline();
     if (!isSpline()) {
-        writeConstant(kTempusZero, stored);
+        writeConstant(kTempusZero, value);
     } else if (spline != nullptr && spline->getNumberOfVertices() > 0) {
-        spline->offsetSpline(t, stored, _maxValue, _minValue, false, false, kTempusZero);
+        spline->offsetSpline(t, value, high, low, neighboursOnly, keepShape, kTempusZero);
     } else {
         // A spline without vertices has nothing to offset: it is the node's constant that is read.
-        _splineNode.storeValue(stored);
+        _splineNode.storeValue(value);
     }
+}
+
+bool KFCurve::setCurveOffset(Tempus const& t, double value) {
+    offsetRoot(t, clamped(value), _minValue, _maxValue, false, false);
     return true;
 }
 
