@@ -1,7 +1,9 @@
 // What a channel does around its curve's operations on a stretch: lock, announcement, time, tolerance.
 
+#include "lumenkey/Channels/KFChannelImpl.h"
 #include "lumenkey/Channels/KFScalarChannels.h"
 #include "lumenkey/curves/KFCurve.h"
+#include "lumenkey/splines/KFSplineState.h"
 #include "tests/Channels/AddingNode.h"
 #include "tests/Channels/RecordingRoot.h"
 
@@ -11,74 +13,99 @@ namespace {
 
 Tempus s(double t) { return KFChronoForChannelSeconds(t, 600); }
 
-struct ChannelShape : testing::Test, RecordingRoot {
-    KFChannelDouble channel{0.0, "Value", this, 7, 0};
-    bool affected = false;
-
-    ChannelShape() {
-        setTimeOffset(s(10), true);
-        for (int i = 0; i <= 4; ++i)
-            channel.setKeyframe(s(i), i == 3 ? 9.0 : i, true);
-        takeAnnounced();
-    }
+struct AffectedRoot : RecordingRoot {
     bool isChannelAffectedByBehaviors(KFChannelBase const*, bool selectedOnly) const override {
         return affected && selectedOnly;
     }
-    bool bakeAnnounces() {
-        channel.bake({s(10), s(2)}, s(1));
-        return !takeAnnounced().empty();
+    bool affected = true;
+};
+
+struct ChannelShape : testing::Test {
+    AffectedRoot root;
+    KFChannelDouble channel{0.0, "Value", &root, 7, 0};
+    BXTimeRange const range{s(10), s(2)};
+
+    ChannelShape() {
+        channel.createLocalChannelImplementation(); // the shared curve stays as it is
+        root.setTimeOffset(s(10), true);
+        for (int i = 0; i <= 4; ++i)
+            curve().setKeypoint(s(i), i == 3 ? 9.0 : i, true);
+        root.takeAnnounced();
     }
+    KFCurve& curve() { return *channel.getCurveInterface(); }
+    unsigned keypoints() { return channel.getNumberOfKeyframes(); }
 };
 
 } // namespace
 
 TEST_F(ChannelShape, BakesTheNodesInTheRootsFrames) {
+    channel.bake(range, s(1));
+    EXPECT_TRUE(root.takeAnnounced().empty()); // no nodes
     auto* const node = new AddingNode(100.0);
     channel.appendCurveProcessingNode(node);
-    EXPECT_FALSE(bakeAnnounces());
-    affected = true;
-    frameDuration = TempusMake(1, 10);
-    EXPECT_TRUE(bakeAnnounces());
+    root.affected = false;
+    channel.bake(range, s(1));
+    EXPECT_TRUE(root.takeAnnounced().empty());
+
+    root.affected = true;
+    root.frameDuration = TempusMake(1, 10);
+    channel.bake(range, s(1));
+    EXPECT_EQ(root.takeAnnounced().size(), 1U);
+    EXPECT_FALSE(curve().getSplineState()->sanitizeBezier);
     channel.deleteCurveProcessingNode(node);
     for (double const t : {0.0, 0.7, 1.5, 1.9})
         EXPECT_NEAR(channel.getValueAsDouble(s(10 + t), 0.0), 100.0 + t, 0.02) << t;
+    EXPECT_EQ(channel.getValueAsDouble(s(13), 0.0), 9.0);
     EXPECT_FALSE(channel.hasKeypointAt(s(12), 0)); // the last frame is the one before
-    EXPECT_FALSE(bakeAnnounces());                 // no nodes
+
+    channel.lock(true, false);
+    channel.appendCurveProcessingNode(new AddingNode(1.0));
+    root.takeAnnounced();
+    channel.bake(range, s(1));
+    EXPECT_TRUE(root.takeAnnounced().empty());
 }
 
 TEST_F(ChannelShape, SimplifiesInGlobalTime) {
     channel.simplify(s(10), s(14), s(1), 1.0, 4, 0, false);
-    EXPECT_EQ(takeAnnounced().size(), 1U);
-    EXPECT_EQ(channel.getNumberOfKeyframes(), 3U);
+    EXPECT_EQ(root.takeAnnounced().size(), 1U);
+    EXPECT_EQ(keypoints(), 3U);
+    EXPECT_TRUE(channel.hasKeypointAt(s(13), 0));
+    channel.reduceKeyframes(s(0), s(4), s(1), 1.0, 1.0, 4, 0);
     channel.smoothKeyframes(s(0), s(4), TempusMake(1, 2));
-    EXPECT_EQ(channel.getNumberOfKeyframes(), 8U);
-    EXPECT_TRUE(takeAnnounced().empty());
+    EXPECT_EQ(keypoints(), 8U);
+    EXPECT_TRUE(root.takeAnnounced().empty());
     channel.lock(true, false);
     channel.simplify(s(10), s(14), s(1), 1.0, 4, 0, false);
-    channel.reduceKeyframes(s(0), s(4), s(1), 1.0, 1.0, 4, 0);
-    EXPECT_EQ(channel.getNumberOfKeyframes(), 8U);
+    channel.smoothKeyframes(s(0), s(4), s(1));
+    EXPECT_EQ(keypoints(), 8U);
 }
 
 TEST_F(ChannelShape, SegmentsAndTheWholeCurve) {
-    KFCurve& curve = *channel.getCurveInterface();
     channel.setSliderMax(5.0);
     channel.setCurveSegmentValue(s(1.5), 50.0, true);
     EXPECT_NEAR(channel.getCurveValue(s(1.5), false), 4.5,
-                1e-9); // the upper of both reaches the slider's end
+                1e-9); // the upper of the two reaches the slider's end
+    channel.setCurveSegmentValue(s(1.5), 50.0, false);
+    EXPECT_NEAR(channel.getCurveValue(s(1.5), false), 50.0, 1e-9);
     channel.setExtrapolation(3, 0);
     channel.generateKeys(0, 1);
-    EXPECT_GT(channel.getNumberOfKeyframes(), 5U);
-    frameDuration = TempusMake(1, 24);
+    EXPECT_GT(keypoints(), 5U);
+    root.frameDuration = TempusMake(1, 24);
     channel.setUseRetimingExtrapolation(true);
-    EXPECT_TRUE(curve.getRetimingExtrapolation() && curve.getFrameDuration() == frameDuration);
+    EXPECT_TRUE(curve().getRetimingExtrapolation());
+    EXPECT_EQ(curve().getFrameDuration(), root.frameDuration);
+    channel.setUseRetimingExtrapolation(false);
     channel.closeParametricCurve();
     bool closed = false;
-    EXPECT_TRUE(curve.isClosedCurve(&closed) && closed);
-    channel.resetCurve();
-    EXPECT_EQ(channel.getNumberOfKeyframes(), 0U);
-    EXPECT_TRUE(channel.createCurveSegment(s(1), s(2), TempusMake(1, 2), false));
+    EXPECT_TRUE(curve().isClosedCurve(&closed) && closed);
     channel.reparametrizeChannel();
-    EXPECT_EQ(channel.getKeyframeMaxTime(), s(3)); // of the fourth keypoint
+    EXPECT_TRUE(curve().getCurrentMaxValueU(nullptr));
+    channel.resetCurve();
+    EXPECT_EQ(keypoints(), 0U);
+    EXPECT_EQ(channel.getValueAsDouble(s(11), 0.0), 0.0);
+    EXPECT_TRUE(channel.createCurveSegment(s(1), s(2), TempusMake(1, 2), false));
+    EXPECT_EQ(keypoints(), 4U);
     channel.lock(true, false);
     EXPECT_FALSE(channel.createCurveSegment(s(11), s(12), TempusMake(1, 2), false));
+    EXPECT_EQ(keypoints(), 4U);
 }

@@ -384,6 +384,22 @@ TEST(KFSplineStore, KeepsItsOrderThroughRandomEdits) {
     }
 }
 
+// Thinned blocks join those behind them, in the middle of a long spline too.
+TEST(KFSplineStore, FindsWhatDeletionsLeave) {
+    MuseumSpline curve;
+    for (int i = 0; i < 4000; ++i) {
+        curve->appendVertexNoTangents(TempusMake(i, 1), i, kTempusZero);
+    }
+    for (int i = 1500; i > 500; --i) {
+        ASSERT_TRUE(i % 9 == 0 || curve->deleteVertex(TempusMake(i, 1), false, kTempusZero));
+    }
+    for (KFVertex* const vertex : museumVertices(*curve)) {
+        void* found = nullptr;
+        ASSERT_TRUE(curve->getVertexHandle(vertex->getValueU(), &found, true));
+        ASSERT_EQ(found, vertex);
+    }
+}
+
 TEST(KFSplineStore, NeverFollowsADeadHandle) {
     MuseumSpline curve;
     for (int i = 0; i < 200; ++i) {
