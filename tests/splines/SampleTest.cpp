@@ -34,8 +34,11 @@ struct Curve : MuseumSpline {
         for (int i = 0; i < count; ++i) {
             KFVertex* const vertex = append(s(u, 60), number(-9, 9), types[random() % types.size()]);
             if (number(0, 2) > 0) {
-                vertex->setInputTangents(-number(0, 9) / 100.0, number(-9, 9) / 30.0, kTempusZero);
-                vertex->setOutputTangents(number(0, 9) / 100.0, number(-9, 9) / 30.0, kTempusZero);
+                double const size = number(0, 3) == 0 ? 1e-4 : 1.0; // almost flat is curved too
+                vertex->setInputTangents(-number(0, 9) * size / 100.0, number(-9, 9) * size / 30.0,
+                                         kTempusZero);
+                vertex->setOutputTangents(number(0, 9) * size / 100.0, number(-9, 9) * size / 30.0,
+                                          kTempusZero);
             }
             u += mayShare && number(0, 4) == 0 ? 0 : number(1, 50);
             if (number(0, 4) == 0) {
