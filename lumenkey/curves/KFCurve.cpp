@@ -105,7 +105,8 @@ namespace {
 template <class Value> void change(KFCurve& curve, BXRelaxed<Value> KFSplineState::*setting, Value value) {
     if ((curve.settings().*setting).get() == value)
         return;
-    curve.createLocalSplineState()->*setting = value;
+    if (KFSplineState* const local = curve.createLocalSplineState(); local != nullptr)
+        local->*setting = value;
 }
 
 template <class Value> bool answer(Value* out, Value value) {
