@@ -27,6 +27,7 @@
 #include "lumenkey/curves/KFCurveNode.h"
 #include "lumenkey/curves/KFCurveNodeParam.h"
 #include "lumenkey/curves/KFCurveOwner.h"
+#include "lumenkey/curves/KFRecordingNode.h"
 #include "lumenkey/curves/KFSplineNode.h"
 #include "lumenkey/curves/KFTypedCurves.h"
 #include "lumenkey/foundation/BXAlgorithm.h"

@@ -27,7 +27,7 @@ struct KFFadeBlock;
 /// converter or object root. Doubles are equal within 1e-7.
 ///
 /// A locked channel (bit 2 of its own) ignores every form of setting, removing and moving values, `offsetChannel`,
-/// `scaleChannel`, the limits, and the switches of the curve's shape. It obeys `resetToDefault`, `setInitialValue`,
+/// `scaleChannel`, the limits, the switches of the curve's shape, and the beginning of takes. It obeys `resetToDefault`, `setInitialValue`,
 /// `setDefaultValue`, the info setters, `copy` and `assign`.
 ///
 /// Threads: values may be read on any number of threads beside one that edits keypoints or the constant of a channel
@@ -54,6 +54,23 @@ public:
     char const* getFacadeWrapperName() override;
     void lock(bool on, bool passDown) override;
     void setDefaultToCurrentValue() override;
+    // A take: values are recorded into the curve while time runs, and become keypoints at the end (`KFRecordingNode`
+    // tells how, by `scope` and `mode`). In order: `beginPlayback`, `beginRecording`, any number of `setValue`,
+    // `updateCurrentRecordingTime` while a value is held, `endRecording`, `endPlayback`. A channel without keypoints
+    // takes part in none. The times of both playback operations are curve times.
+    //
+    // A locked channel doesn't begin a take, but ends one. `beginRecording` forgets all callbacks, `endRecording` needs
+    // no recording to tell the object root. The callbacks hear of every value that is set while recording, with this
+    // channel and global time; `wantsWrapper` asks for the channel's facade wrapper in its place where there is a
+    // facade.
+    void beginPlayback(Tempus const& t, unsigned int scope, unsigned int mode,
+                       Tempus const& resolution) override;
+    void endPlayback(Tempus const& t) override;
+    void beginRecording(Tempus const& t) override;
+    void endRecording(Tempus const& t) override;
+    void updateCurrentRecordingTime(Tempus const& t) override;
+    void registerRecordingCallback(RecordingCallback function, void* context, bool wantsWrapper) override;
+    void unregisterRecordingCallback(RecordingCallback function, void* context) override;
     void copy(KFChannelBase const* other, bool silent) override;
     /// Equal records; ID, name and flags don't count.
     bool compare(KFChannelBase const* other) const override;
@@ -135,9 +152,10 @@ public:
     virtual bool moveValue(Tempus const& from, Tempus const& to, bool force);
     virtual void offsetChannel(Tempus const& t, double delta);
     virtual void scaleChannel(double factor);
-    // Takes: false, with the outputs untouched, and nothing.
+    /// Between `beginPlayback` and `endPlayback`; only then are the outputs written. Each may be null.
     virtual bool isPlaying(unsigned int* scope, unsigned int* mode, Tempus* resolution);
     virtual bool isRecording();
+    /// Calls the recording callbacks.
     virtual void didRecordValue(Tempus const& t);
     virtual double getSliderMax() const;
     /// Start and end of the range in local time, and the duration of a frame. Outputs may be null.
