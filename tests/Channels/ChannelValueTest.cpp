@@ -188,7 +188,7 @@ TEST(KFChannelValue, FindsItsExtremes) {
     double low = 0.0, high = 0.0, lowest = 0.0;
     for (int i = 0; i <= 100000; ++i)
         lowest = std::min(lowest, channel.getCurveValue(s(i, 100000), false));
-    EXPECT_TRUE(channel.getCurrentMinAndMax(s(2), s(0), &low, &high));
+    EXPECT_TRUE(channel.getCurrentMinAndMax(s(0), s(2), &low, &high));
     EXPECT_LT(lowest, -1.0);
     EXPECT_NEAR(low, lowest, 1e-6);
     EXPECT_EQ(high, 10.0);
