@@ -28,6 +28,19 @@ public:
     }
     void include(KFValueExtremes const& of) noexcept { include(of.lowest, of.highest); }
     bool hold(double value) const noexcept { return _innerLow <= value && value <= _innerHigh; }
+    /// Whether a cubic with these control values changes nothing.
+    bool holdCubic(double const (&v)[4]) const noexcept {
+        return hold(v[0]) && hold(v[3]) && hold(v[1]) && hold(v[2]);
+    }
+    /// The same by the control values of its two halves (de Casteljau), which lie nearer to it.
+    bool holdHalves(double const (&v)[4]) const noexcept {
+        double const middle = 0.5 * (v[1] + v[2]);
+        double const left = 0.5 * (v[0] + v[1]);
+        double const right = 0.5 * (v[2] + v[3]);
+        // The point where they meet lies between the two next to it.
+        return hold(v[0]) && hold(v[3]) && hold(left) && hold(right) && hold(0.5 * (left + middle)) &&
+               hold(0.5 * (middle + right));
+    }
 
 private:
     static constexpr double kRoundings = 256.0 * std::numeric_limits<double>::epsilon();
@@ -47,6 +60,29 @@ private:
     double _innerHigh = -kInfinity;
 };
 
+/// Fetches vertices from memory some steps before they are looked at.
+class Prefetch {
+public:
+    Prefetch(KFVertexStore const& store, KFVertexIterator place) noexcept : _store(store), _ahead(place) {
+        for (int i = 0; i < kSteps; ++i)
+            step();
+    }
+    void step() noexcept {
+        if (_ahead == _store.end())
+            return;
+        auto const* const vertex = static_cast<KFStaticVertex const*>(_store.at(_ahead));
+        __builtin_prefetch(vertex);
+        __builtin_prefetch(vertex + 1); // its end
+        _ahead = _store.next(_ahead);
+    }
+
+private:
+    static constexpr int kSteps = 8; // tuned
+
+    KFVertexStore const& _store;
+    KFVertexIterator _ahead;
+};
+
 } // namespace
 
 /// The walk over whole segments. The caller holds the lock.
@@ -54,7 +90,10 @@ class KFSplineExtremes {
 public:
     KFSplineExtremes(KFSpline& spline, KFValueExtremes& extremes)
         : _spline(spline), _store(*spline._store), _extremes(extremes),
-          _handlesPerTangent(spline.getState()->parametric ? 1.0 : 12.0) {}
+          _handlesPerTangent(spline.getState()->parametric ? 1.0 : 12.0) {
+        if (spline.getState()->retimingExtrapolation && !_store.empty())
+            _outsideFrom = _store.tickAt(_store.last());
+    }
 
     bool walk(Tempus const& from, Tempus const& to);
 
@@ -62,9 +101,10 @@ private:
     using Place = KFVertexIterator;
 
     bool canWalk(Place start) const;
-    double valueAtVertex(Place place, KFStaticVertex const& vertex);
+    double valueAtVertex(std::int64_t tick, KFStaticVertex const& vertex);
     bool includeSegment(Place place, KFStaticVertex& a, KFStaticVertex& b);
     void includeBezier(KFStaticVertex& a, KFStaticVertex& b);
+    void includeCatmullRom(Place place, KFStaticVertex& a, KFStaticVertex& b);
     void includeConstant(Place place, KFStaticVertex const& a, KFStaticVertex const& b);
     template <class Interpolator> void includeWithinEnds(KFStaticVertex& a, KFStaticVertex& b);
     template <class Interpolator> void ask(KFStaticVertex& a, KFStaticVertex& b) {
@@ -75,6 +115,8 @@ private:
     KFVertexStore const& _store;
     GrowingExtremes _extremes;
     double const _handlesPerTangent;
+    /// A retimed curve is extrapolated from its last vertex on.
+    std::int64_t _outsideFrom = std::numeric_limits<std::int64_t>::max();
 };
 
 /// What the index says must be what a reading by `getVertexValue` says.
@@ -92,12 +134,9 @@ bool KFSplineExtremes::canWalk(Place start) const {
            !isWhole(_store.front()) && !isWhole(_store.back());
 }
 
-/// A retimed curve is extrapolated from its last vertex on.
-double KFSplineExtremes::valueAtVertex(Place place, KFStaticVertex const& vertex) {
-    bool const isOutside =
-        _spline.getState()->retimingExtrapolation && _store.tickAt(place) == _store.tickAt(_store.last());
-    return isOutside ? _spline.getVertexValue(vertex.getValueU(), kTempusZero, false)
-                     : vertex.getValueV(kTempusZero);
+double KFSplineExtremes::valueAtVertex(std::int64_t tick, KFStaticVertex const& vertex) {
+    return tick < _outsideFrom ? vertex.getValueV(kTempusZero)
+                               : _spline.getVertexValue(vertex.getValueU(), kTempusZero, false);
 }
 
 bool KFSplineExtremes::walk(Tempus const& from, Tempus const& to) {
@@ -108,22 +147,25 @@ bool KFSplineExtremes::walk(Tempus const& from, Tempus const& to) {
     if (place == end)
         return true;
     auto* a = static_cast<KFStaticVertex*>(_store.at(place));
-    double const first = valueAtVertex(place, *a);
+    std::int64_t tickA = _store.tickAt(place);
+    double const first = valueAtVertex(tickA, *a);
     _extremes.include(first, first);
+    Prefetch prefetch(_store, place);
     for (Place next = _store.next(place); next != end; next = _store.next(next)) {
+        prefetch.step();
         auto* const b = static_cast<KFStaticVertex*>(_store.at(next));
-        std::int64_t const tickA = _store.tickAt(place);
         std::int64_t const tickB = _store.tickAt(next);
         if (tickB < tickA)
             return false;
         if (tickB > tickA) { // of several at one place the first has the value
             if (!includeSegment(place, *a, *b))
                 return false;
-            double const value = valueAtVertex(next, *b);
+            double const value = valueAtVertex(tickB, *b);
             _extremes.include(value, value);
         }
         place = next;
         a = b;
+        tickA = tickB;
     }
     return true;
 }
@@ -147,7 +189,7 @@ bool KFSplineExtremes::includeSegment(Place place, KFStaticVertex& a, KFStaticVe
         includeBezier(a, b);
         return true;
     case kKFInterpolationCatmullRom:
-        ask<KFCatmullRomInterpolator>(a, b);
+        includeCatmullRom(place, a, b);
         return true;
     case kKFInterpolationEaseIn:
         includeWithinEnds<KFEaseInInterpolator>(a, b);
@@ -174,8 +216,8 @@ bool KFSplineExtremes::includeSegment(Place place, KFStaticVertex& a, KFStaticVe
     }
 }
 
-/// Handles that point into the segment are at most shortened where they would fold it, so that the curve stays within
-/// the control values that they have here.
+/// Handles that point into the segment are at most shortened, where they would fold it, so that the curve stays within
+/// the control values that they have here; within its halves' where they aren't.
 void KFSplineExtremes::includeBezier(KFStaticVertex& a, KFStaticVertex& b) {
     double outU = 0.0;
     double outV = 0.0;
@@ -185,12 +227,32 @@ void KFSplineExtremes::includeBezier(KFStaticVertex& a, KFStaticVertex& b) {
     b.getInputTangents(&inU, &inV, kTempusZero);
     double const valueA = a.getValueV(kTempusZero);
     double const valueB = b.getValueV(kTempusZero);
-    bool const changesNothing = outU >= 0.0 && inU <= 0.0 && _extremes.hold(valueA) &&
-                                _extremes.hold(valueB) &&
-                                _extremes.hold(valueA + outV * _handlesPerTangent) &&
-                                _extremes.hold(valueB + inV * _handlesPerTangent);
-    if (!changesNothing)
-        ask<KFBezierInterpolator>(a, b);
+    double const polygon[4] = {valueA, valueA + outV * _handlesPerTangent, valueB + inV * _handlesPerTangent,
+                               valueB};
+    if (outU >= 0.0 && inU <= 0.0) {
+        if (_extremes.holdCubic(polygon))
+            return;
+        double const longest = _handlesPerTangent * std::max(outU, -inU);
+        if (longest <= TempusSecondsBetween(a.getValueU(), b.getValueU()) && _extremes.holdHalves(polygon))
+            return;
+    }
+    ask<KFBezierInterpolator>(a, b);
+}
+
+/// The handles rise with the line through the neighbours, at an open end not at all.
+void KFSplineExtremes::includeCatmullRom(Place place, KFStaticVertex& a, KFStaticVertex& b) {
+    auto const valueAt = [this](Place at) { return _store.at(at)->getValueV(kTempusZero); };
+    Place const next = _store.next(_store.next(place));
+    bool const hasBefore = place != _store.begin();
+    bool const hasAfter = next != _store.end();
+    double const valueA = a.getValueV(kTempusZero);
+    double const valueB = b.getValueV(kTempusZero);
+    double const riseA = hasBefore ? valueB - valueAt(_store.previous(place)) : 0.0;
+    double const riseB = hasAfter ? valueA - valueAt(next) : 0.0;
+    bool const knowsHandles = !_spline.isClosed() || (hasBefore && hasAfter);
+    double const polygon[4] = {valueA, valueA + riseA / 6.0, valueB + riseB / 6.0, valueB};
+    if (!knowsHandles || !_extremes.holdCubic(polygon))
+        ask<KFCatmullRomInterpolator>(a, b);
 }
 
 template <class Interpolator> void KFSplineExtremes::includeWithinEnds(KFStaticVertex& a, KFStaticVertex& b) {
