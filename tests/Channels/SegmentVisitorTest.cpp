@@ -24,6 +24,7 @@ Tempus s(std::int64_t value, std::int32_t timescale = 1) { return TempusMake(val
 
 struct Piece {
     std::uint32_t type;
+    std::pair<double, double> (*minMax)(Piece const&);
     KFSpline& spline;
     void* first;
     void* second;
@@ -31,39 +32,46 @@ struct Piece {
     double offset;
 };
 
+template <class Interpolator> std::pair<double, double> minMaxOf(Piece const& p) {
+    double low = 0.0, high = 0.0;
+    Interpolator().getMinMaxValues(p.spline, p.first, p.second, std::min(p.sourceStart, p.sourceEnd),
+                                   std::max(p.sourceStart, p.sourceEnd), &low, &high);
+    return {low + p.offset, high + p.offset};
+}
+
 class PieceVisitor : public KFChannelSegmentVisitor {
 public:
     virtual void piece(Piece const& piece) = 0;
 
     void visitLinear(KFSpline& k, void* a, void* b, Time c, Time d, Time e, Time f, double o) final {
-        piece({1, k, a, b, c, d, e, f, o});
+        piece({1, minMaxOf<KFLinearInterpolator>, k, a, b, c, d, e, f, o});
     }
     void visitBezier(KFSpline& k, void* a, void* b, Time c, Time d, Time e, Time f, double o) final {
-        piece({4, k, a, b, c, d, e, f, o});
+        piece({4, minMaxOf<KFBezierInterpolator>, k, a, b, c, d, e, f, o});
     }
     void visitCatmullRom(KFSpline& k, void* a, void* b, Time c, Time d, Time e, Time f, double o) final {
-        piece({6, k, a, b, c, d, e, f, o});
+        piece({6, minMaxOf<KFCatmullRomInterpolator>, k, a, b, c, d, e, f, o});
     }
     void visitEaseIn(KFSpline& k, void* a, void* b, Time c, Time d, Time e, Time f, double o) final {
-        piece({7, k, a, b, c, d, e, f, o});
+        piece({7, minMaxOf<KFEaseInInterpolator>, k, a, b, c, d, e, f, o});
     }
     void visitEaseOut(KFSpline& k, void* a, void* b, Time c, Time d, Time e, Time f, double o) final {
-        piece({8, k, a, b, c, d, e, f, o});
+        piece({8, minMaxOf<KFEaseOutInterpolator>, k, a, b, c, d, e, f, o});
     }
     void visitExponential(KFSpline& k, void* a, void* b, Time c, Time d, Time e, Time f, double o) final {
-        piece({13, k, a, b, c, d, e, f, o});
+        piece({13, minMaxOf<KFExponentialInterpolator>, k, a, b, c, d, e, f, o});
     }
     void visitLogarithmic(KFSpline& k, void* a, void* b, Time c, Time d, Time e, Time f, double o) final {
-        piece({14, k, a, b, c, d, e, f, o});
+        piece({14, minMaxOf<KFLogarithmicInterpolator>, k, a, b, c, d, e, f, o});
     }
     void visitEase(KFSpline& k, void* a, void* b, Time c, Time d, Time e, Time f, double o) final {
-        piece({15, k, a, b, c, d, e, f, o});
+        piece({15, minMaxOf<KFEaseInterpolator>, k, a, b, c, d, e, f, o});
     }
     void visitAccelerate(KFSpline& k, void* a, void* b, Time c, Time d, Time e, Time f, double o) final {
-        piece({16, k, a, b, c, d, e, f, o});
+        piece({16, minMaxOf<KFAccelerateInterpolator>, k, a, b, c, d, e, f, o});
     }
     void visitDecelerate(KFSpline& k, void* a, void* b, Time c, Time d, Time e, Time f, double o) final {
-        piece({17, k, a, b, c, d, e, f, o});
+        piece({17, minMaxOf<KFDecelerateInterpolator>, k, a, b, c, d, e, f, o});
     }
 };
 
@@ -71,55 +79,32 @@ public:
 class ExtremesVisitor : public PieceVisitor {
 public:
     double min = kMost, max = -kMost;
+    int visits = 0;
 
     void visitConstant(double value, Time, Time) override { include(value, value); }
     void piece(Piece const& p) override {
-        switch (p.type) {
-        case 1:
-            return linear(p);
-        case 4:
-            return ask<KFBezierInterpolator>(p);
-        case 6:
-            return ask<KFCatmullRomInterpolator>(p);
-        case 7:
-            return ask<KFEaseInInterpolator>(p);
-        case 8:
-            return ask<KFEaseOutInterpolator>(p);
-        case 13:
-            return ask<KFExponentialInterpolator>(p);
-        case 14:
-            return ask<KFLogarithmicInterpolator>(p);
-        case 15:
-            return ask<KFEaseInterpolator>(p);
-        case 16:
-            return ask<KFAccelerateInterpolator>(p);
-        default:
-            return ask<KFDecelerateInterpolator>(p);
+        if (p.type != 1) {
+            auto const [low, high] = p.minMax(p);
+            return include(low, high);
+        }
+        bool const isOutside = p.first == nullptr || p.second == nullptr;
+        for (bool const end : {false, true}) {
+            Tempus const u = isOutside ? (end ? p.targetEnd : p.targetStart)
+                             : end     ? p.sourceEnd
+                                       : p.sourceStart;
+            double const value =
+                isOutside ? p.spline.getVertexValue(u, kTempusZero, false)
+                          : p.offset + KFLinearInterpolator().interpolate(p.spline, kTempusZero, p.first,
+                                                                          p.second, u, false, false);
+            include(value, value);
         }
     }
 
 private:
     void include(double low, double high) {
+        ++visits;
         min = low < min ? low : min;
         max = high > max ? high : max;
-    }
-    void linear(Piece const& p) {
-        bool const isOutside = p.first == nullptr || p.second == nullptr;
-        for (bool const end : {false, true}) {
-            double const value =
-                isOutside
-                    ? p.spline.getVertexValue(end ? p.targetEnd : p.targetStart, kTempusZero, false)
-                    : KFLinearInterpolator().interpolate(p.spline, kTempusZero, p.first, p.second,
-                                                         end ? p.sourceEnd : p.sourceStart, false, false) +
-                          p.offset;
-            include(value, value);
-        }
-    }
-    template <class Interpolator> void ask(Piece const& p) {
-        double low = 0.0, high = 0.0;
-        Interpolator().getMinMaxValues(p.spline, p.first, p.second, std::min(p.sourceStart, p.sourceEnd),
-                                       std::max(p.sourceStart, p.sourceEnd), &low, &high);
-        include(low + p.offset, high + p.offset);
     }
 };
 
@@ -129,18 +114,14 @@ public:
     std::ostringstream text;
 
     void visitConstant(double value, Time start, Time end) override {
-        text << value << '@' << seconds(start);
-        if (start != end)
-            text << ".." << seconds(end);
-        text << ' ';
+        text << value << '@' << seconds(start) << (start == end ? "" : "..");
+        start == end ? text << ' ' : text << seconds(end) << ' ';
     }
     void piece(Piece const& p) override {
         text << (p.first == nullptr ? "<" : "") << (p.second == nullptr ? ">" : "") << p.type << ':'
              << seconds(p.sourceStart) << ".." << seconds(p.sourceEnd) << '@' << seconds(p.targetStart)
              << ".." << seconds(p.targetEnd);
-        if (p.offset != 0.0)
-            text << '+' << p.offset;
-        text << ' ';
+        p.offset == 0.0 ? text << ' ' : text << '+' << p.offset << ' ';
     }
 
 private:
@@ -166,16 +147,9 @@ struct Shown {
         spline->setExtrapolation(mode, 0);
         spline->setExtrapolation(mode, 1);
     }
-    template <class Visitor> Visitor visited(Time start, Time end) {
-        Visitor visitor;
+    template <class Visitor> Visitor&& visit(Visitor&& visitor, Time start, Time end) {
         KFChannelSegmentVisitor::visitSegments(channel, start, end, visitor);
-        return visitor;
-    }
-    std::string notes(Time start, Time end) {
-        Notes notes;
-        KFChannelSegmentVisitor::visitSegments(channel, start, end, notes);
-        std::string text = notes.text.str();
-        return text.empty() ? text : text.substr(0, text.size() - 1);
+        return std::forward<Visitor>(visitor);
     }
     std::pair<double, double> extremes(Time start, Time end) {
         double low = 0.0, high = 0.0;
@@ -191,7 +165,7 @@ Shown shown(Keys const& keys, std::uint32_t mode = 0, bool retiming = false) {
     for (auto const& [u, value, type] : keys)
         static_cast<KFVertex*>(curve->appendVertexNoTangents(u, value, kTempusZero))->setInterpolation(type);
     curve.state->preExtrapolation = curve.state->postExtrapolation = mode;
-    curve.state->retimingExtrapolation = retiming;
+    curve.state->retimingExtrapolation = curve.state->parametric = retiming; // a frame is 1 then
     return Shown(curve);
 }
 
@@ -214,91 +188,58 @@ std::vector<Tempus> ends(KFSpline& spline) {
 
 TEST(KFChannelSegmentVisitor, VisitsPieceByPiece) {
     Keys const three{{s(0), 0.0, 1}, {s(1), 4.0, 4}, {s(3), 1.0, 1}};
+    Keys const mixed{{s(0), 2.0, 0}, {s(0), 7.0, 0}, {s(1), 4.0, 19}, {s(2), 5.0, 1}};
     struct Case {
         Keys keys;
         std::uint32_t mode;
         Tempus start, end;
         char const* visits;
+        bool retiming = false;
     };
     Case const cases[] = {
-        {{}, 3, s(1), s(2), "0@1..2"},
-        {{{s(5), 3.0, 1}}, 1, s(1), s(2), "3@1..2"},
+        {{}, 3, s(1), s(2), "0@1..2 "},
+        {{{s(5), 3.0, 1}}, 1, s(1), s(2), "3@1..2 "},
         // Inside: ends on keypoints and between them, no length, ends exchanged.
-        {three, 0, s(0), s(3), "0@0 1:0..1@0..1 4@1 4:1..3@1..3 1@3"},
-        {three, 0, s(1, 2), s(2), "1:0.5..1@0.5..1 4@1 4:1..2@1..2"},
-        {three, 0, s(1), s(1), "4@1"},
-        {three, 0, s(1, 2), s(1, 2), "1:0.5..0.5@0.5..0.5"},
+        {three, 0, s(0), s(3), "0@0 1:0..1@0..1 4@1 4:1..3@1..3 1@3 "},
+        {three, 0, s(1, 2), s(2), "1:0.5..1@0.5..1 4@1 4:1..2@1..2 "},
+        {three, 0, s(1), s(1), "4@1 "},
+        {three, 0, s(1, 2), s(1, 2), "1:0.5..0.5@0.5..0.5 "},
         {three, 0, s(2), s(1, 2), ""},
-        {{{s(0), 2.0, 0}, {s(0), 7.0, 0}, {s(1), 4.0, 19}, {s(2), 5.0, 1}},
-         0,
-         s(0),
-         s(2),
-         "2@0 7@0..1 4@1 5@2"},
+        {mixed, 0, s(0), s(2), "2@0 7@0..1 4@1 5@2 "},
         // Outside.
-        {three, 0, s(-2), s(-1), "0@-2..-1"},
-        {three, 0, s(-1), s(0), "0@-1..0 0@0"},
-        {three, 0, s(2), s(5), "4:2..3@2..3 1@3 1@3..5"},
-        {three, 1, s(-2), s(-1), "<1:-2..-1@-2..-1"},
-        {three, 1, s(4), s(5), ">1:4..5@4..5"},
-        {three, 9, s(-2), s(5), "0@0 1:0..1@0..1 4@1 4:1..3@1..3 1@3"},
-        {three, 2, s(-4), s(-1), "4:2..3@-4..-3 1@-3 4:3..1@-3..-1 4@-1"},
+        {three, 0, s(-2), s(-1), "0@-2..-1 "},
+        {three, 0, s(-1), s(0), "0@-1..0 0@0 "},
+        {three, 0, s(2), s(5), "4:2..3@2..3 1@3 1@3..5 "},
+        {three, 1, s(-2), s(-1), "<1:-2..-1@-2..-1 "},
+        {three, 1, s(4), s(5), ">1:4..5@4..5 "},
+        {three, 9, s(-2), s(5), "0@0 1:0..1@0..1 4@1 4:1..3@1..3 1@3 "},
+        {three, 2, s(-4), s(-1), "4:2..3@-4..-3 1@-3 4:3..1@-3..-1 4@-1 "},
         {three, 2, s(3), s(10),
-         "1@3 4:3..1@3..5 4@5 1:1..0@5..6 0@6 1:0..1@6..7 4@7 4:1..3@7..9 1@9 4:3..2@9..10"},
-        {three, 3, s(-4), s(0), "4:2..3@-4..-3 1@-3 1:0..1@-3..-2 4@-2 4:1..3@-2..0 0@0"},
-        {three, 3, s(5), s(13, 2), "4:2..3@5..6 0@6 1:0..0.5@6..6.5"},
+         "1@3 4:3..1@3..5 4@5 1:1..0@5..6 0@6 1:0..1@6..7 4@7 4:1..3@7..9 1@9 4:3..2@9..10 "},
+        {three, 3, s(-4), s(0), "4:2..3@-4..-3 1@-3 1:0..1@-3..-2 4@-2 4:1..3@-2..0 0@0 "},
+        {three, 3, s(5), s(13, 2), "4:2..3@5..6 0@6 1:0..0.5@6..6.5 "},
         {three, 4, s(-7), s(-2),
-         "4:2..3@-7..-6+-3 -2@-6 1:0..1@-6..-5+-2 2@-5 4:1..3@-5..-3+-2 -1@-3 1:0..1@-3..-2+-1 3@-2"},
-        {three, 4, s(3), s(7), "1@3 1:0..1@3..4+1 5@4 4:1..3@4..6+1 2@6 1:0..1@6..7+2 6@7"},
+         "4:2..3@-7..-6+-3 -2@-6 1:0..1@-6..-5+-2 2@-5 4:1..3@-5..-3+-2 -1@-3 1:0..1@-3..-2+-1 3@-2 "},
+        {three, 4, s(3), s(7), "1@3 1:0..1@3..4+1 5@4 4:1..3@4..6+1 2@6 1:0..1@6..7+2 6@7 "},
         // What repeats without end, in no time, or from a time that is none.
-        {three, 3, kTempusNegativeInfinity, s(0), "0@0"},
-        {three, 3, s(3), kTempusPositiveInfinity, "1@3"},
-        {{{s(1), 5.0, 1}, {s(1), 6.0, 1}}, 2, s(2), s(4), "6@2..4"},
+        {three, 3, kTempusNegativeInfinity, s(0), "0@0 "},
+        {three, 3, s(3), kTempusPositiveInfinity, "1@3 "},
+        {{{s(1), 5.0, 1}, {s(1), 6.0, 1}}, 2, s(2), s(4), "6@2..4 "},
+        // Retimed: the point at the end is read a frame further. One frame starts anew again and again.
+        {three, 2, s(3), s(8), "4@3 4:2..1@3..4 1:1..0@4..5 4:1..3@5..7 4:2..1@7..8 ", true},
+        {{{s(0), 0.0, 1}, {s(1), 6.0, 1}}, 2, s(2), s(7, 2), "1:0..1@2..3 1:0..0.5@3..3.5 ", true},
+        {{{s(0), 0.0, 1}, {s(1, 2), 6.0, 1}},
+         2,
+         s(1),
+         s(2),
+         "0@1 1:0..0.5@1..1.5 6@1.5 1:0.5..0@1.5..2 0@2 ",
+         true},
     };
     for (Case const& c : cases) {
-        EXPECT_EQ(shown(c.keys, c.mode).notes(c.start, c.end), c.visits)
+        EXPECT_EQ(shown(c.keys, c.mode, c.retiming).visit(Notes(), c.start, c.end).text.str(), c.visits)
             << "mode " << c.mode << " from " << museumText(c.start) << " to " << museumText(c.end);
     }
 }
-
-/// Every piece in the order of target times, one behind the other; its source where the mapping has it.
-class Checks : public PieceVisitor {
-public:
-    Tempus firstTime, minTime, maxTime, lastTime, step;
-    std::uint32_t mode = 0;
-    bool retiming = false;
-    Tempus reached = kTempusNegativeInfinity;
-    std::int64_t visits = 0;
-    std::int64_t misplaced = 0;
-    std::int64_t misread = 0;
-
-    void visitConstant(double, Time start, Time end) override { follow(start, end); }
-    void piece(Piece const& p) override {
-        follow(p.targetStart, p.targetEnd);
-        bool const isOutside = p.targetStart < firstTime || p.targetStart >= lastTime;
-        if (p.first == nullptr || p.second == nullptr || !isOutside)
-            return;
-        bool backwards = false;
-        long cycles = 0;
-        bool const retimed = retiming && p.targetStart >= lastTime;
-        Tempus mapped = mode == 2 ? KFChannelSegmentVisitor::mapPingPong(p.targetStart, minTime, maxTime,
-                                                                         step, retimed, &backwards)
-                                  : KFChannelSegmentVisitor::mapProgressiveRepeat(p.targetStart, minTime,
-                                                                                  maxTime, retimed, &cycles);
-        if (mode != 2 && mapped == maxTime) // where two cycles meet the next one goes on
-            mapped = minTime;
-        auto const u = [](void* vertex) { return static_cast<KFVertex*>(vertex)->getValueU(); };
-        auto const [low, high] = std::minmax(p.sourceStart, p.sourceEnd);
-        misread += mapped != p.sourceStart || backwards != (p.sourceEnd < p.sourceStart) ||
-                   u(p.first) > low || u(p.second) < high || high - low != p.targetEnd - p.targetStart;
-    }
-
-private:
-    void follow(Time start, Time end) {
-        visits += 1;
-        misplaced += start < reached || end < start;
-        reached = end;
-    }
-};
 
 /// Times that can't be written exactly, so that a keypoint of a repeat is met beside where it is.
 bool isInexact(std::string const& name) {
@@ -306,59 +247,10 @@ bool isInexact(std::string const& name) {
            name == "ages" || name == "negative times";
 }
 
-TEST(KFChannelSegmentVisitorMuseum, GivesOnePieceAfterTheOther) {
-    for (Exhibit const& exhibit : museum()) {
-        Shown curve(exhibit.build());
-        auto const vertices = museumVertices(*curve.spline);
-        if (vertices.size() < 2 || vertices.size() > 1000)
-            continue;
-        for (std::uint32_t const mode : {0u, 1u, 2u, 3u, 4u}) {
-            curve.setModes(mode);
-            auto const at = ends(*curve.spline);
-            Checks checks;
-            checks.minTime = curve.spline->getMinValueU(kTempusZero, true);
-            checks.maxTime = curve.spline->getMaxValueU(kTempusZero, true);
-            checks.firstTime = vertices.front()->getValueU();
-            checks.lastTime = vertices.back()->getValueU();
-            checks.step = curve.spline->getStep();
-            checks.retiming = curve.spline->getState()->retimingExtrapolation;
-            checks.mode = mode;
-            KFChannelSegmentVisitor::visitSegments(curve.channel, at.front(), at.back(), checks);
-            std::string const what = exhibit.name + ", mode " + std::to_string(mode);
-            EXPECT_EQ(checks.misplaced, 0) << what;
-            EXPECT_TRUE(checks.misread == 0 || isInexact(exhibit.name)) << what << ": " << checks.misread;
-            EXPECT_LE(checks.visits, static_cast<std::int64_t>(vertices.size()) * 2 * 22 + 4) << what;
-        }
-    }
-}
-
-TEST(KFChannelSegmentVisitorMuseum, FindsTheSameExtremesAsAHost) {
-    for (Exhibit const& exhibit : museum()) {
-        Shown curve(exhibit.build());
-        for (std::uint32_t const mode : {0u, 1u, 2u, 3u, 4u, 9u}) {
-            curve.setModes(mode);
-            auto const at = ends(*curve.spline);
-            std::size_t const stride = curve.spline->getNumberOfVertices() > 1000 ? 5 : 1;
-            for (std::size_t i = 0; i < at.size(); i += stride) {
-                for (std::size_t j = i; j < at.size(); j += stride) {
-                    auto const host = curve.visited<ExtremesVisitor>(at[i], at[j]);
-                    auto const [low, high] = curve.extremes(at[i], at[j]);
-                    bool const isSame = isSameDouble(low, host.min) && isSameDouble(high, host.max);
-                    double const slack = isInexact(exhibit.name) ? 1e-12 : 0.0;
-                    ASSERT_TRUE(isSame ||
-                                (std::fabs(low - host.min) <= slack && std::fabs(high - host.max) <= slack))
-                        << exhibit.name << ", mode " << mode << ", " << museumText(at[i]) << " to "
-                        << museumText(at[j]) << ": " << low << ' ' << host.min << ", " << high << ' '
-                        << host.max;
-                }
-            }
-        }
-    }
-}
-
-/// Whether each segment has a visit, and is where its keypoints say. What a disabled keypoint cuts isn't the curve, of
-/// several keypoints at one end others continue the curve than end it, and of a fold a part lies aside of time.
-bool isWhollyVisited(Shown& curve) {
+/// Whether the pieces are the curve. They aren't where a type has no visit, where a keypoint is disabled, where several
+/// at one end continue the curve otherwise than they end it, where a fold lies aside of time, where cubic segments are
+/// too short to be read as a whole, and where a spline is closed.
+bool isWhollyVisited(Shown& curve, std::string const& name) {
     auto const vertices = museumVertices(*curve.spline);
     for (std::size_t i = 0; i < vertices.size(); ++i) {
         std::uint32_t const type = vertices[i]->getInterpolation();
@@ -367,73 +259,76 @@ bool isWhollyVisited(Shown& curve) {
         if (!hasVisit || !vertices[i]->isEnabled(kTempusZero) || isShared)
             return false;
     }
-    return vertices.size() > 1 && vertices.size() < 100 && !curve.spline->isClosed() &&
-           curve.spline->getState()->sanitizeBezier;
+    return vertices.size() > 1 && vertices.size() < 100 && !curve.spline->isClosed() && name != "a fold" &&
+           !name.starts_with("shortest spans") && !isInexact(name);
 }
 
 /// In every segment and all its images, to and fro.
 std::vector<Tempus> samplePositions(KFSpline& spline) {
     auto const vertices = museumVertices(spline);
-    Tempus const first = vertices.front()->getValueU();
-    Tempus const last = vertices.back()->getValueU();
+    Tempus const ends = vertices.front()->getValueU() + vertices.back()->getValueU();
+    Tempus const range = vertices.back()->getValueU() - vertices.front()->getValueU();
     std::vector<Tempus> positions;
     for (std::size_t i = 0; i + 1 < vertices.size(); ++i) {
         Tempus const u = vertices[i]->getValueU();
-        Tempus const length = vertices[i + 1]->getValueU() - u;
         for (int part = 0; part <= 40; ++part) {
-            Tempus const x = u + length * s(part, 40);
+            Tempus const x = u + (vertices[i + 1]->getValueU() - u) * s(part, 40);
             for (int cycle = -10; cycle <= 10; ++cycle) {
-                positions.push_back(x + (last - first) * cycle);
-                positions.push_back(first + last - x + (last - first) * cycle);
+                positions.push_back(x + range * cycle);
+                positions.push_back(ends - x + range * cycle);
             }
         }
     }
     return positions;
 }
 
-TEST(KFChannelSegmentVisitorMuseum, FindsTheExtremesOfTheSamples) {
-    int compared = 0;
+TEST(KFChannelSegmentVisitorMuseum, FindsTheExtremesOfAHostAndOfTheSamples) {
     for (Exhibit const& exhibit : museum()) {
         Shown curve(exhibit.build());
-        // Cubic segments of less than a hundredth of a millisecond are read in part.
-        bool const isTooShort = exhibit.name.starts_with("shortest spans");
-        if (!isWhollyVisited(curve) || isInexact(exhibit.name) || isTooShort)
-            continue;
         auto const at = ends(*curve.spline);
-        auto const positions = samplePositions(*curve.spline);
-        for (std::uint32_t const mode : {0u, 1u, 2u, 3u, 4u}) {
-            // The frames of a retimed ping-pong are mapped a step away from where the curve has them.
-            if (mode == 2 && curve.spline->getState()->retimingExtrapolation)
-                continue;
+        std::size_t const count = curve.spline->getNumberOfVertices();
+        std::size_t const stride = count > 1000 ? 9 : count > 100 ? 4 : 1;
+        bool const isSampled = isWhollyVisited(curve, exhibit.name);
+        auto const positions = isSampled ? samplePositions(*curve.spline) : std::vector<Tempus>();
+        for (std::uint32_t const mode : {0u, 1u, 2u, 3u, 4u, 9u}) {
             curve.setModes(mode);
+            for (std::size_t i = 0; i < at.size(); i += stride) {
+                for (std::size_t j = i; j < at.size(); j += stride) {
+                    auto const host = curve.visit(ExtremesVisitor(), at[i], at[j]);
+                    auto const [low, high] = curve.extremes(at[i], at[j]);
+                    double const slack = isInexact(exhibit.name) ? 1e-12 : 0.0;
+                    ASSERT_TRUE((isSameDouble(low, host.min) && isSameDouble(high, host.max)) ||
+                                (std::fabs(low - host.min) <= slack && std::fabs(high - host.max) <= slack))
+                        << exhibit.name << ", mode " << mode << ", " << museumText(at[i]) << " to "
+                        << museumText(at[j]) << ": " << low << ' ' << host.min << ", " << high << ' '
+                        << host.max;
+                    EXPECT_LE(host.visits, 22 * 3 * static_cast<int>(count) + 4) << exhibit.name;
+                }
+            }
+            // The frames of a retimed ping-pong are mapped a step away from where the curve has them.
+            if (!isSampled || mode == 9 || (mode == 2 && curve.spline->getState()->retimingExtrapolation))
+                continue;
             for (auto const& [i, j] :
                  {std::pair<std::size_t, std::size_t>{0, at.size() - 1}, {3, 7}, {6, 12}}) {
+                auto const isIn = [&](Time t) { return at[i] <= t && t <= at[j]; };
                 double min = kMost, max = -kMost;
-                auto const include = [&](Time t) {
-                    double const value = curve.spline->getVertexValue(t, kTempusZero, true);
-                    min = std::min(min, value);
-                    max = std::max(max, value);
-                };
-                include(at[i]);
-                include(at[j]);
-                for (Tempus const& t : positions) {
-                    if (at[i] <= t && t <= at[j])
-                        include(t);
+                for (std::vector<Tempus> const& some : {positions, std::vector{at[i], at[j]}}) {
+                    for (Tempus const& t : some) {
+                        double const value = curve.spline->getVertexValue(t, kTempusZero, true);
+                        min = isIn(t) ? std::min(min, value) : min;
+                        max = isIn(t) ? std::max(max, value) : max;
+                    }
                 }
                 auto const [low, high] = curve.extremes(at[i], at[j]);
-                double const span = std::max(max - min, 1e-12);
-                std::string const what = exhibit.name + ", mode " + std::to_string(mode) + ", " +
-                                         museumText(at[i]) + " to " + museumText(at[j]);
-                EXPECT_LE(low, min + span * 1e-9) << what;
-                EXPECT_GE(high, max - span * 1e-9) << what;
-                // Between two samples a curve rises by a small part only.
-                EXPECT_GE(low, min - span * 1e-2) << what;
-                EXPECT_LE(high, max + span * 1e-2) << what;
-                ++compared;
+                double const rounding = std::max(max - min, 1e-12) * 1e-9;
+                double const betweenSamples = rounding * 1e7;
+                EXPECT_TRUE(low <= min + rounding && high >= max - rounding && low >= min - betweenSamples &&
+                            high <= max + betweenSamples)
+                    << exhibit.name << ", mode " << mode << ", " << museumText(at[i]) << " to "
+                    << museumText(at[j]) << ": " << low << ' ' << min << ", " << high << ' ' << max;
             }
         }
     }
-    EXPECT_GT(compared, 500);
 }
 
 TEST(KFChannelSegmentVisitor, FindsExtremesOfAnyNumberOfRepeats) {
@@ -443,7 +338,7 @@ TEST(KFChannelSegmentVisitor, FindsExtremesOfAnyNumberOfRepeats) {
         for (std::int64_t const reach : {7, 8, 20, 1000}) {
             for (auto const& [from, to] :
                  {std::pair{s(-reach), s(reach)}, {s(3 * reach + 1, 3), s(5 * reach)}}) {
-                auto const host = curve.visited<ExtremesVisitor>(from, to);
+                auto const host = curve.visit(ExtremesVisitor(), from, to);
                 EXPECT_EQ(curve.extremes(from, to), std::pair(host.min, host.max)) << mode << ' ' << reach;
             }
         }
@@ -464,9 +359,8 @@ TEST(KFChannelSegmentVisitor, AnswersWithoutCurveAndWithoutOutputs) {
     EXPECT_TRUE(curve.channel.getCurrentMinAndMax(s(1, 2), s(1), &low, nullptr));
     EXPECT_EQ(std::pair(low, high), std::pair(-5.0, -2.0));
     curve.channel.getCurveInterface()->setIsSpline(false, kTempusZero);
-    EXPECT_EQ(curve.notes(s(9), s(8)), "1@9..8");
+    EXPECT_EQ(curve.visit(Notes(), s(9), s(8)).text.str(), "1@9..8 ");
     delete curve.channel.releaseCurveInterface();
-    EXPECT_EQ(curve.notes(s(0), s(1)), "");
     EXPECT_EQ(curve.extremes(s(0), s(1)), std::pair(kMost, -kMost));
     std::vector<Tempus> times;
     EXPECT_FALSE(curve.channel.getTimeForValue(1.0, times, {s(0), s(1)}, s(1, 30), 0));
@@ -551,30 +445,21 @@ TEST(KFChannelSegmentVisitor, MapsTimesLikeAWalker) {
 }
 
 TEST(KFChannelSegmentVisitor, MapsWhatHasNoCyclesToTheStart) {
-    struct Case {
-        Tempus t, minTime, maxTime;
-    };
-    Tempus const foreign{5, 1, kTempusFlagValid, -1};
-    Case const cases[] = {{s(5), s(2), s(2)},
-                          {s(5), s(2), s(1)},
-                          {s(5), s(2), kTempusPositiveInfinity},
-                          {kTempusPositiveInfinity, s(2), s(3)},
-                          {kTempusNegativeInfinity, s(2), s(3)},
-                          {kTempusInvalid, s(2), s(3)},
-                          {foreign, s(2), s(3)}};
-    for (Case const& c : cases) {
-        bool reversed = true;
-        long cycles = 9;
-        EXPECT_EQ(KFChannelSegmentVisitor::mapPingPong(c.t, c.minTime, c.maxTime, s(1, 30), true, &reversed),
-                  s(2));
-        EXPECT_EQ(KFChannelSegmentVisitor::mapProgressiveRepeat(c.t, c.minTime, c.maxTime, true, &cycles),
-                  s(2));
-        EXPECT_FALSE(reversed);
-        EXPECT_EQ(cycles, 0);
+    Tempus const ofAnotherEpoch{5, 1, kTempusFlagValid, -1};
+    bool reversed = true;
+    long cycles = 9;
+    for (auto const& [t, maxTime] : {std::pair{s(5), s(2)},
+                                     {s(5), s(1)},
+                                     {s(5), kTempusPositiveInfinity},
+                                     {kTempusNegativeInfinity, s(3)},
+                                     {kTempusInvalid, s(3)},
+                                     {ofAnotherEpoch, s(3)}}) {
+        EXPECT_EQ(KFChannelSegmentVisitor::mapPingPong(t, s(2), maxTime, s(1, 30), true, &reversed), s(2));
+        EXPECT_EQ(KFChannelSegmentVisitor::mapProgressiveRepeat(t, s(2), maxTime, true, &cycles), s(2));
+        EXPECT_TRUE(!reversed && cycles == 0);
     }
     // A quotient of rounded seconds would count one cycle less.
-    long cycles = 0;
-    EXPECT_EQ(KFChannelSegmentVisitor::mapProgressiveRepeat(s(3, 10), s(0), s(1, 10), false, &cycles), s(0));
+    KFChannelSegmentVisitor::mapProgressiveRepeat(s(3, 10), s(0), s(1, 10), false, &cycles);
     EXPECT_EQ(cycles, 3);
     EXPECT_EQ(KFChannelSegmentVisitor::mapPingPong(s(5), s(0), s(2), s(1), false, nullptr), s(1));
 }
