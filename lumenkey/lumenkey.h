@@ -12,6 +12,7 @@
 #include "lumenkey/Channels/KFChannelInfo.h"
 #include "lumenkey/Channels/KFChannelObjectRootBase.h"
 #include "lumenkey/Channels/KFChannelRef.h"
+#include "lumenkey/Channels/KFChannelSegmentVisitor.h"
 #include "lumenkey/Channels/KFChannelTimeConverter.h"
 #include "lumenkey/Channels/KFCompoundChannel.h"
 #include "lumenkey/Channels/KFFactories.h"

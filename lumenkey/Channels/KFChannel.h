@@ -160,9 +160,13 @@ public:
     virtual double getSliderMax() const;
     /// Start and end of the range in local time, and the duration of a frame. Outputs may be null.
     virtual void getBakeParameters(BXTimeRange const& range, Tempus* start, Tempus* end, Tempus* frame) const;
-    /// The smallest and largest value between two curve times, in either order, without processing nodes and fades.
-    /// False, with nothing done, if both outputs are null. Keypoints and the ends count exactly; an extreme between
-    /// two neighbouring ones is looked for at 64 steps and then narrowed down.
+    /// The smallest and largest value between two curve times, overshoot and extrapolated stretches included, without
+    /// processing nodes, fades and the curve's limits. Nothing is sampled: each piece of the curve says what its
+    /// extremes are, as `KFChannelSegmentVisitor::visitSegments` tells the pieces, with what that leaves out. So where
+    /// there is no piece, as in a stretch whose end is before its start, the outputs are the largest and the lowest
+    /// finite double. An output may be null; false, with nothing done, if both are.
+    ///
+    /// The time grows with the keypoints, but not with the number of cycles of a curve that repeats.
     virtual bool getCurrentMinAndMax(Tempus const& from, Tempus const& to, double* minimum, double* maximum);
     virtual unsigned int getNumberOfKeyframes() const;
     /// By handle, in curve time. False on a locked channel.
@@ -396,6 +400,12 @@ public:
     bool getKeyframesTimeAndValue(TempusRange range,
                                   std::vector<std::pair<Tempus, std::pair<double, unsigned>>>& out,
                                   Tempus* first, Tempus* last) const;
+    /// Appends to `times` the global times at which the curve has `value`, within `range` less a frame at its end: what
+    /// the curve's `getUForValue` finds, without extrapolation and processing nodes. The start of `range` is global. A
+    /// frame is that of the object root, and `fallbackFrameDuration` without one. With `flags` 1 the times descend.
+    /// False, and nothing is appended, if there are none.
+    bool getTimeForValue(double value, std::vector<Tempus>& times, BXTimeRange const& range,
+                         Tempus const& fallbackFrameDuration, unsigned int flags) const;
     unsigned int getInterpolation() const;
     bool hasInterpolation(unsigned int type) const;
     unsigned int getExtrapolation(unsigned int which) const;
