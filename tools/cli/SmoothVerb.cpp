@@ -1,0 +1,46 @@
+#include "tools/cli/EditVerb.h"
+
+namespace lumenkey::tools {
+
+namespace {
+
+class Smooth : public EditVerb {
+public:
+    EditWords words() const override {
+        return {
+            "smooth",
+            "Take the jitter out of curves",
+            "[--step T]",
+            "A keypoint comes to each step, with the value that a parabola through seven samples has there "
+            "(Savitzky and\nGolay 1964): the longer the step, the smoother. The last one is that of the last "
+            "whole step; keypoints behind it\nstay.\n",
+            "lumenkey smooth walk.bvh Spine --from 1 --to 2 -o smooth.bvh --plot smooth.svg",
+            "largest change"};
+    }
+
+    void addOptions(CLI::App& verb) override {
+        _step.add(verb, "The curve is sampled at every step of the stretch");
+    }
+    void readOptions() override { _step.read(); }
+    void prepare(ChannelFile const& file, TimeSpan const& span) override { _step.prepare(file, span); }
+    std::optional<Tempus> sampleStep() const override { return _step.step(); }
+
+    void apply(KFChannel& channel, TimeSpan const& span) override {
+        SampledStretch const stretch(span, _step.step());
+        if (stretch.isEmpty()) {
+            return;
+        }
+        KFCurve& curve = *channel.getCurveInterface();
+        OutsideKept const kept(curve, {stretch.start, stretch.last});
+        curve.smoothCurve(stretch.start, stretch.end, stretch.step);
+    }
+
+private:
+    StepOption _step;
+};
+
+} // namespace
+
+Verb declareSmooth(CLI::App& program) { return declareEdit(program, std::make_shared<Smooth>()); }
+
+} // namespace lumenkey::tools
