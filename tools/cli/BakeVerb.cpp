@@ -12,12 +12,14 @@ namespace {
 class Bake : public EditVerb {
 public:
     EditWords words() const override {
-        return {"bake",
-                "Replace keypoints by those of a smooth curve through samples",
-                "[--step T] [--tolerance X]",
-                "The last sample is that of the last whole step; keypoints behind it stay.\n",
-                "lumenkey bake walk.bvh Hips --step 1/24 -o baked.bvh",
-                "worst error"};
+        EditWords words;
+        words.name = "bake";
+        words.description = "Replace keypoints by those of a smooth curve through samples";
+        words.usage = "[--step T] [--tolerance X]";
+        words.notes = "The last sample is that of the last whole step; keypoints behind it stay.\n";
+        words.example = "lumenkey bake walk.bvh Hips --step 1/24 -o baked.bvh";
+        words.keepsShape = true;
+        return words;
     }
 
     void addOptions(CLI::App& verb) override {

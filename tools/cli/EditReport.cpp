@@ -77,7 +77,7 @@ void writeChannelJson(JsonWriter& json, EditedChannel const& channel, std::strin
 } // namespace
 
 std::string EditReport::summary() const {
-    std::string text = "keypoints " + keypointsText(totalsOf(channels)) + "; " + words.difference;
+    std::string text = "keypoints " + keypointsText(totalsOf(channels)) + "; " + words.difference();
     for (EditedChannel const* const channel : mostChanged(channels)) {
         text += (channel == mostChanged(channels).front() ? " " : ", ") + tableText(channel->change.most) +
                 " " + channel->unit;
@@ -86,16 +86,16 @@ std::string EditReport::summary() const {
 }
 
 void EditReport::writeTable(OutputSink& out) const {
-    std::size_t const width = words.difference.size() + 2;
+    std::size_t const width = words.difference().size() + 2;
     auto const line = [&](std::string label, std::string const& text) {
         label.resize(width, ' ');
         out.write(label + text + "\n");
     };
     line("keypoints", keypointsText(totalsOf(channels)));
     for (EditedChannel const* const channel : mostChanged(channels)) {
-        line(words.difference, tableText(channel->change.most) + " " + channel->unit + ", of " +
-                                   printableText(channel->channel) + " at " +
-                                   tableText(TempusGetSeconds(channel->change.at)) + " s");
+        line(words.difference(), tableText(channel->change.most) + " " + channel->unit + ", of " +
+                                     printableText(channel->channel) + " at " +
+                                     tableText(TempusGetSeconds(channel->change.at)) + " s");
     }
     line("stretch", timeText(span.from) + " s to " + timeText(span.to) + " s");
     line("written", printableText(output) + ", " + std::to_string(written.count) +
@@ -106,7 +106,7 @@ void EditReport::writeTable(OutputSink& out) const {
                      {"unit"},
                      {"before", Align::Right},
                      {"after", Align::Right},
-                     {words.difference, Align::Right}};
+                     {words.difference(), Align::Right}};
     table.rowCount = channels.size();
     table.cell = [this](std::size_t row, std::size_t column) -> std::string {
         EditedChannel const& channel = channels[row];
@@ -127,8 +127,7 @@ void EditReport::writeTable(OutputSink& out) const {
 }
 
 void EditReport::writeJson(OutputSink& out) const {
-    bool const isError = words.difference == "worst error";
-    std::string const difference = isError ? "worstError" : "largestChange";
+    std::string const difference = words.keepsShape ? "worstError" : "largestChange";
     KeypointTotals const totals = totalsOf(channels);
     JsonWriter json(out);
     json.beginObject();

@@ -123,14 +123,22 @@ private:
         }
     }
 
+    TimeSpan keyedSpan(KFChannel const& channel) const {
+        TimeSpan keyed;
+        channel.getFirstKeyframe(&keyed.from, nullptr);
+        channel.getLastKeyframe(&keyed.to, nullptr);
+        return {TempusMaximum(_span.from, keyed.from), TempusMinimum(_span.to, keyed.to)};
+    }
+
     EditedChannel edit(ChannelTree const& tree, Node node, Tempus const& step) {
         KFChannel& channel = tree.channel(node);
         EditedChannel edited{tree.dottedName(node), std::string(tree.unit(node)),
                              channel.getNumberOfKeyframes()};
         std::unique_ptr<KFCurveInterface> const copy(tree.curve(node).cloneCurve());
         auto& before = static_cast<KFCurve&>(*copy);
-        if (edited.keypointsBefore > 0) {
-            _verb.apply(channel, _span);
+        TimeSpan const keyed = keyedSpan(channel);
+        if (edited.keypointsBefore > 0 && !(keyed.to < keyed.from)) {
+            _verb.apply(channel, keyed);
         }
         edited.keypointsAfter = channel.getNumberOfKeyframes();
         edited.change = changeBetween(before, tree.curve(node), _span, step);
@@ -141,7 +149,7 @@ private:
     }
 
     WrittenRows writeFile(ChannelInput const& input, std::vector<Node> const& channels) const {
-        bool const areKeypoints = _options.rows.empty() ? _verb.movesInTime() : _options.rows == "keypoints";
+        bool const areKeypoints = _options.rows.empty() ? !_verb.sampleStep() : _options.rows == "keypoints";
         Progress bar("writing");
         return writeChannelFile({input.file(), _format, areKeypoints ? RowsOf::Keypoints : RowsOf::Input,
                                  channels, _options.output},
@@ -199,7 +207,7 @@ void addCommonOptions(CLI::App& verb, EditOptions& options) {
     verb.add_option("--to", options.to, "The last time that is edited (else the last of the file)")
         ->option_text("T");
     verb.add_option("--rows", options.rows,
-                    "Of a CSV: a row for each one of the input, or for each keypoint after the edit")
+                    "Of a CSV: a row for each of the input, or for each keypoint after the edit")
         ->check(CLI::IsMember({"input", "keypoints"}))
         ->option_text("input|keypoints");
     verb.add_option("--plot", options.plot, "Draw before and after: PICTURE.svg, .png or .pdf")
@@ -207,15 +215,15 @@ void addCommonOptions(CLI::App& verb, EditOptions& options) {
     verb.add_flag("--json", options.json, "For programs: what changed, every number in full");
 }
 
-std::string footerOf(EditWords const& words) {
+std::string footerOf(EditWords const& words, bool draws) {
     return words.notes +
            "A time is VALUE/TIMESCALE (1001/24000), seconds (0.5) or frames of the file (12f).\n"
            "Without CHANNEL all channels are edited; the others are written as they are.\n"
-           "A BVH has frames that last as long as those of FILE, from 0 or from the first keypoint before it "
-           "to "
-           "the last one.\nA CSV has the rows of the input or, where keypoints come to other times, of the "
-           "keypoints; --rows tells otherwise.\n\nExample: " +
-           words.example;
+           "A BVH has frames as long as those of FILE, from 0, or from the first keypoint before it, to the "
+           "last.\n"
+           "A CSV has " +
+           (draws ? "the rows of the input" : "a row for each keypoint") +
+           ", if --rows doesn't say otherwise.\n\nExample: " + words.example;
 }
 
 } // namespace
@@ -226,7 +234,7 @@ Verb declareEdit(CLI::App& program, std::shared_ptr<EditVerb> const& verb) {
     CLI::App* const arguments = program.add_subcommand(words.name, words.description);
     addCommonOptions(*arguments, *options);
     verb->addOptions(*arguments);
-    arguments->footer(footerOf(words));
+    arguments->footer(footerOf(words, verb->sampleStep().has_value()));
     return {arguments,
             "FILE [CHANNEL...] " + words.usage + (words.usage.empty() ? "" : " ") +
                 "-o OUT.csv|bvh [--from T] [--to T] [--rows input|keypoints] [--plot PICTURE.svg|png|pdf] "

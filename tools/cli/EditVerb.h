@@ -20,9 +20,10 @@ struct EditWords {
     /// Its own part of what stands at the end of the help, and the example there.
     std::string notes;
     std::string example;
-    /// What the difference between before and after is: `worst error` where a curve should stay as it is, else `largest
-    /// change`.
-    std::string difference;
+    /// Curves should stay as they are, so that any difference is an error.
+    bool keepsShape = false;
+
+    std::string difference() const { return keepsShape ? "worst error" : "largest change"; }
 };
 
 /// A verb that changes the curves of some channels in a stretch of time and writes the file anew. What is its own is
@@ -41,13 +42,12 @@ public:
     virtual void readOptions() {}
     /// Once the file is open and the stretch known.
     virtual void prepare(ChannelFile const&, TimeSpan const&) {}
-    /// For a channel with keypoints, in the time of its curve.
+    /// For a channel with keypoints; the span is that part of the stretch in which they lie.
     virtual void apply(KFChannel& channel, TimeSpan const& span) = 0;
 
-    /// The step at which it samples; nothing where it doesn't.
+    /// The step at which it samples curves, to give them keypoints that draw them anew; nothing where it changes the
+    /// keypoints that there are.
     virtual std::optional<Tempus> sampleStep() const { return std::nullopt; }
-    /// Whether keypoints come to other times, so that the rows of a table do too.
-    virtual bool movesInTime() const { return false; }
     /// Where the stretch comes to.
     virtual TimeSpan arrivalOf(TimeSpan const& span) const { return span; }
 };

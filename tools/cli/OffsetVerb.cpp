@@ -12,12 +12,13 @@ namespace {
 class Offset : public EditVerb {
 public:
     EditWords words() const override {
-        return {"offset",
-                "Move curves in time, in value, or in both",
-                "[--by T] [--value X]",
-                "Keypoints of the stretch take the place of those that lie where they come to in time.\n",
-                "lumenkey offset walk.bvh LeftArm --by -6f -o earlier.bvh",
-                "largest change"};
+        EditWords words;
+        words.name = "offset";
+        words.description = "Move curves in time, in value, or in both";
+        words.usage = "[--by T] [--value X]";
+        words.notes = "Keypoints of the stretch replace those that lie where they come to in time.\n";
+        words.example = "lumenkey offset walk.bvh LeftArm --by -6f -o earlier.bvh";
+        return words;
     }
 
     void addOptions(CLI::App& verb) override {
@@ -49,13 +50,12 @@ public:
             curve.getKeypoint(keypoint, nullptr, &value);
             curve.setKeypointValue(keypoint, value + _value, true);
         }
-        if (movesInTime()) {
+        if (_delay != kTempusZero) {
             editKeypointsWithin(channel, span,
                                 [this](KFCurve& moved) { moved.forceRetimeCurve(TempusMake(1, 1), _delay); });
         }
     }
 
-    bool movesInTime() const override { return _delay != kTempusZero; }
     TimeSpan arrivalOf(TimeSpan const& span) const override { return {span.from + _delay, span.to + _delay}; }
 
 private:

@@ -26,14 +26,14 @@ Tempus factorOf(std::string const& text) {
 class Retime : public EditVerb {
 public:
     EditWords words() const override {
-        return {"retime",
-                "Make curves last longer or shorter",
-                "--factor F [--about T]",
-                "A factor above 1 makes them slower. Keypoints of the stretch take the place of those that "
-                "lie where "
-                "they come to.\n",
-                "lumenkey retime walk.bvh --factor 2 -o slow.bvh",
-                "largest change"};
+        EditWords words;
+        words.name = "retime";
+        words.description = "Make curves last longer or shorter";
+        words.usage = "--factor F [--about T]";
+        words.notes = "A factor above 1 makes them slower. Keypoints of the stretch replace those that lie "
+                      "where they come to.\n";
+        words.example = "lumenkey retime walk.bvh --factor 2 -o slow.bvh";
+        return words;
     }
 
     void addOptions(CLI::App& verb) override {
@@ -60,7 +60,6 @@ public:
                             [this](KFCurve& curve) { curve.forceRetimeCurve(_factor, _offset); });
     }
 
-    bool movesInTime() const override { return true; }
     TimeSpan arrivalOf(TimeSpan const& span) const override {
         return {span.from * _factor + _offset, span.to * _factor + _offset};
     }

@@ -7,25 +7,34 @@ namespace {
 class Reverse : public EditVerb {
 public:
     EditWords words() const override {
-        return {"reverse",
-                "Turn curves round in time",
-                "",
-                "Of the keypoints in the stretch the first changes places with the last, the second with the "
-                "last "
-                "but one.\n",
-                "lumenkey reverse walk.bvh -o back.bvh",
-                "largest change"};
+        EditWords words;
+        words.name = "reverse";
+        words.description = "Turn curves round in time";
+        words.notes = "The keypoints of the stretch are mirrored about its middle.\n";
+        words.example = "lumenkey reverse walk.bvh -o back.bvh";
+        return words;
     }
+
+    void prepare(ChannelFile const&, TimeSpan const& span) override { _bothEnds = span.from + span.to; }
 
     void apply(KFChannel& channel, TimeSpan const& span) override {
-        KFCurve& curve = *channel.getCurveInterface();
-        std::vector<void*> const keypoints = keypointsWithin(curve, span);
-        if (!keypoints.empty()) {
-            curve.reverseKeypoints(keypoints.front(), keypoints.back(), true);
-        }
+        editKeypointsWithin(channel, span, [this](KFCurve& curve) {
+            Tempus first{};
+            Tempus last{};
+            void* firstHandle = nullptr;
+            void* lastHandle = nullptr;
+            curve.getFirstKeypoint(&first, nullptr);
+            curve.getLastKeypoint(&last, nullptr);
+            curve.getKeypointHandle(first, &firstHandle);
+            curve.getKeypointHandle(last, &lastHandle);
+            curve.reverseKeypoints(firstHandle, lastHandle, true); // about the middle of the two
+            curve.forceRetimeCurve(TempusMake(1, 1), _bothEnds - (first + last));
+        });
     }
 
-    bool movesInTime() const override { return true; }
+private:
+    /// Twice the middle of the stretch.
+    Tempus _bothEnds{};
 };
 
 } // namespace

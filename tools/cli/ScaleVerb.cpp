@@ -12,12 +12,12 @@ namespace {
 class Scale : public EditVerb {
 public:
     EditWords words() const override {
-        return {"scale",
-                "Multiply values",
-                "--factor X",
-                "",
-                "lumenkey scale walk.bvh Hips.Yposition --factor 0.01 -o metres.bvh",
-                "largest change"};
+        EditWords words;
+        words.name = "scale";
+        words.description = "Multiply values";
+        words.usage = "--factor X";
+        words.example = "lumenkey scale walk.bvh Hips.Yposition --factor 0.01 -o metres.bvh";
+        return words;
     }
 
     void addOptions(CLI::App& verb) override {

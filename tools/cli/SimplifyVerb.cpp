@@ -14,14 +14,16 @@ namespace {
 class Simplify : public EditVerb {
 public:
     EditWords words() const override {
-        return {
-            "simplify",
-            "Draw curves by few keypoints, within a tolerance",
-            "--tolerance X [--step T]",
-            "No curve goes off more than the tolerance, looked at at ten times in each step. One that fewer "
-            "keypoints can't draw\nso well stays as it is.\n",
-            "lumenkey simplify walk.bvh LeftLeg RightLeg --tolerance 0.01 -o few.csv --rows keypoints",
-            "worst error"};
+        EditWords words;
+        words.name = "simplify";
+        words.description = "Draw curves by few keypoints, within a tolerance";
+        words.usage = "--tolerance X [--step T]";
+        words.notes = "Looked at at ten times in each step, no curve goes off more than the tolerance. One "
+                      "that fewer keypoints can't draw\n"
+                      "so well stays as it is.\n";
+        words.example = "lumenkey simplify walk.bvh --tolerance 0.01 -o few.csv --rows keypoints";
+        words.keepsShape = true;
+        return words;
     }
 
     void addOptions(CLI::App& verb) override {

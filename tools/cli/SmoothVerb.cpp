@@ -7,15 +7,16 @@ namespace {
 class Smooth : public EditVerb {
 public:
     EditWords words() const override {
-        return {
-            "smooth",
-            "Take the jitter out of curves",
-            "[--step T]",
-            "A keypoint comes to each step, with the value that a parabola through seven samples has there "
-            "(Savitzky and\nGolay 1964): the longer the step, the smoother. The last one is that of the last "
-            "whole step; keypoints behind it\nstay.\n",
-            "lumenkey smooth walk.bvh Spine --from 1 --to 2 -o smooth.bvh --plot smooth.svg",
-            "largest change"};
+        EditWords words;
+        words.name = "smooth";
+        words.description = "Take the jitter out of curves";
+        words.usage = "[--step T]";
+        words.notes = "Each step gets a keypoint, as high as a parabola through seven samples is there "
+                      "(Savitzky and Golay 1964): the longer\n"
+                      "the step, the smoother. The last one is that of the last whole step; keypoints behind "
+                      "it stay.\n";
+        words.example = "lumenkey smooth walk.bvh Spine --from 1 --to 2 -o smooth.bvh --plot smooth.svg";
+        return words;
     }
 
     void addOptions(CLI::App& verb) override {
