@@ -176,18 +176,20 @@ TEST_F(EditVerbsTest, BakeGoesThroughItsSamples) {
 }
 
 TEST_F(EditVerbsTest, SmoothIsTheFilterItSays) {
-    std::string text = "t,spike,parabola\n";
+    std::string text = "t,spike,parabola,late\n";
     for (int i = 0; i < 15; ++i) {
-        text += std::to_string(i) + "/10," + (i == 7 ? "21" : "0") + "," + std::to_string(i * i) + "\n";
+        text += std::to_string(i) + "/10," + (i == 7 ? "21" : "0") + "," + std::to_string(i * i) +
+                (i < 2 ? ",\n" : ",4\n");
     }
     ASSERT_EQ(edit(_folder.write("f.csv", text), {"smooth"}).exit, 0);
     CsvFile const after = readCsvFile(_out);
     ASSERT_EQ(after.times.size(), 15U);
     double const kernel[] = {-2, 3, 6, 7, 6, 3, -2};
-    for (int i = 3; i < 12; ++i) {
-        auto const row = static_cast<std::size_t>(i);
-        EXPECT_NEAR(after.values[row * 2], i >= 4 && i <= 10 ? kernel[i - 4] : 0, 1e-12);
-        EXPECT_NEAR(after.values[row * 2 + 1], i * i, 1e-12);
+    for (int i = 0; i < 15; ++i) {
+        double const* const row = after.values.data() + static_cast<std::size_t>(i) * 3;
+        EXPECT_NEAR(row[0], i >= 4 && i <= 10 ? kernel[i - 4] : 0, 1e-12);
+        EXPECT_NEAR(row[1], i * i, i >= 3 && i < 12 ? 1e-12 : 10) << "beyond the ends the end's value counts";
+        EXPECT_EQ(std::isnan(row[2]), i < 2) << "a curve doesn't grow";
     }
 }
 
