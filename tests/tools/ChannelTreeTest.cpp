@@ -17,7 +17,7 @@ std::string const kJoint = "{ OFFSET 0 0 0 CHANNELS 1 Xrotation ";
 /// A file with a joint for each name; children are what stands between braces.
 std::unique_ptr<ChannelTree> treeOfJoints(std::string const& joints) {
     std::string text = "HIERARCHY\nROOT " + joints + "MOTION\nFrames: 0\nFrame Time: 0.04\n";
-    return treeOfMotion(readMotionText(text, "folder/odd.name.bvh"));
+    return treeOfMotion(readMotionText(text, "folder/odd.name.bvh")).tree;
 }
 
 /// Path, name and type of all nodes.
@@ -31,7 +31,7 @@ std::string listing(ChannelTree const& tree) {
 }
 
 TEST(ChannelTree, HoldsTheJointsInTheOrderOfTheFile) {
-    std::unique_ptr<ChannelTree> const tree = treeOfMotion(readMotionText(kSmallMotion, "small.bvh"));
+    std::unique_ptr<ChannelTree> const tree = treeOfMotion(readMotionText(kSmallMotion, "small.bvh")).tree;
     EXPECT_EQ(listing(*tree),
               "./ small ObjectRoot\n./1 Hips Folder\n./1/1 Xposition Double\n./1/2 Yposition Double\n"
               "./1/3 Zposition Double\n./1/4 Zrotation Angle\n./1/5 Xrotation Angle\n"
@@ -42,10 +42,12 @@ TEST(ChannelTree, HoldsTheJointsInTheOrderOfTheFile) {
     EXPECT_EQ(tree->channelsBelow(ChannelTree::kTop).size(), 9U);
 
     // Child joints follow the channels also where the file lists them first.
-    std::unique_ptr<ChannelTree> const late = treeOfMotion(
-        readMotionText("HIERARCHY\nROOT A{ OFFSET 0 0 0 JOINT B" + kJoint + "} JOINT C" + kJoint +
-                           "} CHANNELS 1 Yposition }\nMOTION\nFrames: 0\nFrame Time: 1\n",
-                       "late"));
+    std::unique_ptr<ChannelTree> const late =
+        treeOfMotion(readMotionText("HIERARCHY\nROOT A{ OFFSET 0 0 0 JOINT B" + kJoint + "} JOINT C" +
+                                        kJoint +
+                                        "} CHANNELS 1 Yposition }\nMOTION\nFrames: 0\nFrame Time: 1\n",
+                                    "late"))
+            .tree;
     EXPECT_EQ(listing(*late).substr(19),
               "./1 A Folder\n./1/1 Yposition Double\n./1/2 B Folder\n./1/2/1 Xrotation "
               "Angle\n./1/3 C Folder\n./1/3/1 Xrotation Angle\n");
@@ -112,7 +114,7 @@ double interpolated(Motion const& motion, std::size_t channel, Tempus const& tim
 
 TEST(SampleTimes, ReadsCurvesAtExactTimes) {
     Motion const motion = readMotionText(kSmallMotion, "f.bvh");
-    std::unique_ptr<ChannelTree> const tree = treeOfMotion(motion);
+    std::unique_ptr<ChannelTree> const tree = treeOfMotion(motion).tree;
     std::vector<ChannelTree::Node> const channels = tree->channelsBelow(ChannelTree::kTop);
     struct {
         char const* what;

@@ -314,7 +314,8 @@ TEST_F(ProgramTest, FailuresToWriteExitWithOne) {
 }
 
 TEST_F(ProgramTest, EveryVerbHelpsWithAnExample) {
-    for (char const* const verb : {"info", "tree", "keys", "sample", "plot", "gallery"}) {
+    for (char const* const verb : {"info", "tree", "keys", "sample", "plot", "gallery", "simplify", "bake",
+                                   "smooth", "reverse", "offset", "scale", "retime"}) {
         Outcome const help = runLumenkey({verb, "--help"});
         EXPECT_EQ(help.exit, 0);
         EXPECT_NE(help.out.find("Usage: lumenkey " + std::string(verb)), std::string::npos) << help.out;

@@ -5,6 +5,7 @@
 #include "tools/cli/Progress.h"
 #include "tools/cli/TimeArgument.h"
 #include "tools/cli/UsageError.h"
+#include "tools/edit/KeypointStretch.h"
 #include "tools/output/TextForms.h"
 #include "tools/plot/PlotChart.h"
 
@@ -27,11 +28,6 @@ struct PlotOptions {
     int height = 480;
 };
 
-struct TimeSpan {
-    Tempus from;
-    Tempus to;
-};
-
 TimeSpan spanOf(std::optional<TimeArgument> const& from, std::optional<TimeArgument> const& to,
                 ChannelFile const& file) {
     Tempus const frame = file.frameDuration;
@@ -45,15 +41,6 @@ TimeSpan spanOf(std::optional<TimeArgument> const& from, std::optional<TimeArgum
     return span;
 }
 
-ChartPanel& panelOfUnit(PlotChart& chart, std::string_view unit) {
-    for (ChartPanel& panel : chart.panels) {
-        if (panel.unit == unit) {
-            return panel;
-        }
-    }
-    return chart.panels.emplace_back(ChartPanel{std::string(unit), {}});
-}
-
 PlotChart chartOf(ChannelInput const& input, std::vector<ChannelTree::Node> const& channels,
                   TimeSpan const& span, double width) {
     Progress bar("plotting");
@@ -65,7 +52,8 @@ PlotChart chartOf(ChannelInput const& input, std::vector<ChannelTree::Node> cons
         ChartPanel& panel = panelOfUnit(chart, input.tree().unit(channel));
         panel.curves.push_back(
             {input.tree().dottedName(channel),
-             traceCurve(input.tree().spline(channel), span.from, span.to, widthOfCurves(width))});
+             traceCurve(input.tree().spline(channel), span.from, span.to, widthOfCurves(width)),
+             std::nullopt});
         bar.update(static_cast<double>(++done) / static_cast<double>(channels.size()));
     }
     CurvePicture const& first = chart.panels.front().curves.front().picture;

@@ -27,4 +27,13 @@ Verb declareSample(CLI::App& program);
 Verb declarePlot(CLI::App& program);
 Verb declareGallery(CLI::App& program);
 
+// Those that write: see `EditVerb`.
+Verb declareSimplify(CLI::App& program);
+Verb declareBake(CLI::App& program);
+Verb declareSmooth(CLI::App& program);
+Verb declareReverse(CLI::App& program);
+Verb declareOffset(CLI::App& program);
+Verb declareScale(CLI::App& program);
+Verb declareRetime(CLI::App& program);
+
 } // namespace lumenkey::tools

@@ -3,7 +3,7 @@
 #include <algorithm>
 #include <array>
 #include <filesystem>
-#include <numbers>
+#include <utility>
 
 namespace lumenkey::tools {
 
@@ -39,10 +39,10 @@ std::vector<Tempus> timesOfFrames(Motion const& motion) {
 
 } // namespace
 
-std::unique_ptr<ChannelTree> treeOfMotion(Motion const& motion) {
+MotionTree treeOfMotion(Motion const& motion) {
     auto tree = std::make_unique<ChannelTree>(std::filesystem::path(motion.file).stem().string(),
                                               motion.frameDuration);
-    std::vector<ChannelTree::Node> const channels = addJoints(motion, *tree);
+    std::vector<ChannelTree::Node> channels = addJoints(motion, *tree);
     std::vector<Tempus> const times = timesOfFrames(motion);
     std::array<std::vector<double>, kColumnsAtOnce> columns;
     for (std::size_t first = 0; first < channels.size(); first += kColumnsAtOnce) {
@@ -50,7 +50,7 @@ std::unique_ptr<ChannelTree> treeOfMotion(Motion const& motion) {
         std::array<double, kColumnsAtOnce> scales{};
         for (std::size_t i = 0; i < width; ++i) {
             columns[i].resize(motion.frameCount);
-            scales[i] = isRotation(motion.channels[first + i].kind) ? std::numbers::pi / 180 : 1;
+            scales[i] = isRotation(motion.channels[first + i].kind) ? kRadiansOfDegree : 1;
         }
         for (std::size_t frame = 0; frame < motion.frameCount; ++frame) {
             for (std::size_t i = 0; i < width; ++i) {
@@ -62,7 +62,7 @@ std::unique_ptr<ChannelTree> treeOfMotion(Motion const& motion) {
         }
     }
     tree->finish({kTempusZero, motion.timeOfFrame(motion.frameCount)});
-    return tree;
+    return {std::move(tree), std::move(channels)};
 }
 
 } // namespace lumenkey::tools

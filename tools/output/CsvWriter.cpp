@@ -4,6 +4,12 @@
 
 namespace lumenkey::tools {
 
+namespace {
+
+bool isBlank(char c) { return c == ' ' || c == '\t'; }
+
+} // namespace
+
 void CsvWriter::separate() {
     constexpr std::size_t enough = 65'536; // a row may be as long as a file
     if (_pending.size() >= enough) {
@@ -17,7 +23,8 @@ void CsvWriter::separate() {
 
 void CsvWriter::field(std::string_view text) {
     separate();
-    if (text.find_first_of(",\"\r\n") == std::string_view::npos) {
+    bool const hasOuterBlank = !text.empty() && (isBlank(text.front()) || isBlank(text.back()));
+    if (!hasOuterBlank && text.find_first_of(",\"\r\n") == std::string_view::npos) {
         _pending += text;
         return;
     }

@@ -35,6 +35,9 @@ PlotStroke strokeOfCurve(std::size_t index) {
             patterns[round % std::size(patterns)]};
 }
 
+std::string const kBeforeName = "before";
+PlotStroke const kBeforeStroke{style::kBefore, style::kBeforeWidth, {}};
+
 class ChartDrawing {
 public:
     ChartDrawing(PlotChart const& chart, PlotCanvas& canvas) : _chart(chart), _canvas(canvas) {}
@@ -72,9 +75,13 @@ private:
         double y = top + kLegendLine * 0.7;
         double const lowest = top + _canvas.height() * kLegendShare;
         std::size_t index = 0;
+        if (showsBefore()) {
+            drawLegendEntry({x, y}, kBeforeName, kBeforeStroke);
+            x += widthOfEntry(kBeforeName);
+        }
         for (ChartPanel const& panel : _chart.panels) {
             for (ChartCurve const& curve : panel.curves) {
-                double const width = kLegendSample + 7 + _canvas.textWidth(curve.name, kLegend) + 20;
+                double const width = widthOfEntry(curve.name);
                 if (x > kMarginLeft && x + width > _canvas.width() - kMarginRight + 20) {
                     x = kMarginLeft;
                     y += kLegendLine;
@@ -90,9 +97,20 @@ private:
         return y + kLegendLine;
     }
 
+    double widthOfEntry(std::string const& name) {
+        return kLegendSample + 7 + _canvas.textWidth(name, kLegend) + 20;
+    }
+
+    bool showsBefore() const {
+        return std::any_of(_chart.panels.begin(), _chart.panels.end(), [](ChartPanel const& panel) {
+            return std::any_of(panel.curves.begin(), panel.curves.end(),
+                               [](ChartCurve const& curve) { return curve.before.has_value(); });
+        });
+    }
+
     void drawLegendEntry(PlotPoint at, std::string const& name, PlotStroke stroke) {
         double const middle = at.y - kLegend.size * 0.36;
-        stroke.width = 2.2;
+        stroke.width = std::max(stroke.width, 2.2);
         _canvas.line({at.x, middle}, {at.x + kLegendSample, middle}, stroke);
         _canvas.text({at.x + kLegendSample + 7, at.y}, name, kLegend);
     }
@@ -107,9 +125,15 @@ private:
 
     PlotRange valuesOf(ChartPanel const& panel) const {
         PlotRange range = panel.curves.front().picture.valueRange();
-        for (ChartCurve const& curve : panel.curves) {
-            PlotRange const other = curve.picture.valueRange();
+        auto const widen = [&range](CurvePicture const& picture) {
+            PlotRange const other = picture.valueRange();
             range = {std::min(range.low, other.low), std::max(range.high, other.high)};
+        };
+        for (ChartCurve const& curve : panel.curves) {
+            widen(curve.picture);
+            if (curve.before) {
+                widen(*curve.before);
+            }
         }
         return PlotRange::sound(range.low, range.high).padded(0.06);
     }
@@ -118,6 +142,11 @@ private:
         PlotFrame const frame{area, _chart.seconds, valuesOf(panel)};
         drawGrid(frame, panel.unit);
         _canvas.clip({area.x - 4, area.y - 4, area.width + 8, area.height + 8});
+        for (ChartCurve const& curve : panel.curves) {
+            if (curve.before) {
+                drawCurve(_canvas, frame, *curve.before, kBeforeStroke, KeypointMarks::None);
+            }
+        }
         for (ChartCurve const& curve : panel.curves) {
             drawCurve(_canvas, frame, curve.picture, strokeOfCurve(_drawn++),
                       marksFor(curve.picture, area.width));
@@ -164,6 +193,15 @@ private:
 };
 
 } // namespace
+
+ChartPanel& panelOfUnit(PlotChart& chart, std::string_view unit) {
+    for (ChartPanel& panel : chart.panels) {
+        if (panel.unit == unit) {
+            return panel;
+        }
+    }
+    return chart.panels.emplace_back(ChartPanel{std::string(unit), {}});
+}
 
 double widthOfCurves(double chartWidth) { return std::max(chartWidth - kMarginLeft - kMarginRight, 1.0); }
 

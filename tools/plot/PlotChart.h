@@ -4,7 +4,9 @@
 #include "tools/plot/PlotCanvas.h"
 
 #include <cstddef>
+#include <optional>
 #include <string>
+#include <string_view>
 #include <vector>
 
 namespace lumenkey::tools {
@@ -12,6 +14,8 @@ namespace lumenkey::tools {
 struct ChartCurve {
     std::string name;
     CurvePicture picture;
+    /// What the curve was, drawn broad and pale below it.
+    std::optional<CurvePicture> before;
 };
 
 /// Curves of one unit, which share an axis of values.
@@ -33,6 +37,9 @@ struct PlotChart {
 
     void draw(PlotCanvas& canvas) const;
 };
+
+/// The panel of a unit, added where there is none yet.
+ChartPanel& panelOfUnit(PlotChart& chart, std::string_view unit);
 
 /// How many pixels a chart of this width gives to its curves.
 double widthOfCurves(double chartWidth);

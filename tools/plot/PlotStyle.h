@@ -26,6 +26,9 @@ inline constexpr std::array<PlotColour, 7> kCurves{fromHex(0x0072B2), fromHex(0x
                                                    fromHex(0x333333)};
 
 inline constexpr double kCurveWidth = 1.6;
+/// Of what a curve was before an edit.
+inline constexpr PlotColour kBefore = fromHex(0xC3CAD2);
+inline constexpr double kBeforeWidth = 4;
 /// Of a continuation outside the keypoints.
 inline constexpr std::array<double, 2> kContinuationDashes{4, 3};
 

@@ -1,0 +1,64 @@
+#include "tools/cli/EditVerb.h"
+
+#include "tools/cli/UsageError.h"
+
+#include <CLI/CLI.hpp>
+#include <cmath>
+
+namespace lumenkey::tools {
+
+namespace {
+
+class Bake : public EditVerb {
+public:
+    EditWords words() const override {
+        EditWords words;
+        words.name = "bake";
+        words.description = "Replace keypoints by those of a smooth curve through samples";
+        words.usage = "[--step T] [--tolerance X]";
+        words.notes = "The last sample is that of the last whole step; keypoints behind it stay.\n";
+        words.example = "lumenkey bake walk.bvh Hips --step 1/24 -o baked.bvh";
+        words.keepsShape = true;
+        return words;
+    }
+
+    void addOptions(CLI::App& verb) override {
+        _step.add(verb, "The curve is sampled at every step of the stretch");
+        verb.add_option(
+                "--tolerance", _tolerance,
+                "How far the curve may go off a sample, in the unit of its channel: radians, or units")
+            ->option_text("X")
+            ->capture_default_str();
+    }
+
+    void readOptions() override {
+        if (!std::isfinite(_tolerance) || _tolerance < 0) {
+            throw UsageError{"--tolerance must be 0 or above"};
+        }
+        _step.read();
+    }
+
+    void prepare(ChannelFile const& file, TimeSpan const& span) override { _step.prepare(file, span); }
+    std::optional<Tempus> sampleStep() const override { return _step.step(); }
+
+    void apply(KFChannel& channel, TimeSpan const& span) override {
+        constexpr double hundredths = 100;
+        SampledStretch const stretch(span, _step.step());
+        if (stretch.isEmpty()) {
+            return;
+        }
+        KFCurve& curve = *channel.getCurveInterface();
+        OutsideKept const kept(curve, {stretch.start, stretch.last});
+        curve.bakeCurve(nullptr, stretch.start, stretch.step, stretch.end, _tolerance * hundredths, 1);
+    }
+
+private:
+    double _tolerance = 0;
+    StepOption _step;
+};
+
+} // namespace
+
+Verb declareBake(CLI::App& program) { return declareEdit(program, std::make_shared<Bake>()); }
+
+} // namespace lumenkey::tools

@@ -1,0 +1,268 @@
+#include "tools/cli/EditVerb.h"
+
+#include "tools/cli/ChannelInput.h"
+#include "tools/cli/EditReport.h"
+#include "tools/cli/PlotOptions.h"
+#include "tools/cli/Progress.h"
+#include "tools/cli/UsageError.h"
+#include "tools/edit/CurveChange.h"
+#include "tools/export/ChannelFileWriter.h"
+#include "tools/plot/PlotChart.h"
+
+#include <CLI/CLI.hpp>
+#include <algorithm>
+#include <filesystem>
+
+namespace lumenkey::tools {
+
+namespace {
+
+using Node = ChannelTree::Node;
+
+constexpr int kPictureWidth = 960;
+constexpr int kPictureHeight = 480;
+/// A part of a file is drawn with so much of its own length on either side.
+constexpr std::int32_t kShareBeside = 8;
+/// Where the rows of a table aren't evenly spaced, a stretch is compared in so many steps.
+constexpr std::int32_t kStepsOfUnevenRows = 1'000;
+
+struct EditOptions {
+    std::string file;
+    std::vector<std::string> channels;
+    std::string output;
+    std::string from;
+    std::string to;
+    std::string rows;
+    std::string plot;
+    bool json = false;
+};
+
+/// What the name of the output asks for. Throws `UsageError` for what can't be written from this input; of an unknown
+/// input it says nothing.
+ChannelFormat requireOutputFormat(std::string const& output, std::optional<ChannelFormat> input) {
+    std::optional<ChannelFormat> const format = channelFormatNamed(output);
+    if (!format) {
+        throw UsageError{"'" + output + "' must end in .csv or .bvh, which tells what to write"};
+    }
+    if (format == ChannelFormat::Motion && input == ChannelFormat::Csv) {
+        throw UsageError{"'" + output + "' can't be a BVH: a table (CSV) has no skeleton"};
+    }
+    return *format;
+}
+
+/// One run of a verb.
+class EditRun {
+public:
+    EditRun(EditVerb& verb, EditOptions const& options) : _verb(verb), _options(options) {}
+
+    void run(OutputSink& out) {
+        readOptions();
+        ChannelInput const input(_options.file);
+        _format = requireOutputFormat(_options.output, input.file().format);
+        std::vector<Node> const channels = channelsOf(input);
+        _span = spanOf(input.file());
+        _verb.prepare(input.file(), _span);
+        editAll(input, channels);
+
+        EditReport report{_verb.words(), _options.output, _span, {}, std::move(_edited)};
+        report.written = writeFile(input, channels);
+        if (_picture) {
+            savePicture(report);
+        }
+        _options.json ? report.writeJson(out) : report.writeTable(out);
+    }
+
+private:
+    void readOptions() {
+        requireOutputFormat(_options.output, channelFormatNamed(_options.file));
+        if (!_options.plot.empty()) {
+            _picture = requirePlotFormat(_options.plot);
+        }
+        _from = TimeArgument::parseIfGiven(_options.from);
+        _to = TimeArgument::parseIfGiven(_options.to);
+        _verb.readOptions();
+    }
+
+    /// Each once, in tree order.
+    std::vector<Node> channelsOf(ChannelInput const& input) const {
+        std::vector<Node> channels = input.channelsNamed(_options.channels);
+        std::sort(channels.begin(), channels.end());
+        channels.erase(std::unique(channels.begin(), channels.end()), channels.end());
+        if (_picture && channels.size() > kMostDistinctCurves) {
+            throw UsageError{std::to_string(channels.size()) +
+                             " channels are too many to tell apart in one picture; with --plot name " +
+                             std::to_string(kMostDistinctCurves) + " at most, or a folder with no more"};
+        }
+        return channels;
+    }
+
+    TimeSpan spanOf(ChannelFile const& file) const {
+        TimeSpan const span{_from ? _from->resolve(file.frameDuration) : file.firstTime,
+                            _to ? _to->resolve(file.frameDuration) : file.lastTime};
+        if (span.to < span.from) {
+            throw UsageError{"--to lies before --from"};
+        }
+        return span;
+    }
+
+    Tempus comparedStep(ChannelFile const& file) const {
+        Tempus step = _verb.sampleStep().value_or(file.frameDuration);
+        if (!TempusIsNumeric(step)) {
+            step = (_span.to - _span.from) / kStepsOfUnevenRows;
+        }
+        step = step / kComparedPerStep;
+        return step > kTempusZero ? step : TempusMake(1, 1);
+    }
+
+    void editAll(ChannelInput const& input, std::vector<Node> const& channels) {
+        Progress bar("editing");
+        Tempus const step = comparedStep(input.file());
+        for (Node const node : channels) {
+            _edited.push_back(edit(input.tree(), node, step));
+            bar.update(static_cast<double>(_edited.size()) / static_cast<double>(channels.size()));
+        }
+    }
+
+    TimeSpan keyedSpan(KFChannel const& channel) const {
+        TimeSpan keyed;
+        channel.getFirstKeyframe(&keyed.from, nullptr);
+        channel.getLastKeyframe(&keyed.to, nullptr);
+        return {TempusMaximum(_span.from, keyed.from), TempusMinimum(_span.to, keyed.to)};
+    }
+
+    EditedChannel edit(ChannelTree const& tree, Node node, Tempus const& step) {
+        KFChannel& channel = tree.channel(node);
+        EditedChannel edited{tree.dottedName(node), std::string(tree.unit(node)),
+                             channel.getNumberOfKeyframes()};
+        std::unique_ptr<KFCurveInterface> const copy(tree.curve(node).cloneCurve());
+        auto& before = static_cast<KFCurve&>(*copy);
+        TimeSpan const keyed = keyedSpan(channel);
+        if (edited.keypointsBefore > 0 && !(keyed.to < keyed.from)) {
+            _verb.apply(channel, keyed);
+        }
+        edited.keypointsAfter = channel.getNumberOfKeyframes();
+        edited.change = changeBetween(before, tree.curve(node), _span, step);
+        if (_picture) {
+            addToPicture(tree, node, *before.getSpline(), edited);
+        }
+        return edited;
+    }
+
+    WrittenRows writeFile(ChannelInput const& input, std::vector<Node> const& channels) const {
+        bool const areKeypoints = _options.rows.empty() ? !_verb.sampleStep() : _options.rows == "keypoints";
+        Progress bar("writing");
+        return writeChannelFile({input.file(), _format, areKeypoints ? RowsOf::Keypoints : RowsOf::Input,
+                                 channels, _options.output},
+                                [&bar](double share) { bar.update(share); });
+    }
+
+    /// The stretch and where it comes to; around a part of the file, some of what lies beside it.
+    TimeSpan shownSpan() const {
+        TimeSpan const arrival = _verb.arrivalOf(_span);
+        TimeSpan shown{TempusMinimum(_span.from, arrival.from), TempusMaximum(_span.to, arrival.to)};
+        if (!(shown.from < shown.to)) {
+            return {shown.from, shown.from + TempusMake(1, 1)};
+        }
+        Tempus const beside = (shown.to - shown.from) / kShareBeside;
+        return {_from ? shown.from - beside : shown.from, _to ? shown.to + beside : shown.to};
+    }
+
+    void addToPicture(ChannelTree const& tree, Node node, KFSpline& before, EditedChannel const& edited) {
+        TimeSpan const shown = shownSpan();
+        double const pixels = widthOfCurves(kPictureWidth);
+        _chart.seconds = PlotRange::sound(TempusGetSeconds(shown.from), TempusGetSeconds(shown.to));
+        CurvePicture old = traceCurve(before, shown.from, shown.to, pixels);
+        CurvePicture now = traceCurve(tree.spline(node), shown.from, shown.to, pixels);
+        panelOfUnit(_chart, edited.unit).curves.push_back({edited.channel, std::move(now), std::move(old)});
+    }
+
+    void savePicture(EditReport const& report) {
+        _chart.title = _verb.words().name + " " + std::filesystem::path(_options.file).filename().string();
+        _chart.subtitle = report.summary();
+        PlotCanvas canvas(*_picture, kPictureWidth, kPictureHeight);
+        _chart.draw(canvas);
+        canvas.save(_options.plot);
+    }
+
+    EditVerb& _verb;
+    EditOptions const& _options;
+    ChannelFormat _format{};
+    std::optional<PlotFormat> _picture;
+    std::optional<TimeArgument> _from;
+    std::optional<TimeArgument> _to;
+    TimeSpan _span;
+    std::vector<EditedChannel> _edited;
+    PlotChart _chart;
+};
+
+void addCommonOptions(CLI::App& verb, EditOptions& options) {
+    verb.add_option("FILE", options.file, kFileHelp)->option_text(" ")->required();
+    verb.add_option("CHANNEL", options.channels, kChannelHelp)->option_text("...");
+    verb.add_option("-o,--output", options.output,
+                    "The whole file anew: OUT.csv, or OUT.bvh where FILE is a BVH. OUT may be FILE")
+        ->option_text("OUT")
+        ->required();
+    verb.add_option("--from", options.from, "The first time that is edited (else the first of the file)")
+        ->option_text("T");
+    verb.add_option("--to", options.to, "The last time that is edited (else the last of the file)")
+        ->option_text("T");
+    verb.add_option("--rows", options.rows,
+                    "Of a CSV: a row for each of the input, or for each keypoint after the edit")
+        ->check(CLI::IsMember({"input", "keypoints"}))
+        ->option_text("input|keypoints");
+    verb.add_option("--plot", options.plot, "Draw before and after: PICTURE.svg, .png or .pdf")
+        ->option_text("PICTURE");
+    verb.add_flag("--json", options.json, "For programs: what changed, every number in full");
+}
+
+std::string footerOf(EditWords const& words, bool draws) {
+    return words.notes +
+           "A time is VALUE/TIMESCALE (1001/24000), seconds (0.5) or frames of the file (12f).\n"
+           "Without CHANNEL all channels are edited; the others are written as they are.\n"
+           "A BVH has frames as long as those of FILE, from 0, or from the first keypoint before it, to the "
+           "last.\n"
+           "A CSV has " +
+           (draws ? "the rows of the input" : "a row for each keypoint") +
+           ", if --rows doesn't say otherwise.\n\nExample: " + words.example;
+}
+
+} // namespace
+
+Verb declareEdit(CLI::App& program, std::shared_ptr<EditVerb> const& verb) {
+    auto const options = std::make_shared<EditOptions>();
+    EditWords const words = verb->words();
+    CLI::App* const arguments = program.add_subcommand(words.name, words.description);
+    addCommonOptions(*arguments, *options);
+    verb->addOptions(*arguments);
+    arguments->footer(footerOf(words, verb->sampleStep().has_value()));
+    return {arguments,
+            "FILE [CHANNEL...] " + words.usage + (words.usage.empty() ? "" : " ") +
+                "-o OUT.csv|bvh [--from T] [--to T] [--rows input|keypoints] [--plot PICTURE.svg|png|pdf] "
+                "[--json]",
+            [verb, options](OutputSink& out) { EditRun(*verb, *options).run(out); }};
+}
+
+void StepOption::add(CLI::App& verb, std::string const& help) {
+    verb.add_option("--step", _text, help + " (else at every frame or row)")->option_text("T");
+}
+
+void StepOption::read() { _wanted = TimeArgument::parseIfGiven(_text); }
+
+void StepOption::prepare(ChannelFile const& file, TimeSpan const& span) {
+    _step = _wanted ? _wanted->resolve(file.frameDuration) : file.frameDuration;
+    if (file.rows < 2 && !TempusIsNumeric(_step)) {
+        _step = TempusMake(1, 1); // there is nothing to reshape
+    }
+    if (!TempusIsNumeric(_step)) {
+        throw UsageError{"the rows of the file aren't evenly spaced: say --step"};
+    }
+    if (!(_step > kTempusZero)) {
+        throw UsageError{"--step must be above 0"};
+    }
+    if (TempusFloorQuotient(span.to - span.from, _step) >= KFCurve::kMostShapeSamples) {
+        throw UsageError{"the stretch has more than " + std::to_string(KFCurve::kMostShapeSamples) +
+                         " steps; take longer ones"};
+    }
+}
+
+} // namespace lumenkey::tools

@@ -1,0 +1,90 @@
+#include "tools/cli/EditVerb.h"
+
+#include "tools/cli/UsageError.h"
+#include "tools/edit/CurveChange.h"
+
+#include <CLI/CLI.hpp>
+#include <cmath>
+#include <cstdint>
+
+namespace lumenkey::tools {
+
+namespace {
+
+class Simplify : public EditVerb {
+public:
+    EditWords words() const override {
+        EditWords words;
+        words.name = "simplify";
+        words.description = "Draw curves by few keypoints, within a tolerance";
+        words.usage = "--tolerance X [--step T]";
+        words.notes = "Looked at at ten times in each step, no curve goes off more than the tolerance. One "
+                      "that fewer keypoints can't draw\n"
+                      "so well stays as it is.\n";
+        words.example = "lumenkey simplify walk.bvh --tolerance 0.01 -o few.csv --rows keypoints";
+        words.keepsShape = true;
+        return words;
+    }
+
+    void addOptions(CLI::App& verb) override {
+        verb.add_option("--tolerance", _tolerance,
+                        "How far a curve may go off, in the unit of its channel: radians, or units")
+            ->option_text("X")
+            ->required();
+        _step.add(verb, "The curve is fitted to samples at every step of the stretch, or more");
+    }
+
+    void readOptions() override {
+        if (!std::isfinite(_tolerance) || _tolerance < 0) {
+            throw UsageError{"--tolerance must be 0 or above"};
+        }
+        _step.read();
+    }
+
+    void prepare(ChannelFile const& file, TimeSpan const& span) override { _step.prepare(file, span); }
+    std::optional<Tempus> sampleStep() const override { return _step.step(); }
+
+    /// The fit keeps to the tolerance at its samples alone, and between two of them a curve may jump. So the curve is
+    /// looked at more closely than it was sampled, and fitted anew, to more samples and more strictly, while it is off.
+    void apply(KFChannel& channel, TimeSpan const& span) override {
+        KFCurve& curve = *channel.getCurveInterface();
+        std::unique_ptr<KFCurveInterface> const copy(curve.cloneCurve());
+        auto& before = static_cast<KFCurve&>(*copy);
+        for (std::uint32_t attempt = 0; attempt < kAttempts; ++attempt) {
+            fit(curve, span, _step.step() / (1U << attempt), _tolerance * (1 - 0.05 * attempt));
+            if (curve.getNumberOfKeypoints() >= before.getNumberOfKeypoints()) {
+                break;
+            }
+            if (changeBetween(before, curve, span, _step.step() / kComparedPerStep).most <= _tolerance) {
+                return;
+            }
+            curve = before;
+        }
+        curve = before;
+    }
+
+private:
+    static constexpr std::uint32_t kAttempts = 6;
+
+    static void fit(KFCurve& curve, TimeSpan const& span, Tempus const& step, double tolerance) {
+        constexpr double hundredths = 100;
+        SampledStretch const stretch(span, step);
+        if (stretch.isEmpty()) {
+            return;
+        }
+        TimeSpan const fitted{stretch.start, stretch.last};
+        OutsideKept const kept(curve, fitted);
+        makeLinesBezier(curve, fitted);
+        curve.simplifyCurve(stretch.start, stretch.end, stretch.step, tolerance * hundredths, 1,
+                            KFCurve::kSimplifyByFit, 0);
+    }
+
+    double _tolerance = 0;
+    StepOption _step;
+};
+
+} // namespace
+
+Verb declareSimplify(CLI::App& program) { return declareEdit(program, std::make_shared<Simplify>()); }
+
+} // namespace lumenkey::tools

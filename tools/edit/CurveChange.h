@@ -1,0 +1,26 @@
+#pragma once
+
+#include "lumenkey/curves/KFCurve.h"
+#include "tools/edit/KeypointStretch.h"
+
+#include <cstdint>
+
+namespace lumenkey::tools {
+
+/// In each step of a sampled curve, curves are compared at so many times.
+inline constexpr std::int32_t kComparedPerStep = 10;
+
+/// Where two curves lie farthest apart.
+struct CurveChange {
+    double most = 0;
+    /// The first such time.
+    Tempus at{};
+};
+
+/// Reads both curves at `from`, at every step from there on, and at `to`. Where that would be more than
+/// `kMostComparedValues` times, so many are spread evenly.
+CurveChange changeBetween(KFCurve& before, KFCurve& after, TimeSpan const& span, Tempus const& step);
+
+inline constexpr std::int64_t kMostComparedValues = 20'000'000;
+
+} // namespace lumenkey::tools

@@ -1,0 +1,107 @@
+#include "tools/edit/KeypointStretch.h"
+
+#include "lumenkey/Channels/KFKeyframeInfo.h"
+#include "lumenkey/splines/KFInterpolation.h"
+
+#include <cstdint>
+#include <memory>
+
+namespace lumenkey::tools {
+
+namespace {
+
+std::vector<void*> allKeypoints(KFCurve& curve) {
+    std::vector<void*> handles;
+    curve.getKeypointHandleList(handles);
+    return handles;
+}
+
+Tempus timeOf(KFCurve& curve, void* handle) {
+    Tempus time{};
+    curve.getKeypoint(handle, &time, nullptr);
+    return time;
+}
+
+void deleteKeypoints(KFCurve& curve, TimeSpan const& span, bool within) {
+    for (void* const handle : allKeypoints(curve)) {
+        if (span.holds(timeOf(curve, handle)) == within) {
+            curve.delKeypoint(handle, true);
+        }
+    }
+}
+
+} // namespace
+
+std::vector<void*> keypointsWithin(KFCurve& curve, TimeSpan const& span) {
+    std::vector<void*> handles = allKeypoints(curve);
+    std::erase_if(handles, [&](void* handle) { return !span.holds(timeOf(curve, handle)); });
+    return handles;
+}
+
+SampledStretch::SampledStretch(TimeSpan const& span, Tempus const& sampleStep)
+    : start(span.from), step(sampleStep) {
+    Tempus const steps = TempusMake(TempusFloorQuotient(span.to - span.from, step), 1);
+    last = start + step * steps;
+    end = last + step;
+}
+
+OutsideKept::OutsideKept(KFCurve& curve, TimeSpan const& span) : _curve(curve) {
+    for (void* const handle : allKeypoints(curve)) {
+        bool isLocked = false;
+        curve.isLockedKeypoint(handle, &isLocked);
+        if (!isLocked && !span.holds(timeOf(curve, handle))) {
+            curve.lockKeypoint(handle, true, true);
+            _locked.push_back(handle);
+        }
+    }
+}
+
+OutsideKept::~OutsideKept() {
+    for (void* const handle : _locked) {
+        _curve.lockKeypoint(handle, false, true);
+    }
+}
+
+void makeLinesBezier(KFCurve& curve, TimeSpan const& span) {
+    for (void* const handle : keypointsWithin(curve, span)) {
+        std::uint32_t type = 0;
+        void* next = nullptr;
+        if (!curve.getKeypointInterpolation(handle, &type, nullptr) || type != kKFInterpolationLinear) {
+            continue;
+        }
+        curve.setKeypointInterpolation(handle, kKFInterpolationBezier, true);
+        curve.setKeypointOutputHandles(handle, 0, 0, true);
+        if (curve.getNextValidKeypointHandle(handle, &next)) {
+            curve.setKeypointInputHandles(next, 0, 0, true);
+        }
+    }
+}
+
+void editKeypointsWithin(KFChannel& channel, TimeSpan const& span,
+                         std::function<void(KFCurve&)> const& edit) {
+    KFCurve& curve = *channel.getCurveInterface();
+    std::size_t const count = keypointsWithin(curve, span).size();
+    if (count == curve.getNumberOfKeypoints()) {
+        edit(curve);
+        return;
+    }
+    if (count == 0) {
+        return;
+    }
+    std::unique_ptr<KFChannelBase> const copy(channel.clone());
+    KFChannel& part = static_cast<KFChannel&>(*copy);
+    deleteKeypoints(*part.getCurveInterface(), span, false);
+    edit(*part.getCurveInterface());
+    TimeSpan arrival;
+    part.getFirstKeyframe(&arrival.from, nullptr);
+    part.getLastKeyframe(&arrival.to, nullptr);
+    KFChannelBase::KeyframesByChannel gathered;
+    part.keyframesWithChannels({arrival.from, arrival.to - arrival.from}, gathered);
+    deleteKeypoints(curve, span, true);
+    deleteKeypoints(curve, arrival, true);
+    for (auto const& [owner, keypoints] : gathered) {
+        channel.setKeyframesWithInfo(arrival.from, keypoints);
+    }
+}
+
+} // namespace lumenkey::tools

@@ -1,0 +1,54 @@
+#pragma once
+
+#include "tools/import/ChannelFile.h"
+#include "tools/output/OutputSink.h"
+
+#include <cstdint>
+#include <string>
+#include <vector>
+
+namespace lumenkey::tools {
+
+/// So many numbers at most: they are held in memory until all are written.
+inline constexpr std::uint64_t kMostWrittenValues = 200'000'000;
+
+/// Which times the rows of a table have.
+enum class RowsOf {
+    /// Those of the rows or frames of the file that was opened.
+    Input,
+    /// Those of the keypoints of all channels.
+    Keypoints,
+};
+
+/// What is written of a file, and where to.
+struct FileToWrite {
+    ChannelFile const& file;
+    /// A motion only where the file was opened from one.
+    ChannelFormat format{};
+    /// Of a table.
+    RowsOf rows{};
+    /// The channels whose keypoints needn't be those of the file any more.
+    std::vector<ChannelTree::Node> const& edited;
+    std::string target;
+};
+
+/// How a file came out.
+struct WrittenRows {
+    /// Frames of a motion, rows of a table.
+    std::size_t count = 0;
+    /// Of the first one; zero where there is none.
+    Tempus start{};
+};
+
+/// Replaces the target, as a whole or not at all, by the file as its tree is now. Throws `OutputError`, also where
+/// it would hold more than `kMostWrittenValues`.
+///
+/// The frames of a motion last as long as they did. They reach from time zero, or from before the first keypoint of all
+/// channels where that lies before zero, to the last one.
+///
+/// A table has times, seconds, and a column for each channel. A cell is empty where its channel has nothing to say: with
+/// the rows of the keypoints where it has no keypoint; with those of the input, for an edited channel, outside its
+/// keypoints.
+WrittenRows writeChannelFile(FileToWrite const& wanted, ReadingProgress const& progress = {});
+
+} // namespace lumenkey::tools
