@@ -435,7 +435,11 @@ private:
     /// The checks and the announcement in front of an edit; false to stop.
     bool beginEdit();
     double spanOfValues() const;
+    /// What a keypoint at global time `t` has as its time: where converting rounds, that of the keypoint whose global
+    /// time is `t`, if there is one.
+    Tempus curveTimeAt(Tempus const& t) const;
     void* keypointAt(Tempus const& t) const;
+    template <class Step> bool stepToKeypoint(Tempus* t, Step step) const;
     /// Edits the curve on a local record; nothing on a locked channel.
     template <class Edit> void editKeyframes(Edit edit) {
         if (!isLocked(false))

@@ -1,15 +1,13 @@
-// Keyframes of a channel: the setters and reads by handle, edits of ranges, gathering and pasting.
+// Keyframes of a channel: walks and edits of ranges, gathering and pasting.
 
+#include "lumenkey/Channels/KFChannelTimeConverter.h"
 #include "lumenkey/Channels/KFScalarChannels.h"
-#include "lumenkey/curves/KFCurve.h"
 #include "lumenkey/splines/KFInterpolation.h"
-#include "lumenkey/splines/KFVertex.h"
-#include "tests/Channels/AddingNode.h"
 #include "tests/Channels/RecordingRoot.h"
 
 #include <gtest/gtest.h>
 
-#include <functional>
+#include <algorithm>
 #include <tuple>
 
 namespace {
@@ -47,19 +45,7 @@ std::vector<Tempus> timesOf(KFChannel const& channel) {
     return times;
 }
 
-double valueAt(KFChannel const& c, Tempus const& t) {
-    double value = -1.0;
-    c.getKeyframe(c.getKeyframe(t), nullptr, &value);
-    return value;
-}
-
 using Pair = std::pair<double, double>;
-
-Pair input(KFChannel const& c, void* h, bool handles) {
-    Pair p;
-    c.getKeyframeInputTangents(h, &p.first, &p.second, handles);
-    return p;
-}
 
 Pair output(KFChannel const& c, void* h, bool handles) {
     Pair p;
@@ -67,150 +53,51 @@ Pair output(KFChannel const& c, void* h, bool handles) {
     return p;
 }
 
-/// An edit of a channel with keypoints 10, 20 and 40 at 1, 2 and 4 s, by the handle of the second; and its effect.
-struct Edit {
-    char const* name;
-    unsigned int announcements;
-    std::function<void(KFChannel&, void*)> run;
-    std::function<bool(KFChannel&, void*)> worked;
-    Edit(char const* n, unsigned int count, decltype(run) r, decltype(worked) w)
-        : name(n), announcements(count), run(std::move(r)), worked(std::move(w)) {}
-};
-
-#define EDIT(announcements, edit, effect)                                                                    \
-    Edit(                                                                                                    \
-        #edit, announcements, [](KFChannel& c, void* h) { (void)h, c.edit; },                                \
-        [](KFChannel& c, void* h) { return (void)h, (void)c, (effect); })
-
-std::vector<Edit> const kEdits = {
-    EDIT(0, setKeyframe(s(3), 7.0, true),
-         valueAt(c, s(3)) == 7.0 && input(c, c.getKeyframe(s(3)), false) != Pair()),
-    EDIT(0, setKeyframe(s(3), 7.0, false),
-         valueAt(c, s(3)) == 7.0 && input(c, c.getKeyframe(s(3)), false) == Pair()),
-    EDIT(0, setKeyframe(s(3)), valueAt(c, s(3)) > 20.0),
-    EDIT(0, setKeyframeIfRecording(s(3)), valueAt(c, s(3)) > 20.0),
-    EDIT(0, setKeyframe(h, s(3), 7.0), valueAt(c, s(3)) == 7.0 && c.getNumberOfKeyframes() == 3),
-    EDIT(0, appendKeyframe(s(6), 7.0, true), valueAt(c, s(6)) == 7.0),
-    EDIT(0, cloneKeyframe(h, s(3)), valueAt(c, s(3)) == 20.0 && valueAt(c, s(2)) == 20.0),
-    EDIT(0, setKeyframeValue(h, 7.0), valueAt(c, s(2)) == 7.0 && valueAt(c, s(1)) == 10.0),
-    EDIT(0, setKeyframesValue(7.0),
-         c.getKeyframeMinValue(false) == 7.0 && c.getKeyframeMaxValue(false) == 7.0),
-    EDIT(0, setKeyframeFlags(h, 0x19), c.getKeyframeFlags(h) == 0x19),
-    EDIT(0, deleteAllKeyframes(s(2)), !c.hasKeypoints(0) && c.getInitialValue() == 20.0),
-    EDIT(0, moveKeyframe(h, s(3), true, false), valueAt(c, s(3)) == 20.0 && c.getNumberOfKeyframes() == 3),
-    EDIT(0, offsetKeyframe(h, s(3)), valueAt(c, s(3)) == 20.0 && c.getNumberOfKeyframes() == 3),
-    EDIT(0, linearTimeWarp(2.0, s(0)), c.getKeyframeMaxTime() > s(4)),
-    EDIT(0, reverseKeyframes(c.getKeyframe(s(1)), c.getKeyframe(s(4))), valueAt(c, s(1)) == 40.0),
-    EDIT(0, smoothKeyframe(h, false), output(c, h, true) == Pair() && c.isSmoothKeyframe(h)),
-    EDIT(0, setKeyframeInputTangents(h, -12.0, 6.0, true), input(c, h, false) == Pair(-1.0, 0.5)),
-    EDIT(0, setKeyframeOutputTangents(h, 1.0, 0.5, false), output(c, h, true) == Pair(12.0, 6.0)),
-    EDIT(0, setKeyframeBias(h, 0.25), c.getKeyframeBias(h) == 0.25),
-    EDIT(0, setKeyframeNormal(h, 0.5), c.getKeyframeNormal(h) == 0.5),
-    EDIT(0, setKeyframeNormal(s(2), 0.5), c.getKeyframeNormal(s(2)) == 0.5),
-    EDIT(0, setKeyframeEnabled(h, false), !c.getKeyframeEnabled(h) && c.getKeyframes(true).size() == 2),
-    EDIT(0, setKeyframeSelected(h, true), (c.getKeyframeFlags(h) & kKFVertexFlagSelected) != 0),
-    EDIT(0, setKeyframeLocked(h, true), c.getKeyframeLocked(h)),
-    EDIT(0, setKeyframeTangentsBroken(h, true), c.getKeyframeTangentsBroken(h)),
-    EDIT(0, setKeyframeTangentsScaled(h, true), c.getKeyframeTangentsScaled(h)),
-    EDIT(0, setKeyframeTangentsFlat(h), output(c, h, false).second == 0.0),
-    EDIT(1, deleteKeyframe(h), c.getKeyframe(s(2)) == nullptr && c.getNumberOfKeyframes() == 2),
-    EDIT(1, setKeyframeInterpolation(h, kKFInterpolationBezier),
-         c.getKeyframeInterpolation(h) == kKFInterpolationBezier && !c.isSmoothKeyframe(h)),
-    EDIT(1, setCurveSegmentSpeed(h, 3), c.getCurveSegmentSpeed(h) == 3),
-};
-
-TEST(KFChannelKeyframes, SettersCheckTheLockMakeTheRecordLocalAndAnnounceOnlyWhereSaid) {
-    for (Tempus const& offset : {kTempusZero, s(10)}) {
-        for (Edit const& edit : kEdits) {
-            SCOPED_TRACE(edit.name);
-            Fixture shared(offset);
-            shared.channel.lock(true, false);
-            edit.run(shared.channel, nullptr);
-            EXPECT_TRUE(shared.channel.getImpl()->isShared());
-            shared.channel.lock(false, false);
-            edit.run(shared.channel, nullptr);
-            EXPECT_FALSE(shared.channel.getImpl()->isShared());
-
-            Fixture f(offset);
-            f.key({{1, 10.0}, {2, 20.0}, {4, 40.0}});
-            void* const handle = f.channel.getKeyframe(s(2));
-            KFChannelDouble const before(f.channel);
-            f.channel.lock(true, false);
-            f.root.takeAnnounced();
-            edit.run(f.channel, handle);
-            EXPECT_TRUE(f.channel.compare(&before));
-            EXPECT_FALSE(edit.worked(f.channel, handle));
-            EXPECT_TRUE(f.root.takeAnnounced().empty());
-            f.channel.lock(false, false);
-            f.root.takeAnnounced();
-            edit.run(f.channel, handle);
-            EXPECT_TRUE(edit.worked(f.channel, handle));
-            EXPECT_EQ(f.root.takeAnnounced().size(), edit.announcements);
-        }
-    }
-}
-
-TEST(KFChannelKeyframes, AreReadInCurveTime) {
-    Fixture f(s(10));
-    f.key({{1, 10.0}, {2, 20.0}, {4, 40.0}});
+TEST(KFChannelKeyframes, AreFoundAgainWhereConvertingTheirTimesRounds) {
+    Fixture f(s(1'234'567'891, 1'000'000'007)); // no timescale holds the sums
     KFChannel& c = f.channel;
-    void* const middle = c.getKeyframe(s(2));
-    Tempus time;
-    double value = 0.0;
-    EXPECT_TRUE(c.getNextKeyframe(s(2), &time, &value) && time == s(4) && value == 40.0);
-    EXPECT_TRUE(c.getPreviousKeyframe(s(2), &time, &value) && time == s(1) && value == 10.0);
-    EXPECT_TRUE(c.getFirstKeyframe(&time, nullptr) && time == s(1));
-    EXPECT_TRUE(c.getLastKeyframe(&time, nullptr) && time == s(4));
-    EXPECT_EQ(c.getNextEnabledKeyframe(s(1)), middle);
-    EXPECT_EQ(c.getPreviousEnabledKeyframe(c.getLastEnabledKeyframe()), middle);
-    EXPECT_EQ(c.getNextEnabledKeyframe(c.getLastEnabledKeyframe()), nullptr);
-    EXPECT_EQ(c.getKeyframe(s(3)), nullptr);
-    EXPECT_FALSE(c.getKeyframe(nullptr, &time, &value));
-    EXPECT_EQ(c.getKeyframeMinTime(), s(1));
-    EXPECT_EQ(c.getKeyframeTimeRange(), s(3));
-    EXPECT_EQ(c.getKeyframeParametricRange(), s(3));
-    std::vector<double> values;
-    unsigned int count = 2;
-    EXPECT_TRUE(c.getSamples(s(1), s(3), count, static_cast<std::vector<Tempus>*>(nullptr), &values));
-    EXPECT_EQ(values, (std::vector<double>{10.0, 40.0}));
-    auto* const first = new AddingNode(1.0);
-    auto* const second = new AddingNode(2.0);
-    c.appendCurveProcessingNode(first);
-    c.appendCurveProcessingNode(second);
-    EXPECT_EQ(c.getPreviousProcessingNode(second), first);
-    EXPECT_EQ(c.getPreviousProcessingNode(first), nullptr);
-    c.setInterpolation(kKFInterpolationLinear);
-    EXPECT_TRUE(c.hasInterpolation(kKFInterpolationLinear));
-    EXPECT_EQ(c.getInterpolation(), kKFInterpolationLinear);
-    c.purgeKeyframes();
-    EXPECT_EQ(c.getNumberOfKeyframes(), 3u);
+    std::vector<Tempus> times;
+    for (std::int64_t i = 1; i <= 50; ++i) {
+        c.setKeyframe(s(100'003 * i, 262'144), static_cast<double>(i), true);
+        times.push_back(c.localToGlobalTime(s(100'003 * i, 262'144)));
+    }
+    EXPECT_EQ(f.root.keypoints({times.front(), s(60)}, false, 0), times);
+    std::vector<Tempus> backward{times.back()};
+    for (Tempus t = times.back(); f.root.previousKeypoint(&t, 0);)
+        backward.push_back(t);
+    EXPECT_TRUE(std::equal(times.rbegin(), times.rend(), backward.begin(), backward.end()));
+    for (std::size_t i = 0; i < times.size(); i += 2) {
+        EXPECT_TRUE(c.hasKeypointAt(times[i], 0));
+        c.addKeypointAt(times[i]);
+        c.setValue(times[i], -1.0, true);
+        c.deleteKeypointAt(times[i]);
+    }
+    EXPECT_EQ(c.getNumberOfKeyframes(), 25u);
+    EXPECT_EQ(c.getKeyframeMinValue(false), 2.0);
 }
 
-TEST(KFChannelKeyframes, RangesAreOfGlobalTime) {
-    for (int const offset : {0, 10}) {
-        Fixture f(s(offset));
-        f.key({{1, 5.0}, {2, -3.0}, {4, 8.0}, {6, 100.0}});
-        auto const at = [&](int time) { return s(time + offset); };
-        EXPECT_EQ(f.channel.getKeyframeMinValueInRange(at(1), at(4)), -3.0);
-        EXPECT_EQ(f.channel.getKeyframeMaxValueInRange(at(1), at(4)), 8.0);
-        EXPECT_EQ(f.channel.getKeyframeMinValueInRange(at(3), at(3)), f.channel.getCurveValue(s(3), true));
-        EXPECT_EQ(f.channel.getKeyframeMaxValueInRange(at(7), at(9)), 100.0);
-        f.channel.offsetKeyframesValuesInRange(at(2), at(5), at(2), 7.0);
-        EXPECT_EQ(keypointsOf(f.channel), (std::vector<std::tuple<Tempus, double>>{
-                                              {s(1), 5.0}, {s(2), 7.0}, {s(4), 18.0}, {s(6), 100.0}}));
-        KFChannelBase::KeyframesByChannel gathered;
-        f.root.keyframesWithChannels({at(2), s(2)}, gathered);
-        ASSERT_EQ(gathered.size(), 1u);
-        ASSERT_EQ(gathered[0].second.size(), 2u);
-        EXPECT_EQ(gathered[0].second[1].time, s(4));
-        f.root.keyframesWithChannels({at(7), s(2)}, gathered);
-        EXPECT_EQ(gathered.size(), 1u);
+/// A host's converter that holds the time, or lets it run backward.
+struct Held : KFChannelTimeConverter {
+    explicit Held(int speedIn) : speed(speedIn) {}
+    Tempus globalToLocalTime(KFChannelBase const*, Tempus const& t) const override { return t * speed; }
+    Tempus localToGlobalTime(KFChannelBase const*, Tempus const& t) const override {
+        return speed == 0 ? s(1) : t * speed;
+    }
+    bool extentIsLocal() const override { return false; }
+    int speed;
+};
 
-        using Times = std::vector<Tempus>;
-        EXPECT_EQ(f.root.keypoints({at(2), s(2)}, false, 0), (Times{at(2), at(4)}));
-        EXPECT_EQ(f.root.keypoints({at(2), s(2)}, true, 0), (Times{at(2), at(1), at(2), at(4), at(6)}));
-        EXPECT_EQ(f.root.visibleKeypoints({at(7), s(2)}, false, 0), Times{});
-        EXPECT_EQ(f.channel.visibleKeypoints({at(2), s(2)}, true, 0), (Times{at(1), at(2), at(4), at(6)}));
+TEST(KFChannelKeyframes, AreWalkedToAnEndWhateverTheConverterDoes) {
+    for (int const speed : {0, -1}) {
+        Fixture f;
+        KFChannelDouble forward("forward", &f.root, 3, 0);
+        f.key({{1, 1.0}, {2, 2.0}, {3, 3.0}});
+        forward.setKeyframe(s(2), 0.0, true);
+        Held converter(speed);
+        f.channel.setTimeConverterDelegate(&converter);
+        EXPECT_LE(f.root.keypoints({s(-4), s(9)}, true, 0).size(), 4u);
+        EXPECT_LE(f.channel.keypoints({s(1), s(9)}, true, 0).size(), 4u);
+        EXPECT_EQ(f.root.offsetKeyframesInRange(s(2), s(2), s(1), s(0), false, false), s(1));
     }
 }
 
@@ -229,7 +116,7 @@ TEST(KFChannelKeyframes, MoveInARangeAsFarAsTheNeighboursAllow) {
         EXPECT_EQ(timesOf(f.channel), (Times{s(1), s(2), s(3), s(8)}));
         EXPECT_EQ(move(2, 3, 1, false), s(1)) << "the later one moves first";
         EXPECT_EQ(timesOf(f.channel), (Times{s(1), s(3), s(4), s(8)}));
-        EXPECT_EQ(valueAt(f.channel, s(4)), 4.0);
+        EXPECT_EQ(f.channel.getCurveValue(s(4), true), 4.0);
         EXPECT_EQ(move(3, 4, 0, true), kTempusZero);
         EXPECT_EQ(move(5, 7, 2, true), kTempusZero);
         EXPECT_EQ(timesOf(f.channel), (Times{s(1), s(3), s(4), s(8)}));
