@@ -106,7 +106,7 @@ public:
     void bake(BXTimeRange const& range, Tempus const& step) override;
     /// `KFCurve::simplifyCurve` between two global times; `step` isn't converted. The tolerance is `percent` of what
     /// the curve's values span, the fine delta where they span nothing, and with `clampToCoarse` at most the coarse
-    /// delta. `mode1` is the curve's mode, `mode2` its radius.
+    /// delta; the curve keeps a hundredth of that over the scale. `mode1` is the curve's mode, `mode2` its radius.
     void simplify(Tempus const& a, Tempus const& b, Tempus const& step, double percent, unsigned int mode1,
                   unsigned int mode2, bool clampToCoarse) override;
     /// `KFCurve::generateKeypoints`.
