@@ -393,8 +393,9 @@ public:
     double getKeyframeMaxValueInRange(Tempus const& from, Tempus const& to) const;
     /// Shifts the values of those keypoints alike, so that the curve would pass through `value` at global time `t`.
     void offsetKeyframesValuesInRange(Tempus const& from, Tempus const& to, Tempus const& t, double value);
-    /// Pastes records with their spacing, the first at curve time `t`, over whatever keypoints are there. Takes no
-    /// account of scales, and announces nothing.
+    /// Pastes records with their spacing, the first at curve time `t`, over whatever keypoints are there, with all that
+    /// they hold; a single one that stands as high as a neighbour has no handle on that side. Takes no account of
+    /// scales, and announces nothing.
     void setKeyframesWithInfo(Tempus const& t, std::vector<_KFKeyframeInfo> const& keyframes);
 
     // Fades -----------------------------------------------------------------------------------------------------
