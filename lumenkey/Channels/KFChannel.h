@@ -123,7 +123,7 @@ public:
     void bake(BXTimeRange const& range, Tempus const& step) override;
     /// `KFCurve::simplifyCurve` between two global times; `step` isn't converted. The tolerance is `percent` of what
     /// the curve's values span, the fine delta where they span nothing, and with `clampToCoarse` at most the coarse
-    /// delta. `mode1` is the curve's mode, `mode2` its radius.
+    /// delta; the curve keeps a hundredth of that over the scale. `mode1` is the curve's mode, `mode2` its radius.
     void simplify(Tempus const& a, Tempus const& b, Tempus const& step, double percent, unsigned int mode1,
                   unsigned int mode2, bool clampToCoarse) override;
     /// `KFCurve::generateKeypoints`.
@@ -421,8 +421,9 @@ public:
     double getKeyframeMaxValueInRange(Tempus const& from, Tempus const& to) const;
     /// Shifts the values of those keypoints alike, so that the curve would pass through `value` at global time `t`.
     void offsetKeyframesValuesInRange(Tempus const& from, Tempus const& to, Tempus const& t, double value);
-    /// Pastes records with their spacing, the first at curve time `t`, over whatever keypoints are there. Takes no
-    /// account of scales, and announces nothing.
+    /// Pastes records with their spacing, the first at curve time `t`, over whatever keypoints are there, with all that
+    /// they hold; a single one that stands as high as a neighbour has no handle on that side. Takes no account of
+    /// scales, and announces nothing.
     void setKeyframesWithInfo(Tempus const& t, std::vector<_KFKeyframeInfo> const& keyframes);
 
     // Fades -----------------------------------------------------------------------------------------------------
@@ -463,7 +464,11 @@ private:
     /// The checks and the announcement in front of an edit; false to stop.
     bool beginEdit();
     double spanOfValues() const;
+    /// What a keypoint at global time `t` has as its time: where converting rounds, that of the keypoint whose global
+    /// time is `t`, if there is one.
+    Tempus curveTimeAt(Tempus const& t) const;
     void* keypointAt(Tempus const& t) const;
+    template <class Step> bool stepToKeypoint(Tempus* t, Step step) const;
     /// Edits the curve on a local record; nothing on a locked channel.
     template <class Edit> void editKeyframes(Edit edit) {
         if (!isLocked(false))

@@ -136,7 +136,9 @@ public:
     // `BXCurveFit`, and what it gives are Bezier keypoints, whatever type those before had. Samples that aren't finite
     // are left out of it. A keypoint for the first one stands exactly there, others at the nearest tick of
     // `kKFChannelTimescale` (of the step, in `simplifyCurve`). Locked keypoints keep time and value. Where nothing
-    // fits, the stretch is left without keypoints.
+    // fits, the stretch is left without keypoints. A tolerance is that at the samples, for curves that aren't
+    // parametric (whose handles mean something else) and without locked keypoints. Between two samples the curve isn't
+    // looked at: there it may move by about as much as it spans over those and the next on either side.
     //
     // `bakeCurve` replaces the keypoints after `start` up to `end` by what the chain up to `node` gives (null: the
     // root), `tolerance` being hundredths of the curve's unit times `scale`. All keypoints of the curve become Bezier,
