@@ -213,9 +213,9 @@ bool KFSegmentWalk::cyclesOf(Side side, std::uint32_t mode, Tempus const& start,
     return true;
 }
 
-/// What comes between the first and the last of many whole cycles adds nothing to the extremes: a repeat and a ping-pong
-/// take the same values again, and a progressive repeat shifts each value further the same way. A spline that is closed
-/// or drawn as one function isn't extrapolated, so that its points don't repeat.
+/// What comes between the first and the last of many whole cycles adds nothing to the extremes: a repeat and a
+/// ping-pong take the same values again, and a progressive repeat shifts each value further the same way. A spline that
+/// is closed or drawn as one function isn't extrapolated, so that its points don't repeat.
 bool KFSegmentWalk::maySkipCycles() {
     return _extremes != nullptr && !_spline.isClosed() &&
            _spline.getInterpolator(_spline.getState()->interpolation)->useKeypoints();
