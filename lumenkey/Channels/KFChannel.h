@@ -166,7 +166,8 @@ public:
     /// there is no piece, as in a stretch whose end is before its start, the outputs are the largest and the lowest
     /// finite double. An output may be null; false, with nothing done, if both are.
     ///
-    /// The time grows with the keypoints, but not with the number of cycles of a curve that repeats.
+    /// The time grows with the keypoints, but not with the number of cycles of a curve that repeats. The spline's lock is
+    /// held while whole segments are looked at; nobody may edit the curve meanwhile.
     virtual bool getCurrentMinAndMax(Tempus const& from, Tempus const& to, double* minimum, double* maximum);
     virtual unsigned int getNumberOfKeyframes() const;
     /// By handle, in curve time. False on a locked channel.

@@ -163,8 +163,9 @@ void KFSegmentWalk::walkRepeats(Side side, std::uint32_t mode, Tempus const& sta
     Cycles cycles;
     if (cyclesOf(side, mode, start, cycles)) {
         if (areNumbersOfOneEpoch({start, end, cycles.anchor, cycles.outerBound}) &&
-            TempusIsNumeric(cycles.length))
+            TempusIsNumeric(cycles.length)) {
             walkCycles(side, cycles, start, end);
+        }
     } else {
         _visitor.visitConstant(valueAt(start), start, end);
     }
@@ -183,8 +184,9 @@ bool KFSegmentWalk::cyclesOf(Side side, std::uint32_t mode, Tempus const& start,
     if (mode == kKFExtrapolationProgressiveRepeat &&
         _spline.getFirstValidVertexWithLock(&first, kTempusZero) &&
         _spline.getLastValidVertexWithLock(&last, kTempusZero)) {
-        double const rise = valueOf(*static_cast<KFVertex*>(last)) - valueOf(*static_cast<KFVertex*>(first));
-        cycles.rise = side == Side::Before ? -rise : rise;
+        double const firstValue = valueOf(*static_cast<KFVertex*>(first));
+        double const lastValue = valueOf(*static_cast<KFVertex*>(last));
+        cycles.rise = side == Side::Before ? firstValue - lastValue : lastValue - firstValue;
     }
     if (mode != kKFExtrapolationPingPong)
         return true;
@@ -211,9 +213,9 @@ bool KFSegmentWalk::cyclesOf(Side side, std::uint32_t mode, Tempus const& start,
     return true;
 }
 
-/// What comes between the first and the last of many whole cycles adds nothing to the extremes: a repeat and a ping-pong
-/// take the same values again, and a progressive repeat shifts each value further the same way. A spline that is closed
-/// or drawn as one function isn't extrapolated, so that its points don't repeat.
+/// What comes between the first and the last of many whole cycles adds nothing to the extremes: a repeat and a
+/// ping-pong take the same values again, and a progressive repeat shifts each value further the same way. A spline that
+/// is closed or drawn as one function isn't extrapolated, so that its points don't repeat.
 bool KFSegmentWalk::maySkipCycles() {
     return _extremes != nullptr && !_spline.isClosed() &&
            _spline.getInterpolator(_spline.getState()->interpolation)->useKeypoints();
@@ -226,16 +228,17 @@ void KFSegmentWalk::walkCycles(Side side, Cycles const& cycles, Tempus const& st
     std::int64_t number = TempusFloorQuotient(start - cycles.anchor, cycles.length);
     Tempus begin = start - TempusModulo(start - cycles.anchor, cycles.length);
     for (Tempus target = start;; target = begin) {
-        auto const risen = static_cast<double>(side == Side::Before ? -number : number);
-        Cycle const cycle{number % 2 == 0 ? cycles.even : cycles.odd, begin, cycles.rise * risen};
+        auto const count = static_cast<double>(number);
+        double const offset = cycles.rise * (side == Side::Before ? -count : count);
+        Cycle const cycle{number % 2 == 0 ? cycles.even : cycles.odd, begin, offset};
         if (!walkCycle(cycles, cycle, target, end))
             return;
         std::int64_t passed = 1;
         whole += target == begin ? 1 : 0;
         if (maySkip && whole >= keptAtEitherEnd) {
             std::int64_t const left = TempusFloorQuotient(end - begin, cycles.length) - 1;
-            std::int64_t const skipped = left > keptAtEitherEnd ? (left - keptAtEitherEnd) / 2 * 2 : 0;
-            passed += skipped;
+            if (left > keptAtEitherEnd)
+                passed += (left - keptAtEitherEnd) / 2 * 2;
         }
         // Times so far out that they can't tell two cycles from each other end the walk.
         Tempus const next = begin + cycles.length * TempusMake(passed, 1);
@@ -273,8 +276,8 @@ bool KFSegmentWalk::walkCycle(Cycles const& cycles, Cycle const& cycle, Tempus t
             behind == _spline.beginVertices() ? nullptr : _spline.vertexAt(_spline.previousPlace(behind));
         KFVertex* const second = behind == _spline.endVertices() ? nullptr : _spline.vertexAt(behind);
         KFVertex const* const here = forward ? first : second;
-        if (cycles.havePoints && here != nullptr && here->getValueU() == source &&
-            target != cycles.outerBound)
+        bool const isPoint = here != nullptr && here->getValueU() == source && target != cycles.outerBound;
+        if (cycles.havePoints && isPoint)
             visitPoint(target);
         if (target >= end)
             return false;

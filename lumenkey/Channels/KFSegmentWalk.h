@@ -19,7 +19,8 @@ struct KFValueExtremes;
 class KFSegmentWalk {
 public:
     /// Whatever the root. `extremes` is null, or what the visitor keeps, which then is nothing but the lowest and the
-    /// highest value that it was shown: pieces that can't change them are left out.
+    /// highest value that it was shown: pieces that can't change them are left out. Where a repeat's times can't be
+    /// written exactly, that holds but for what their rounding makes of values.
     static void overCurve(KFCurve& curve, Tempus const& start, Tempus const& end,
                           KFChannelSegmentVisitor& visitor, KFValueExtremes* extremes);
 

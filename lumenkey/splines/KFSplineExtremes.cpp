@@ -14,8 +14,8 @@ namespace {
 
 constexpr double kInfinity = std::numeric_limits<double>::infinity();
 
-/// Extremes, and the band within which a value changes nothing even when it is computed less exactly than it is bounded:
-/// the power form in which a cubic is evaluated rounds some dozen times, each by a part of the largest control value.
+/// Extremes, and the band within which a bound changes nothing, even though what it bounds is computed with roundings:
+/// the power form in which a cubic is evaluated has some dozen, each of a part of the largest control value.
 class GrowingExtremes {
 public:
     explicit GrowingExtremes(KFValueExtremes& extremes) noexcept : _extremes(extremes) { settle(); }

@@ -32,8 +32,8 @@ KFValueExtremes KFExtremesOfSegment(KFSpline& spline, void* vA, void* vB, Tempus
 }
 
 /// Includes the values of the spline at all its vertices from `from` to `to`, and those of the whole segments between
-/// them, as one visit after the other of `KFChannelSegmentVisitor` would find them, to the bit. False where the vertices
-/// must be visited one by one, as those of a foreign class; some of the values may be included then.
+/// them, to the bit as they are found by `getVertexValue` and by `KFExtremesOfSegment` segment by segment. False where
+/// the vertices must be looked at one by one, as those of a foreign class; some of the values may be included then.
 ///
 /// Under one lock, which it takes. Most segments cost a look at their ends: a curve lies within its control values, and
 /// where these lie within the extremes found so far there is nothing to solve.

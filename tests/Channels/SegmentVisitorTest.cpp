@@ -314,9 +314,11 @@ TEST(KFChannelSegmentVisitorMuseum, FindsTheExtremesOfAHostAndOfTheSamples) {
                 double min = kMost, max = -kMost;
                 for (std::vector<Tempus> const& some : {positions, std::vector{at[i], at[j]}}) {
                     for (Tempus const& t : some) {
+                        if (!isIn(t))
+                            continue;
                         double const value = curve.spline->getVertexValue(t, kTempusZero, true);
-                        min = isIn(t) ? std::min(min, value) : min;
-                        max = isIn(t) ? std::max(max, value) : max;
+                        min = std::min(min, value);
+                        max = std::max(max, value);
                     }
                 }
                 auto const [low, high] = curve.extremes(at[i], at[j]);
