@@ -49,10 +49,24 @@ public:
         }
         KFCurve& curve = *channel.getCurveInterface();
         OutsideKept const kept(curve, {stretch.start, stretch.last});
-        curve.bakeCurve(nullptr, stretch.start, stretch.step, stretch.end, _tolerance * hundredths, 1);
+        double const scale = scaleOfFit(curve, stretch.step);
+        curve.bakeCurve(nullptr, stretch.start, stretch.step, stretch.end, _tolerance * scale * hundredths,
+                        scale);
     }
 
 private:
+    /// Makes values small beside a step. The fit measures along the curve, and so it measures time: where values weigh
+    /// more, handles between two samples come out too short or too long, and the curve swings.
+    static double scaleOfFit(KFCurve& curve, Tempus const& step) {
+        constexpr double share = 0.01;
+        double least = 0;
+        double greatest = 0;
+        curve.getCurrentMinValueV(&least, false);
+        curve.getCurrentMaxValueV(&greatest, false);
+        double const scale = share * TempusGetSeconds(step) / (greatest - least);
+        return std::isnormal(scale) ? scale : 1;
+    }
+
     double _tolerance = 0;
     StepOption _step;
 };

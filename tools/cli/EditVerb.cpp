@@ -23,7 +23,7 @@ constexpr int kPictureWidth = 960;
 constexpr int kPictureHeight = 480;
 /// A part of a file is drawn with so much of its own length on either side.
 constexpr std::int32_t kShareBeside = 8;
-/// Where the rows of a table aren't evenly spaced, a stretch is compared in so many steps.
+/// Where the rows of a table aren't evenly spaced, this takes the place of a frame: a share of the stretch.
 constexpr std::int32_t kStepsOfUnevenRows = 1'000;
 
 struct EditOptions {
@@ -105,18 +105,9 @@ private:
         return span;
     }
 
-    Tempus comparedStep(ChannelFile const& file) const {
-        Tempus step = _verb.sampleStep().value_or(file.frameDuration);
-        if (!TempusIsNumeric(step)) {
-            step = (_span.to - _span.from) / kStepsOfUnevenRows;
-        }
-        step = step / kComparedPerStep;
-        return step > kTempusZero ? step : TempusMake(1, 1);
-    }
-
     void editAll(ChannelInput const& input, std::vector<Node> const& channels) {
         Progress bar("editing");
-        Tempus const step = comparedStep(input.file());
+        Tempus const step = comparedStep(input.file(), _span, _verb.sampleStep());
         for (Node const node : channels) {
             _edited.push_back(edit(input.tree(), node, step));
             bar.update(static_cast<double>(_edited.size()) / static_cast<double>(channels.size()));
@@ -227,6 +218,16 @@ std::string footerOf(EditWords const& words, bool draws) {
 }
 
 } // namespace
+
+Tempus comparedStep(ChannelFile const& file, TimeSpan const& span, std::optional<Tempus> const& sampleStep) {
+    Tempus step =
+        TempusIsNumeric(file.frameDuration) ? file.frameDuration : (span.to - span.from) / kStepsOfUnevenRows;
+    if (sampleStep) {
+        step = TempusMinimum(step, *sampleStep);
+    }
+    step = step / kComparedPerStep;
+    return step > kTempusZero ? step : TempusMake(1, 1);
+}
 
 Verb declareEdit(CLI::App& program, std::shared_ptr<EditVerb> const& verb) {
     auto const options = std::make_shared<EditOptions>();

@@ -52,6 +52,9 @@ public:
     virtual TimeSpan arrivalOf(TimeSpan const& span) const { return span; }
 };
 
+/// In steps of this length before and after are compared: ten in a frame, or in a sample step where that is shorter.
+Tempus comparedStep(ChannelFile const& file, TimeSpan const& span, std::optional<Tempus> const& sampleStep);
+
 Verb declareEdit(CLI::App& program, std::shared_ptr<EditVerb> const& verb);
 
 /// The option `--step` of a verb that samples.

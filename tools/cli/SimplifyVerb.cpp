@@ -18,9 +18,10 @@ public:
         words.name = "simplify";
         words.description = "Draw curves by few keypoints, within a tolerance";
         words.usage = "--tolerance X [--step T]";
-        words.notes = "Looked at at ten times in each step, no curve goes off more than the tolerance. One "
-                      "that fewer keypoints can't draw\n"
-                      "so well stays as it is.\n";
+        words.notes =
+            "Looked at at ten times in each frame or step, no curve goes off more than the "
+            "tolerance. One that fewer\n"
+            "keypoints can't draw so well stays as it is.\n";
         words.example = "lumenkey simplify walk.bvh --tolerance 0.01 -o few.csv --rows keypoints";
         words.keepsShape = true;
         return words;
@@ -41,7 +42,10 @@ public:
         _step.read();
     }
 
-    void prepare(ChannelFile const& file, TimeSpan const& span) override { _step.prepare(file, span); }
+    void prepare(ChannelFile const& file, TimeSpan const& span) override {
+        _step.prepare(file, span);
+        _comparedStep = comparedStep(file, span, _step.step());
+    }
     std::optional<Tempus> sampleStep() const override { return _step.step(); }
 
     /// The fit keeps to the tolerance at its samples alone, and between two of them a curve may jump. So the curve is
@@ -55,7 +59,7 @@ public:
             if (curve.getNumberOfKeypoints() >= before.getNumberOfKeypoints()) {
                 break;
             }
-            if (changeBetween(before, curve, span, _step.step() / kComparedPerStep).most <= _tolerance) {
+            if (changeBetween(before, curve, span, _comparedStep).most <= _tolerance) {
                 return;
             }
             curve = before;
@@ -81,6 +85,7 @@ private:
 
     double _tolerance = 0;
     StepOption _step;
+    Tempus _comparedStep{};
 };
 
 } // namespace

@@ -100,28 +100,27 @@ std::vector<Keypoint> readKeypoints(KFSpline& spline) {
     return keypoints;
 }
 
-void drawHandle(PlotCanvas& canvas, PlotFrame const& frame, Keypoint const& key,
-                KeypointHandle const& handle) {
-    if (handle.isFlat()) {
-        return;
-    }
-    double const seconds = TempusGetSeconds(key.time);
-    PlotPoint const end = frame.at(seconds + handle.seconds, key.value + handle.value);
-    PlotStroke const stroke{style::kHandle, 1, {}};
-    canvas.line(frame.at(seconds, key.value), end, stroke);
-    canvas.square(end, 2, style::kPaper, stroke);
-}
+constexpr PlotPoint kBreak{std::numeric_limits<double>::quiet_NaN(),
+                           std::numeric_limits<double>::quiet_NaN()};
 
 /// What shapes the curve: handles, or the lines between control points.
 void drawControls(PlotCanvas& canvas, PlotFrame const& frame, CurvePicture const& curve) {
     std::vector<PlotPoint> places;
+    std::vector<PlotPoint> handles;
+    std::vector<PlotPoint> ends;
     for (Keypoint const& key : curve.keypoints) {
-        places.push_back(frame.at(TempusGetSeconds(key.time), key.value));
-        if (key.usesHandles) {
-            drawHandle(canvas, frame, key, key.in);
-            drawHandle(canvas, frame, key, key.out);
+        double const seconds = TempusGetSeconds(key.time);
+        places.push_back(frame.at(seconds, key.value));
+        for (KeypointHandle const& handle : {key.in, key.out}) {
+            if (key.usesHandles && !handle.isFlat()) {
+                ends.push_back(frame.at(seconds + handle.seconds, key.value + handle.value));
+                handles.insert(handles.end(), {places.back(), ends.back(), kBreak});
+            }
         }
     }
+    PlotStroke const stroke{style::kHandle, 1, {}};
+    canvas.polyline(handles, stroke);
+    canvas.squares(ends, 2, style::kPaper, stroke);
     if (curve.isOneFunction) {
         canvas.polyline(places, {style::kHandle, 0.8, {2, 2}});
     }
@@ -129,14 +128,16 @@ void drawControls(PlotCanvas& canvas, PlotFrame const& frame, CurvePicture const
 
 void drawSmallMarks(PlotCanvas& canvas, PlotFrame const& frame, CurvePicture const& curve,
                     PlotStroke const& stroke) {
+    std::vector<PlotPoint> drawn;
     PlotPoint last{-std::numeric_limits<double>::infinity(), 0};
     for (Keypoint const& key : curve.keypoints) {
         PlotPoint const place = frame.at(TempusGetSeconds(key.time), key.value);
         if (std::hypot(place.x - last.x, place.y - last.y) >= kBetweenDots) {
-            canvas.dot(place, 1.1, stroke.colour, {stroke.colour, 0.5, {}});
+            drawn.push_back(place);
             last = place;
         }
     }
+    canvas.dots(drawn, 1.1, stroke.colour, {stroke.colour, 0.5, {}});
 }
 
 } // namespace
@@ -218,10 +219,11 @@ void drawCurve(PlotCanvas& canvas, PlotFrame const& frame, CurvePicture const& c
     if (marks != KeypointMarks::Large) {
         return;
     }
+    std::vector<PlotPoint> places;
     for (Keypoint const& key : curve.keypoints) {
-        canvas.dot(frame.at(TempusGetSeconds(key.time), key.value), 2.8, style::kPaper,
-                   {stroke.colour, 1.4, {}});
+        places.push_back(frame.at(TempusGetSeconds(key.time), key.value));
     }
+    canvas.dots(places, 2.8, style::kPaper, {stroke.colour, 1.4, {}});
 }
 
 } // namespace lumenkey::tools

@@ -2,6 +2,7 @@
 
 #include "tools/output/SafeOutputFile.h"
 #include "tools/output/TextForms.h"
+#include "tools/plot/PlotShortening.h"
 
 #include <algorithm>
 #include <cairo-pdf.h>
@@ -144,7 +145,7 @@ void PlotCanvas::line(PlotPoint from, PlotPoint to, PlotStroke const& stroke) {
 
 void PlotCanvas::polyline(std::vector<PlotPoint> const& points, PlotStroke const& stroke) {
     bool isDown = false;
-    for (PlotPoint const& point : points) {
+    for (PlotPoint const& point : withoutStraightPoints(points)) {
         if (std::isnan(point.x) || std::isnan(point.y)) {
             isDown = false;
             continue;
@@ -156,22 +157,34 @@ void PlotCanvas::polyline(std::vector<PlotPoint> const& points, PlotStroke const
     apply(stroke);
 }
 
-void PlotCanvas::dot(PlotPoint centre, double radius, PlotColour const& inside, PlotStroke const& rim) {
-    if (std::isnan(centre.x) || std::isnan(centre.y)) {
-        return;
-    }
-    cairo_new_sub_path(_context.get());
-    cairo_arc(_context.get(), reachable(centre.x), reachable(centre.y), radius, 0, 2 * std::numbers::pi);
+void PlotCanvas::fillAndApply(PlotColour const& inside, PlotStroke const& rim) {
     setColour(inside);
     cairo_fill_preserve(_context.get());
     apply(rim);
 }
 
-void PlotCanvas::square(PlotPoint centre, double halfSide, PlotColour const& inside, PlotStroke const& rim) {
-    PlotRectangle const area{reachable(centre.x) - halfSide, reachable(centre.y) - halfSide, 2 * halfSide,
-                             2 * halfSide};
-    fill(area, inside);
-    outline(area, rim);
+void PlotCanvas::dots(std::vector<PlotPoint> const& centres, double radius, PlotColour const& inside,
+                      PlotStroke const& rim) {
+    for (PlotPoint const& centre : centres) {
+        if (!std::isnan(centre.x) && !std::isnan(centre.y)) {
+            cairo_new_sub_path(_context.get());
+            cairo_arc(_context.get(), reachable(centre.x), reachable(centre.y), radius, 0,
+                      2 * std::numbers::pi);
+            cairo_close_path(_context.get());
+        }
+    }
+    fillAndApply(inside, rim);
+}
+
+void PlotCanvas::squares(std::vector<PlotPoint> const& centres, double halfSide, PlotColour const& inside,
+                         PlotStroke const& rim) {
+    for (PlotPoint const& centre : centres) {
+        if (!std::isnan(centre.x) && !std::isnan(centre.y)) {
+            cairo_rectangle(_context.get(), reachable(centre.x) - halfSide, reachable(centre.y) - halfSide,
+                            2 * halfSide, 2 * halfSide);
+        }
+    }
+    fillAndApply(inside, rim);
 }
 
 void PlotCanvas::selectFont(PlotText const& style) {
@@ -222,7 +235,7 @@ void PlotCanvas::save(std::string const& file) {
     cairo_surface_finish(_surface.get());
     check(cairo_surface_status(_surface.get()));
     SafeOutputFile out(file);
-    out.write(*_bytes);
+    out.write(_format == PlotFormat::Svg ? withShortNumbers(*_bytes) : *_bytes);
     out.close();
 }
 

@@ -69,9 +69,11 @@ public:
     void outline(PlotRectangle const& area, PlotStroke const& stroke, double cornerRadius = 0);
     void line(PlotPoint from, PlotPoint to, PlotStroke const& stroke);
     void polyline(std::vector<PlotPoint> const& points, PlotStroke const& stroke);
-    /// A disc with a rim.
-    void dot(PlotPoint centre, double radius, PlotColour const& inside, PlotStroke const& rim);
-    void square(PlotPoint centre, double halfSide, PlotColour const& inside, PlotStroke const& rim);
+    /// Discs with a rim, and squares; all rims above all insides.
+    void dots(std::vector<PlotPoint> const& centres, double radius, PlotColour const& inside,
+              PlotStroke const& rim);
+    void squares(std::vector<PlotPoint> const& centres, double halfSide, PlotColour const& inside,
+                 PlotStroke const& rim);
 
     /// `at` is on the base line.
     void text(PlotPoint at, std::string const& text, PlotText const& style);
@@ -93,6 +95,7 @@ private:
     static cairo_status_t append(void* bytes, unsigned char const* data, unsigned length);
     void check(cairo_status_t status) const;
     void apply(PlotStroke const& stroke);
+    void fillAndApply(PlotColour const& inside, PlotStroke const& rim);
     void setColour(PlotColour const& colour);
     void selectFont(PlotText const& style);
     void tracePath(PlotRectangle const& area, double cornerRadius);
