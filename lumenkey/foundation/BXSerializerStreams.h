@@ -24,8 +24,8 @@ struct BXScope {
     static constexpr BXScope end() noexcept { return {nullptr, 0}; }
 };
 
-/// Takes a document as elements, attributes and values. The innermost pushed scope gives tags their names. All
-/// attributes of an element are written before its content.
+/// Takes a document as elements, attributes and values. Tags have the names that the scopes in force give them, the one
+/// that was pushed last first. All attributes of an element are written before its content.
 class LUMENKEY_API BXSerializerWriteStream {
 public:
     virtual ~BXSerializerWriteStream();
@@ -57,8 +57,8 @@ public:
 /// An element that is being read: its tag, its attributes and, where it holds no element, its text.
 ///
 /// Each reading is false, with the output as it was, for what isn't there and for a text that isn't wholly of the kind.
-/// The output may not be null. Spaces around numbers, bools, times and UUIDs don't count. An element with children has
-/// no text.
+/// The output may not be null. Spaces around numbers, bools, times and UUIDs don't count. Readings of 32 bits give the
+/// low half of any number that 64 bits hold. An element with children has no text; one that is empty has an empty one.
 ///
 /// Valid as long as the handler that it is given to works on it.
 class LUMENKEY_API BXStreamElement {
@@ -70,6 +70,7 @@ public:
 
     bool getAsString(BXString* out) const;
     bool getAsUInt32(std::uint32_t* out) const;
+    bool getAsInt32(std::int32_t* out) const;
     bool getAsUInt64(std::uint64_t* out) const;
     bool getAsBool(bool* out) const;
     bool getAsDouble(double* out) const;
@@ -103,15 +104,17 @@ class LUMENKEY_API BXSerializerReadStream {
 public:
     virtual ~BXSerializerReadStream();
 
-    /// The table isn't owned and must outlive the handler that pushes it.
+    /// The table isn't owned; it must outlive the stream, which remembers names and tags by it, and not change.
     virtual void pushScope(BXScope const* scope) = 0;
-    /// Not owned; must outlive the element. Null does nothing.
+    /// Not owned; must outlive the element. Null does nothing, and so does a push out of a handler's `parseEnd`.
     virtual void pushHandler(BXSerializer* handler) = 0;
     /// Passes over all that is inside the element that is handed over now.
     virtual void skipElement() = 0;
 
     // The same questions of an element, asked through the stream.
-    bool getAsInt32(BXStreamElement const& element, std::int32_t* out) const;
+    bool getAsInt32(BXStreamElement const& element, std::int32_t* out) const {
+        return element.getAsInt32(out);
+    }
     bool getAsDouble(BXStreamElement const& element, double* out) const { return element.getAsDouble(out); }
     bool getAsString(BXStreamElement const& element, BXString* out) const { return element.getAsString(out); }
     bool getAsChrono(BXStreamElement const& element, Tempus* out) const { return element.getAsTime(out); }
