@@ -60,6 +60,7 @@ int main(int argc, char** argv) {
     registerThreads(bench);
     registerTree(bench);
     registerRecording(bench);
+    registerDocuments(bench);
     registerGsl(bench);
     registerGStreamer(bench);
     registerMlt(bench);

@@ -50,6 +50,7 @@
 #include "lumenkey/foundation/BXXMLReadStream.h"
 #include "lumenkey/foundation/BXXMLWriteStream.h"
 #include "lumenkey/foundation/Tempus.h"
+#include "lumenkey/persistence/ChannelParser.h"
 #include "lumenkey/splines/KFBSplineInterpolator.h"
 #include "lumenkey/splines/KFBasicInterpolators.h"
 #include "lumenkey/splines/KFBezierUtil.h"

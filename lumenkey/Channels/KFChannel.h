@@ -90,6 +90,14 @@ public:
     /// scale). One that would fall on a locked keypoint is left out. From a channel without keypoints this one is reset
     /// and takes its value. Nothing for null and for what is no value channel.
     void copyKeyframesFromChannel(Tempus const& t, KFChannelBase* other) override;
+    void writeHeader(BXSerializerWriteStream& stream, bool full) override;
+    void writeBody(BXSerializerWriteStream& stream, bool full, bool children, bool all) override;
+    /// Frees the fades of a local record: a document that has some brings them.
+    bool parseBegin(BXSerializerReadStream& stream) override;
+    /// Returns to the shared record where the document changed nothing.
+    bool parseEnd(BXSerializerReadStream& stream) override;
+    bool parseElement(BXSerializerReadStream& stream, BXStreamElement& element) override;
+    void calcHashForState(BXSerializerWriteStream& stream, Tempus const& t) override;
     /// A change to what isn't both keyframable and a spline counts as one of state. A compound parent is announced
     /// first.
     void willBeModified(unsigned int kind) override;
@@ -491,6 +499,11 @@ private:
     void noteRecordedValue(Tempus const& t);
     KFFadeBlock& fadesToWrite();
     bool beginFadeEdit(bool wantsBlock);
+
+    // Documents (lumenkey/persistence).
+    bool isLeftOutOf(BXSerializerWriteStream const& stream) const;
+    void parseFadeOffset(BXStreamElement const& element);
+    void parseFadeShape(BXStreamElement const& element);
 
     void takeImplOf(KFChannel const& other);
     void takeInfoOf(KFChannel const& other);

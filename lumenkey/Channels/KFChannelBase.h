@@ -9,12 +9,14 @@
 #include "lumenkey/foundation/BXString.h"
 #include "lumenkey/foundation/Tempus.h"
 
+#include <array>
 #include <cstdint>
 #include <map>
 #include <memory>
 #include <utility>
 #include <vector>
 
+class BXURL;
 class KFChannel;
 class KFChannelFolder;
 class KFChannelObjectRootBase;
@@ -44,6 +46,7 @@ public:
     using ResetCallbackDataTable = KFResetCallbackDataTable;
     using KeyframesByChannel = std::vector<std::pair<KFChannel*, std::vector<_KFKeyframeInfo>>>;
     using KeyframesByRef = std::map<KFChannelRef, std::vector<_KFKeyframeInfo>>;
+    /// How `writeFlags` writes.
     enum WriteFlagType { kWriteFlagsAsAttribute = 0, kWriteFlagsAsElement = 1 };
 
     /// Enters the parent's list unless the parent is null. Bit 4 is added to the flags; bits 32 and up start
@@ -135,13 +138,20 @@ public:
     virtual void generateKeys(unsigned int first, unsigned int second);
 
     // Of BXSerializer, with the digest of the state and the state blob.
+    //
+    // A document is written by `markFactoriesForSerialization`, `KFFactories::saveFactories`, `writeHeader`, `writeBody`
+    // and the end of the element, in this order. Reading keeps what it finds: the flags of a class, children that
+    // the document doesn't mention, and what it can't read stays as it was. A locked node is read like any other.
     void writeHeader(BXSerializerWriteStream& stream, bool full) override;
     void writeBody(BXSerializerWriteStream& stream, bool full, bool children, bool all) override;
     void markFactoriesForSerialization(BXSerializerWriteStream& stream, bool all) override;
     bool parseBegin(BXSerializerReadStream& stream) override;
     bool parseEnd(BXSerializerReadStream& stream) override;
     bool parseElement(BXSerializerReadStream& stream, BXStreamElement& element) override;
+    /// A digest of what is seen at `t`; names, IDs and keypoints don't enter.
     virtual void calcHashForState(BXSerializerWriteStream& stream, Tempus const& t);
+    /// Reads a document into this channel, which takes its ID; false where it is broken or holds no channel. What was
+    /// read until then stays. The numbers that an earlier document gave to factories on this thread are forgotten.
     virtual bool configureWithState(BXData const& state);
 
     /// Announces a change before it is made, to the nearest object root; nothing without one.
@@ -278,6 +288,18 @@ public:
     void setKeyframesWithChannelRef(Tempus const& t, Tempus const& unused, KeyframesByRef const& keyframes,
                                     bool clear);
 
+    // State ---------------------------------------------------------------------------------------------------
+
+    /// The channel as a document of its own, in a blob; with `children` those of a folder, with `all` also those that
+    /// are at their defaults. Not beside changes of the tree.
+    BXData createChannelState(bool children, bool all);
+    /// Reads such a document from a file, as `configureWithState` does, but keeps the ID.
+    bool configureWithURL(BXURL const& url);
+    /// A digest of the state of the channel and all that lies below it, names and IDs included: equal for equal state.
+    /// Flags that aren't state, defaults and children that stay out of documents don't enter, nor the value of a
+    /// channel with bit 7.
+    std::array<std::uint8_t, 16> getHash();
+
     // The ID generator. Any thread.
     static unsigned int getNextUniqueID() noexcept;
     /// The ID that will be handed out next.
@@ -311,6 +333,8 @@ public:
     KFChannelBase& operator=(KFChannelBase const& other);
 
 protected:
+    /// Nothing for a word of 0. Into a digest go the state bits, into a document all but bit 6.
+    void writeFlags(BXSerializerWriteStream& stream, WriteFlagType type) const;
     /// The flag word, without an announcement: for constructors.
     void storeFlags(KFChannelFlags flags) noexcept { _flags = flags; }
     /// Of the keypoints from `from` to `to`, both in global time, in ascending order.

@@ -32,15 +32,6 @@ void KFChannelBase::simplify(Tempus const&, Tempus const&, Tempus const&, double
 void KFChannelBase::setExtrapolation(unsigned int, unsigned int) {}
 void KFChannelBase::generateKeys(unsigned int, unsigned int) {}
 
-void KFChannelBase::writeHeader(BXSerializerWriteStream&, bool) {}
-void KFChannelBase::writeBody(BXSerializerWriteStream&, bool, bool, bool) {}
-void KFChannelBase::markFactoriesForSerialization(BXSerializerWriteStream&, bool) {}
-bool KFChannelBase::parseBegin(BXSerializerReadStream&) { return true; }
-bool KFChannelBase::parseEnd(BXSerializerReadStream&) { return true; }
-bool KFChannelBase::parseElement(BXSerializerReadStream&, BXStreamElement&) { return true; }
-void KFChannelBase::calcHashForState(BXSerializerWriteStream&, Tempus const&) {}
-bool KFChannelBase::configureWithState(BXData const&) { return false; }
-
 void KFChannelBase::setIsSpline(bool) {}
 bool KFChannelBase::isSpline() const { return false; }
 bool KFChannelBase::isModified(bool) const { return false; }

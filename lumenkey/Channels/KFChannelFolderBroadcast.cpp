@@ -48,15 +48,6 @@ void KFChannelFolder::adjustToFrameDuration(Tempus const& frameDuration) {
     forEachChild([&](Child& child) { child.adjustToFrameDuration(frameDuration); });
 }
 
-void KFChannelFolder::markFactoriesForSerialization(BXSerializerWriteStream& stream, bool all) {
-    KFChannelBase::markFactoriesForSerialization(stream, all);
-    forEachChild([&](Child& child) { child.markFactoriesForSerialization(stream, all); });
-}
-
-void KFChannelFolder::calcHashForState(BXSerializerWriteStream& stream, Tempus const& t) {
-    forEachChild([&](Child& child) { child.calcHashForState(stream, t); });
-}
-
 // To visible children ---------------------------------------------------------------------------------------
 
 void KFChannelFolder::lock(bool on, bool checkAncestors) {

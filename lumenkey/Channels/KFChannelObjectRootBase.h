@@ -33,6 +33,14 @@ public:
     Tempus localToGlobalTime(Tempus const& t) const override;
     using KFChannelFolder::globalToLocalTime;
     using KFChannelFolder::localToGlobalTime;
+    /// The time of the object and its state in front of what a folder writes.
+    void writeBody(BXSerializerWriteStream& stream, bool full, bool children, bool all) override;
+    bool parseBegin(BXSerializerReadStream& stream) override;
+    /// Locks a root that the document has locked, now that its children have been read.
+    bool parseEnd(BXSerializerReadStream& stream) override;
+    /// Time and state are taken without an announcement of data. The flags above the low word end up clear, unless the
+    /// document stands alone.
+    bool parseElement(BXSerializerReadStream& stream, BXStreamElement& element) override;
     /// Also multiplies the start and the duration of the extent.
     void adjustToFrameDuration(Tempus const& frameDuration) override;
 
@@ -77,12 +85,28 @@ public:
     bool writesTimeRange() const noexcept { return _writesTimeRange; }
     void setWritesTimeRange(bool writes) noexcept { _writesTimeRange = writes; }
 
+    // Documents ---------------------------------------------------------------------------------------------
+
+    /// What `writeBody` writes, without children; the two last arguments aren't used.
+    void serializeSelfOnly(BXSerializerWriteStream& stream, bool full, bool all);
+    /// Marks what a reader can't make up by itself: the folders below whose children aren't fixed by their class.
+    void markChannelFactoriesForSerialization(BXSerializerWriteStream& stream);
+    /// The same below a folder; null does nothing. Roots below it are passed by.
+    void markVaryingFolderFactoriesForSerialization(KFChannelFolder* folder, BXSerializerWriteStream& stream);
+    /// A digest of the root itself; the time has no effect.
+    void calcHashForStateSelfOnly(BXSerializerWriteStream& stream, Tempus const& t);
+
     /// `assign`.
     KFChannelObjectRootBase& operator=(KFChannelObjectRootBase const& other);
     bool operator==(KFChannelObjectRootBase const& other) const { return compare(&other); }
 
 private:
+    void writeTiming(BXSerializerWriteStream& stream) const;
+    void writeState(BXSerializerWriteStream& stream) const;
+    void parseTiming(BXSerializerReadStream const& stream, BXStreamElement const& element);
+
     Tempus _timeOffset = kTempusZero;
     BXTimeRange _timeExtent{kTempusZero, kTempusZero};
     bool _writesTimeRange = true;
+    bool _locksAfterParse = false;
 };

@@ -3,6 +3,7 @@
 #include "lumenkey/curves/KFCurve.h"
 
 #include "lumenkey/curves/KFCurveOwner.h"
+#include "lumenkey/curves/KFCurveParseRecord.h"
 #include "lumenkey/splines/KFCoreGlobals.h"
 #include "lumenkey/splines/KFSpline.h"
 #include "lumenkey/splines/KFSplineAccess.h"

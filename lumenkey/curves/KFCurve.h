@@ -12,6 +12,7 @@
 
 class KFCurveOwner;
 class KFSplineState;
+struct KFCurveParseRecord;
 
 /// A value over time: a root node, a chain of processing nodes behind it, and a clamp.
 ///
@@ -60,7 +61,9 @@ public:
     bool operator==(KFCurve const& other) const;
     ~KFCurve() override;
 
-    // Of BXSerializer.
+    // Of BXSerializer. The keypoints are written from a copy up to 4096 of them, beyond that 256 at a time under the
+    // spline's lock, so that a write may run beside evaluation. Reading replaces the keypoints, keyframable or not;
+    // settings that a document leaves out stay. `parseElement` answers true for whatever it is given.
     void writeHeader(BXSerializerWriteStream& stream, bool full) override;
     void writeBody(BXSerializerWriteStream& stream, bool full, bool children, bool all) override;
     void markFactoriesForSerialization(BXSerializerWriteStream& stream, bool all) override;
@@ -451,6 +454,19 @@ private:
     void offsetRoot(Tempus const& t, double value, double low, double high, bool neighboursOnly,
                     bool keepShape);
     bool settleAfterDeletion();
+
+    // Documents (lumenkey/persistence).
+    void writeSettings(BXSerializerWriteStream& stream);
+    void writeKeypoints(BXSerializerWriteStream& stream);
+    void parseSettings(BXStreamElement const& element);
+    void beginParsingKeypoints(std::uint32_t count);
+    KFCurveParseRecord& parseRecord();
+    void flushParseRecord();
+    void parseKeypointElement(BXSerializerReadStream const& stream, BXStreamElement const& element);
+    void appendParsedKeypoint(double value);
+    void setParsedAttribute(bool (KFSpline::*set)(void*, double, Tempus const&), double number);
+    void parseHandle(BXSerializerReadStream const& stream, BXStreamElement const& element);
+
     bool readFlag(void* handle, std::uint32_t flag, bool* out) const;
     double handleScale() const;
     static bool offsetsOnly(bool force);
@@ -473,6 +489,7 @@ private:
     KFCurveOwner* _ownerChannel = nullptr;
     KFSplineState* _splineState = nullptr;
     BXRelaxed<std::uint32_t> _rootKind{kRootConstant};
+    std::unique_ptr<KFCurveParseRecord> _parseRecord; // while keypoints are read from a document
 };
 
 inline std::uint32_t KFCurve::keypointCount() const noexcept {

@@ -11,7 +11,7 @@
 namespace {
 
 /// First byte of each call. Digests may be stored, so never renumber.
-enum class Call : std::uint8_t { Start = 1, End = 2, Value = 16, Attribute = 32 };
+enum class Call : std::uint8_t { Start = 1, Value = 16, Attribute = 32 };
 
 /// Added to `Value` and `Attribute`; likewise.
 enum class Type : std::uint8_t {
@@ -53,14 +53,13 @@ public:
         reserve();
         put(static_cast<std::uint8_t>(Call::Start));
         put(tag);
-        ++_depth;
+        put(_scopes);
     }
 
-    void end() {
-        if (_depth != 0) {
-            --_depth;
-            reserve();
-            put(static_cast<std::uint8_t>(Call::End));
+    void pushScope() { ++_scopes; }
+    void popScope() {
+        if (_scopes != 0) {
+            --_scopes;
         }
     }
 
@@ -144,7 +143,7 @@ private:
     std::unique_ptr<XXH3_state_t, FreeState> _state;
     std::array<std::uint8_t, kBlock> _block;
     std::size_t _used = 0;
-    std::size_t _depth = 0;
+    std::uint32_t _scopes = 0;
 };
 
 BXHashWriteStream::BXHashWriteStream() : _digest(std::make_unique<Digest>()) {}
@@ -152,10 +151,10 @@ BXHashWriteStream::~BXHashWriteStream() = default;
 
 std::array<std::uint8_t, 16> BXHashWriteStream::getHash() { return _digest->hash(); }
 
-void BXHashWriteStream::pushScope(BXScope const*) {}
-void BXHashWriteStream::popScope() {}
+void BXHashWriteStream::pushScope(BXScope const*) { _digest->pushScope(); }
+void BXHashWriteStream::popScope() { _digest->popScope(); }
 void BXHashWriteStream::startElement(std::uint32_t tag) { _digest->start(tag); }
-void BXHashWriteStream::endElement() { _digest->end(); }
+void BXHashWriteStream::endElement() {}
 void BXHashWriteStream::writeValue(bool value) { _digest->value(value); }
 void BXHashWriteStream::writeValue(std::uint32_t value) { _digest->value(value); }
 void BXHashWriteStream::writeValue(std::uint64_t value) { _digest->value(value); }

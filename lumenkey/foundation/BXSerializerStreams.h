@@ -85,7 +85,6 @@ public:
     /// A new one, which the caller frees; null where there is none.
     BXUUID* getAttributeAsUUID(std::uint32_t tag) const;
 
-protected:
     /// The text as it stands in the document, entities resolved, if the element has one. Valid until the next call.
     virtual std::optional<std::string_view> text() const = 0;
     /// Of the attribute with that tag in the scopes in force now.

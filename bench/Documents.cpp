@@ -1,0 +1,302 @@
+// Documents: reading beside expat with empty handlers, writing beside the formatting of the same numbers, digests
+// beside XXH3, what of it all grows with the size, and the memory beside the tree. JSON for comparison.
+
+#include "bench/Benchmarks.h"
+#include "bench/CountedMemory.h"
+#include "bench/Subjects.h"
+
+#include "lumenkey/Channels/KFChannelImpl.h"
+#include "lumenkey/Channels/KFChannelObjectRootBase.h"
+#include "lumenkey/Channels/KFScalarChannels.h"
+#include "lumenkey/curves/KFCurve.h"
+#include "lumenkey/foundation/BXStream.h"
+#include "lumenkey/foundation/BXXMLWriteStream.h"
+
+#include <charconv>
+#include <expat.h>
+#include <nlohmann/json.hpp>
+#include <stdexcept>
+#include <xxhash.h>
+
+namespace {
+
+constexpr std::size_t kDocumentSizes[] = {1000, 100000, 1000000};
+constexpr std::size_t kKeypointsOfChannel = 1000;
+constexpr double kMebibyte = 1024.0 * 1024.0;
+constexpr double kHandleScale = 12.0;
+
+/// Channels of a thousand keypoints each under one root.
+struct DocumentTree {
+    KFChannelObjectRootBase root{"Object", nullptr, 1, 0, 0};
+    std::vector<std::unique_ptr<KFChannelBase>> channels;
+    std::vector<Key> keys = makeKeys(kKeypointsOfChannel);
+
+    explicit DocumentTree(std::size_t keypoints) {
+        for (std::size_t i = 0; i < keypoints / kKeypointsOfChannel; ++i)
+            addChannel(static_cast<unsigned int>(i + 1));
+    }
+    void addChannel(unsigned int id) {
+        auto channel = std::make_unique<KFChannelDouble>(0.0, "Value", &root, id, 0);
+        KFCurve& curve = *channel->createLocalChannelImplementation()->getCurve();
+        for (Key const& key : keys) {
+            curve.appendKeypointNoTangents(key.time(), key.value, true);
+            void* const handle = curve.getSpline()->getLastVertex();
+            curve.setKeypointInterpolation(handle, kKFInterpolationBezier, true);
+            curve.setKeypointInputHandles(handle, key.in.u, key.in.v, true);
+            curve.setKeypointOutputHandles(handle, key.out.u, key.out.v, true);
+        }
+        channels.push_back(std::move(channel));
+    }
+    std::size_t keypoints() const { return channels.size() * keys.size(); }
+};
+
+/// A tree that is read into; what reading makes belongs to it.
+struct ReadTree {
+    KFChannelObjectRootBase root{"Object", nullptr, 1, 0, 0};
+
+    ReadTree() = default;
+    ReadTree(ReadTree const&) = delete;
+    ReadTree& operator=(ReadTree const&) = delete;
+    ~ReadTree() {
+        std::vector<KFChannelBase*> const children =
+            root.getDescendants() == nullptr ? std::vector<KFChannelBase*>() : *root.getDescendants();
+        root.removeAllDescendants(true);
+        for (KFChannelBase* const child : children)
+            delete child;
+    }
+};
+
+template <class Work> double nanoseconds(Work work) {
+    auto const start = std::chrono::steady_clock::now();
+    work();
+    std::chrono::duration<double, std::nano> const elapsed = std::chrono::steady_clock::now() - start;
+    return elapsed.count();
+}
+
+/// Small documents are repeated, so that each measurement takes some milliseconds.
+template <class Work> Measurement perKeypoint(std::size_t keypoints, Work work) {
+    return [keypoints, work] {
+        std::size_t const rounds = std::max<std::size_t>(1, 20000 / keypoints);
+        double total = 0.0;
+        for (std::size_t i = 0; i < rounds; ++i)
+            total += work();
+        return total / static_cast<double>(rounds * keypoints);
+    };
+}
+
+double readDocument(BXData const& data) {
+    ReadTree tree;
+    return nanoseconds([&] {
+        if (!tree.root.configureWithState(data))
+            throw std::runtime_error("a document of our own can't be read");
+    });
+}
+
+double readByExpat(BXData const& data) {
+    XML_Parser const parser = XML_ParserCreate("UTF-8");
+    XML_SetElementHandler(
+        parser, [](void*, XML_Char const*, XML_Char const**) {}, [](void*, XML_Char const*) {});
+    XML_SetCharacterDataHandler(parser, [](void*, XML_Char const*, int) {});
+    double const time = nanoseconds([&] {
+        XML_Parse(parser, reinterpret_cast<char const*>(data.data()), static_cast<int>(data.size()), 1);
+    });
+    XML_ParserFree(parser);
+    return time;
+}
+
+/// Bytes that go nowhere.
+struct Counter : BXStream {
+    bool write(void const*, std::size_t size) override {
+        bytes += size;
+        return true;
+    }
+    std::size_t bytes = 0;
+};
+
+void writeInto(BXStream& sink, KFChannelBase& channel) {
+    BXXMLWriteStream stream(sink, 5, 13);
+    channel.writeHeader(stream, true);
+    channel.writeBody(stream, true, true, true);
+    stream.endElement();
+    stream.close();
+}
+
+template <class Number> char* format(char* to, Number number) {
+    return std::to_chars(to, to + 32, number).ptr;
+}
+
+/// Just the numbers of the document, one behind the other.
+void formatNumbers(DocumentTree const& tree, std::vector<char>& buffer) {
+    for (std::size_t i = 0; i < tree.channels.size(); ++i) {
+        char* to = buffer.data();
+        for (Key const& key : tree.keys) {
+            to = format(to, key.ticks);
+            to = format(to, kTimescale);
+            to = format(to, 0U);
+            for (double const number : {key.value, key.in.u, key.in.v, key.out.u, key.out.v})
+                to = format(to, number);
+        }
+        benchmark::DoNotOptimize(to);
+    }
+}
+
+template <class Value> void feed(XXH3_state_t* state, Value value) {
+    XXH3_128bits_update(state, &value, sizeof value);
+}
+
+void digestNumbers(DocumentTree const& tree) {
+    XXH3_state_t* const state = XXH3_createState();
+    XXH3_128bits_reset(state);
+    for (std::size_t i = 0; i < tree.channels.size(); ++i) {
+        for (Key const& key : tree.keys) {
+            feed(state, key.ticks);
+            feed(state, kTimescale);
+            feed(state, 0U);
+            for (double const number : {key.value, key.in.u, key.in.v, key.out.u, key.out.v})
+                feed(state, number / kHandleScale);
+        }
+    }
+    benchmark::DoNotOptimize(XXH3_128bits_digest(state));
+    XXH3_freeState(state);
+}
+
+nlohmann::json jsonOf(DocumentTree const& tree) {
+    nlohmann::json channels = nlohmann::json::array();
+    for (std::size_t i = 0; i < tree.channels.size(); ++i) {
+        nlohmann::json keypoints = nlohmann::json::array();
+        for (Key const& key : tree.keys)
+            keypoints.push_back({{"flags", 0},
+                                 {"time", {key.ticks, kTimescale}},
+                                 {"value", key.value},
+                                 {"in", {key.in.u, key.in.v}},
+                                 {"out", {key.out.u, key.out.v}}});
+        channels.push_back({{"name", "Value"}, {"id", i + 1}, {"keypoints", std::move(keypoints)}});
+    }
+    return channels;
+}
+
+using Trees = std::shared_ptr<DocumentTree>;
+
+Measurement reading(Trees const& tree) {
+    auto const data = std::make_shared<BXData const>(tree->root.createChannelState(true, true));
+    return perKeypoint(tree->keypoints(), [data] { return readDocument(*data); });
+}
+
+Measurement writing(Trees const& tree) {
+    return perKeypoint(tree->keypoints(), [tree] {
+        Counter sink;
+        return nanoseconds([&] { writeInto(sink, tree->root); });
+    });
+}
+
+Measurement digesting(Trees const& tree) {
+    return perKeypoint(tree->keypoints(), [tree] {
+        return nanoseconds([&] { benchmark::DoNotOptimize(tree->root.getHash()); });
+    });
+}
+
+Contest readingContest(std::size_t size) {
+    auto const tree = std::make_shared<DocumentTree>(size);
+    auto const data = std::make_shared<BXData const>(tree->root.createChannelState(true, true));
+    return {reading(tree), perKeypoint(size, [data] { return readByExpat(*data); })};
+}
+
+Contest writingContest(std::size_t size) {
+    auto const tree = std::make_shared<DocumentTree>(size);
+    auto const buffer = std::make_shared<std::vector<char>>(kKeypointsOfChannel * 8 * 32);
+    return {writing(tree), perKeypoint(size, [tree, buffer] {
+                return nanoseconds([&] { formatNumbers(*tree, *buffer); });
+            })};
+}
+
+Contest digestContest(std::size_t size) {
+    auto const tree = std::make_shared<DocumentTree>(size);
+    return {digesting(tree),
+            perKeypoint(size, [tree] { return nanoseconds([&] { digestNumbers(*tree); }); })};
+}
+
+/// Mebibytes above what was there, and what the tree itself weighs.
+double memoryOfReading(DocumentTree& tree) {
+    BXData const data = tree.root.createChannelState(true, true);
+    auto read = std::make_unique<ReadTree>();
+    CountedMemory::Peak peak;
+    std::size_t const before = CountedMemory::heapBytes();
+    peak.start();
+    read->root.configureWithState(data);
+    std::size_t const highest = peak.risenBy();
+    std::size_t const kept = CountedMemory::heapBytes() - before;
+    return std::max(0.0, static_cast<double>(highest) - static_cast<double>(kept)) / kMebibyte;
+}
+
+double memoryOfWriting(DocumentTree& tree) {
+    Counter sink;
+    CountedMemory::Peak peak;
+    peak.start();
+    writeInto(sink, tree.root);
+    return static_cast<double>(peak.risenBy()) / kMebibyte;
+}
+
+void registerMemoryOfDocuments(Bench& bench, std::size_t size) {
+    auto const within = [&bench, size](std::string const& what, double (*measure)(DocumentTree&)) {
+        ContestEntry entry{withSize("memory of " + what, size), "1 MiB beside the tree", Bound::atMost(1.0),
+                           [size, measure] {
+                               auto const tree = std::make_shared<DocumentTree>(size);
+                               return Contest{[tree, measure] { return measure(*tree); }, [] { return 1.0; }};
+                           }};
+        entry.unit = "MiB";
+        entry.repeats = false;
+        registerContest(bench, std::move(entry));
+    };
+    within("reading", memoryOfReading);
+    within("writing", memoryOfWriting);
+}
+
+void registerGrowthOfDocuments(Bench& bench) {
+    auto const growth = [&bench](std::string const& what, Measurement (*measure)(Trees const&)) {
+        registerContest(bench,
+                        {what + " a keypoint/1000000", "a keypoint of 100000", Bound::atMost(1.1), [measure] {
+                             return Contest{measure(std::make_shared<DocumentTree>(1000000)),
+                                            measure(std::make_shared<DocumentTree>(100000))};
+                         }});
+    };
+    growth("read", reading);
+    growth("write", writing);
+    growth("digest", digesting);
+}
+
+void registerJson(Bench& bench) {
+    constexpr std::size_t kSize = 100000;
+    registerContest(bench, {"beside JSON/read", "nlohmann-json", Bound::none(), [] {
+                                auto const tree = std::make_shared<DocumentTree>(kSize);
+                                auto const text = std::make_shared<std::string>(jsonOf(*tree).dump());
+                                return Contest{reading(tree), perKeypoint(kSize, [text] {
+                                                   return nanoseconds([&] {
+                                                       benchmark::DoNotOptimize(nlohmann::json::parse(*text));
+                                                   });
+                                               })};
+                            }});
+    registerContest(bench, {"beside JSON/write", "nlohmann-json", Bound::none(), [] {
+                                auto const tree = std::make_shared<DocumentTree>(kSize);
+                                return Contest{writing(tree), perKeypoint(kSize, [tree] {
+                                                   return nanoseconds([&] {
+                                                       benchmark::DoNotOptimize(jsonOf(*tree).dump());
+                                                   });
+                                               })};
+                            }});
+}
+
+} // namespace
+
+void registerDocuments(Bench& bench) {
+    for (std::size_t const size : kDocumentSizes) {
+        registerContest(bench, {withSize("read a document", size), "expat with empty handlers",
+                                Bound::atMost(2.5), [size] { return readingContest(size); }});
+        registerContest(bench, {withSize("write a document", size), "its numbers by to_chars",
+                                Bound::atMost(2.0), [size] { return writingContest(size); }});
+        registerContest(bench, {withSize("digest", size), "XXH3 of its numbers, one by one",
+                                Bound::atMost(1.5), [size] { return digestContest(size); }});
+        registerMemoryOfDocuments(bench, size);
+    }
+    registerGrowthOfDocuments(bench);
+    registerJson(bench);
+}

@@ -1,0 +1,224 @@
+// What documents look like, to the letter.
+
+#include "lumenkey/Channels/KFChannelImpl.h"
+#include "lumenkey/Channels/KFScalarChannels.h"
+#include "lumenkey/Channels/KFVectorChannels.h"
+#include "lumenkey/curves/KFCurve.h"
+#include "lumenkey/foundation/BXStream.h"
+#include "lumenkey/foundation/BXXMLWriteStream.h"
+#include "tests/persistence/RandomTree.h"
+
+#include <gtest/gtest.h>
+
+#include <functional>
+#include <regex>
+
+namespace {
+
+Tempus s(double t) { return KFChronoForChannelSeconds(t, 600); }
+
+/// The text of each description replaced by three dots.
+std::string withoutDescriptions(std::string const& document) {
+    return std::regex_replace(document, std::regex("<description>[^<]*</description>"),
+                              "<description>...</description>");
+}
+
+/// As a host writes a node into a document of its own.
+std::string inHostsDocument(KFChannelBase& channel, bool full, bool children, bool all) {
+    BXBufferWriteStream buffer(1024, 1024);
+    BXXMLWriteStream stream(buffer, 5, 13);
+    channel.writeHeader(stream, full);
+    channel.writeBody(stream, full, children, all);
+    stream.endElement();
+    stream.close();
+    BXData const data = buffer.copyData();
+    std::string const text(data.begin(), data.end());
+    std::size_t const start = text.find("  <parameter");
+    std::size_t const end = text.rfind("</kfml>");
+    return start == std::string::npos ? text : text.substr(start, end - start);
+}
+
+struct Group {
+    KFChannelFolder folder{"Group", nullptr, 7, 0, 0};
+    KFChannelDouble size{0.0, "Size", &folder, 1, 0};
+    KFChannelDouble blur{0.0, "Blur", &folder, 2, 0};
+
+    Group() {
+        KFCurve& curve = *blur.createLocalChannelImplementation()->getCurve();
+        for (double const t : {0.0, 1.0}) {
+            curve.appendKeypointNoTangents(s(t), 10 * t, true);
+            curve.setKeypointInterpolation(curve.getSpline()->getLastVertex(), kKFInterpolationBezier, true);
+        }
+        folder.finishInitializing();
+    }
+};
+
+} // namespace
+
+TEST(Document, StandsAlone) {
+    Group group;
+    EXPECT_EQ(withoutDescriptions(documentOf(group.folder)),
+              R"(<?xml version="1.0" encoding="UTF-8"?>
+<kfml version="5.13">
+  <factory id="1" uuid="E7BF3809-2290-11D7-98E5-00039389B702">
+    <description>...</description>
+    <manufacturer>Arbor</manufacturer>
+    <version>1</version>
+  </factory>
+  <factory id="2" uuid="FDC1944B-2291-11D7-B1C3-00039389B702">
+    <description>...</description>
+    <manufacturer>Arbor</manufacturer>
+    <version>1</version>
+  </factory>
+  <parameter name="Group" id="7" factoryID="1">
+    <flags>8589938704</flags>
+    <parameter name="Size" id="1" factoryID="2">
+      <flags>8589934608</flags>
+      <curve type="1" default="0" value="0"/>
+    </parameter>
+    <parameter name="Blur" id="2" factoryID="2">
+      <flags>8589934608</flags>
+      <curve type="1" default="0" value="0">
+        <numberOfKeypoints>2</numberOfKeypoints>
+        <keypoint flags="0">
+          <time>0/600</time>
+          <value>0</value>
+        </keypoint>
+        <keypoint flags="0">
+          <time>600/600</time>
+          <value>10</value>
+        </keypoint>
+      </curve>
+    </parameter>
+  </parameter>
+</kfml>
+)");
+    std::string const self = documentOf(group.folder, false, false);
+    EXPECT_EQ(self.find("Size"), std::string::npos);
+    EXPECT_NE(self.find("<flags>8589938704</flags>"), std::string::npos);
+}
+
+TEST(Document, StandsInsideAnother) {
+    Group group;
+    EXPECT_EQ(inHostsDocument(group.folder, false, true, false),
+              R"(  <parameter name="Group" id="7" flags="8589938704">
+    <parameter name="Blur" id="2" flags="8589934608">
+      <curve type="1" default="0" value="0">
+        <numberOfKeypoints>2</numberOfKeypoints>
+        <keypoint flags="0">
+          <time>0/600</time>
+          <value>0</value>
+        </keypoint>
+        <keypoint flags="0">
+          <time>600/600</time>
+          <value>10</value>
+        </keypoint>
+      </curve>
+    </parameter>
+  </parameter>
+)");
+}
+
+TEST(Document, WritesOfAChannelWhatIsNotAsUsual) {
+    struct Case {
+        char const* expected;
+        std::function<void(KFChannelDouble&, KFCurve&)> change;
+    };
+    auto const key = [](KFCurve& curve, unsigned type) {
+        curve.appendKeypointNoTangents(s(1), 2.0, true);
+        void* const handle = curve.getSpline()->getLastVertex();
+        curve.setKeypointInterpolation(handle, type, true);
+        return handle;
+    };
+    constexpr char const* kHead = "  <parameter name=\"V\" id=\"1\" flags=\"16\"";
+    Case const cases[] = {
+        {" default=\"1\" value=\"2\"/>\n",
+         [](auto&, KFCurve& curve) {
+             curve.setCurveDefaultValue(1);
+             curve.setCurveInitialValue(2);
+         }},
+        // A fade without a length is no reason for a curve, but its shape is kept.
+        {" default=\"0\" value=\"0\">\n    <fadeInCurve>2</fadeInCurve>\n  </parameter>\n",
+         [](KFChannelDouble& channel, auto&) { channel.setFadeInCurve(2); }},
+        {">\n    <fadeOutOffset>1200/600</fadeOutOffset>\n    <curve type=\"1\" default=\"0\" value=\"0\"/>\n"
+         "  </parameter>\n",
+         [](KFChannelDouble& channel, auto&) { channel.setFadeOutOffset(s(2), false); }},
+        {">\n    <curve type=\"1\" default=\"0\" value=\"0\" parametric=\"1\" round=\"0\" "
+         "retimingExtrapolation=\"1\">\n      <numberOfKeypoints>1</numberOfKeypoints>\n      "
+         "<min>-5</min>\n      "
+         "<max>5</max>\n      <preExtrapolation>3</preExtrapolation>\n      "
+         "<postExtrapolation>2</postExtrapolation>\n      <closed>1</closed>\n      <keypoint "
+         "interpolation=\"1\" "
+         "enabled=\"0\" flags=\"17\">\n        <time>600/600</time>\n        <value>2</value>\n        "
+         "<bias>0.5</bias>\n        <normal>3</normal>\n      </keypoint>\n    </curve>\n  </parameter>\n",
+         [&](auto&, KFCurve& curve) {
+             void* const handle = key(curve, 1);
+             curve.setKeypointBiasLinear(handle, 0.5);
+             curve.setKeypointNormal(handle, 3, true);
+             curve.setKeypointFlags(handle, 17, true);
+             curve.enableKeypoint(handle, false, true);
+             curve.closeCurve();
+             curve.setCurveParametric(true);
+             curve.setRoundingInUSpace(false);
+             curve.setRetimingExtrapolation(true);
+             curve.setAbsoluteMinValueV(-5);
+             curve.setAbsoluteMaxValueV(5);
+             curve.setCurveExtrapolation(3, 1);
+             curve.setCurveExtrapolation(2, 0);
+         }},
+        // Handles are twelve times what is stored; both parts of one, and only where tangents count.
+        {">\n    <curve type=\"1\" default=\"0\" value=\"0\">\n      "
+         "<numberOfKeypoints>1</numberOfKeypoints>\n"
+         "      <keypoint flags=\"128\">\n        <time>600/600</time>\n        <value>2</value>\n        "
+         "<outputTangentTime>0</outputTangentTime>\n        <outputTangentValue>6</outputTangentValue>\n     "
+         " "
+         "</keypoint>\n    </curve>\n  </parameter>\n",
+         [&](auto&, KFCurve& curve) {
+             void* const handle = key(curve, 4);
+             curve.setKeypointBiasLinear(handle, 1.0000000001);
+             curve.setKeypointOutputNormalizedTangents(handle, 0, 0.5, true);
+         }},
+        {">\n    <curve type=\"1\" default=\"0\" value=\"0\">\n      "
+         "<numberOfKeypoints>1</numberOfKeypoints>\n"
+         "      <keypoint flags=\"128\">\n        <time>600/600</time>\n        <value>2</value>\n      "
+         "</keypoint>\n    </curve>\n  </parameter>\n",
+         [&](auto&, KFCurve& curve) {
+             curve.setKeypointOutputNormalizedTangents(key(curve, 4), 0, 0.5, true);
+             curve.setCurveDeriveTangents(false);
+         }},
+    };
+    for (Case const& c : cases) {
+        KFChannelDouble channel(0.0, "V", nullptr, 1, 0);
+        c.change(channel, *channel.createLocalChannelImplementation()->getCurve());
+        EXPECT_EQ(inHostsDocument(channel, false, true, true), std::string(kHead) + c.expected);
+    }
+}
+
+TEST(Document, LeavesOutWhatNobodyChanged) {
+    KFChannelFolder folder("Folder", nullptr, 1, 0, 0);
+    KFChannelDouble plain(0.0, "Plain", &folder, 1, 0);
+    KFChannelDouble kept(0.0, "Kept", &folder, 2, 0);
+    KFChannelDouble notSaved(0.0, "NotSaved", &folder, 3, kChannelFlagNotSaved);
+    KFChannelDouble disabled(0.0, "Disabled", &folder, 4, 0);
+    KFChannel3D linked("Linked", &folder, 5, 0);
+    for (KFChannelBase* const node : *folder.getDescendants())
+        node->saveStateAsDefault();
+    kept.setFlag(kChannelFlagSaveWhenAtDefault, true);
+    kept.saveStateAsDefault();
+    notSaved.setInitialValue(5, true);
+    disabled.enable(false, true);
+    std::string const text = inHostsDocument(folder, false, true, false);
+    for (auto const& [name, is] : {std::pair{"Plain", false},
+                                   {"Kept", true},
+                                   {"NotSaved", false},
+                                   {"Disabled", true},
+                                   {"Linked", false}})
+        EXPECT_EQ(text.find(name) != std::string::npos, is) << text;
+    std::string const all = inHostsDocument(folder, false, true, true);
+    EXPECT_NE(all.find("Plain"), std::string::npos);
+    EXPECT_EQ(all.find("NotSaved"), std::string::npos);
+    folder.setFoldFlag(kFoldFlagChildrenNotSaved);
+    std::string const alone = inHostsDocument(folder, false, true, true);
+    EXPECT_EQ(alone.find("Plain"), std::string::npos);
+    EXPECT_NE(alone.find("<foldFlags>16777216</foldFlags>"), std::string::npos);
+}

@@ -1,0 +1,83 @@
+// Random trees, written, read and written again: the same bytes, the same digest.
+
+#include "lumenkey/Channels/KFChannel.h"
+#include "lumenkey/curves/KFCurve.h"
+#include "tests/persistence/RandomTree.h"
+
+#include <gtest/gtest.h>
+
+#include <atomic>
+#include <cstdlib>
+#include <thread>
+
+namespace {
+
+std::uint64_t numberOfSeeds() { return std::getenv("LUMENKEY_TEST_LONG") != nullptr ? 5000 : 200; }
+
+OwnedTree emptyRoot() { return OwnedTree(new KFChannelObjectRootBase("Root", nullptr, 1, 0, 0)); }
+
+/// Where two documents differ first.
+std::string difference(std::string const& a, std::string const& b) {
+    std::size_t i = 0;
+    while (i < a.size() && i < b.size() && a[i] == b[i])
+        ++i;
+    std::size_t const from = i > 300 ? i - 300 : 0;
+    return a.substr(from, 400) + "\n--- instead of ---\n" + b.substr(from, 400);
+}
+
+bool comesBack(std::uint64_t seed) {
+    OwnedTree const tree = randomTree(seed);
+    std::string const document = documentOf(*tree);
+    OwnedTree const fresh = emptyRoot();
+    EXPECT_TRUE(readDocument(*fresh, document)) << "seed " << seed;
+    std::string const again = documentOf(*fresh);
+    EXPECT_TRUE(again == document) << "seed " << seed << ": " << difference(again, document);
+    EXPECT_EQ(fresh->getHash(), tree->getHash()) << "seed " << seed;
+    return !testing::Test::HasFailure();
+}
+
+} // namespace
+
+TEST(RoundTrip, GivesTheSameBytesInAFreshTree) {
+    for (std::uint64_t seed = 1; seed <= numberOfSeeds() && comesBack(seed); ++seed) {
+    }
+}
+
+TEST(RoundTrip, GivesTheSameBytesInPlace) {
+    // Into the tree itself, where the keyed channels have been given other keypoints and another constant.
+    for (std::uint64_t seed = 1; seed <= numberOfSeeds(); ++seed) {
+        OwnedTree const tree = randomTree(seed);
+        std::string const document = documentOf(*tree);
+        std::vector<KFChannelBase*> channels;
+        tree->getAllDescendantsFlattened(channels, 0, false);
+        for (KFChannelBase* const node : channels) {
+            auto& channel = static_cast<KFChannel&>(*node);
+            if (channel.getNumberOfKeyframes() == 0)
+                continue;
+            channel.getCurveInterface()->setKeypoint(TempusMake(7, 1), 3.0, true);
+            channel.setInitialValue(channel.getInitialValue() / 2 + 1, true);
+        }
+        ASSERT_TRUE(readDocument(*tree, document));
+        std::string const again = documentOf(*tree);
+        ASSERT_TRUE(again == document) << "seed " << seed << ": " << difference(again, document);
+    }
+}
+
+TEST(RoundTripThreads, SaveAndLoadDifferentTreesAtOnce) {
+    std::vector<std::thread> threads;
+    std::atomic<int> failures{0};
+    for (std::uint64_t worker = 0; worker < 8; ++worker) {
+        threads.emplace_back([worker, &failures] {
+            for (std::uint64_t i = 0; i < 10; ++i) {
+                OwnedTree const tree = randomTree(1000 + worker * 10 + i);
+                std::string const document = documentOf(*tree);
+                OwnedTree const fresh = emptyRoot();
+                if (!readDocument(*fresh, document) || documentOf(*fresh) != document)
+                    ++failures;
+            }
+        });
+    }
+    for (std::thread& thread : threads)
+        thread.join();
+    EXPECT_EQ(failures, 0);
+}
