@@ -130,14 +130,14 @@ void BXXMLReadStream::Reading::run() {
     bool isLast = false;
     while (!isLast && feed(&block, &isLast)) {
         // The parser begins a token that a block cuts off anew with the next one. Blocks as long as what is left over
-        // keep that linear.
+        // keep that linear, and none reaches past the longest token.
         XML_Index const done = XML_GetCurrentByteIndex(_parser.get());
         std::uint64_t const left = done < 0 ? 0 : _fed - std::min(_fed, static_cast<std::uint64_t>(done));
-        if (left > kLongestToken) {
+        if (left >= kLongestToken) {
             failHere("a tag or comment is longer than " + std::to_string(kLongestToken) + " bytes");
             return;
         }
-        block = std::max(kBlock, left);
+        block = std::min(std::max(kBlock, left), kLongestToken - left);
     }
 }
 

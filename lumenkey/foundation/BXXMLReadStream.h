@@ -28,10 +28,10 @@ struct BXReadFailure {
 /// elements in an element counts nowhere, so `readSignificantWhiteSpace` is never asked. Namespaces are no more than
 /// parts of names. What is read may be hostile: document type declarations, and so entities but XML's own, are
 /// refused; elements lie at most 1,000 deep, the root counted; a text, or a tag with all its attributes, is at most
-/// 64 MiB long. Memory follows the longest of those, never the document.
+/// 64 MiB long. Memory follows the longest of those and the number of different names, not the document.
 ///
 /// The first failure stops the reading; what handlers did until then stays. A handler that answers false is a failure
-/// too. One object belongs to one thread; any number may read at once.
+/// too, and what one throws comes out of `parse`. One object belongs to one thread; any number may read at once.
 class LUMENKEY_API BXXMLReadStream final : public BXSerializerReadStream {
 public:
     /// Not copied: the bytes must stay until `parse` returns.

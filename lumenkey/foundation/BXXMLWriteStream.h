@@ -42,8 +42,8 @@ public:
     BXXMLWriteStream(BXXMLWriteStream const&) = delete;
     BXXMLWriteStream& operator=(BXXMLWriteStream const&) = delete;
 
-    /// Ends the elements that are open and the root. True if the sink took everything and nothing was left out; a
-    /// second call answers the same.
+    /// Ends the elements that are open and the root. True if the sink took everything and nothing was left out. Further
+    /// calls only answer.
     bool close();
 
     void pushScope(BXScope const* scope) override;
