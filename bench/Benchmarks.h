@@ -8,6 +8,7 @@ void registerEditing(Bench& bench);
 void registerMemory(Bench& bench);
 void registerThreads(Bench& bench);
 void registerTree(Bench& bench);
+void registerRecording(Bench& bench);
 // What a host would use instead. Where one wasn't found when the build was configured, a note says so.
 void registerGsl(Bench& bench);
 void registerGStreamer(Bench& bench);

@@ -59,6 +59,7 @@ int main(int argc, char** argv) {
     registerMemory(bench);
     registerThreads(bench);
     registerTree(bench);
+    registerRecording(bench);
     registerGsl(bench);
     registerGStreamer(bench);
     registerMlt(bench);

@@ -13,6 +13,7 @@
 #include "tools/import/ChannelFile.h"
 
 #include <CLI/CLI.hpp>
+#include <algorithm>
 #include <cstdio>
 #include <filesystem>
 #include <fstream>
@@ -100,6 +101,25 @@ Contest constantChannel(Bench const& bench) {
     SegmentLookup const lookup(keys, *queries);
     return {timePerItem(bench, queries->size(), readAll(queries->size(), ours)),
             timePerItem(bench, lookup.size(), readAll(lookup.size(), lookup))};
+}
+
+/// The whole curve, segment by segment.
+Measurement extremes(Bench const& bench, std::size_t size) {
+    auto const keys = std::make_shared<std::vector<Key>>(makeKeys(size));
+    auto const deep = std::make_shared<DeepChannel>();
+    deep->key(*keys);
+    auto const between = [deep, keys](std::size_t first, std::size_t last) {
+        std::pair<double, double> found;
+        deep->channel.getCurrentMinAndMax((*keys)[first].time(), (*keys)[last].time(), &found.first,
+                                          &found.second);
+        return found;
+    };
+    auto const whole = between(0, size - 1);
+    auto const left = between(0, size / 2);
+    auto const right = between(size / 2, size - 1);
+    requireAgreement("a lowest value", whole.first, std::min(left.first, right.first), 0.0);
+    requireAgreement("a highest value", whole.second, std::max(left.second, right.second), 0.0);
+    return timePerItem(bench, size - 1, [between, size] { benchmark::DoNotOptimize(between(0, size - 1)); });
 }
 
 // Memory -----------------------------------------------------------------------------------------------------
@@ -262,6 +282,9 @@ void registerTree(Bench& bench) {
     }
     registerContest(bench, nanosecondsAbove("channel/constant", "an array look-up", 15.0,
                                             [&bench] { return constantChannel(bench); }));
+    registerContest(bench, {withSize("extremes", 100000), "20 ns a segment", Bound::atMost(1.0), [&bench] {
+                                return Contest{extremes(bench, 100000), [] { return 20.0; }};
+                            }});
     registerContest(bench, measuredOnce("bytes per channel/KFChannelDouble", "B", 200.0,
                                         [] { return bytesOfOne<KFChannelDouble>(); }));
     registerContest(bench, measuredOnce("bytes per channel/KFChannelBool", "B", 200.0,

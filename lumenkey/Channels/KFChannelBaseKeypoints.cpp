@@ -4,12 +4,25 @@
 
 #include <algorithm>
 
+namespace {
+
+/// Only ever forward: a walk over channels whose converters reverse or hold the time would go round for ever.
+bool stepForward(KFChannelBase const& node, Tempus& t, unsigned int mask) {
+    Tempus next = t;
+    if (!node.nextKeypoint(&next, mask) || !(next > t))
+        return false;
+    t = next;
+    return true;
+}
+
+} // namespace
+
 std::vector<Tempus> KFChannelBase::keypointTimesInRange(Tempus const& from, Tempus const& to) const {
     std::vector<Tempus> times;
     if (hasKeypointAt(from, 0))
         times.push_back(from);
     Tempus time = from;
-    while (nextKeypoint(&time, 0) && !(time > to))
+    while (stepForward(*this, time, 0) && !(time > to))
         times.push_back(time);
     return times;
 }
@@ -22,7 +35,7 @@ std::vector<Tempus> KFChannelBase::keypoints(TempusRange range, bool withNeighbo
     Tempus time = range.start;
     if (withNeighbours && previousKeypoint(&time, mask))
         times.push_back(time);
-    while (nextKeypoint(&time, mask) && !(time > end))
+    while (stepForward(*this, time, mask) && !(time > end))
         times.push_back(time);
     time = end;
     if (withNeighbours && nextKeypoint(&time, mask))

@@ -128,9 +128,3 @@ unsigned int KFChannel::getNumberOfCurveProcessingNodes() const {
     curve().getNumCurveProcessingNodes(&count);
     return count;
 }
-
-// --- Takes ---
-
-bool KFChannel::isPlaying(unsigned int*, unsigned int*, Tempus*) { return false; }
-bool KFChannel::isRecording() { return false; }
-void KFChannel::didRecordValue(Tempus const&) {}

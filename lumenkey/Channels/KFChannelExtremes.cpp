@@ -1,115 +1,111 @@
-// The smallest and largest value of a curve over a stretch of time. The stretch is cut at the keypoints; each piece is
-// looked at in equal steps, and the steps around its smallest and its largest value are narrowed down by thirds.
+// What a channel answers about a stretch of time: its extremes, and the times at which it has a value.
 
 #include "lumenkey/Channels/KFChannel.h"
-#include "lumenkey/Channels/KFChannelImpl.h"
+#include "lumenkey/Channels/KFChannelObjectRootBase.h"
+#include "lumenkey/Channels/KFChannelSegmentVisitor.h"
+#include "lumenkey/Channels/KFSegmentWalk.h"
 #include "lumenkey/curves/KFCurve.h"
+#include "lumenkey/splines/KFSpline.h"
+#include "lumenkey/splines/KFSplineExtremes.h"
 
-#include <algorithm>
-#include <limits>
+#include <utility>
 
 namespace {
 
-constexpr std::int64_t kSteps = 64;
-/// Each leaves two thirds: 40 of them a ten-millionth of two steps.
-constexpr int kNarrowings = 40;
-/// Repeats in a piece outside the keypoints that are each looked at in full.
-constexpr std::int64_t kMostCycles = 1000;
+using Time = Tempus const&;
 
-/// A piece of a curve, read by a position from 0 to 1.
-struct Piece {
-    KFCurve& curve;
-    Tempus start;
-    Tempus duration;
+class MinMaxValuesVisitor : public KFChannelSegmentVisitor {
+public:
+    KFValueExtremes extremes;
 
-    double at(double position) const {
-        double value = 0.0;
-        curve.getPointWithoutBehavior(start + duration * position, 0.0, &value);
-        return value;
+    void visitConstant(double value, Time, Time) override { extremes.include(value, value); }
+    void visitLinear(KFSpline& spline, void* first, void* second, Time sourceStart, Time sourceEnd,
+                     Time targetStart, Time targetEnd, double valueOffset) override {
+        if (first == nullptr || second == nullptr) {
+            include(spline.getVertexValue(targetStart, kTempusZero, true));
+            include(spline.getVertexValue(targetEnd, kTempusZero, true));
+            return;
+        }
+        KFLinearInterpolator linear;
+        for (Tempus const& source : {sourceStart, sourceEnd})
+            include(linear.interpolate(spline, kTempusZero, first, second, source, false, false) +
+                    valueOffset);
+    }
+    void visitBezier(KFSpline& spline, void* first, void* second, Time sourceStart, Time sourceEnd, Time,
+                     Time, double valueOffset) override {
+        include<KFBezierInterpolator>(spline, first, second, sourceStart, sourceEnd, valueOffset);
+    }
+    void visitCatmullRom(KFSpline& spline, void* first, void* second, Time sourceStart, Time sourceEnd, Time,
+                         Time, double valueOffset) override {
+        include<KFCatmullRomInterpolator>(spline, first, second, sourceStart, sourceEnd, valueOffset);
+    }
+    void visitEaseIn(KFSpline& spline, void* first, void* second, Time sourceStart, Time sourceEnd, Time,
+                     Time, double valueOffset) override {
+        include<KFEaseInInterpolator>(spline, first, second, sourceStart, sourceEnd, valueOffset);
+    }
+    void visitEaseOut(KFSpline& spline, void* first, void* second, Time sourceStart, Time sourceEnd, Time,
+                      Time, double valueOffset) override {
+        include<KFEaseOutInterpolator>(spline, first, second, sourceStart, sourceEnd, valueOffset);
+    }
+    void visitEase(KFSpline& spline, void* first, void* second, Time sourceStart, Time sourceEnd, Time, Time,
+                   double valueOffset) override {
+        include<KFEaseInterpolator>(spline, first, second, sourceStart, sourceEnd, valueOffset);
+    }
+    void visitAccelerate(KFSpline& spline, void* first, void* second, Time sourceStart, Time sourceEnd, Time,
+                         Time, double valueOffset) override {
+        include<KFAccelerateInterpolator>(spline, first, second, sourceStart, sourceEnd, valueOffset);
+    }
+    void visitDecelerate(KFSpline& spline, void* first, void* second, Time sourceStart, Time sourceEnd, Time,
+                         Time, double valueOffset) override {
+        include<KFDecelerateInterpolator>(spline, first, second, sourceStart, sourceEnd, valueOffset);
+    }
+    void visitExponential(KFSpline& spline, void* first, void* second, Time sourceStart, Time sourceEnd, Time,
+                          Time, double valueOffset) override {
+        include<KFExponentialInterpolator>(spline, first, second, sourceStart, sourceEnd, valueOffset);
+    }
+    void visitLogarithmic(KFSpline& spline, void* first, void* second, Time sourceStart, Time sourceEnd, Time,
+                          Time, double valueOffset) override {
+        include<KFLogarithmicInterpolator>(spline, first, second, sourceStart, sourceEnd, valueOffset);
     }
 
-    /// The largest value of `sign` times the curve between two positions that have at most one extreme between them.
-    double narrowedDown(double low, double high, double sign) const {
-        double best = -std::numeric_limits<double>::max();
-        for (int i = 0; i < kNarrowings; ++i) {
-            double const lower = low + (high - low) / 3.0;
-            double const upper = high - (high - low) / 3.0;
-            double const atLower = sign * at(lower);
-            double const atUpper = sign * at(upper);
-            best = std::max({best, atLower, atUpper});
-            (atLower < atUpper ? low : high) = atLower < atUpper ? lower : upper;
-        }
-        return best;
+private:
+    void include(double value) { extremes.include(value, value); }
+    template <class Interpolator>
+    void include(KFSpline& spline, void* first, void* second, Time sourceStart, Time sourceEnd,
+                 double valueOffset) {
+        KFValueExtremes const of =
+            KFExtremesOfSegment<Interpolator>(spline, first, second, TempusMinimum(sourceStart, sourceEnd),
+                                              TempusMaximum(sourceStart, sourceEnd));
+        extremes.include(of.lowest + valueOffset, of.highest + valueOffset);
     }
 };
-
-struct Extremes {
-    double lowest = std::numeric_limits<double>::max();
-    double highest = -std::numeric_limits<double>::max();
-
-    void include(double value) {
-        lowest = std::min(lowest, value);
-        highest = std::max(highest, value);
-    }
-
-    void include(Piece const& piece, std::int64_t steps) {
-        double const step = 1.0 / static_cast<double>(steps);
-        std::int64_t lowestStep = 0;
-        std::int64_t highestStep = 0;
-        Extremes inPiece;
-        for (std::int64_t i = 0; i <= steps; ++i) {
-            double const value = piece.at(static_cast<double>(i) * step);
-            if (value < inPiece.lowest)
-                lowestStep = i;
-            if (value > inPiece.highest)
-                highestStep = i;
-            inPiece.include(value);
-        }
-        auto const below = [step](std::int64_t i) {
-            return std::max(0.0, static_cast<double>(i - 1) * step);
-        };
-        auto const above = [step](std::int64_t i) {
-            return std::min(1.0, static_cast<double>(i + 1) * step);
-        };
-        include(inPiece.lowest);
-        include(inPiece.highest);
-        include(-piece.narrowedDown(below(lowestStep), above(lowestStep), -1.0));
-        include(piece.narrowedDown(below(highestStep), above(highestStep), 1.0));
-    }
-};
-
-Extremes extremesBetween(KFCurve& curve, Tempus const& first, Tempus const& last) {
-    Extremes extremes;
-    Tempus range = kTempusZero;
-    curve.getCurrentRangeU(&range);
-    Tempus start = first;
-    while (start < last) {
-        Tempus next = last;
-        if (curve.getNextKeypoint(start, &next, nullptr) && next > last)
-            next = last;
-        Tempus const duration = next - start;
-        std::int64_t const cycles = range > kTempusZero ? TempusFloorQuotient(duration, range) : 0;
-        extremes.include(Piece{curve, start, duration}, kSteps * (1 + std::min(cycles, kMostCycles)));
-        start = next;
-    }
-    return extremes;
-}
 
 } // namespace
 
 bool KFChannel::getCurrentMinAndMax(Tempus const& from, Tempus const& to, double* minimum, double* maximum) {
     if (minimum == nullptr && maximum == nullptr)
         return false;
-    Extremes extremes;
-    if (getCurveInterface() != nullptr) {
-        Tempus const first = TempusMinimum(from, to);
-        if (hasKeypoints(0) && TempusIsNumeric(from) && TempusIsNumeric(to))
-            extremes = extremesBetween(curve(), first, TempusMaximum(from, to));
-        extremes.include(getCurveValue(first, false));
-    }
+    MinMaxValuesVisitor visitor;
+    if (KFCurve* const used = getCurveInterface())
+        KFSegmentWalk::overCurve(*used, from, to, visitor, &visitor.extremes);
     if (minimum != nullptr)
-        *minimum = extremes.lowest;
+        *minimum = visitor.extremes.lowest;
     if (maximum != nullptr)
-        *maximum = extremes.highest;
+        *maximum = visitor.extremes.highest;
+    return true;
+}
+
+bool KFChannel::getTimeForValue(double value, std::vector<Tempus>& times, BXTimeRange const& range,
+                                Tempus const& fallbackFrameDuration, unsigned int flags) const {
+    if (getCurveInterface() == nullptr)
+        return false;
+    KFChannelObjectRootBase const* const root = getChannelRootBase();
+    Tempus frameDuration = root == nullptr ? fallbackFrameDuration : root->getFrameDuration();
+    BXTimeRange local{globalToLocalTime(range.start), range.duration};
+    std::vector<Tempus> found;
+    if (!curve().getUForValue(value, found, local, frameDuration, flags))
+        return false;
+    for (Tempus const& t : found)
+        times.push_back(localToGlobalTime(t));
     return true;
 }

@@ -3,6 +3,7 @@
 #include "lumenkey/Channels/KFChannel.h"
 #include "lumenkey/Channels/KFChannelImpl.h"
 #include "lumenkey/curves/KFCurve.h"
+#include "lumenkey/splines/KFVertex.h"
 
 #include <cmath>
 
@@ -43,6 +44,20 @@ void pasteTangents(KFCurve& curve, Tempus const& t, double value, bool several, 
     } else if (isBetween) {
         curve.setKeypointInputNormalizedTangents(next.handle, 0.0, 0.0, true);
     }
+}
+
+/// What decides whether the other attributes of a keypoint may be written, and what ties its handles together, comes
+/// last: so each is as it was pasted. One that is locked and stays so keeps what the lock guards.
+template <class PasteOthers>
+void pasteFlagsAround(KFCurve& curve, void* handle, _KFKeyframeInfo const& info, PasteOthers pasteOthers) {
+    bool wasLocked = false;
+    curve.isLockedKeypoint(handle, &wasLocked);
+    bool const staysLocked = wasLocked && (info.flags & kKFVertexFlagLocked) != 0;
+    curve.setKeypointFlags(handle, staysLocked ? info.flags : kKFVertexFlagHandlesBroken, true);
+    curve.enableKeypoint(handle, true, true);
+    pasteOthers();
+    curve.setKeypointFlags(handle, info.flags, true);
+    curve.enableKeypoint(handle, info.enabled, true);
 }
 
 } // namespace
@@ -101,15 +116,15 @@ void KFChannel::setKeyframesWithInfo(Tempus const& t, std::vector<_KFKeyframeInf
         void* const h = getKeyframe(target);
         if (h == nullptr) // a curve that takes no keypoints took the value
             continue;
-        written.enableKeypoint(h, info.enabled, true);
-        written.setKeypointNormal(h, info.normal, true);
-        written.setKeypointInterpolation(h, info.interpolation, true);
-        written.setKeypointFlags(h, info.flags, true);
-        written.setKeypointBiasLinear(h, info.bias);
-        pasteTangents(
-            written, target, info.value, keyframes.size() > 1,
-            [&] { written.setKeypointInputHandles(h, info.inputTangentX, info.inputTangentY, true); },
-            [&] { written.setKeypointOutputHandles(h, info.outputTangentX, info.outputTangentY, true); });
+        pasteFlagsAround(written, h, info, [&] {
+            written.setKeypointNormal(h, info.normal, true);
+            written.setKeypointInterpolation(h, info.interpolation, true);
+            written.setKeypointBiasLinear(h, info.bias);
+            pasteTangents(
+                written, target, info.value, keyframes.size() > 1,
+                [&] { written.setKeypointInputHandles(h, info.inputTangentX, info.inputTangentY, true); },
+                [&] { written.setKeypointOutputHandles(h, info.outputTangentX, info.outputTangentY, true); });
+        });
     }
 }
 
@@ -143,18 +158,18 @@ void KFChannel::copyKeyframesFromChannel(Tempus const& t, KFChannelBase* other) 
         void* const h = getKeyframe(target);
         if (h == nullptr)
             continue;
-        written.setKeypointFlags(h, info.flags, true);
-        written.enableKeypoint(h, info.enabled, true);
-        written.setKeypointInterpolation(h, info.interpolation, true);
-        pasteTangents(
-            written, target, value, keyframes.size() > 1,
-            [&] {
-                written.setKeypointInputNormalizedTangents(h, info.inputTangentX,
-                                                           inOwnUnit(info.inputTangentY), true);
-            },
-            [&] {
-                written.setKeypointOutputNormalizedTangents(h, info.outputTangentX,
-                                                            inOwnUnit(info.outputTangentY), true);
-            });
+        pasteFlagsAround(written, h, info, [&] {
+            written.setKeypointInterpolation(h, info.interpolation, true);
+            pasteTangents(
+                written, target, value, keyframes.size() > 1,
+                [&] {
+                    written.setKeypointInputNormalizedTangents(h, info.inputTangentX,
+                                                               inOwnUnit(info.inputTangentY), true);
+                },
+                [&] {
+                    written.setKeypointOutputNormalizedTangents(h, info.outputTangentX,
+                                                                inOwnUnit(info.outputTangentY), true);
+                });
+        });
     }
 }

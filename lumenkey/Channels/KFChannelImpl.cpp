@@ -22,7 +22,7 @@ KFChannelImpl& KFChannelImpl::operator=(KFChannelImpl const& other) {
     return *this;
 }
 
-KFChannelImpl::~KFChannelImpl() = default;
+KFChannelImpl::~KFChannelImpl() { delete _recordingCallbacks.load(std::memory_order_acquire); }
 
 bool KFChannelImpl::operator==(KFChannelImpl const& other) const {
     if (this == &other)

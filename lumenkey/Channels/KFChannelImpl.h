@@ -3,9 +3,13 @@
 #include "lumenkey/foundation/BXExport.h"
 #include "lumenkey/foundation/Tempus.h"
 
+#include <atomic>
 #include <cstdint>
 #include <memory>
+#include <vector>
 
+class KFChannel;
+class KFChannelBase;
 class KFCurve;
 
 /// A channel's fades: lengths at the start and the end of its extent (zero means none) and their shapes (0 linear,
@@ -20,6 +24,13 @@ struct KFFadeBlock {
         return fadeInOffset == other.fadeInOffset && fadeOutOffset == other.fadeOutOffset &&
                fadeInCurve == other.fadeInCurve && fadeOutCurve == other.fadeOutCurve;
     }
+};
+
+/// Whom to tell of each value that is recorded: with the channel, or its facade wrapper, and the context.
+struct RecordingCallbackData {
+    void (*function)(KFChannelBase*, Tempus const&, void*);
+    void* context;
+    bool wantsWrapper;
 };
 
 /// Holds a channel's curve and fades: shared by all channels of a class until one of them differs.
@@ -63,8 +74,33 @@ public:
 
     bool isShared() const noexcept { return _shared; }
 
+    // Takes, in curve time. Each does nothing without a curve, and is false where the curve refuses.
+
+    bool beginPlayback(Tempus const& t, std::uint32_t scope, std::uint32_t mode, Tempus const& resolution);
+    bool endPlayback(Tempus const& t);
+    /// Forgets the callbacks first: they are registered for one take.
+    bool beginRecording(Tempus const& t);
+    bool endRecording(Tempus const& t);
+    bool updateCurrentRecordingTime(Tempus const& t);
+    bool isPlaying(std::uint32_t* scope, std::uint32_t* mode, Tempus* resolution) const;
+    bool isRecording() const;
+
+    // Callbacks aren't copied, assigned or compared. A null function is ignored. Not guarded: register, unregister and
+    // record on one thread at a time. A callback may register and unregister, itself too; one that comes in is called
+    // for this value already.
+
+    void registerRecordingCallback(RecordingCallbackData const& callback);
+    /// The first with this function and context.
+    void unregisterRecordingCallback(RecordingCallbackData const& callback);
+    /// Calls each in the order of registration.
+    void didRecordValue(KFChannel* channel, Tempus const& t);
+
 private:
+    using RecordingCallbacks = std::vector<RecordingCallbackData>;
+    RecordingCallbacks& recordingCallbacks();
+
     std::unique_ptr<KFCurve> _curve;
     std::unique_ptr<KFFadeBlock> _fades;
+    std::atomic<RecordingCallbacks*> _recordingCallbacks{nullptr}; // owned, made on first use
     bool _shared = false;
 };

@@ -12,9 +12,35 @@ unsigned int KFChannel::getNumberOfKeyframes() const {
 
 // --- Looking ---
 
+Tempus KFChannel::curveTimeAt(Tempus const& t) const {
+    Tempus const local = globalToLocalTime(t);
+    if (!TempusHasBeenRounded(local) || curve().getKeypointHandle(local, nullptr))
+        return local;
+    Tempus found;
+    bool const isNext = curve().getNextKeypoint(local, &found, nullptr) && localToGlobalTime(found) == t;
+    bool const isPrevious =
+        !isNext && curve().getPreviousKeypoint(local, &found, nullptr) && localToGlobalTime(found) == t;
+    return isNext || isPrevious ? found : local;
+}
+
 void* KFChannel::keypointAt(Tempus const& t) const {
     void* handle = nullptr;
-    return curve().getKeypointHandle(globalToLocalTime(t), &handle) ? handle : nullptr;
+    return curve().getKeypointHandle(curveTimeAt(t), &handle) ? handle : nullptr;
+}
+
+template <class Step> bool KFChannel::stepToKeypoint(Tempus* t, Step step) const {
+    if (t == nullptr)
+        return false;
+    Tempus local = globalToLocalTime(*t);
+    Tempus found, global;
+    do {
+        if (!step(local, &found))
+            return false;
+        local = found;
+        global = localToGlobalTime(found);
+    } while (global == *t); // converting there and back may round, and a host's converter may hold the time
+    *t = global;
+    return true;
 }
 
 bool KFChannel::hasKeypoints(unsigned int) const { return KFChannel::getNumberOfKeyframes() > 0; }
@@ -24,19 +50,15 @@ bool KFChannel::allHaveKeypointsAt(Tempus const& t) const { return keypointAt(t)
 unsigned int KFChannel::numberOfKeypointsAt(Tempus const& t) const { return keypointAt(t) != nullptr; }
 
 bool KFChannel::previousKeypoint(Tempus* t, unsigned int) const {
-    Tempus found;
-    if (t == nullptr || !curve().getPreviousKeypoint(globalToLocalTime(*t), &found, nullptr))
-        return false;
-    *t = localToGlobalTime(found);
-    return true;
+    return stepToKeypoint(t, [this](Tempus const& local, Tempus* found) {
+        return curve().getPreviousKeypoint(local, found, nullptr);
+    });
 }
 
 bool KFChannel::nextKeypoint(Tempus* t, unsigned int) const {
-    Tempus found;
-    if (t == nullptr || !curve().getNextKeypoint(globalToLocalTime(*t), &found, nullptr))
-        return false;
-    *t = localToGlobalTime(found);
-    return true;
+    return stepToKeypoint(t, [this](Tempus const& local, Tempus* found) {
+        return curve().getNextKeypoint(local, found, nullptr);
+    });
 }
 
 // --- Editing ---
@@ -51,7 +73,7 @@ void KFChannel::addKeypointAt(Tempus const& t) {
     createLocalChannelImplementation();
     if (!isSpline())
         setIsSpline(true);
-    curveToWrite().setKeypoint(globalToLocalTime(t), true);
+    curveToWrite().setKeypoint(curveTimeAt(t), true);
 }
 
 void KFChannel::deleteKeypointAt(Tempus const& t) {
@@ -78,7 +100,7 @@ Tempus KFChannel::moveKeypointTo(Tempus const& from, Tempus const& to, bool a, b
     if (handle == nullptr)
         return to;
     // The curve takes the two switches in the other order.
-    curve().moveKeypoint(handle, globalToLocalTime(to), true, b, a);
+    curve().moveKeypoint(handle, curveTimeAt(to), true, b, a);
     Tempus moved;
     // A keypoint that was merged into another is gone; then it is the target that stands there.
     return curve().getKeypoint(handle, &moved, nullptr) ? localToGlobalTime(moved) : to;

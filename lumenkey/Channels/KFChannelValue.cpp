@@ -85,7 +85,7 @@ void KFChannel::setValue(Tempus const& t, double value, bool silent) {
         root->channelValueWillBeSet(this, t, value);
         keyStartOfExtentIfWanted(*root, t, false);
     }
-    curveToWrite().setKeypoint(globalToLocalTime(t), value, false);
+    curveToWrite().setKeypoint(curveTimeAt(t), value, false);
     noteRecordedValue(t);
 }
 
@@ -113,21 +113,21 @@ void KFChannel::setValue(Tempus const& t) {
     createLocalChannelImplementation();
     if (KFChannelObjectRootBase* const root = getChannelRootBase())
         keyStartOfExtentIfWanted(*root, t, true);
-    curveToWrite().setKeypoint(globalToLocalTime(t), false);
+    curveToWrite().setKeypoint(curveTimeAt(t), false);
     noteRecordedValue(t);
 }
 
 void KFChannel::setValueAndIgnoreRecordOption(Tempus const& t) {
     if (!beginEdit())
         return;
-    curveToWrite().setKeypoint(globalToLocalTime(t), true);
+    curveToWrite().setKeypoint(curveTimeAt(t), true);
     noteRecordedValue(t);
 }
 
 void KFChannel::setValueAndDontAddFirstKeypoint(Tempus const& t, double value) {
     if (!beginEdit())
         return;
-    curveToWrite().setKeypoint(globalToLocalTime(t), value, false);
+    curveToWrite().setKeypoint(curveTimeAt(t), value, false);
     noteRecordedValue(t);
 }
 

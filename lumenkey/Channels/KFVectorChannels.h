@@ -46,7 +46,7 @@ class LUMENKEY_API KFChannel2D : public KFCompoundChannel {
     /// and the other has none, the other is keyed at its value. In the mode `KFCurve::kSimplifyToExtremes` what stays
     /// instead are the keypoints in front of `a`, behind `b`, at both ends, and those where the path turns: where `y`
     /// over `x` goes from rising to falling or back. The one behind a removed keypoint isn't looked at. Before that the
-    /// compound is keyed (`addKeypointAt`, so at what then are global times) where not all components have keypoints.
+    /// compound is keyed (`addKeypointAt`) where not all components have keypoints.
     void simplify(Tempus const& a, Tempus const& b, Tempus const& step, double percent, unsigned int mode1,
                   unsigned int mode2, bool clampToCoarse) override;
 

@@ -27,7 +27,7 @@ void align(KFChannel const& channel, std::vector<Tempus> const& times, KFChannel
     }
 }
 
-/// The times at which some, but not all, of the components have keypoints.
+/// The global times at which some, but not all, of the components have keypoints.
 std::vector<Tempus> timesNotSharedByAll(KFChannelFolder const& compound) {
     std::map<Tempus, std::set<KFChannel const*>> keyed;
     std::vector<Tempus> times;
@@ -39,7 +39,7 @@ std::vector<Tempus> timesNotSharedByAll(KFChannelFolder const& compound) {
         if (auto const* const channel = dynamic_cast<KFChannel const*>(child)) {
             ++count;
             for (Tempus const& time : keyframeTimes(*channel)) {
-                keyed[time].insert(channel);
+                keyed[channel->localToGlobalTime(time)].insert(channel);
             }
         }
     }

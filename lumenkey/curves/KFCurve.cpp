@@ -16,7 +16,7 @@ KFCurve::KFCurve(KFCurve const& other, bool cloneChain) : KFCurve(other._minValu
     copySplineState(other);
     if (cloneChain)
         cloneTree(other);
-    copyRoots(other);
+    copyRoots(other, false);
     _pointToPoint = other._pointToPoint;
     _remapsTime = other._remapsTime;
     _keyframable = other._keyframable;
@@ -26,7 +26,7 @@ KFCurve& KFCurve::operator=(KFCurve const& other) {
     if (this == &other)
         return *this;
     copySplineState(other);
-    copyRoots(other);
+    copyRoots(other, true);
     _minValue = other._minValue;
     _maxValue = other._maxValue;
     _keyframable = other._keyframable;
@@ -47,21 +47,29 @@ bool KFCurve::operator==(KFCurve const& other) const {
 
 /// The kinds too: a constant node takes a spline node for its equal, but not the other way round.
 bool KFCurve::sameRoot(KFCurve const& other) const {
-    return _rootKind == other._rootKind && _rootNode->compare(other._rootNode);
+    return _rootKind.get() == other._rootKind.get() && getRootNode()->compare(other.getRootNode());
 }
 
 KFCurve::~KFCurve() {
     while (!_processingNodes.empty())
         _processingNodes.pop_back();
+    _recordingNode.reset();
     // The spline refers to the settings, so it goes before they do.
     _splineNode.destroySpline();
     setSplineState(nullptr);
 }
 
 /// The settings are copied before, so that the copied spline refers to this curve's.
-void KFCurve::copyRoots(KFCurve const& other) {
+void KFCurve::copyRoots(KFCurve const& other, bool withRecorded) {
     _constantNode = other._constantNode;
     _splineNode = other._splineNode;
+    std::unique_ptr<KFRecordingNode> recording;
+    if (other._recordingNode != nullptr) {
+        recording = std::make_unique<KFRecordingNode>(*other._recordingNode, &_splineNode);
+        if (withRecorded)
+            *recording = *other._recordingNode;
+    }
+    _recordingNode.swap(recording);
     adoptRoot(other._rootKind);
 }
 
@@ -201,8 +209,13 @@ bool KFCurve::canModifyCurve(bool force) const { return _keyframable && (force |
 // --- Roots and what they hold ---
 
 void KFCurve::adoptRoot(std::uint32_t kind) noexcept {
+    KFCurveNode* node = &_constantNode;
+    if (kind == kRootSpline)
+        node = &_splineNode;
+    if (kind == kRootRecording)
+        node = _recordingNode.get();
     _rootKind = kind;
-    _rootNode = kind == kRootConstant ? &_constantNode : static_cast<KFCurveNode*>(&_splineNode);
+    _rootNode.store(node, std::memory_order_release);
 }
 
 void KFCurve::setRootNode(double value) {
@@ -240,12 +253,14 @@ bool KFCurve::setCurveType(std::uint32_t type) {
 }
 
 bool KFCurve::setCurveToDefault() {
+    if (isRecording())
+        return true;
     _constantNode.reset();
     _splineNode.reset();
     return true;
 }
 
-bool KFCurve::getCurveDefaultValue(double* out) { return answer(out, _rootNode->getDefaultValue()); }
+bool KFCurve::getCurveDefaultValue(double* out) { return answer(out, getRootNode()->getDefaultValue()); }
 
 bool KFCurve::setCurveDefaultValue(double value) {
     _constantNode.setDefaultValue(value);
@@ -261,16 +276,16 @@ bool KFCurve::setCurveInitialValue(double value) {
     return true;
 }
 
-bool KFCurve::getCurrentMaxValueU(Tempus* out) { return answer(out, _rootNode->getMaxValueU()); }
-bool KFCurve::getCurrentMinValueU(Tempus* out) { return answer(out, _rootNode->getMinValueU()); }
-bool KFCurve::getCurrentRangeU(Tempus* out) { return answer(out, _rootNode->getCurrentRange()); }
+bool KFCurve::getCurrentMaxValueU(Tempus* out) { return answer(out, getRootNode()->getMaxValueU()); }
+bool KFCurve::getCurrentMinValueU(Tempus* out) { return answer(out, getRootNode()->getMinValueU()); }
+bool KFCurve::getCurrentRangeU(Tempus* out) { return answer(out, getRootNode()->getCurrentRange()); }
 
 bool KFCurve::getCurrentMaxValueV(double* out, bool withTangents) {
-    return answer(out, _rootNode->getMaxValue(withTangents));
+    return answer(out, getRootNode()->getMaxValue(withTangents));
 }
 
 bool KFCurve::getCurrentMinValueV(double* out, bool withTangents) {
-    return answer(out, _rootNode->getMinValue(withTangents));
+    return answer(out, getRootNode()->getMinValue(withTangents));
 }
 
 bool KFCurve::getAbsoluteMaxValueV(double* out) { return answer(out, _maxValue.get()); }

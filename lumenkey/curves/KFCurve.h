@@ -3,9 +3,11 @@
 #include "lumenkey/curves/KFConstantNode.h"
 #include "lumenkey/curves/KFCurveInterface.h"
 #include "lumenkey/curves/KFCurveNodeParam.h"
+#include "lumenkey/curves/KFRecordingNode.h"
 #include "lumenkey/curves/KFSplineNode.h"
 #include "lumenkey/splines/KFSpline.h"
 
+#include <atomic>
 #include <memory>
 
 class KFCurveOwner;
@@ -14,15 +16,15 @@ class KFSplineState;
 /// A value over time: a root node, a chain of processing nodes behind it, and a clamp.
 ///
 /// The root is a constant or a spline of keypoints; `getCurveType` tells 0 from 1. A curve that may be keyframed
-/// usually has the spline root from the start, which answers its constant until the first keypoint. The chain is the
-/// host's; the clamp to the absolute minimum and maximum acts on the final value only, where the maximum wins if the
+/// usually has the spline root from the start, which answers its constant until the first keypoint. While values are
+/// recorded into it, a recording is the root, which counts as a spline. The chain is the host's; the clamp to the absolute minimum and maximum acts on the final value only, where the maximum wins if the
 /// two cross, and a not-a-number passes.
 ///
 /// `force` in an edit means: act although the process-wide animate switch is off and the curve has no keypoint. A
 /// curve that is not keyframable refuses also then.
 ///
 /// Threads: a curve has no lock. Reading may run beside one thread that edits keypoints or constants, which the
-/// spline's lock keeps apart; creating the first and deleting the last keypoint, switching the root and changing the
+/// spline's lock keeps apart, and beside a take, its beginning and its end; creating the first and deleting the last keypoint, switching the root and changing the
 /// chain or the settings record must not run beside anything else, nor comparing curves beside an edit of one. Whether
 /// a handle is valid and what is then done by it are two steps: who reads by handle beside an editing thread knows that
 /// the keypoint stays. Long readers take a `getCurveWorkingCopy`.
@@ -31,6 +33,7 @@ public:
     /// Kinds of root: the numbers of `_rootKind`.
     static constexpr std::uint32_t kRootConstant = 0;
     static constexpr std::uint32_t kRootSpline = 1;
+    static constexpr std::uint32_t kRootRecording = 2;
 
     /// On a curve that isn't parametric a handle is this many times the tangent that the spline stores.
     static constexpr double kHandleScale = 12.0;
@@ -46,7 +49,7 @@ public:
     /// The initial value goes to the constant node; the spline node starts at 0. The settings record is null until
     /// `setSplineState`.
     KFCurve(double minimum, double maximum, double initialValue);
-    /// A copy without owner channel. A shared settings record is shared, a local one copied; the processing nodes are
+    /// A copy without owner channel, and without what a take has recorded so far. A shared settings record is shared, a local one copied; the processing nodes are
     /// cloned with `cloneChain`, else the chain is empty (and the flags about it stay as they were).
     KFCurve(KFCurve const& other, bool cloneChain);
     KFCurve(KFCurve const&) = delete;
@@ -133,7 +136,9 @@ public:
     // `BXCurveFit`, and what it gives are Bezier keypoints, whatever type those before had. Samples that aren't finite
     // are left out of it. A keypoint for the first one stands exactly there, others at the nearest tick of
     // `kKFChannelTimescale` (of the step, in `simplifyCurve`). Locked keypoints keep time and value. Where nothing
-    // fits, the stretch is left without keypoints.
+    // fits, the stretch is left without keypoints. A tolerance is that at the samples, for curves that aren't
+    // parametric (whose handles mean something else) and without locked keypoints. Between two samples the curve isn't
+    // looked at: there it may move by about as much as it spans over those and the next on either side.
     //
     // `bakeCurve` replaces the keypoints after `start` up to `end` by what the chain up to `node` gives (null: the
     // root), `tolerance` being hundredths of the curve's unit times `scale`. All keypoints of the curve become Bezier,
@@ -313,7 +318,13 @@ public:
     bool enumerateCurveProcessingNodes(std::vector<KFCurveNode*>& out) override;
     bool getNumCurveProcessingNodes(std::uint32_t* out) override;
 
-    // Takes.
+    // Takes: see `KFRecordingNode`. While a take is being recorded it is the root: `setKeypoint` and what else writes a
+    // value records it, while keypoints are read, listed and edited by their other operations as ever, and the curve
+    // keeps its kind of root and what it has against all but `setRootNode`, `setCurveToDefault` included.
+    //
+    // `beginPlayback` makes the recording node. False, with nothing changed, on a curve without a spline and for what
+    // `KFRecordingNode::beginPlayback` refuses; the other four are false on a curve that never was played, and so is
+    // `isPlaying`, which writes its outputs only when it is true. `endRecording` leaves a spline root.
     bool beginPlayback(Tempus const& t, std::uint32_t scope, std::uint32_t mode,
                        Tempus const& resolution) override;
     bool endPlayback(Tempus const& t) override;
@@ -336,7 +347,8 @@ public:
 
     // Beyond the interface --------------------------------------------------------------------------------------
 
-    KFCurveNode* getRootNode() const noexcept { return _rootNode; }
+    /// May be asked for beside the beginning or the end of a take.
+    KFCurveNode* getRootNode() const noexcept { return _rootNode.load(std::memory_order_acquire); }
     KFSpline* getSpline() const noexcept { return _splineNode.getSpline(); }
     bool isSpline() const noexcept { return _rootKind != kRootConstant; }
     /// True acts on a constant root only, false on a spline root only: the root is switched and keeps the value that
@@ -350,7 +362,7 @@ public:
     bool hasProcessingNodes() const noexcept { return !_processingNodes.empty(); }
     // What `getNumberOfKeypoints` and `getCurveInitialValue` answer, for those who read values all the time.
     std::uint32_t keypointCount() const noexcept;
-    double clampedInitialValue() const { return clamped(_rootNode->getInitialValue()); }
+    double clampedInitialValue() const { return clamped(getRootNode()->getInitialValue()); }
     /// Keyframable, and animated by the process-wide switch or by a keypoint.
     bool isAnimated() const;
     /// Whether keypoints may be edited: keyframable, and animated or forced.
@@ -446,12 +458,13 @@ private:
     void adoptRoot(std::uint32_t kind) noexcept;
     /// Takes over the settings: the same record where it is shared, else a local one with its contents.
     void copySplineState(KFCurve const& other);
-    void copyRoots(KFCurve const& other);
+    void copyRoots(KFCurve const& other, bool withRecorded);
 
-    KFCurveNode* _rootNode;
+    std::atomic<KFCurveNode*> _rootNode;
     KFConstantNode _constantNode;
     KFSplineNode _splineNode;
     std::vector<std::unique_ptr<KFCurveNode>> _processingNodes;
+    std::unique_ptr<KFRecordingNode> _recordingNode; // made by the first take, and kept
     BXRelaxed<double> _minValue;
     BXRelaxed<double> _maxValue;
     bool _pointToPoint = true;
@@ -459,7 +472,7 @@ private:
     BXRelaxed<bool> _keyframable{true};
     KFCurveOwner* _ownerChannel = nullptr;
     KFSplineState* _splineState = nullptr;
-    std::uint32_t _rootKind = kRootConstant;
+    BXRelaxed<std::uint32_t> _rootKind{kRootConstant};
 };
 
 inline std::uint32_t KFCurve::keypointCount() const noexcept {

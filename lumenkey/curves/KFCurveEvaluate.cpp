@@ -112,13 +112,13 @@ void KFCurve::cloneTree(KFCurve const& other) {
 
 double KFCurve::getValue(Tempus const& t, double operand) {
     if (_processingNodes.empty())
-        return clamped(_rootNode->solveNode(t, operand, 0.0));
+        return clamped(getRootNode()->solveNode(t, operand, 0.0));
     return clamped(solveFirst(_processingNodes.size(), t, operand));
 }
 
 double KFCurve::getValue(Tempus const& t, void* node) {
     if (node == nullptr || _processingNodes.empty())
-        return clamped(_rootNode->solveNode(t, 0.0, 0.0));
+        return clamped(getRootNode()->solveNode(t, 0.0, 0.0));
     std::size_t const index = indexOfNode(static_cast<KFCurveNode const*>(node));
     return clamped(index == _processingNodes.size() ? 0.0 : solveFirst(index + 1, t, 0.0));
 }
@@ -149,7 +149,7 @@ double KFCurve::solveFirst(std::size_t nodes, Tempus const& t, double operand) {
 }
 
 double KFCurve::solveChain(std::size_t nodes, Tempus const& t, double operand) {
-    double value = _rootNode->solveNode(t, operand, 0.0);
+    double value = getRootNode()->solveNode(t, operand, 0.0);
     for (std::size_t i = 0; i < nodes; ++i)
         value = _processingNodes[i]->solveNode(t, operand, value);
     return value;
@@ -160,7 +160,7 @@ double KFCurve::solveRemappedChain(std::size_t nodes, Tempus const& t, double op
     std::vector<Tempus> times(nodes + 1, t);
     for (std::size_t i = nodes; i-- > 0;)
         times[i] = _processingNodes[i]->getNeededTime(times[i + 1]);
-    double value = _rootNode->solveNode(times[0], operand, 0.0);
+    double value = getRootNode()->solveNode(times[0], operand, 0.0);
     for (std::size_t i = 0; i < nodes; ++i)
         value = _processingNodes[i]->solveNode(times[i + 1], operand, value);
     return value;
@@ -233,11 +233,11 @@ bool KFCurve::processCurve(KFCurveNodeParam& param, KFCurveNode* stopNode) {
 
     std::vector<Stage> stages; // the last one first
     stages.reserve(_processingNodes.size() + 1);
-    stages.push_back(lastStage(stopNode == nullptr ? *_rootNode : *stopNode, param));
+    stages.push_back(lastStage(stopNode == nullptr ? *getRootNode() : *stopNode, param));
     if (stopNode != nullptr) {
         for (std::size_t i = stop; i > 0 && !stages.back().node->isPassThrough(); --i)
             stages.push_back(stageInFrontOf(stages.back(), *_processingNodes[i - 1]));
-        stages.push_back(stageInFrontOf(stages.back(), *_rootNode));
+        stages.push_back(stageInFrontOf(stages.back(), *getRootNode()));
     }
 
     while (!stages.empty()) {

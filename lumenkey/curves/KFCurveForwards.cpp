@@ -105,7 +105,7 @@ bool KFCurve::getCurveDerivativesSamples(Tempus const& start, Tempus const& step
 
 bool KFCurve::getUForValue(double value, std::vector<Tempus>& times, BXTimeRange& range,
                            Tempus& frameDuration, std::uint32_t flags) {
-    return _rootNode->getUForValue(value, times, range, frameDuration, flags);
+    return getRootNode()->getUForValue(value, times, range, frameDuration, flags);
 }
 
 bool KFCurve::warpCurveLinear(double factor, Tempus const& t, bool force) {

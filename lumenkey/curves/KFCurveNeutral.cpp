@@ -1,4 +1,4 @@
-// Operations that this curve refuses: it takes part in no takes, follows no dynamic curve and stores nothing of itself.
+// Operations that this curve refuses: it follows no dynamic curve and stores nothing of itself.
 // None changes anything, and those with an answer give false.
 
 #include "lumenkey/curves/KFCurve.h"
@@ -15,13 +15,3 @@ bool KFCurve::parseElement(BXSerializerReadStream&, BXStreamElement&) { return f
 // --- Curves of dynamic channels ---
 
 bool KFCurve::generateCurveFromDynamicCurve(Tempus const&, KFDynamicCurve*) { return false; }
-
-// --- Takes ---
-
-bool KFCurve::beginPlayback(Tempus const&, std::uint32_t, std::uint32_t, Tempus const&) { return false; }
-bool KFCurve::endPlayback(Tempus const&) { return false; }
-bool KFCurve::beginRecording(Tempus const&) { return false; }
-bool KFCurve::endRecording(Tempus const&) { return false; }
-bool KFCurve::updateCurrentRecordingTime(Tempus const&) { return false; }
-bool KFCurve::isPlaying(std::uint32_t*, std::uint32_t*, Tempus*) { return false; }
-bool KFCurve::isRecording() { return false; }

@@ -114,15 +114,10 @@ void placeFitted(KFSpline& spline, std::vector<Point> const& fitted, Row const& 
     }
 }
 
+/// By position, since of several vertices at one the list of handles has the first only.
 void deleteStretch(KFSpline& spline, Tempus const& start, Tempus const& end) {
-    std::vector<void*> handles;
-    spline.getAllVerticesHandles(handles);
-    for (void* const handle : handles) {
-        Tempus u;
-        spline.getVertex(handle, &u, nullptr, kTempusZero);
-        if (!(u < start) && !(end < u))
-            spline.deleteVertex(handle, true, kTempusZero);
-    }
+    spline.deleteVertex(start, true, kTempusZero);
+    spline.deleteVertices(start, end);
 }
 
 /// The mean over 2 * radius + 1 samples; beyond either end the end's sample counts again, without being visited.

@@ -25,13 +25,13 @@ KFSpline* KFCurve::splineForNewKeypoints() {
 /// The root's own way of taking a value, with the spline node kept in step: it is what a later switch of
 /// the root reads.
 void KFCurve::writeConstant(Tempus const& t, double clampedValue) {
-    _rootNode->setValue(t, clampedValue, true);
+    getRootNode()->setValue(t, clampedValue, true);
     _splineNode.storeValue(clampedValue);
 }
 
 bool KFCurve::setKeyValue(Tempus const& t, double value, bool withTangents) {
     double const stored = clamped(value);
-    _rootNode->setValue(t, stored, withTangents);
+    getRootNode()->setValue(t, stored, withTangents);
     if (!isSpline())
         _splineNode.storeValue(stored);
     return true;
@@ -79,7 +79,7 @@ bool KFCurve::setKeypoint(Tempus const& t, bool force) {
 bool KFCurve::setKeyAtCurrentValue(Tempus const& t) {
     if (!isSpline())
         return false;
-    _rootNode->setValue(t, getValue(t, static_cast<void*>(nullptr)), true);
+    getRootNode()->setValue(t, getValue(t, static_cast<void*>(nullptr)), true);
     return true;
 }
 
@@ -107,16 +107,28 @@ bool KFCurve::appendKeypointsNoTangents(std::uint32_t count, Tempus const* times
 
 bool KFCurve::setKeyValue(void* handle, Tempus const& t, double value) {
     double const stored = clamped(value);
-    if (KFSpline* const spline = rootSpline())
-        return spline->isValidHandle(handle) && spline->setVertex(handle, t, stored, kTempusZero);
+    if (KFSpline* const spline = rootSpline()) {
+        if (!isRecording())
+            return spline->isValidHandle(handle) && spline->setVertex(handle, t, stored, kTempusZero);
+        _recordingNode->setValue(t, stored, true);
+        return true;
+    }
     writeConstant(t, stored);
     return true;
 }
 
 bool KFCurve::setKeyValue(void* handle, double value) {
     double const stored = clamped(value);
-    if (KFSpline* const spline = rootSpline())
-        return spline->isValidHandle(handle) && spline->setVertexValue(handle, stored, kTempusZero);
+    if (KFSpline* const spline = rootSpline()) {
+        if (!spline->isValidHandle(handle))
+            return false;
+        if (!isRecording())
+            return spline->setVertexValue(handle, stored, kTempusZero);
+        Tempus t = kTempusInvalid;
+        spline->getVertex(handle, &t, nullptr, kTempusZero);
+        _recordingNode->setValue(t, stored, true);
+        return true;
+    }
     writeConstant(kTempusZero, stored);
     return true;
 }

@@ -183,6 +183,8 @@ public:
     KFVertexIterator endVertices() const noexcept;
     KFVertexIterator nextPlace(KFVertexIterator place) const noexcept;
     KFVertexIterator previousPlace(KFVertexIterator place) const noexcept;
+    /// The place of the first vertex strictly after `u`; the end when there is none.
+    KFVertexIterator placeAfter(Tempus const& u) const noexcept;
     /// The vertex at a place that isn't the end.
     KFVertex* vertexAt(KFVertexIterator place) const noexcept;
 
@@ -412,6 +414,7 @@ protected:
 private:
     friend class KFSplineSampler;
     friend class KFControlVertices;
+    friend class KFSplineExtremes;
 
     /// Lets others see how many vertices there are: when the lock is given back, and at the end of an edit without it.
     void publishVertexCount() const noexcept;

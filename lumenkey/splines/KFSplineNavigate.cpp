@@ -206,6 +206,7 @@ KFVertexIterator KFSpline::nextPlace(KFVertexIterator place) const noexcept { re
 KFVertexIterator KFSpline::previousPlace(KFVertexIterator place) const noexcept {
     return _store->previous(place);
 }
+KFVertexIterator KFSpline::placeAfter(Tempus const& u) const noexcept { return _store->upperBound(u); }
 KFVertex* KFSpline::vertexAt(KFVertexIterator place) const noexcept { return _store->at(place); }
 void* KFSpline::getFirstVertex() const noexcept { return _store->front(); }
 void* KFSpline::getLastVertex() const noexcept { return _store->back(); }

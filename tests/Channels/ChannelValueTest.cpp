@@ -175,25 +175,6 @@ TEST(KFChannelValue, KeepsItsLimitsAndUnitWhenItTakesAnother) {
     EXPECT_TRUE(target.testFlag(kChannelFlagSaveWhenAtDefault));
 }
 
-TEST(KFChannelValue, FindsItsExtremes) {
-    KFChannelDouble channel("", nullptr, 1, 0);
-    channel.willLoadKeyframes(true, 3);
-    channel.appendKeyframes(3, std::array{s(0), s(1), s(2)}.data(), std::array{0.0, 10.0, 4.0}.data(), false);
-    channel.willLoadKeyframes(false, 0);
-    // A Bezier segment that overshoots, against a dense walk.
-    void* first = nullptr;
-    channel.getCurveInterface()->getKeypointHandle(s(0), &first);
-    channel.getCurveInterface()->setKeypointInterpolation(first, 4, true);
-    channel.getCurveInterface()->setKeypointOutputHandles(first, 0.4, -20.0, true);
-    double low = 0.0, high = 0.0, lowest = 0.0;
-    for (int i = 0; i <= 100000; ++i)
-        lowest = std::min(lowest, channel.getCurveValue(s(i, 100000), false));
-    EXPECT_TRUE(channel.getCurrentMinAndMax(s(2), s(0), &low, &high));
-    EXPECT_LT(lowest, -1.0);
-    EXPECT_NEAR(low, lowest, 1e-6);
-    EXPECT_EQ(high, 10.0);
-}
-
 TEST(KFChannelFades, StayWithinTheExtent) {
     RecordingRoot root;
     root.frameDuration = s(1);

@@ -1,15 +1,15 @@
-// Keyframes of a channel: the setters and reads by handle, edits of ranges, gathering and pasting.
+// Keyframes of a channel: walks and edits of ranges, gathering and pasting.
 
+#include "lumenkey/Channels/KFChannelTimeConverter.h"
 #include "lumenkey/Channels/KFScalarChannels.h"
-#include "lumenkey/curves/KFCurve.h"
 #include "lumenkey/splines/KFInterpolation.h"
-#include "lumenkey/splines/KFVertex.h"
-#include "tests/Channels/AddingNode.h"
 #include "tests/Channels/RecordingRoot.h"
 
 #include <gtest/gtest.h>
 
-#include <functional>
+#include <algorithm>
+#include <cmath>
+#include <random>
 #include <tuple>
 
 namespace {
@@ -47,12 +47,6 @@ std::vector<Tempus> timesOf(KFChannel const& channel) {
     return times;
 }
 
-double valueAt(KFChannel const& c, Tempus const& t) {
-    double value = -1.0;
-    c.getKeyframe(c.getKeyframe(t), nullptr, &value);
-    return value;
-}
-
 using Pair = std::pair<double, double>;
 
 Pair input(KFChannel const& c, void* h, bool handles) {
@@ -67,150 +61,51 @@ Pair output(KFChannel const& c, void* h, bool handles) {
     return p;
 }
 
-/// An edit of a channel with keypoints 10, 20 and 40 at 1, 2 and 4 s, by the handle of the second; and its effect.
-struct Edit {
-    char const* name;
-    unsigned int announcements;
-    std::function<void(KFChannel&, void*)> run;
-    std::function<bool(KFChannel&, void*)> worked;
-    Edit(char const* n, unsigned int count, decltype(run) r, decltype(worked) w)
-        : name(n), announcements(count), run(std::move(r)), worked(std::move(w)) {}
-};
-
-#define EDIT(announcements, edit, effect)                                                                    \
-    Edit(                                                                                                    \
-        #edit, announcements, [](KFChannel& c, void* h) { (void)h, c.edit; },                                \
-        [](KFChannel& c, void* h) { return (void)h, (void)c, (effect); })
-
-std::vector<Edit> const kEdits = {
-    EDIT(0, setKeyframe(s(3), 7.0, true),
-         valueAt(c, s(3)) == 7.0 && input(c, c.getKeyframe(s(3)), false) != Pair()),
-    EDIT(0, setKeyframe(s(3), 7.0, false),
-         valueAt(c, s(3)) == 7.0 && input(c, c.getKeyframe(s(3)), false) == Pair()),
-    EDIT(0, setKeyframe(s(3)), valueAt(c, s(3)) > 20.0),
-    EDIT(0, setKeyframeIfRecording(s(3)), valueAt(c, s(3)) > 20.0),
-    EDIT(0, setKeyframe(h, s(3), 7.0), valueAt(c, s(3)) == 7.0 && c.getNumberOfKeyframes() == 3),
-    EDIT(0, appendKeyframe(s(6), 7.0, true), valueAt(c, s(6)) == 7.0),
-    EDIT(0, cloneKeyframe(h, s(3)), valueAt(c, s(3)) == 20.0 && valueAt(c, s(2)) == 20.0),
-    EDIT(0, setKeyframeValue(h, 7.0), valueAt(c, s(2)) == 7.0 && valueAt(c, s(1)) == 10.0),
-    EDIT(0, setKeyframesValue(7.0),
-         c.getKeyframeMinValue(false) == 7.0 && c.getKeyframeMaxValue(false) == 7.0),
-    EDIT(0, setKeyframeFlags(h, 0x19), c.getKeyframeFlags(h) == 0x19),
-    EDIT(0, deleteAllKeyframes(s(2)), !c.hasKeypoints(0) && c.getInitialValue() == 20.0),
-    EDIT(0, moveKeyframe(h, s(3), true, false), valueAt(c, s(3)) == 20.0 && c.getNumberOfKeyframes() == 3),
-    EDIT(0, offsetKeyframe(h, s(3)), valueAt(c, s(3)) == 20.0 && c.getNumberOfKeyframes() == 3),
-    EDIT(0, linearTimeWarp(2.0, s(0)), c.getKeyframeMaxTime() > s(4)),
-    EDIT(0, reverseKeyframes(c.getKeyframe(s(1)), c.getKeyframe(s(4))), valueAt(c, s(1)) == 40.0),
-    EDIT(0, smoothKeyframe(h, false), output(c, h, true) == Pair() && c.isSmoothKeyframe(h)),
-    EDIT(0, setKeyframeInputTangents(h, -12.0, 6.0, true), input(c, h, false) == Pair(-1.0, 0.5)),
-    EDIT(0, setKeyframeOutputTangents(h, 1.0, 0.5, false), output(c, h, true) == Pair(12.0, 6.0)),
-    EDIT(0, setKeyframeBias(h, 0.25), c.getKeyframeBias(h) == 0.25),
-    EDIT(0, setKeyframeNormal(h, 0.5), c.getKeyframeNormal(h) == 0.5),
-    EDIT(0, setKeyframeNormal(s(2), 0.5), c.getKeyframeNormal(s(2)) == 0.5),
-    EDIT(0, setKeyframeEnabled(h, false), !c.getKeyframeEnabled(h) && c.getKeyframes(true).size() == 2),
-    EDIT(0, setKeyframeSelected(h, true), (c.getKeyframeFlags(h) & kKFVertexFlagSelected) != 0),
-    EDIT(0, setKeyframeLocked(h, true), c.getKeyframeLocked(h)),
-    EDIT(0, setKeyframeTangentsBroken(h, true), c.getKeyframeTangentsBroken(h)),
-    EDIT(0, setKeyframeTangentsScaled(h, true), c.getKeyframeTangentsScaled(h)),
-    EDIT(0, setKeyframeTangentsFlat(h), output(c, h, false).second == 0.0),
-    EDIT(1, deleteKeyframe(h), c.getKeyframe(s(2)) == nullptr && c.getNumberOfKeyframes() == 2),
-    EDIT(1, setKeyframeInterpolation(h, kKFInterpolationBezier),
-         c.getKeyframeInterpolation(h) == kKFInterpolationBezier && !c.isSmoothKeyframe(h)),
-    EDIT(1, setCurveSegmentSpeed(h, 3), c.getCurveSegmentSpeed(h) == 3),
-};
-
-TEST(KFChannelKeyframes, SettersCheckTheLockMakeTheRecordLocalAndAnnounceOnlyWhereSaid) {
-    for (Tempus const& offset : {kTempusZero, s(10)}) {
-        for (Edit const& edit : kEdits) {
-            SCOPED_TRACE(edit.name);
-            Fixture shared(offset);
-            shared.channel.lock(true, false);
-            edit.run(shared.channel, nullptr);
-            EXPECT_TRUE(shared.channel.getImpl()->isShared());
-            shared.channel.lock(false, false);
-            edit.run(shared.channel, nullptr);
-            EXPECT_FALSE(shared.channel.getImpl()->isShared());
-
-            Fixture f(offset);
-            f.key({{1, 10.0}, {2, 20.0}, {4, 40.0}});
-            void* const handle = f.channel.getKeyframe(s(2));
-            KFChannelDouble const before(f.channel);
-            f.channel.lock(true, false);
-            f.root.takeAnnounced();
-            edit.run(f.channel, handle);
-            EXPECT_TRUE(f.channel.compare(&before));
-            EXPECT_FALSE(edit.worked(f.channel, handle));
-            EXPECT_TRUE(f.root.takeAnnounced().empty());
-            f.channel.lock(false, false);
-            f.root.takeAnnounced();
-            edit.run(f.channel, handle);
-            EXPECT_TRUE(edit.worked(f.channel, handle));
-            EXPECT_EQ(f.root.takeAnnounced().size(), edit.announcements);
-        }
-    }
-}
-
-TEST(KFChannelKeyframes, AreReadInCurveTime) {
-    Fixture f(s(10));
-    f.key({{1, 10.0}, {2, 20.0}, {4, 40.0}});
+TEST(KFChannelKeyframes, AreFoundAgainWhereConvertingTheirTimesRounds) {
+    Fixture f(s(1'234'567'891, 1'000'000'007)); // no timescale holds the sums
     KFChannel& c = f.channel;
-    void* const middle = c.getKeyframe(s(2));
-    Tempus time;
-    double value = 0.0;
-    EXPECT_TRUE(c.getNextKeyframe(s(2), &time, &value) && time == s(4) && value == 40.0);
-    EXPECT_TRUE(c.getPreviousKeyframe(s(2), &time, &value) && time == s(1) && value == 10.0);
-    EXPECT_TRUE(c.getFirstKeyframe(&time, nullptr) && time == s(1));
-    EXPECT_TRUE(c.getLastKeyframe(&time, nullptr) && time == s(4));
-    EXPECT_EQ(c.getNextEnabledKeyframe(s(1)), middle);
-    EXPECT_EQ(c.getPreviousEnabledKeyframe(c.getLastEnabledKeyframe()), middle);
-    EXPECT_EQ(c.getNextEnabledKeyframe(c.getLastEnabledKeyframe()), nullptr);
-    EXPECT_EQ(c.getKeyframe(s(3)), nullptr);
-    EXPECT_FALSE(c.getKeyframe(nullptr, &time, &value));
-    EXPECT_EQ(c.getKeyframeMinTime(), s(1));
-    EXPECT_EQ(c.getKeyframeTimeRange(), s(3));
-    EXPECT_EQ(c.getKeyframeParametricRange(), s(3));
-    std::vector<double> values;
-    unsigned int count = 2;
-    EXPECT_TRUE(c.getSamples(s(1), s(3), count, static_cast<std::vector<Tempus>*>(nullptr), &values));
-    EXPECT_EQ(values, (std::vector<double>{10.0, 40.0}));
-    auto* const first = new AddingNode(1.0);
-    auto* const second = new AddingNode(2.0);
-    c.appendCurveProcessingNode(first);
-    c.appendCurveProcessingNode(second);
-    EXPECT_EQ(c.getPreviousProcessingNode(second), first);
-    EXPECT_EQ(c.getPreviousProcessingNode(first), nullptr);
-    c.setInterpolation(kKFInterpolationLinear);
-    EXPECT_TRUE(c.hasInterpolation(kKFInterpolationLinear));
-    EXPECT_EQ(c.getInterpolation(), kKFInterpolationLinear);
-    c.purgeKeyframes();
-    EXPECT_EQ(c.getNumberOfKeyframes(), 3u);
+    std::vector<Tempus> times;
+    for (std::int64_t i = 1; i <= 50; ++i) {
+        c.setKeyframe(s(100'003 * i, 262'144), static_cast<double>(i), true);
+        times.push_back(c.localToGlobalTime(s(100'003 * i, 262'144)));
+    }
+    EXPECT_EQ(f.root.keypoints({times.front(), s(60)}, false, 0), times);
+    std::vector<Tempus> backward{times.back()};
+    for (Tempus t = times.back(); f.root.previousKeypoint(&t, 0);)
+        backward.push_back(t);
+    EXPECT_TRUE(std::equal(times.rbegin(), times.rend(), backward.begin(), backward.end()));
+    for (std::size_t i = 0; i < times.size(); i += 2) {
+        EXPECT_TRUE(c.hasKeypointAt(times[i], 0));
+        c.addKeypointAt(times[i]);
+        c.setValue(times[i], -1.0, true);
+        c.deleteKeypointAt(times[i]);
+    }
+    EXPECT_EQ(c.getNumberOfKeyframes(), 25u);
+    EXPECT_EQ(c.getKeyframeMinValue(false), 2.0);
 }
 
-TEST(KFChannelKeyframes, RangesAreOfGlobalTime) {
-    for (int const offset : {0, 10}) {
-        Fixture f(s(offset));
-        f.key({{1, 5.0}, {2, -3.0}, {4, 8.0}, {6, 100.0}});
-        auto const at = [&](int time) { return s(time + offset); };
-        EXPECT_EQ(f.channel.getKeyframeMinValueInRange(at(1), at(4)), -3.0);
-        EXPECT_EQ(f.channel.getKeyframeMaxValueInRange(at(1), at(4)), 8.0);
-        EXPECT_EQ(f.channel.getKeyframeMinValueInRange(at(3), at(3)), f.channel.getCurveValue(s(3), true));
-        EXPECT_EQ(f.channel.getKeyframeMaxValueInRange(at(7), at(9)), 100.0);
-        f.channel.offsetKeyframesValuesInRange(at(2), at(5), at(2), 7.0);
-        EXPECT_EQ(keypointsOf(f.channel), (std::vector<std::tuple<Tempus, double>>{
-                                              {s(1), 5.0}, {s(2), 7.0}, {s(4), 18.0}, {s(6), 100.0}}));
-        KFChannelBase::KeyframesByChannel gathered;
-        f.root.keyframesWithChannels({at(2), s(2)}, gathered);
-        ASSERT_EQ(gathered.size(), 1u);
-        ASSERT_EQ(gathered[0].second.size(), 2u);
-        EXPECT_EQ(gathered[0].second[1].time, s(4));
-        f.root.keyframesWithChannels({at(7), s(2)}, gathered);
-        EXPECT_EQ(gathered.size(), 1u);
+/// A host's converter that holds the time, or lets it run backward.
+struct Held : KFChannelTimeConverter {
+    explicit Held(int speedIn) : speed(speedIn) {}
+    Tempus globalToLocalTime(KFChannelBase const*, Tempus const& t) const override { return t * speed; }
+    Tempus localToGlobalTime(KFChannelBase const*, Tempus const& t) const override {
+        return speed == 0 ? s(1) : t * speed;
+    }
+    bool extentIsLocal() const override { return false; }
+    int speed;
+};
 
-        using Times = std::vector<Tempus>;
-        EXPECT_EQ(f.root.keypoints({at(2), s(2)}, false, 0), (Times{at(2), at(4)}));
-        EXPECT_EQ(f.root.keypoints({at(2), s(2)}, true, 0), (Times{at(2), at(1), at(2), at(4), at(6)}));
-        EXPECT_EQ(f.root.visibleKeypoints({at(7), s(2)}, false, 0), Times{});
-        EXPECT_EQ(f.channel.visibleKeypoints({at(2), s(2)}, true, 0), (Times{at(1), at(2), at(4), at(6)}));
+TEST(KFChannelKeyframes, AreWalkedToAnEndWhateverTheConverterDoes) {
+    for (int const speed : {0, -1}) {
+        Fixture f;
+        KFChannelDouble forward("forward", &f.root, 3, 0);
+        f.key({{1, 1.0}, {2, 2.0}, {3, 3.0}});
+        forward.setKeyframe(s(2), 0.0, true);
+        Held converter(speed);
+        f.channel.setTimeConverterDelegate(&converter);
+        EXPECT_LE(f.root.keypoints({s(-4), s(9)}, true, 0).size(), 4u);
+        EXPECT_LE(f.channel.keypoints({s(1), s(9)}, true, 0).size(), 4u);
+        EXPECT_EQ(f.root.offsetKeyframesInRange(s(2), s(2), s(1), s(0), false, false), s(1));
     }
 }
 
@@ -229,7 +124,7 @@ TEST(KFChannelKeyframes, MoveInARangeAsFarAsTheNeighboursAllow) {
         EXPECT_EQ(timesOf(f.channel), (Times{s(1), s(2), s(3), s(8)}));
         EXPECT_EQ(move(2, 3, 1, false), s(1)) << "the later one moves first";
         EXPECT_EQ(timesOf(f.channel), (Times{s(1), s(3), s(4), s(8)}));
-        EXPECT_EQ(valueAt(f.channel, s(4)), 4.0);
+        EXPECT_EQ(f.channel.getCurveValue(s(4), true), 4.0);
         EXPECT_EQ(move(3, 4, 0, true), kTempusZero);
         EXPECT_EQ(move(5, 7, 2, true), kTempusZero);
         EXPECT_EQ(timesOf(f.channel), (Times{s(1), s(3), s(4), s(8)}));
@@ -283,23 +178,13 @@ TEST(KFChannelKeyframes, ASinglePastedOneLeavesALevelCurveLevel) {
     EXPECT_EQ(output(f.channel, f.channel.getKeyframe(s(2)), true), Pair(12.0, 12.0));
 }
 
-TEST(KFChannelKeyframes, GatheredAndPastedAgainKeepAllAttributes) {
+TEST(KFChannelKeyframes, ArePastedAtATimeOverWhatIsThereOrInItsPlace) {
     for (int const offset : {0, 10}) {
         Fixture f(s(offset));
         KFChannelDouble other("other", &f.root, 3, 0);
         f.key({{2, 1.0}, {3, 9.0}, {5, 2.0}});
         other.setKeyframe(s(4), 4.0, true);
         KFChannel& c = f.channel;
-        for (void* const h : c.getKeyframes(false)) {
-            c.setKeyframeTangentsBroken(h, true);
-            c.setKeyframeInputTangents(h, -3.0, 6.0, true);
-            c.setKeyframeOutputTangents(h, 6.0, 1.5, true);
-            c.setKeyframeBias(h, 0.25);
-            c.setKeyframeNormal(h, 0.5);
-            c.setKeyframeSelected(h, true);
-        }
-        c.setKeyframeInterpolation(c.getKeyframe(s(3)), kKFInterpolationEase);
-        KFChannelDouble const before(f.channel);
         KFChannelBase::KeyframesByRef gathered;
         f.root.keyframesWithChannelRef({s(2 + offset), s(3)}, gathered);
         ASSERT_EQ(gathered.size(), 2u);
@@ -309,7 +194,7 @@ TEST(KFChannelKeyframes, GatheredAndPastedAgainKeepAllAttributes) {
         c.deleteKeypoints(s(0), s(9));
         ASSERT_FALSE(c.hasKeypoints(0));
         f.root.setKeyframesWithChannelRef(s(2), s(0), gathered, false);
-        EXPECT_TRUE(c.compare(&before));
+        EXPECT_EQ(timesOf(c), (std::vector<Tempus>{s(2), s(3), s(5)}));
         EXPECT_EQ(timesOf(other), std::vector<Tempus>{s(4)});
 
         c.setKeyframe(s(13), 7.0, true);
@@ -319,6 +204,101 @@ TEST(KFChannelKeyframes, GatheredAndPastedAgainKeepAllAttributes) {
         f.root.setKeyframesWithChannelRef(s(12), s(0), gathered, true);
         EXPECT_EQ(timesOf(other), (std::vector<Tempus>{s(4), s(14)}));
         EXPECT_EQ(timesOf(c), (std::vector<Tempus>{s(2), s(3), s(5), s(12), s(13), s(15)}));
+    }
+}
+
+/// Two channels in a folder, under a root with an offset.
+struct Tree {
+    RecordingRoot root;
+    KFChannelFolder folder{"folder", &root, 1, 0, 2};
+    KFChannelDouble a{"a", &folder, 1, 0}, b{"b", &folder, 2, 0};
+    explicit Tree(Tempus const& offset) { root.setTimeOffset(offset, true); }
+    KFChannelBase::KeyframesByRef gather() {
+        KFChannelBase::KeyframesByRef gathered;
+        root.keyframesWithChannelRef({root.localToGlobalTime(s(1)), s(99)}, gathered);
+        return gathered;
+    }
+};
+
+testing::AssertionResult sameKeyframes(KFChannel const& channel, KFChannel const& as,
+                                       Tempus const& later = kTempusZero) {
+    auto const is = channel.getKeyframes(false);
+    auto const was = as.getKeyframes(false);
+    if (is.size() != was.size())
+        return testing::AssertionFailure() << is.size() << " and not " << was.size();
+    for (std::size_t i = 0; i < is.size(); ++i) {
+        auto const numbers = [](KFChannel const& c, void* h, Tempus* t) {
+            double value = 0.0;
+            c.getKeyframe(h, t, &value);
+            auto const [inU, inV] = input(c, h, true);
+            auto const [outU, outV] = output(c, h, true);
+            return std::vector<double>{value,
+                                       inU,
+                                       inV,
+                                       outU,
+                                       outV,
+                                       c.getKeyframeBias(h),
+                                       c.getKeyframeNormal(h),
+                                       double(c.getKeyframeFlags(h)),
+                                       double(c.getKeyframeInterpolation(h)),
+                                       double(c.getKeyframeEnabled(h))};
+        };
+        Tempus time, timeBefore;
+        auto const now = numbers(channel, is[i], &time);
+        auto const then = numbers(as, was[i], &timeBefore);
+        for (std::size_t k = 0; k < now.size(); ++k) {
+            if (std::fabs(now[k] - then[k]) > 1e-12)
+                return testing::AssertionFailure()
+                       << "keypoint " << i << ", attribute " << k << ": " << now[k] << ", not " << then[k];
+        }
+        if (time != timeBefore + later)
+            return testing::AssertionFailure() << "time of keypoint " << i;
+    }
+    return testing::AssertionSuccess();
+}
+
+/// Keypoints with attributes at random: the first, at 1 s, may be disabled (of the others only enabled ones are
+/// gathered); any may be locked, or have handles that its flags don't allow.
+void keyAtRandom(KFChannel& channel, std::mt19937_64& random) {
+    std::uniform_real_distribution<double> number(-5.0, 5.0), some(0.0, 1.0);
+    std::uint32_t const types[] = {0, 1, 4, 6, 7, 8, 13, 14, 15, 16, 17, 19, 20, 21};
+    Tempus t = s(1);
+    for (int left = 2 + static_cast<int>(random() % 5); left > 0; --left) {
+        channel.setKeyframe(t, number(random), some(random) < 0.5);
+        void* const h = channel.getKeyframe(t);
+        if (some(random) < 0.7) {
+            channel.setKeyframeTangentsBroken(h, true);
+            channel.setKeyframeInputTangents(h, -some(random), number(random), true);
+            channel.setKeyframeOutputTangents(h, some(random), number(random), true);
+        }
+        channel.setKeyframeBias(h, 2.0 * some(random));
+        channel.setKeyframeNormal(h, number(random));
+        channel.setKeyframeInterpolation(h, types[random() % std::size(types)]);
+        channel.setKeyframeEnabled(h, t > s(1) || some(random) < 0.8);
+        channel.setKeyframeFlags(h, static_cast<unsigned>(random()) & 0x39B);
+        t = t + s(1 + static_cast<int>(random() % 90), 24);
+    }
+}
+
+TEST(KFChannelKeyframes, WhateverIsGatheredIsRestoredByPasting) {
+    std::mt19937_64 random(7);
+    for (int round = 0; round < 500; ++round) {
+        SCOPED_TRACE(round);
+        Tree tree(s(round % 3, 25)), target(s(-5));
+        keyAtRandom(tree.a, random);
+        keyAtRandom(tree.b, random);
+        KFChannelDouble const a(tree.a), b(tree.b);
+        auto const gathered = tree.gather();
+        tree.a.deleteAllKeyframes(s(0));
+        tree.b.deleteAllKeyframes(s(0));
+        tree.root.setKeyframesWithChannelRef(s(1), s(0), gathered, round % 2 == 0);
+        tree.root.setKeyframesWithChannelRef(s(1), s(0), gathered, false); // onto themselves
+        ASSERT_TRUE(sameKeyframes(tree.a, a));
+        ASSERT_TRUE(sameKeyframes(tree.b, b));
+
+        target.root.setKeyframesWithChannelRef(s(3), s(0), gathered, true);
+        ASSERT_TRUE(sameKeyframes(target.a, a, s(2)));
+        ASSERT_TRUE(sameKeyframes(target.b, b, s(2)));
     }
 }
 

@@ -56,6 +56,19 @@ public:
     void reset() override { note("reset"); }
 };
 
+class HostVisitor : public KFChannelSegmentVisitor {
+public:
+    void visitConstant(double, Tempus const&, Tempus const&) override { note("visitConstant"); }
+    void visitEase(KFSpline&, void*, void*, Tempus const&, Tempus const&, Tempus const&, Tempus const&,
+                   double) override {
+        note("visitEase");
+    }
+    void visitLogarithmic(KFSpline&, void*, void*, Tempus const&, Tempus const&, Tempus const&, Tempus const&,
+                          double) override {
+        note("visitLogarithmic");
+    }
+};
+
 template <class Result, class... Arguments>
 void callAs(void* object, unsigned int slot, Arguments... arguments) {
     using Operation = Result (*)(void*, Arguments...);
@@ -73,6 +86,7 @@ Tempus const zero = kTempusZero;
 HostRoot root;
 HostChannel channel;
 HostNode node;
+HostVisitor visitor;
 
 PluginInterface makeInterface() {
     auto const onNothing = [](void* object, unsigned int slot) { callAs<void>(object, slot); };
@@ -101,6 +115,14 @@ PluginInterface makeInterface() {
         callAs<bool, double, void*, void*, void*, unsigned>(object, slot, 0, nullptr, nullptr, nullptr, 0);
     };
 
+    auto const visitsConstant = [](void* object, unsigned int slot) {
+        callAs<void, double, Tempus const*, Tempus const*>(object, slot, 0.0, &zero, &zero);
+    };
+    auto const visitsPiece = [](void* object, unsigned int slot) {
+        callAs<void, void*, void*, void*, Tempus const*, Tempus const*, Tempus const*, Tempus const*, double>(
+            object, slot, nullptr, nullptr, nullptr, &zero, &zero, &zero, &zero, 0.0);
+    };
+
     // The destructors of channels are slots 0 and 1.
     std::vector<PluginSlot> const slots = {
         {"getInstanceID", 7, &root, onNothing},
@@ -125,6 +147,9 @@ PluginInterface makeInterface() {
         {"compare", 17, &node, onPointers},
         {"isPointToPoint", 22, &node, onNothing},
         {"reset", 25, &node, onNothing},
+        {"visitConstant", 2, &visitor, visitsConstant},
+        {"visitEase", 8, &visitor, visitsPiece},
+        {"visitLogarithmic", 12, &visitor, visitsPiece},
     };
     return {slots, &lastAsked, &root, &channel, [] { return static_cast<KFCurveNode*>(new HostNode()); }};
 }

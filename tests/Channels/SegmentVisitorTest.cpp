@@ -1,0 +1,498 @@
+// The pieces of a curve over a stretch of time, and what is made of them: extremes, and the times of a value.
+
+#include "lumenkey/Channels/KFChannelSegmentVisitor.h"
+#include "lumenkey/Channels/KFScalarChannels.h"
+#include "lumenkey/curves/KFCurve.h"
+#include "lumenkey/splines/KFBasicInterpolators.h"
+#include "lumenkey/splines/KFSplineInterpolator.h"
+#include "tests/Channels/RecordingRoot.h"
+#include "tests/splines/museum.h"
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <cmath>
+#include <limits>
+#include <sstream>
+
+namespace {
+
+using Time = Tempus const&;
+constexpr double kMost = std::numeric_limits<double>::max();
+
+Tempus s(std::int64_t value, std::int32_t timescale = 1) { return TempusMake(value, timescale); }
+
+struct Piece {
+    std::uint32_t type;
+    std::pair<double, double> (*minMax)(Piece const&);
+    KFSpline& spline;
+    void* first;
+    void* second;
+    Tempus sourceStart, sourceEnd, targetStart, targetEnd;
+    double offset;
+};
+
+template <class Interpolator> std::pair<double, double> minMaxOf(Piece const& p) {
+    double low = 0.0, high = 0.0;
+    Interpolator().getMinMaxValues(p.spline, p.first, p.second, std::min(p.sourceStart, p.sourceEnd),
+                                   std::max(p.sourceStart, p.sourceEnd), &low, &high);
+    return {low + p.offset, high + p.offset};
+}
+
+class PieceVisitor : public KFChannelSegmentVisitor {
+public:
+    virtual void piece(Piece const& piece) = 0;
+
+    void visitLinear(KFSpline& k, void* a, void* b, Time c, Time d, Time e, Time f, double o) final {
+        piece({1, minMaxOf<KFLinearInterpolator>, k, a, b, c, d, e, f, o});
+    }
+    void visitBezier(KFSpline& k, void* a, void* b, Time c, Time d, Time e, Time f, double o) final {
+        piece({4, minMaxOf<KFBezierInterpolator>, k, a, b, c, d, e, f, o});
+    }
+    void visitCatmullRom(KFSpline& k, void* a, void* b, Time c, Time d, Time e, Time f, double o) final {
+        piece({6, minMaxOf<KFCatmullRomInterpolator>, k, a, b, c, d, e, f, o});
+    }
+    void visitEaseIn(KFSpline& k, void* a, void* b, Time c, Time d, Time e, Time f, double o) final {
+        piece({7, minMaxOf<KFEaseInInterpolator>, k, a, b, c, d, e, f, o});
+    }
+    void visitEaseOut(KFSpline& k, void* a, void* b, Time c, Time d, Time e, Time f, double o) final {
+        piece({8, minMaxOf<KFEaseOutInterpolator>, k, a, b, c, d, e, f, o});
+    }
+    void visitExponential(KFSpline& k, void* a, void* b, Time c, Time d, Time e, Time f, double o) final {
+        piece({13, minMaxOf<KFExponentialInterpolator>, k, a, b, c, d, e, f, o});
+    }
+    void visitLogarithmic(KFSpline& k, void* a, void* b, Time c, Time d, Time e, Time f, double o) final {
+        piece({14, minMaxOf<KFLogarithmicInterpolator>, k, a, b, c, d, e, f, o});
+    }
+    void visitEase(KFSpline& k, void* a, void* b, Time c, Time d, Time e, Time f, double o) final {
+        piece({15, minMaxOf<KFEaseInterpolator>, k, a, b, c, d, e, f, o});
+    }
+    void visitAccelerate(KFSpline& k, void* a, void* b, Time c, Time d, Time e, Time f, double o) final {
+        piece({16, minMaxOf<KFAccelerateInterpolator>, k, a, b, c, d, e, f, o});
+    }
+    void visitDecelerate(KFSpline& k, void* a, void* b, Time c, Time d, Time e, Time f, double o) final {
+        piece({17, minMaxOf<KFDecelerateInterpolator>, k, a, b, c, d, e, f, o});
+    }
+};
+
+/// The extremes piece by piece, each as its interpolator has them: what a host could write.
+class ExtremesVisitor : public PieceVisitor {
+public:
+    double min = kMost, max = -kMost;
+    int visits = 0;
+
+    void visitConstant(double value, Time, Time) override { include(value, value); }
+    void piece(Piece const& p) override {
+        if (p.type != 1) {
+            auto const [low, high] = p.minMax(p);
+            return include(low, high);
+        }
+        bool const isOutside = p.first == nullptr || p.second == nullptr;
+        for (bool const end : {false, true}) {
+            Tempus const u = isOutside ? (end ? p.targetEnd : p.targetStart)
+                             : end     ? p.sourceEnd
+                                       : p.sourceStart;
+            double const value =
+                isOutside ? p.spline.getVertexValue(u, kTempusZero, false)
+                          : p.offset + KFLinearInterpolator().interpolate(p.spline, kTempusZero, p.first,
+                                                                          p.second, u, false, false);
+            include(value, value);
+        }
+    }
+
+private:
+    void include(double low, double high) {
+        ++visits;
+        min = low < min ? low : min;
+        max = high > max ? high : max;
+    }
+};
+
+/// Writes the visits down: "value@time", "value@start..end", "type:source..source@start..end+offset".
+class Notes : public PieceVisitor {
+public:
+    std::ostringstream text;
+
+    void visitConstant(double value, Time start, Time end) override {
+        text << value << '@' << seconds(start) << (start == end ? "" : "..");
+        start == end ? text << ' ' : text << seconds(end) << ' ';
+    }
+    void piece(Piece const& p) override {
+        text << (p.first == nullptr ? "<" : "") << (p.second == nullptr ? ">" : "") << p.type << ':'
+             << seconds(p.sourceStart) << ".." << seconds(p.sourceEnd) << '@' << seconds(p.targetStart)
+             << ".." << seconds(p.targetEnd);
+        p.offset == 0.0 ? text << ' ' : text << '+' << p.offset << ' ';
+    }
+
+private:
+    static double seconds(Time t) { return TempusGetSeconds(t); }
+};
+
+/// A channel whose curve is a copy of a spline.
+struct Shown {
+    KFChannelDouble channel{"", nullptr, 1, 0};
+    KFSpline* spline = nullptr;
+
+    explicit Shown(MuseumSpline const& curve) {
+        channel.createLocalChannelImplementation();
+        KFCurve& own = *channel.getCurveInterface();
+        own.setIsSpline(true, kTempusZero);
+        own.setSplineState(new KFSplineState(*curve.state));
+        auto* const node = dynamic_cast<KFSplineNode*>(own.getRootNode());
+        node->allocKFSpline(curve.spline.get());
+        spline = node->getSpline();
+    }
+
+    void setModes(std::uint32_t mode) {
+        spline->setExtrapolation(mode, 0);
+        spline->setExtrapolation(mode, 1);
+    }
+    template <class Visitor> Visitor&& visit(Visitor&& visitor, Time start, Time end) {
+        KFChannelSegmentVisitor::visitSegments(channel, start, end, visitor);
+        return std::forward<Visitor>(visitor);
+    }
+    std::pair<double, double> extremes(Time start, Time end) {
+        double low = 0.0, high = 0.0;
+        EXPECT_TRUE(channel.getCurrentMinAndMax(start, end, &low, &high));
+        return {low, high};
+    }
+};
+
+using Keys = std::vector<std::tuple<Tempus, double, std::uint32_t>>;
+
+Shown shown(Keys const& keys, std::uint32_t mode = 0, bool retiming = false) {
+    MuseumSpline curve;
+    for (auto const& [u, value, type] : keys)
+        static_cast<KFVertex*>(curve->appendVertexNoTangents(u, value, kTempusZero))->setInterpolation(type);
+    curve.state->preExtrapolation = curve.state->postExtrapolation = mode;
+    curve.state->retimingExtrapolation = curve.state->parametric = retiming; // a frame is 1 then
+    return Shown(curve);
+}
+
+/// Positions around and between the vertices, and the repeats next to them.
+std::vector<Tempus> ends(KFSpline& spline) {
+    Tempus const first = spline.getMinValueU(kTempusZero, true);
+    Tempus const last = spline.getMaxValueU(kTempusZero, true);
+    Tempus const range = last - first;
+    std::vector<Tempus> at{first, last, first + range * s(37, 100), first + range * s(83, 100)};
+    for (Tempus const& cycles : {s(21, 100), s(1), s(2), s(13, 5), s(19, 2)}) {
+        at.push_back(first - range * cycles);
+        at.push_back(last + range * cycles);
+    }
+    auto const vertices = museumVertices(spline);
+    for (std::size_t i = 0; i < vertices.size(); i += 1 + vertices.size() / 4)
+        at.push_back(vertices[i]->getValueU());
+    std::sort(at.begin(), at.end());
+    return at;
+}
+
+TEST(KFChannelSegmentVisitor, VisitsPieceByPiece) {
+    Keys const three{{s(0), 0.0, 1}, {s(1), 4.0, 4}, {s(3), 1.0, 1}};
+    Keys const mixed{{s(0), 2.0, 0}, {s(0), 7.0, 0}, {s(1), 4.0, 19}, {s(2), 5.0, 1}};
+    struct Case {
+        Keys keys;
+        std::uint32_t mode;
+        Tempus start, end;
+        char const* visits;
+        bool retiming = false;
+    };
+    Case const cases[] = {
+        {{}, 3, s(1), s(2), "0@1..2 "},
+        {{{s(5), 3.0, 1}}, 1, s(1), s(2), "3@1..2 "},
+        // Inside: ends on keypoints and between them, no length, ends exchanged.
+        {three, 0, s(0), s(3), "0@0 1:0..1@0..1 4@1 4:1..3@1..3 1@3 "},
+        {three, 0, s(1, 2), s(2), "1:0.5..1@0.5..1 4@1 4:1..2@1..2 "},
+        {three, 0, s(1), s(1), "4@1 "},
+        {three, 0, s(1, 2), s(1, 2), "1:0.5..0.5@0.5..0.5 "},
+        {three, 0, s(2), s(1, 2), ""},
+        {mixed, 0, s(0), s(2), "2@0 7@0..1 4@1 5@2 "},
+        // Outside.
+        {three, 0, s(-2), s(-1), "0@-2..-1 "},
+        {three, 0, s(-1), s(0), "0@-1..0 0@0 "},
+        {three, 0, s(2), s(5), "4:2..3@2..3 1@3 1@3..5 "},
+        {three, 1, s(-2), s(-1), "<1:-2..-1@-2..-1 "},
+        {three, 1, s(4), s(5), ">1:4..5@4..5 "},
+        {three, 9, s(-2), s(5), "0@0 1:0..1@0..1 4@1 4:1..3@1..3 1@3 "},
+        {three, 2, s(-4), s(-1), "4:2..3@-4..-3 1@-3 4:3..1@-3..-1 4@-1 "},
+        {three, 2, s(3), s(10),
+         "1@3 4:3..1@3..5 4@5 1:1..0@5..6 0@6 1:0..1@6..7 4@7 4:1..3@7..9 1@9 4:3..2@9..10 "},
+        {three, 3, s(-4), s(0), "4:2..3@-4..-3 1@-3 1:0..1@-3..-2 4@-2 4:1..3@-2..0 0@0 "},
+        {three, 3, s(5), s(13, 2), "4:2..3@5..6 0@6 1:0..0.5@6..6.5 "},
+        {three, 4, s(-7), s(-2),
+         "4:2..3@-7..-6+-3 -2@-6 1:0..1@-6..-5+-2 2@-5 4:1..3@-5..-3+-2 -1@-3 1:0..1@-3..-2+-1 3@-2 "},
+        {three, 4, s(3), s(7), "1@3 1:0..1@3..4+1 5@4 4:1..3@4..6+1 2@6 1:0..1@6..7+2 6@7 "},
+        // What repeats without end, in no time, or from a time that is none.
+        {three, 3, kTempusNegativeInfinity, s(0), "0@0 "},
+        {three, 3, s(3), kTempusPositiveInfinity, "1@3 "},
+        {{{s(1), 5.0, 1}, {s(1), 6.0, 1}}, 2, s(2), s(4), "6@2..4 "},
+        // Retimed: the point at the end is read a frame further. One frame starts anew again and again.
+        {three, 2, s(3), s(8), "4@3 4:2..1@3..4 1:1..0@4..5 4:1..3@5..7 4:2..1@7..8 ", true},
+        {{{s(0), 0.0, 1}, {s(1), 6.0, 1}}, 2, s(2), s(7, 2), "1:0..1@2..3 1:0..0.5@3..3.5 ", true},
+        {{{s(0), 0.0, 1}, {s(1, 2), 6.0, 1}},
+         2,
+         s(1),
+         s(2),
+         "0@1 1:0..0.5@1..1.5 6@1.5 1:0.5..0@1.5..2 0@2 ",
+         true},
+    };
+    for (Case const& c : cases) {
+        EXPECT_EQ(shown(c.keys, c.mode, c.retiming).visit(Notes(), c.start, c.end).text.str(), c.visits)
+            << "mode " << c.mode << " from " << museumText(c.start) << " to " << museumText(c.end);
+    }
+}
+
+/// Times that can't be written exactly, so that a keypoint of a repeat is met beside where it is.
+bool isInexact(std::string const& name) {
+    return name == "incommensurable" || name == "two large primes" || name == "fine and long" ||
+           name == "ages" || name == "negative times";
+}
+
+/// Whether the pieces are the curve. They aren't where a type has no visit, where a keypoint is disabled, where several
+/// at one end continue the curve otherwise than they end it, where a fold lies aside of time, where cubic segments are
+/// too short to be read as a whole, and where a spline is closed.
+bool isWhollyVisited(Shown& curve, std::string const& name) {
+    auto const vertices = museumVertices(*curve.spline);
+    for (std::size_t i = 0; i < vertices.size(); ++i) {
+        std::uint32_t const type = vertices[i]->getInterpolation();
+        bool const hasVisit = type < 2 || type == 4 || (type > 5 && type < 9) || (type > 12 && type < 18);
+        bool const isShared = i > 0 && vertices[i - 1]->getValueU() == vertices[i]->getValueU();
+        if (!hasVisit || !vertices[i]->isEnabled(kTempusZero) || isShared)
+            return false;
+    }
+    return vertices.size() > 1 && vertices.size() < 100 && !curve.spline->isClosed() && name != "a fold" &&
+           !name.starts_with("shortest spans") && !isInexact(name);
+}
+
+/// In every segment and all its images, to and fro.
+std::vector<Tempus> samplePositions(KFSpline& spline) {
+    auto const vertices = museumVertices(spline);
+    Tempus const ends = vertices.front()->getValueU() + vertices.back()->getValueU();
+    Tempus const range = vertices.back()->getValueU() - vertices.front()->getValueU();
+    std::vector<Tempus> positions;
+    for (std::size_t i = 0; i + 1 < vertices.size(); ++i) {
+        Tempus const u = vertices[i]->getValueU();
+        for (int part = 0; part <= 40; ++part) {
+            Tempus const x = u + (vertices[i + 1]->getValueU() - u) * s(part, 40);
+            for (int cycle = -10; cycle <= 10; ++cycle) {
+                positions.push_back(x + range * cycle);
+                positions.push_back(ends - x + range * cycle);
+            }
+        }
+    }
+    return positions;
+}
+
+TEST(KFChannelSegmentVisitorMuseum, FindsTheExtremesOfAHostAndOfTheSamples) {
+    for (Exhibit const& exhibit : museum()) {
+        Shown curve(exhibit.build());
+        auto const at = ends(*curve.spline);
+        std::size_t const count = curve.spline->getNumberOfVertices();
+        std::size_t const stride = count > 1000 ? 9 : count > 100 ? 4 : 1;
+        bool const isSampled = isWhollyVisited(curve, exhibit.name);
+        auto const positions = isSampled ? samplePositions(*curve.spline) : std::vector<Tempus>();
+        for (std::uint32_t const mode : {0u, 1u, 2u, 3u, 4u, 9u}) {
+            curve.setModes(mode);
+            for (std::size_t i = 0; i < at.size(); i += stride) {
+                for (std::size_t j = i; j < at.size(); j += stride) {
+                    auto const host = curve.visit(ExtremesVisitor(), at[i], at[j]);
+                    auto const [low, high] = curve.extremes(at[i], at[j]);
+                    double const slack = isInexact(exhibit.name) ? 1e-12 : 0.0;
+                    ASSERT_TRUE((isSameDouble(low, host.min) && isSameDouble(high, host.max)) ||
+                                (std::fabs(low - host.min) <= slack && std::fabs(high - host.max) <= slack))
+                        << exhibit.name << ", mode " << mode << ", " << museumText(at[i]) << " to "
+                        << museumText(at[j]) << ": " << low << ' ' << host.min << ", " << high << ' '
+                        << host.max;
+                    EXPECT_LE(host.visits, 22 * 3 * static_cast<int>(count) + 4) << exhibit.name;
+                }
+            }
+            // The frames of a retimed ping-pong are mapped a step away from where the curve has them.
+            if (!isSampled || mode == 9 || (mode == 2 && curve.spline->getState()->retimingExtrapolation))
+                continue;
+            for (auto const& [i, j] :
+                 {std::pair<std::size_t, std::size_t>{0, at.size() - 1}, {3, 7}, {6, 12}}) {
+                auto const isIn = [&](Time t) { return at[i] <= t && t <= at[j]; };
+                double min = kMost, max = -kMost;
+                for (std::vector<Tempus> const& some : {positions, std::vector{at[i], at[j]}}) {
+                    for (Tempus const& t : some) {
+                        if (!isIn(t))
+                            continue;
+                        double const value = curve.spline->getVertexValue(t, kTempusZero, true);
+                        min = std::min(min, value);
+                        max = std::max(max, value);
+                    }
+                }
+                auto const [low, high] = curve.extremes(at[i], at[j]);
+                double const rounding = std::max(max - min, 1e-12) * 1e-9;
+                double const betweenSamples = rounding * 1e7;
+                EXPECT_TRUE(low <= min + rounding && high >= max - rounding && low >= min - betweenSamples &&
+                            high <= max + betweenSamples)
+                    << exhibit.name << ", mode " << mode << ", " << museumText(at[i]) << " to "
+                    << museumText(at[j]) << ": " << low << ' ' << min << ", " << high << ' ' << max;
+            }
+        }
+    }
+}
+
+TEST(KFChannelSegmentVisitor, FindsExtremesOfAnyNumberOfRepeats) {
+    Keys const keys{{s(0), 0.0, 4}, {s(1, 3), 5.0, 7}, {s(5, 6), -1.0, 0}, {s(1), 1.0, 1}};
+    for (std::uint32_t const mode : {2u, 3u, 4u}) {
+        Shown curve = shown(keys, mode);
+        for (std::int64_t const reach : {7, 8, 20, 1000}) {
+            for (auto const& [from, to] :
+                 {std::pair{s(-reach), s(reach)}, {s(3 * reach + 1, 3), s(5 * reach)}}) {
+                auto const host = curve.visit(ExtremesVisitor(), from, to);
+                EXPECT_EQ(curve.extremes(from, to), std::pair(host.min, host.max)) << mode << ' ' << reach;
+            }
+        }
+        // One by one these would take years.
+        std::int64_t const many = std::int64_t{1} << 50;
+        auto const all = curve.extremes(s(-many), s(many));
+        auto const some = curve.extremes(s(-9), s(9));
+        double const rise = mode == 4 ? static_cast<double>(many - 9) : 0.0;
+        EXPECT_EQ(all, std::pair(some.first - rise, some.second + rise));
+    }
+}
+
+TEST(KFChannelSegmentVisitor, AnswersWithoutCurveAndWithoutOutputs) {
+    Shown curve = shown({{s(0), 1.0, 1}, {s(1), -5.0, 1}});
+    double low = 7.0, high = 7.0;
+    EXPECT_FALSE(curve.channel.getCurrentMinAndMax(s(0), s(1), nullptr, nullptr));
+    EXPECT_TRUE(curve.channel.getCurrentMinAndMax(s(1, 2), s(1), nullptr, &high));
+    EXPECT_TRUE(curve.channel.getCurrentMinAndMax(s(1, 2), s(1), &low, nullptr));
+    EXPECT_EQ(std::pair(low, high), std::pair(-5.0, -2.0));
+    curve.channel.getCurveInterface()->setIsSpline(false, kTempusZero);
+    EXPECT_EQ(curve.visit(Notes(), s(9), s(8)).text.str(), "1@9..8 ");
+    delete curve.channel.releaseCurveInterface();
+    EXPECT_EQ(curve.extremes(s(0), s(1)), std::pair(kMost, -kMost));
+    std::vector<Tempus> times;
+    EXPECT_FALSE(curve.channel.getTimeForValue(1.0, times, {s(0), s(1)}, s(1, 30), 0));
+}
+
+// --- Mapping, against a walk in ticks ---
+
+/// One point that moves to and fro between 0 and a range, or runs from 0 to the range again and again.
+struct Walker {
+    std::int64_t range, step;
+    std::int64_t at = 0;
+    bool back = false;
+    long cycles = 0;
+
+    void pingPong() {
+        at += back ? -1 : 1;
+        if (at == 0 || at == range)
+            back = at == range;
+    }
+    void retimedPingPong() {
+        at += back ? -1 : 1;
+        if (at == (back ? 0 : range)) {
+            at = back ? step : range - step;
+            back = !back;
+        }
+    }
+};
+
+TEST(KFChannelSegmentVisitor, MapsTimesLikeAWalker) {
+    constexpr std::int64_t origin = -13;
+    auto const time = [](std::int64_t tick) { return s(tick * 1001, 30000); };
+    Tempus const minTime = time(origin);
+    bool reversed = false;
+    long cycles = 0;
+    for (std::int64_t const range : {1, 2, 5, 12}) {
+        Tempus const maxTime = time(origin + range);
+        for (std::int64_t const step : {1, 2, 5}) {
+            Walker plain{range, step};
+            Walker retimed{range, step, range - step, true};
+            for (std::int64_t tick = 0; tick < 60; ++tick, plain.pingPong()) {
+                for (bool const retiming : {false, true}) {
+                    Tempus const t = time(origin + tick);
+                    Tempus const mapped = KFChannelSegmentVisitor::mapPingPong(
+                        t, minTime, maxTime, time(step), retiming, &reversed);
+                    Walker expected = plain;
+                    if (retiming && tick >= range && range >= step) {
+                        expected = range == step ? Walker{range, step} : retimed;
+                        if (range != step)
+                            retimed.retimedPingPong();
+                    }
+                    EXPECT_EQ(mapped, time(origin + expected.at)) << range << ' ' << step << ' ' << tick;
+                    EXPECT_EQ(reversed, expected.back) << range << ' ' << step << ' ' << tick;
+                }
+                // The other way from the start the same places are passed, in the other direction.
+                Tempus const mapped = KFChannelSegmentVisitor::mapPingPong(
+                    time(origin - tick), minTime, maxTime, time(step), true, &reversed);
+                EXPECT_EQ(mapped, time(origin + plain.at));
+                EXPECT_EQ(reversed, plain.at == range || (plain.at != 0 && !plain.back));
+            }
+        }
+        for (std::int64_t tick = -60; tick < 60; ++tick) {
+            for (bool const retiming : {false, true}) {
+                std::int64_t place = tick;
+                long passed = 0;
+                if (tick > range || (retiming && tick == range)) {
+                    for (; place >= range; ++passed)
+                        place -= range;
+                } else if (tick < 0) {
+                    for (; place <= 0; ++passed)
+                        place += range;
+                }
+                Tempus const t = time(origin + tick);
+                EXPECT_EQ(
+                    KFChannelSegmentVisitor::mapProgressiveRepeat(t, minTime, maxTime, retiming, &cycles),
+                    time(origin + place));
+                EXPECT_EQ(cycles, passed) << range << ' ' << tick;
+                EXPECT_EQ(KFChannelSegmentVisitor::mapRepeat(t, minTime, maxTime, retiming),
+                          time(origin + place));
+            }
+        }
+    }
+}
+
+TEST(KFChannelSegmentVisitor, MapsWhatHasNoCyclesToTheStart) {
+    Tempus const ofAnotherEpoch{5, 1, kTempusFlagValid, -1};
+    bool reversed = true;
+    long cycles = 9;
+    for (auto const& [t, maxTime] : {std::pair{s(5), s(2)},
+                                     {s(5), s(1)},
+                                     {s(5), kTempusPositiveInfinity},
+                                     {kTempusNegativeInfinity, s(3)},
+                                     {kTempusInvalid, s(3)},
+                                     {ofAnotherEpoch, s(3)}}) {
+        EXPECT_EQ(KFChannelSegmentVisitor::mapPingPong(t, s(2), maxTime, s(1, 30), true, &reversed), s(2));
+        EXPECT_EQ(KFChannelSegmentVisitor::mapProgressiveRepeat(t, s(2), maxTime, true, &cycles), s(2));
+        EXPECT_TRUE(!reversed && cycles == 0);
+    }
+    // A quotient of rounded seconds would count one cycle less.
+    KFChannelSegmentVisitor::mapProgressiveRepeat(s(3, 10), s(0), s(1, 10), false, &cycles);
+    EXPECT_EQ(cycles, 3);
+    EXPECT_EQ(KFChannelSegmentVisitor::mapPingPong(s(5), s(0), s(2), s(1), false, nullptr), s(1));
+}
+
+// --- Times of a value ---
+
+TEST(KFChannelSegmentVisitor, FindsTheTimesOfAValue) {
+    RecordingRoot root;
+    root.setTimeOffset(s(100), true);
+    root.frameDuration = s(1, 2);
+    KFChannelDouble channel("", &root, 1, 0);
+    channel.willLoadKeyframes(true, 4);
+    for (int i = 0; i < 4; ++i)
+        channel.appendKeyframe(s(i), i % 2 == 0 ? 0.0 : 8.0, false);
+    channel.willLoadKeyframes(false, 0);
+    std::vector<Tempus> times{s(1)};
+    // The range ends a frame of the root before its end, 103.
+    EXPECT_TRUE(channel.getTimeForValue(6.0, times, {s(100), s(3)}, s(1000), 0));
+    EXPECT_EQ(times, (std::vector{s(1), s(403, 4), s(405, 4)}));
+    times.clear();
+    EXPECT_TRUE(channel.getTimeForValue(6.0, times, {s(100), s(4)}, s(1000), 1));
+    EXPECT_EQ(times, (std::vector{s(411, 4), s(405, 4), s(403, 4)}));
+    for (Tempus const& t : times)
+        EXPECT_EQ(channel.getValueAsDouble(t, 0.0), 6.0);
+    EXPECT_FALSE(channel.getTimeForValue(9.0, times, {s(100), s(4)}, s(1000), 0));
+    EXPECT_EQ(times.size(), 3u);
+
+    KFChannelDouble alone(2.0, "", nullptr, 1, 0);
+    times.clear();
+    EXPECT_TRUE(alone.getTimeForValue(2.0, times, {s(7), s(1)}, s(1, 30), 0));
+    EXPECT_EQ(times, std::vector{s(7)});
+}
+
+} // namespace

@@ -1,0 +1,540 @@
+#include "lumenkey/foundation/BXHashWriteStream.h"
+#include "lumenkey/foundation/BXXMLReadStream.h"
+#include "lumenkey/foundation/BXXMLWriteStream.h"
+
+#include <gtest/gtest.h>
+
+#include <chrono>
+#include <cstdio>
+#include <fstream>
+#include <functional>
+#include <random>
+
+namespace {
+
+constexpr BXScope kRootScope[] = {
+    BXScope::element("kfml", 91),      BXScope::attribute("version", 91, 116),
+    BXScope::element("group", 1),      BXScope::attribute("name", 1, 11),
+    BXScope::attribute("id", 1, 12),   BXScope::element("leaf", 2),
+    BXScope::attribute("name", 2, 11), BXScope::end(),
+};
+/// Gives `leaf` and an attribute of `group` other numbers.
+constexpr BXScope kInnerScope[] = {
+    BXScope::element("leaf", 3),
+    BXScope::element("deep", 4),
+    BXScope::attribute("id", 1, 13),
+    BXScope::end(),
+};
+
+/// Writes down all that it is given: begins, ends, and elements with tag, text and name.
+class Recorder : public BXSerializer {
+public:
+    using Hook = std::function<bool(BXSerializerReadStream&, BXStreamElement&)>;
+
+    Recorder(std::string label, std::string& log, Hook onElement = {})
+        : hook(std::move(onElement)), _label(std::move(label)), _log(log) {}
+
+    void writeHeader(BXSerializerWriteStream&, bool) override {}
+    void writeBody(BXSerializerWriteStream&, bool, bool, bool) override {}
+    void markFactoriesForSerialization(BXSerializerWriteStream&, bool) override {}
+    bool parseBegin(BXSerializerReadStream& stream) override {
+        _log += _label + "( ";
+        if (scope != nullptr) {
+            stream.pushScope(scope);
+        }
+        return true;
+    }
+    bool parseEnd(BXSerializerReadStream&) override {
+        _log += _label + ") ";
+        return true;
+    }
+    bool parseElement(BXSerializerReadStream& stream, BXStreamElement& element) override {
+        BXString text;
+        _log += _label + std::to_string(element.tag());
+        _log += element.getAsString(&text) ? "'" + text.str() + "' " : " ";
+        return !hook || hook(stream, element);
+    }
+
+    Hook hook;
+    BXScope const* scope = nullptr;
+
+private:
+    std::string _label;
+    std::string& _log;
+};
+
+std::span<std::uint8_t const> bytesOf(std::string_view text) {
+    return {reinterpret_cast<std::uint8_t const*>(text.data()), text.size()};
+}
+
+/// What a handler below all others writes down, then what failed.
+std::string reading(std::string_view document, Recorder::Hook hook = {}) {
+    std::string log;
+    Recorder bottom("", log, std::move(hook));
+    BXXMLReadStream stream(bytesOf(document));
+    stream.pushScope(kRootScope);
+    stream.pushHandler(&bottom);
+    bool const isWhole = stream.parse();
+    EXPECT_EQ(isWhole, stream.failure() == nullptr);
+    if (BXReadFailure const* failure = stream.failure()) {
+        log += std::to_string(failure->line) + ":" + std::to_string(failure->column) + ": " + failure->reason;
+    }
+    return log;
+}
+
+template <typename Write> std::string written(Write const& write, bool isWhole = true) {
+    BXBufferWriteStream buffer(16, 16);
+    BXXMLWriteStream stream(buffer, 5, 13);
+    stream.pushScope(kRootScope);
+    write(stream);
+    EXPECT_EQ(stream.close(), isWhole);
+    BXData const data = buffer.copyData();
+    EXPECT_EQ(buffer.takeData(), data);
+    EXPECT_EQ(buffer.size(), 0u);
+    return {data.begin(), data.end()};
+}
+
+/// Refuses what goes beyond a number of bytes.
+class FullSink final : public BXStream {
+public:
+    explicit FullSink(std::size_t room) : _room(room) {}
+    bool write(void const*, std::size_t size) override {
+        EXPECT_FALSE(_isFull) << "called after it refused";
+        _isFull = size > _room;
+        _room -= std::min(_room, size);
+        return !_isFull;
+    }
+
+private:
+    std::size_t _room;
+    bool _isFull = false;
+};
+
+constexpr std::string_view kDeclaration = "<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n";
+
+} // namespace
+
+// Writing -------------------------------------------------------------------------------------------------------------
+
+TEST(BXXMLWriteStream, WritesLinesAndAttributesInOrder) {
+    std::string const text = written([](BXXMLWriteStream& stream) {
+        stream.startElement(1);
+        stream.writeAttribute(12, std::uint32_t{7});
+        stream.writeAttribute(11, BXString("a \"b\"\n"));
+        stream.pushScope(kInnerScope);
+        stream.startElement(4);
+        stream.popScope(); // an element keeps its name
+        stream.startElement(2);
+        stream.writeValue(BXString("<x>\n"));
+        stream.endElement();
+        stream.startElement(2);
+        stream.writeAttribute(11, TempusMake(1, 24));
+        stream.writeValue(BXString());
+        stream.endElement();
+        stream.endElement();
+        stream.endLine();
+        stream.pushScope(kInnerScope);
+        stream.startElement(3); // the name of the inner scope
+        stream.writeValue(true);
+        stream.endElement();
+        stream.popScope();
+        stream.endElement();
+    });
+    EXPECT_EQ(text, std::string(kDeclaration) + "<kfml version=\"5.13\">\n"
+                                                "  <group id=\"7\" name=\"a &quot;b&quot;&#10;\">\n"
+                                                "    <deep>\n"
+                                                "      <leaf>&lt;x&gt;\n</leaf>\n"
+                                                "      <leaf name=\"1/24\"/>\n"
+                                                "    </deep>\n"
+                                                "    <leaf>1</leaf>\n"
+                                                "  </group>\n"
+                                                "</kfml>\n");
+    EXPECT_EQ(written([](BXXMLWriteStream&) {}), std::string(kDeclaration) + "<kfml version=\"5.13\"/>\n");
+}
+
+TEST(BXXMLWriteStream, LeavesOutWhatHasNoPlace) {
+    auto const misuse = [](BXXMLWriteStream& stream) {
+        stream.writeValue(1.0);         // no element
+        stream.writeAttribute(12, 1.0); // nor here
+        stream.endElement();
+        stream.startElement(1);
+        stream.writeAttribute(12, true);
+        stream.writeAttribute(12, false); // twice
+        stream.writeAttribute(99, true);  // no name
+        stream.startElement(99);
+        stream.writeAttribute(12, true);
+        stream.startElement(2);
+        stream.endElement();
+        stream.endElement();
+        stream.startElement(2);
+        stream.endElement();
+        stream.writeAttribute(11, true); // behind content
+        stream.writeValue(5.0);          // behind a child
+        stream.popScope();
+        stream.popScope();
+    };
+    EXPECT_EQ(written(misuse, false), std::string(kDeclaration) + "<kfml version=\"5.13\">\n"
+                                                                  "  <group id=\"1\">\n"
+                                                                  "    <leaf/>\n"
+                                                                  "  </group>\n"
+                                                                  "</kfml>\n");
+}
+
+TEST(BXXMLWriteStream, RemembersThatTheSinkRefused) {
+    for (std::size_t const room : {0u, 100u, 40000u, 150000u}) {
+        FullSink sink(room);
+        BXXMLWriteStream stream(sink, 5, 13);
+        stream.pushScope(kRootScope);
+        for (int i = 0; i < 5000; ++i) {
+            stream.startElement(2);
+            stream.writeValue(i * 0.1);
+            stream.endElement();
+        }
+        stream.startElement(2);
+        stream.writeValue(BXString(std::string(50000, 'x')));
+        stream.endElement();
+        EXPECT_FALSE(stream.close());
+        EXPECT_FALSE(stream.close());
+    }
+}
+
+// Reading -------------------------------------------------------------------------------------------------------------
+
+TEST(BXXMLReadStream, HandsOverContainersFirstAndLeavesAtTheirEnd) {
+    EXPECT_EQ(reading("<kfml version='5.13'>\n"
+                      "  <group name='g'>text <leaf> a&amp;b<![CDATA[<c>]]>\n </leaf> more <leaf/></group>\n"
+                      "  <unknown><leaf>inside</leaf><kfml/></unknown>\n"
+                      "  <!-- comment --><?target x?>\n"
+                      "</kfml>\n"),
+              "( 91 1 2' a&b<c>\n ' 2'' ) ");
+    EXPECT_EQ(reading("<other><leaf/></other>"), "( ) ");
+}
+
+TEST(BXXMLReadStream, EndsHandlersAndScopesWithTheirElement) {
+    std::string log;
+    Recorder inner("i", log, [](BXSerializerReadStream&, BXStreamElement& element) {
+        return element.tag() != 4; // refused: known only by the scope that this handler pushes
+    });
+    inner.scope = kInnerScope;
+    Recorder second("s", log);
+    auto const push = [&](BXSerializerReadStream& stream, BXStreamElement& element) {
+        if (element.tag() == 1) {
+            stream.pushHandler(nullptr);
+            stream.pushHandler(&inner);
+            stream.pushHandler(&second);
+        }
+        return true;
+    };
+    auto const run = [&](std::string_view document) {
+        log.clear();
+        Recorder bottom("b", log, push);
+        BXXMLReadStream stream(bytesOf(document));
+        stream.pushScope(kRootScope);
+        stream.pushHandler(&bottom);
+        EXPECT_TRUE(stream.parse());
+        EXPECT_TRUE(stream.parse()) << "again";
+        return log;
+    };
+    // `leaf` is 3 inside, by the scope of the inner handler, and 2 again behind it.
+    EXPECT_EQ(run("<kfml><leaf/><group><leaf>x</leaf><group/></group><leaf/><deep/></kfml>"),
+              "b( b91 b2'' b1 i( s( s3'x' s1'' s) i) b2'' b) ");
+    EXPECT_EQ(run("<kfml><group/><leaf/></kfml>"), "b( b91 b1'' i( s( s) i) b2'' b) ");
+    EXPECT_EQ(reading("<group><leaf/></group>",
+                      [](BXSerializerReadStream&, BXStreamElement& element) { return element.tag() == 1; }),
+              "( 1 2'' ) 1:15: a handler refused an element");
+}
+
+TEST(BXXMLReadStream, PassesOverWhatIsSkipped) {
+    std::string const document =
+        "<kfml><group><group><leaf/></group></group><leaf>a</leaf><leaf>b</leaf></kfml>";
+    EXPECT_EQ(reading(document,
+                      [](BXSerializerReadStream& stream, BXStreamElement& element) {
+                          if (element.tag() != 91) {
+                              stream.skipElement(); // at the end of a leaf there is nothing left to skip
+                          }
+                          return true;
+                      }),
+              "( 91 1 2'a' 2'b' ) ");
+}
+
+TEST(BXXMLReadStream, FindsAttributesByTheScopesOfTheMoment) {
+    std::string found;
+    auto const ask = [&](BXSerializerReadStream& stream, BXStreamElement& element) {
+        std::uint32_t id = 0;
+        BXString name("untouched");
+        auto const note = [&](std::uint32_t tag) {
+            found += element.getAttributeAsUInt32(tag, &id) ? std::to_string(id) + " " : "- ";
+        };
+        note(12);
+        note(13);
+        stream.pushScope(kInnerScope); // makes `id` of `group` 13
+        note(12);
+        note(13);
+        EXPECT_FALSE(element.getAttributeAsUInt32(11, &id)); // no number
+        EXPECT_TRUE(element.getAttributeAsString(11, &name));
+        EXPECT_EQ(name, std::string_view("a\\\x01"));
+        EXPECT_EQ(element.getAttributeAsUUID(11), nullptr);
+        return true;
+    };
+    EXPECT_EQ(reading("<group other='1' id=' 5 ' name='a\\\\x01'/>", ask), "( 1'' ) ");
+    EXPECT_EQ(found, "5 - - 5 ");
+}
+
+TEST(BXXMLReadStream, ReadsWhatWasWritten) {
+    std::mt19937_64 random(4);
+    std::vector<std::string> texts;
+    for (int i = 0; i < 300; ++i) {
+        std::string& text = texts.emplace_back();
+        for (auto n = random() % 40; n != 0; --n) {
+            text += static_cast<char>(random() % 2 == 0 ? random() : "\\x41&<\r\n\t \xC3\xA4"[random() % 12]);
+        }
+    }
+    BXUUID const uuid{{0x4B723EA5, 0x244311D7, 0x9C750003, 0x9366FB58}};
+    std::string const document = written([&](BXXMLWriteStream& stream) {
+        for (std::string const& text : texts) {
+            stream.startElement(1);
+            stream.writeAttribute(11, BXString(text));
+            stream.writeAttribute(12, uuid);
+            stream.writeValue(BXString(text));
+            stream.endElement();
+        }
+    });
+    std::size_t next = 0;
+    reading(document, [&](BXSerializerReadStream& stream, BXStreamElement& element) {
+        BXString value;
+        BXString name;
+        if (element.tag() == 1) {
+            EXPECT_TRUE(stream.getAsString(element, &value) &&
+                        stream.getAttributeAsString(element, 11, &name));
+            EXPECT_EQ(value.str(), texts[next]);
+            EXPECT_EQ(name.str(), texts[next++]);
+            std::unique_ptr<BXUUID> const read(stream.getAttributeAsUUID(element, 12));
+            EXPECT_TRUE(read && *read == uuid);
+        }
+        return true;
+    });
+    EXPECT_EQ(next, texts.size());
+}
+
+TEST(BXXMLReadStream, FailsAtEveryCut) {
+    std::string const document = "<?xml version=\"1.0\"?>\n<kfml version=\"5.13\">\n<!-- \u00C4 -->"
+                                 "<group id='&#65;'><![CDATA[x]]></group>&amp;</kfml>";
+    EXPECT_EQ(reading(document), "( 91 1'x' ) ");
+    for (std::size_t size = 0; size < document.size(); ++size) {
+        // In memory of its own, so that reading past the end is seen.
+        std::vector<char> const cut(document.begin(), document.begin() + static_cast<std::ptrdiff_t>(size));
+        std::string const log = reading(std::string_view(cut.data(), cut.size()));
+        EXPECT_NE(log.find(") "), std::string::npos) << "no parseEnd";
+        EXPECT_NE(log.find(": "), std::string::npos) << size;
+    }
+}
+
+TEST(BXXMLReadStream, TellsWhereAndWhyItFailed) {
+    struct Row {
+        std::string document;
+        char const* log;
+    };
+    using namespace std::string_literals;
+    Row const rows[] = {
+        {"", "( ) 1:1: no element found"},
+        {"<kfml>\n <leaf></group>\n</kfml>", "( 91 ) 2:10: mismatched tag"},
+        {"<kfml>\n\n  a\0b</kfml>"s, "( ) 3:4: not well-formed (invalid token)"},
+        {"<kfml>\u00C4\xFF</kfml>", "( ) 1:8: not well-formed (invalid token)"},
+        {"<kfml/><kfml/>", "( 91'' ) 1:8: junk after document element"},
+        {"<kfml a='1' a='2'/>", "( ) 1:13: duplicate attribute"},
+        {"<kfml>&x;</kfml>", "( ) 1:7: undefined entity"},
+        {"<!DOCTYPE kfml>\n<kfml/>", "( ) 1:15: a document type declaration is not allowed"},
+        {"<!DOCTYPE kfml [<!ENTITY a 'aa'><!ENTITY b '&a;&a;'>]><kfml>&b;</kfml>",
+         "( ) 1:16: a document type declaration is not allowed"},
+        {"<!DOCTYPE kfml SYSTEM 'file:///etc/passwd'><kfml/>",
+         "( ) 1:43: a document type declaration is not allowed"},
+        {"<?xml version='1.0' encoding='EBCDIC'?><kfml/>", "( ) 1:31: unknown encoding"},
+    };
+    for (Row const& row : rows) {
+        EXPECT_EQ(reading(row.document), row.log) << row.document;
+    }
+
+    BXXMLReadStream missing(BXURL("/no/such/file"));
+    EXPECT_FALSE(missing.parse());
+    EXPECT_EQ(missing.failure()->line, 0u);
+    EXPECT_EQ(missing.failure()->reason.find("the file can't be opened: "), 0u);
+    BXXMLReadStream folder(BXURL("/"));
+    EXPECT_FALSE(folder.parse());
+    EXPECT_EQ(folder.failure()->reason.find("the file can't be read: "), 0u);
+}
+
+TEST(BXXMLReadStream, TakesTheEncodingsOfXml) {
+    std::string utf16("\xFF\xFE");
+    for (char const c : std::string_view("<leaf>a\xC4</leaf>")) {
+        utf16 += c;
+        utf16 += '\0';
+    }
+    EXPECT_EQ(reading(utf16), "( 2'a\u00C4' ) ");
+    EXPECT_EQ(reading("\xEF\xBB\xBF<leaf>\u00C4</leaf>"), "( 2'\u00C4' ) ");
+    EXPECT_EQ(reading("<?xml version='1.0' encoding='ISO-8859-1'?><leaf>\xC4</leaf>"), "( 2'\u00C4' ) ");
+}
+
+TEST(BXXMLReadStream, KeepsItsLimits) {
+    auto const nested = [](std::size_t depth) {
+        std::string text;
+        for (std::size_t i = 0; i < depth; ++i) {
+            text += "<leaf>";
+        }
+        for (std::size_t i = 0; i < depth; ++i) {
+            text += "</leaf>";
+        }
+        return text;
+    };
+    EXPECT_EQ(reading(nested(1000)).find("deep"), std::string::npos);
+    std::string const deep = reading(nested(1'000'000));
+    EXPECT_NE(deep.find(") 1:6001: elements lie more than 1000 deep in each other"), std::string::npos)
+        << deep.substr(deep.size() - 100);
+    EXPECT_NE(reading("<x>" + nested(1'000'000) + "</x>").find("1000 deep"), std::string::npos)
+        << "passed over";
+
+    std::string const document = nested(1);
+    for (std::uint64_t const limit : {document.size(), document.size() - 1}) {
+        BXXMLReadStream stream(bytesOf(document));
+        stream.setSizeLimit(limit);
+        EXPECT_EQ(stream.parse(), limit == document.size());
+    }
+}
+
+TEST(BXXMLReadStream, ReadsLongTextsAndTagsInLinearTime) {
+    std::size_t const limit = std::size_t{64} << 20;
+    auto const start = std::chrono::steady_clock::now();
+    std::string const fits(limit, 'x');
+    std::size_t size = 0;
+    auto const measure = [&](BXSerializerReadStream&, BXStreamElement& element) {
+        BXString text;
+        size = element.getAttributeAsString(11, &text) || element.getAsString(&text) ? text.size() : 0;
+        return true;
+    };
+    auto const fails = [&](std::string const& document) {
+        BXXMLReadStream stream(bytesOf(document));
+        std::string log;
+        Recorder bottom("", log, measure);
+        stream.pushScope(kRootScope);
+        stream.pushHandler(&bottom);
+        return !stream.parse();
+    };
+    EXPECT_FALSE(fails("<leaf>" + fits + "</leaf>"));
+    EXPECT_EQ(size, limit);
+    EXPECT_TRUE(fails("<leaf>" + fits + "x</leaf>"));
+    std::string const attribute = fits.substr(0, limit - 100);
+    EXPECT_FALSE(fails("<leaf name='" + attribute + "'/>"));
+    EXPECT_EQ(size, attribute.size());
+    EXPECT_TRUE(fails("<leaf name='" + fits + fits + fits + "'/>"));
+    // Beginning such a tag anew with each block would take minutes.
+    EXPECT_LT(std::chrono::steady_clock::now() - start, std::chrono::seconds(60));
+}
+
+TEST(BXXMLReadStream, ReadsFilesBlockByBlock) {
+    std::string const path = ::testing::TempDir() + "lumenkey_streams_test.kfml";
+    std::string expected = "( 91 ";
+    {
+        std::ofstream file(path, std::ios::binary);
+        file << "<kfml>";
+        for (int i = 0; i < 50000; ++i) {
+            file << "\n  <leaf name='n'>" << i << "</leaf>";
+            expected += "2'" + std::to_string(i) + "' ";
+        }
+        file << "</kfml>";
+    }
+    std::string log;
+    Recorder bottom("", log);
+    BXXMLReadStream stream{BXURL(path)};
+    stream.pushScope(kRootScope);
+    stream.pushHandler(&bottom);
+    EXPECT_TRUE(stream.parse());
+    EXPECT_TRUE(log == expected + ") ");
+    std::remove(path.c_str());
+}
+
+// Digests -------------------------------------------------------------------------------------------------------------
+
+TEST(BXHashWriteStream, TellsNeighboursApart) {
+    using Write = std::function<void(BXHashWriteStream&)>;
+    // No two of these are alike; those of one row are.
+    std::vector<std::vector<Write>> const rows = {
+        {[](auto&) {}, [](auto& s) { s.endElement(); },
+         [](auto& s) {
+             s.pushScope(kRootScope);
+             s.endLine();
+         }},
+        {[](auto& s) { s.startElement(1); }},
+        {[](auto& s) { s.startElement(2); }},
+        {[](auto& s) {
+             s.startElement(1);
+             s.endElement();
+         },
+         [](auto& s) {
+             s.endElement();
+             s.startElement(1);
+             s.endElement();
+             s.endElement();
+         }},
+        {[](auto& s) {
+            s.writeValue(BXString("ab"));
+            s.writeValue(BXString("c"));
+        }},
+        {[](auto& s) {
+            s.writeValue(BXString("a"));
+            s.writeValue(BXString("bc"));
+        }},
+        {[](auto& s) { s.writeValue(BXString("abc")); }},
+        {[](auto& s) {
+            s.writeValue(BXString("abc"));
+            s.writeValue(BXString());
+        }},
+        {[](auto& s) { s.writeValue(true); }},
+        {[](auto& s) { s.writeValue(std::uint32_t{1}); }},
+        {[](auto& s) { s.writeValue(std::uint64_t{1}); }},
+        {[](auto& s) { s.writeAttribute(1, std::uint32_t{1}); }},
+        {[](auto& s) { s.writeAttribute(2, std::uint32_t{1}); }},
+        {[](auto& s) { s.writeValue(0.0); }},
+        {[](auto& s) { s.writeValue(-0.0); }},
+        {[](auto& s) { s.writeValue(std::numeric_limits<double>::quiet_NaN()); }},
+        {[](auto& s) { s.writeValue(-std::numeric_limits<double>::quiet_NaN()); }},
+        {[](auto& s) { s.writeValue(TempusMake(1, 2)); }},
+        {[](auto& s) { s.writeValue(TempusMake(2, 4)); }},
+        {[](auto& s) {
+            s.writeValue(BXUUID{{1, 0, 0, 0}});
+        }},
+        {[](auto& s) {
+            s.writeValue(BXUUID{{0, 0, 0, 1}});
+        }},
+    };
+    std::vector<std::array<std::uint8_t, 16>> seen;
+    for (auto const& row : rows) {
+        for (Write const& write : row) {
+            BXHashWriteStream stream;
+            EXPECT_TRUE(stream.isHashStream());
+            write(stream);
+            auto const hash = stream.getHash();
+            EXPECT_EQ(stream.getHash(), hash);
+            if (&write == &row.front()) {
+                EXPECT_EQ(std::count(seen.begin(), seen.end(), hash), 0) << seen.size();
+                seen.push_back(hash);
+            } else {
+                EXPECT_EQ(hash, seen.back()) << seen.size();
+            }
+        }
+    }
+}
+
+TEST(BXHashWriteStream, DoesNotDependOnHowBytesAreCut) {
+    // Asking in between cuts the input elsewhere; strings around the size of its block are what could go wrong.
+    BXHashWriteStream whole;
+    BXHashWriteStream cut;
+    for (std::size_t size = 0; size < 3000; size += 7) {
+        for (BXHashWriteStream* stream : {&whole, &cut}) {
+            stream->startElement(static_cast<std::uint32_t>(size));
+            stream->writeAttribute(3, TempusMake(static_cast<std::int64_t>(size), 24));
+            stream->writeValue(BXString(std::string(size, 'x')));
+            stream->endElement();
+        }
+        cut.getHash();
+    }
+    EXPECT_EQ(whole.getHash(), cut.getHash());
+}
