@@ -61,7 +61,7 @@ TEST_F(EditVerbsTest, KeypointsMoveInTimeAndValue) {
         {{"offset", "--by", "-1/3"}, "-1/3=0,5 2/3=2, 5/3=4,7 8/3=6,1 11/3=8, "},
         // What lies where the stretch comes to gives way, on either side.
         {{"offset", "X", "--by", "2", "--to", "1"}, "0/1=,5 2/1=0,7 3/1=2,1 4/1=8, "},
-        {{"offset", "X", "--by", "-1.5", "--from", "3f"}, "0/1=0,5 1/1=2, 3/2=6, 2/1=,7 5/2=8, 3/1=,1 "},
+        {{"offset", "X", "--by", "-3/2", "--from", "3f"}, "0/1=0,5 1/1=2, 3/2=6, 2/1=,7 5/2=8, 3/1=,1 "},
         {{"scale", "--factor", "-0.5"}, "0/1=-0,-2.5 1/1=-1, 2/1=-2,-3.5 3/1=-3,-0.5 4/1=-4, "},
         {{"scale", "X", "--factor", "3", "--to", "2.5"}, "0/1=0,5 1/1=6, 2/1=12,7 3/1=6,1 4/1=8, "},
         {{"retime", "--factor", "1/3", "--about", "3"}, "2/1=0,5 7/3=2, 8/3=4,7 3/1=6,1 10/3=8, "},
@@ -272,6 +272,7 @@ TEST_F(EditVerbsTest, WrongArgumentsAreToldBeforeAnythingIsWritten) {
         {none, {"reverse", "--plot", "p.bmp"}, "out.csv", "must end in .svg, .png or .pdf"},
         {none, {"reverse", "--from", "soon"}, "out.csv", "'soon' is no time"},
         {none, {"reverse", "--rows", "all"}, "out.csv", "--rows"},
+        {_folder.file("none.bvh"), {"reverse", "--rows", "input"}, "out.bvh", "--rows is for a table"},
         {none, {"simplify"}, "out.csv", "--tolerance is required"},
         {none, {"simplify", "--tolerance", "-1"}, "out.csv", "--tolerance must be 0 or above"},
         {none, {"bake", "--tolerance", "nan"}, "out.csv", "--tolerance must be 0 or above"},

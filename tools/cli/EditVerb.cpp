@@ -74,7 +74,10 @@ public:
 
 private:
     void readOptions() {
-        requireOutputFormat(_options.output, channelFormatNamed(_options.file));
+        ChannelFormat const format = requireOutputFormat(_options.output, channelFormatNamed(_options.file));
+        if (format != ChannelFormat::Csv && !_options.rows.empty()) {
+            throw UsageError{"--rows is for a table: '" + _options.output + "' must end in .csv then"};
+        }
         if (!_options.plot.empty()) {
             _picture = requirePlotFormat(_options.plot);
         }
