@@ -5,6 +5,7 @@ struct Bench;
 /// Each registers its benchmarks, which refer to `bench` until they have run.
 void registerEvaluation(Bench& bench);
 void registerEditing(Bench& bench);
+void registerReshaping(Bench& bench);
 void registerMemory(Bench& bench);
 void registerThreads(Bench& bench);
 void registerTree(Bench& bench);

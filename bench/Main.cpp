@@ -56,6 +56,7 @@ int main(int argc, char** argv) {
         bench.setQuick();
     registerEvaluation(bench);
     registerEditing(bench);
+    registerReshaping(bench);
     registerMemory(bench);
     registerThreads(bench);
     registerTree(bench);

@@ -36,7 +36,9 @@ private:
 KFChannel::KFChannel(KFFactory* factory, BXString const& name, KFChannelFolder* parent, unsigned int id,
                      unsigned int flags, KFChannelImpl* impl, KFChannelInfo* info)
     : KFChannelBase(factory, name, parent, id, flags), _impl(impl), _prototypeImpl(impl), _info(info),
-      _prototypeInfo(info) {}
+      _prototypeInfo(info) {
+    setValueChannel(true);
+}
 
 KFChannel::KFChannel(KFFactory* factory, BXString const& name, unsigned int id, KFChannelImpl* impl,
                      KFChannelInfo* info)
@@ -49,16 +51,21 @@ KFChannel::KFChannel(KFChannel const& other)
       _prototypeImpl(other._prototypeImpl == other._impl ? _impl : other._prototypeImpl),
       _info(KFChannelInfo::sharedOrCopied(other._info)),
       _prototypeInfo(other._prototypeInfo == other._info ? _info : other._prototypeInfo),
-      _prototypeCurve(cloneOf(other._prototypeCurve.get())) {}
+      _prototypeCurve(cloneOf(other._prototypeCurve.get())) {
+    setValueChannel(true);
+}
 
 KFChannel::KFChannel(KFChannel const& other, KFChannelFolder* parent)
     : KFChannelBase(other, parent), _impl(KFChannelImpl::sharedOrCopied(other._impl)),
       _prototypeImpl(other._prototypeImpl == other._impl ? _impl : other._prototypeImpl),
       _info(KFChannelInfo::sharedOrCopied(other._info)),
       _prototypeInfo(other._prototypeInfo == other._info ? _info : other._prototypeInfo),
-      _prototypeCurve(cloneOf(other._prototypeCurve.get())) {}
+      _prototypeCurve(cloneOf(other._prototypeCurve.get())) {
+    setValueChannel(true);
+}
 
 KFChannel::~KFChannel() {
+    setValueChannel(false);
     freeLocalImpl();
     freeLocalInfo();
 }

@@ -24,7 +24,8 @@ struct KFFadeBlock;
 /// at its class's state is a few pointers, and owns no memory of its own but a long name.
 ///
 /// Times are global unless an operation says curve time: `globalToLocalTime` converts, down to the nearest time
-/// converter or object root. Doubles are equal within 1e-7.
+/// converter or object root. Where that rounds, the keypoint whose global time is asked for counts as standing there;
+/// a step to a neighbouring keypoint never ends where it began. Doubles are equal within 1e-7.
 ///
 /// A locked channel (bit 2 of its own) ignores every form of setting, removing and moving values, `offsetChannel`,
 /// `scaleChannel`, the limits, the switches of the curve's shape, and the beginning of takes. It obeys `resetToDefault`, `setInitialValue`,

@@ -256,6 +256,8 @@ public:
     // Place -------------------------------------------------------------------------------------------------
 
     KFChannelFolder* getParent() const noexcept { return _parent; }
+    /// Whether this is a `KFChannel`, so that walks over many nodes needn't cast to find out.
+    bool isValueChannel() const noexcept { return _isValueChannel; }
     /// Leaves another parent's list first and stores the new one; false if it had another.
     bool registerParent(KFChannelFolder* parent);
     /// False if there was none.
@@ -337,6 +339,8 @@ protected:
     void writeFlags(BXSerializerWriteStream& stream, WriteFlagType type) const;
     /// The flag word, without an announcement: for constructors.
     void storeFlags(KFChannelFlags flags) noexcept { _flags = flags; }
+    /// For `KFChannel` alone, while it is one.
+    void setValueChannel(bool on) noexcept { _isValueChannel = on; }
     /// Of the keypoints from `from` to `to`, both in global time, in ascending order.
     std::vector<Tempus> keypointTimesInRange(Tempus const& from, Tempus const& to) const;
     /// Without an announcement.
@@ -348,6 +352,7 @@ private:
     void copyControllerNames(KFChannelBase const& other) noexcept;
 
     unsigned int _id;
+    bool _isValueChannel = false;
     BXString _name;
     std::unique_ptr<BXString> _internalName;
     KFChannelFolder* _parent = nullptr;

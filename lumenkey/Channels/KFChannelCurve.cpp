@@ -9,9 +9,8 @@
 // --- Spline or constant ---
 
 bool KFChannel::isSpline() const {
-    std::uint32_t type = 0;
-    auto* const used = _impl == nullptr ? nullptr : _impl->getCurve();
-    return used != nullptr && used->getCurveType(&type) && type == 1;
+    auto const* const used = _impl == nullptr ? nullptr : _impl->getCurve();
+    return used != nullptr && used->isSpline();
 }
 
 void KFChannel::setIsSpline(bool on) {

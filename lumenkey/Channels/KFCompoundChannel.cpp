@@ -4,7 +4,9 @@
 
 namespace {
 
-KFChannel* asValue(KFChannelBase* child) noexcept { return dynamic_cast<KFChannel*>(child); }
+KFChannel* asValue(KFChannelBase* child) noexcept {
+    return child != nullptr && child->isValueChannel() ? static_cast<KFChannel*>(child) : nullptr;
+}
 
 KFCompoundChannel* asCompound(KFChannelBase* child) noexcept {
     return child->isCompoundChannel() ? static_cast<KFCompoundChannel*>(child) : nullptr;

@@ -17,6 +17,10 @@ constexpr double kHopelessFactor = 4.0;
 constexpr double kLongestHandle = 0.95;
 /// Cuts at the worst point may shave off one point at a time; below this depth they halve.
 constexpr int kWorstPointDepth = 32;
+/// Stretches of more points than the second are first looked at through the first number of their points: far too long
+/// ones, as most are at the beginning of a long row, so cost little. Tuned.
+constexpr std::size_t kProbePoints = 64;
+constexpr std::size_t kLongestUnprobed = 256;
 /// A least-squares handle below this part of the chord is degenerate (Schneider's number).
 constexpr double kShortestHandle = 1e-6;
 
@@ -58,16 +62,12 @@ Point direction(Point const& from, Point const& to) noexcept {
 
 class Fitter {
 public:
-    Fitter(std::vector<Point> const& points, std::vector<Point>& result, double tolerance)
-        : _points(points), _result(result), _tolerance(tolerance),
-          _ordered(std::adjacent_find(points.begin(), points.end(),
-                                      [](Point const& a, Point const& b) { return !(a.x < b.x); }) ==
-                   points.end()),
-          _parameters(points.size()) {}
+    Fitter(std::vector<Point> const& points, double tolerance, bool ordered)
+        : _points(points), _tolerance(tolerance), _ordered(ordered), _parameters(points.size()) {}
 
-    void run() {
+    void run(std::vector<Point>& result) {
         std::size_t const last = _points.size() - 1;
-        _result.push_back(_points[0]);
+        result.push_back(_points[0]);
         _pending.push_back(
             {0, last, direction(_points[0], _points[1]), direction(_points[last], _points[last - 1]), 0});
         while (!_pending.empty()) {
@@ -75,8 +75,8 @@ public:
             _pending.pop_back();
             std::size_t cutAt = 0;
             Cubic piece;
-            if (fit(stretch, piece, cutAt)) {
-                _result.insert(_result.end(), piece.p + 1, piece.p + 4);
+            if (!isHopeless(stretch, cutAt) && fit(stretch, piece, cutAt)) {
+                result.insert(result.end(), piece.p + 1, piece.p + 4);
             } else {
                 cut(stretch, cutAt);
             }
@@ -84,6 +84,30 @@ public:
     }
 
 private:
+    std::size_t cutOf(Stretch const& s, std::size_t worst) const noexcept {
+        return s.depth < kWorstPointDepth ? worst : s.first + (s.last - s.first) / 2;
+    }
+
+    /// Whether a long stretch is so far from its piece, by a few of its points, that it must be cut at `cutAt`.
+    bool isHopeless(Stretch const& s, std::size_t& cutAt) const {
+        std::size_t const length = s.last - s.first;
+        if (length <= kLongestUnprobed) {
+            return false;
+        }
+        auto const indexOf = [&](std::size_t probe) { return s.first + length * probe / kProbePoints; };
+        std::vector<Point> points;
+        points.reserve(kProbePoints + 1);
+        for (std::size_t i = 0; i <= kProbePoints; ++i) {
+            points.push_back(_points[indexOf(i)]);
+        }
+        Fitter probe(points, _tolerance, _ordered);
+        Stretch const whole{0, kProbePoints, s.leaving, s.entering, 0};
+        probe.placeParameters(whole);
+        Deviation const worst = probe.measure(whole, probe.leastSquares(whole));
+        cutAt = cutOf(s, indexOf(worst.index));
+        return !(worst.distance <= kHopelessFactor * _tolerance);
+    }
+
     /// False if the stretch must be cut at `cutAt`, a point between its ends.
     bool fit(Stretch const& s, Cubic& piece, std::size_t& cutAt) {
         if (s.last - s.first == 1) {
@@ -103,7 +127,7 @@ private:
             }
             improveParameters(s, piece);
         }
-        cutAt = s.depth < kWorstPointDepth ? worst.index : s.first + (s.last - s.first) / 2;
+        cutAt = cutOf(s, worst.index);
         return false;
     }
 
@@ -189,9 +213,15 @@ private:
     /// How far the piece misses the points between its ends. Ordered points first get the parameters of their x.
     Deviation measure(Stretch const& s, Cubic const& piece) noexcept {
         Deviation worst{0.0, s.first + (s.last - s.first) / 2};
+        // From the piece's own start: far along x, rounding would keep the search from coming to an end.
+        double const start = piece.p[0].x;
+        Cubic fromStart = piece;
+        for (Point& point : fromStart.p) {
+            point.x -= start;
+        }
         for (std::size_t i = s.first + 1; i < s.last; ++i) {
             if (_ordered) {
-                _parameters[i] = parameterOfX(piece, _points[i].x, _parameters[i]);
+                _parameters[i] = parameterOfX(fromStart, _points[i].x - start, _parameters[i]);
             }
             Point const miss = piece.at(_parameters[i]) - _points[i];
             double const distance = _ordered ? std::fabs(miss.y) : miss.length();
@@ -218,7 +248,7 @@ private:
         }
     }
 
-    /// Where the piece, whose x rises from 0 to 1, has this x: Newton's steps, kept inside a shrinking bracket.
+    /// Where the piece, whose x rises from 0 on, has this x: Newton's steps, kept inside a shrinking bracket.
     static double parameterOfX(Cubic const& piece, double x, double guess) noexcept {
         constexpr int stepLimit = 60;
         double low = 0.0;
@@ -226,7 +256,7 @@ private:
         double t = guess;
         for (int step = 0; step < stepLimit; ++step) {
             double const miss = piece.at(t).x - x;
-            if (miss == 0.0) {
+            if (std::fabs(miss) <= 0x1p-53 * piece.p[3].x) {
                 break;
             }
             (miss < 0.0 ? low : high) = t;
@@ -243,7 +273,6 @@ private:
     }
 
     std::vector<Point> const& _points;
-    std::vector<Point>& _result;
     double const _tolerance;
     bool const _ordered;             // x strictly ascending
     std::vector<double> _parameters; // of each point within the piece at work
@@ -272,5 +301,7 @@ void BXCurveFit::FitCurve(std::vector<BXVector2<double>> const& points,
         result = points;
         return;
     }
-    Fitter(points, result, tolerance > 0.0 ? tolerance : 0.0).run();
+    auto const isNotAscending = [](Point const& a, Point const& b) { return !(a.x < b.x); };
+    bool const ordered = std::adjacent_find(points.begin(), points.end(), isNotAscending) == points.end();
+    Fitter(points, tolerance > 0.0 ? tolerance : 0.0, ordered).run(result);
 }

@@ -25,8 +25,8 @@ public:
     ///   the x range of their piece, so that no piece turns back in x.
     /// - otherwise: the distance of the point from the curve.
     ///
-    /// Cost: O(n) for each level of cuts; cuts fall in the middle once a stretch lies more than 32 deep, so at most
-    /// O(n log n). Nothing recurses.
+    /// Cost: about O(n), since a stretch that is far too long for a piece is recognised by a few of its points. At most
+    /// O(n log n): cuts fall in the middle once a stretch lies more than 32 deep. Nothing recurses.
     void FitCurve(std::vector<BXVector2<double>> const& points, std::vector<BXVector2<double>>& result,
                   double tolerance) const;
 

@@ -139,6 +139,22 @@ TEST(BXCurveFit, HoldsTheToleranceOverTime) {
     }
 }
 
+TEST(BXCurveFit, FitsLongRowsAlikeWhereverTheyStand) {
+    std::mt19937 engine(8103);
+    std::uniform_real_distribution<double> noise(-0.002, 0.002);
+    Points const row = sampled(5000, 1.0, [&](int i) { return std::sin(i * 0.05) + noise(engine); });
+    Points farAway = row;
+    for (Point& point : farAway)
+        point.x += 1e7;
+    std::size_t const pieces = expectGoodFit(row, 0.01);
+    EXPECT_EQ(expectGoodFit(farAway, 0.01), pieces);
+    // Cut where a few of its points are worst, it needs hardly more than its parts do.
+    std::size_t ofParts = 0;
+    for (auto part = row.begin(); part != row.end(); part += 250)
+        ofParts += fitted({part, part + 250}, 0.01).size() / 3;
+    EXPECT_LE(pieces, ofParts + ofParts / 10);
+}
+
 TEST(BXCurveFit, HoldsTheToleranceInThePlane) {
     std::mt19937 engine(8102);
     std::normal_distribution<double> normal;
