@@ -6,6 +6,9 @@
 #include "lumenkey/splines/KFSplineExtremes.h"
 #include "lumenkey/splines/KFVertex.h"
 
+#include <algorithm>
+#include <initializer_list>
+
 namespace {
 
 bool areNumbersOfOneEpoch(std::initializer_list<Tempus> times) {
@@ -222,9 +225,9 @@ bool KFSegmentWalk::maySkipCycles() {
 }
 
 void KFSegmentWalk::walkCycles(Side side, Cycles const& cycles, Tempus const& start, Tempus const& end) {
-    constexpr std::int64_t keptAtEitherEnd = 2; // one in each direction
+    constexpr int neededWhole = 2; // one in each direction
     bool const maySkip = maySkipCycles();
-    std::int64_t whole = 0;
+    int whole = 0;
     std::int64_t number = TempusFloorQuotient(start - cycles.anchor, cycles.length);
     Tempus begin = start - TempusModulo(start - cycles.anchor, cycles.length);
     for (Tempus target = start;; target = begin) {
@@ -234,12 +237,10 @@ void KFSegmentWalk::walkCycles(Side side, Cycles const& cycles, Tempus const& st
         if (!walkCycle(cycles, cycle, target, end))
             return;
         std::int64_t passed = 1;
-        whole += target == begin ? 1 : 0;
-        if (maySkip && whole >= keptAtEitherEnd) {
-            std::int64_t const left = TempusFloorQuotient(end - begin, cycles.length) - 1;
-            if (left > keptAtEitherEnd)
-                passed += (left - keptAtEitherEnd) / 2 * 2;
-        }
+        if (whole < neededWhole && target == begin)
+            ++whole;
+        if (maySkip && whole >= neededWhole) // on to the last whole cycle
+            passed = std::max(passed, TempusFloorQuotient(end - begin, cycles.length) - 1);
         // Times so far out that they can't tell two cycles from each other end the walk.
         Tempus const next = begin + cycles.length * TempusMake(passed, 1);
         if (!(next > begin) || !TempusIsNumeric(next) || __builtin_add_overflow(number, passed, &number))

@@ -13,6 +13,7 @@
 #include <algorithm>
 #include <cmath>
 #include <limits>
+#include <random>
 #include <sstream>
 
 namespace {
@@ -329,6 +330,39 @@ TEST(KFChannelSegmentVisitorMuseum, FindsTheExtremesOfAHostAndOfTheSamples) {
                     << exhibit.name << ", mode " << mode << ", " << museumText(at[i]) << " to "
                     << museumText(at[j]) << ": " << low << ' ' << min << ", " << high << ' ' << max;
             }
+        }
+    }
+}
+
+/// Long enough for most segments to lie within the extremes of those before, some by a hair.
+TEST(KFChannelSegmentVisitor, FindsTheSameExtremesOfWildCurves) {
+    std::mt19937_64 random(1);
+    auto const between = [&random](double low, double high) {
+        return std::uniform_real_distribution<double>(low, high)(random);
+    };
+    double const plateaus[] = {0.1, 0.7, 0.3};
+    for (int i = 0; i < 2000; ++i) {
+        MuseumSpline curve;
+        curve.state->parametric = i % 17 == 0;
+        curve.state->retimingExtrapolation = i % 5 == 0;
+        bool const isLevel = i % 3 == 0;
+        auto const reach = [&] { return between(0.0, i % 2 == 0 ? 0.4 : 2.0); };
+        for (int key = 0; key < 30; ++key) {
+            double const value = isLevel ? plateaus[random() % 3] : between(-1.0, 1.0);
+            Tempus const u = s(12 * key + static_cast<std::int64_t>(random() % 9), 24);
+            void* const vertex = curve->appendVertexNoTangents(u, value, kTempusZero);
+            auto const type = museumSegmentTypes()[random() % museumSegmentTypes().size()];
+            curve->setVertexInterpolation(vertex, i % 4 == 3 ? type : i % 4 == 2 ? 6 : 4);
+            double const rise = isLevel ? 0.0 : between(-1.0, 1.0);
+            curve->setVertexInputHandles(vertex, -reach(), rise * between(0.0, 3.0), kTempusZero, true);
+            curve->setVertexOutputHandles(vertex, reach(), rise * between(0.0, 3.0), kTempusZero, true);
+        }
+        if (i % 7 == 0)
+            curve->setClosed(true, nullptr);
+        Shown wild(curve);
+        for (auto const& [from, to] : {std::pair{s(0), s(15)}, {s(7, 3), s(9)}}) {
+            auto const host = wild.visit(ExtremesVisitor(), from, to);
+            ASSERT_EQ(wild.extremes(from, to), std::pair(host.min, host.max)) << i;
         }
     }
 }
