@@ -22,6 +22,7 @@ namespace {
 
 constexpr std::size_t kDocumentSizes[] = {1000, 100000, 1000000};
 constexpr std::size_t kKeypointsOfChannel = 1000;
+constexpr std::size_t kSizeBesideJson = 100000;
 constexpr double kMebibyte = 1024.0 * 1024.0;
 constexpr double kHandleScale = 12.0;
 
@@ -265,19 +266,18 @@ void registerGrowthOfDocuments(Bench& bench) {
 }
 
 void registerJson(Bench& bench) {
-    constexpr std::size_t kSize = 100000;
     registerContest(bench, {"beside JSON/read", "nlohmann-json", Bound::none(), [] {
-                                auto const tree = std::make_shared<DocumentTree>(kSize);
+                                auto const tree = std::make_shared<DocumentTree>(kSizeBesideJson);
                                 auto const text = std::make_shared<std::string>(jsonOf(*tree).dump());
-                                return Contest{reading(tree), perKeypoint(kSize, [text] {
+                                return Contest{reading(tree), perKeypoint(kSizeBesideJson, [text] {
                                                    return nanoseconds([&] {
                                                        benchmark::DoNotOptimize(nlohmann::json::parse(*text));
                                                    });
                                                })};
                             }});
     registerContest(bench, {"beside JSON/write", "nlohmann-json", Bound::none(), [] {
-                                auto const tree = std::make_shared<DocumentTree>(kSize);
-                                return Contest{writing(tree), perKeypoint(kSize, [tree] {
+                                auto const tree = std::make_shared<DocumentTree>(kSizeBesideJson);
+                                return Contest{writing(tree), perKeypoint(kSizeBesideJson, [tree] {
                                                    return nanoseconds([&] {
                                                        benchmark::DoNotOptimize(jsonOf(*tree).dump());
                                                    });
