@@ -5,10 +5,12 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <array>
 #include <chrono>
 #include <cstdio>
 #include <fstream>
 #include <functional>
+#include <limits>
 #include <random>
 
 namespace {
@@ -150,6 +152,13 @@ TEST(BXXMLWriteStream, WritesLinesAndAttributesInOrder) {
                                                 "    <leaf>1</leaf>\n"
                                                 "  </group>\n"
                                                 "</kfml>\n");
+    std::string const deep = written([](BXXMLWriteStream& stream) {
+        for (int i = 0; i < 40; ++i) {
+            stream.startElement(2);
+        }
+    });
+    EXPECT_NE(deep.find("\n" + std::string(80, ' ') + "<leaf/>\n" + std::string(78, ' ') + "</leaf>\n"),
+              std::string::npos);
     EXPECT_EQ(written([](BXXMLWriteStream&) {}), std::string(kDeclaration) + "<kfml version=\"5.13\"/>\n");
 }
 
