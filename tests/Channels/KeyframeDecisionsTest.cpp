@@ -85,7 +85,10 @@ std::vector<_KFKeyframeInfo> oneKeyframe() {
 }
 
 #define WITH_SUBJECT(x)                                                                                      \
-    [[maybe_unused]] auto& [c, h, node, other, shift, last] = x;                                             \
+    [[maybe_unused]] KFChannel& c = x.c;                                                                     \
+    [[maybe_unused]] void* const h = x.h;                                                                    \
+    [[maybe_unused]] KFCurveNode* const node = x.node;                                                       \
+    [[maybe_unused]] KFChannel* const other = x.other;                                                       \
     [[maybe_unused]] auto const at = [&x](double t) { return x.at(t); };
 #define RUN(call) #call, [](Subject const& x) { WITH_SUBJECT(x)(void)(c.call); }
 #define EFFECT(expression) [](Subject const& x) -> bool { WITH_SUBJECT(x) return expression; }
