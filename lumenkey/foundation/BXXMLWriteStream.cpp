@@ -4,7 +4,9 @@
 #include "lumenkey/foundation/BXTextForms.h"
 
 #include <algorithm>
+#include <cstring>
 #include <string>
+#include <type_traits>
 #include <vector>
 
 class BXXMLWriteStream::Writer {
@@ -131,14 +133,17 @@ void BXXMLWriteStream::Writer::endStartTag() {
 }
 
 void BXXMLWriteStream::Writer::newLine() {
-    static constexpr std::string_view kSpaces =
-        "                                                                ";
+    static constexpr std::string_view kSpaces = "                                ";
     _out.append("\n");
-    for (std::size_t left = 2 * _open.size(); left != 0;) {
+    std::size_t left = 2 * _open.size();
+    do {
+        // All of them in one go, which is quicker than few, and only as many count as are wanted.
         std::size_t const some = std::min(left, kSpaces.size());
-        _out.append(kSpaces.substr(0, some));
+        char* const room = _out.room(kSpaces.size());
+        std::memcpy(room, kSpaces.data(), kSpaces.size());
+        _out.taken(room + some);
         left -= some;
-    }
+    } while (left != 0);
 }
 
 bool BXXMLWriteStream::Writer::isNewAttribute(std::string_view name) {
@@ -146,7 +151,7 @@ bool BXXMLWriteStream::Writer::isNewAttribute(std::string_view name) {
     _attributeNames += name;
     _attributeNames += '\0';
     std::string_view const all = _attributeNames;
-    if (all.find(all.substr(before)) == before) {
+    if (before == 0 || all.find(all.substr(before)) == before) {
         return true;
     }
     _attributeNames.resize(before + 1);

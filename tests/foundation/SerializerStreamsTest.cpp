@@ -5,10 +5,12 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <array>
 #include <chrono>
 #include <cstdio>
 #include <fstream>
 #include <functional>
+#include <limits>
 #include <random>
 
 namespace {
@@ -150,6 +152,13 @@ TEST(BXXMLWriteStream, WritesLinesAndAttributesInOrder) {
                                                 "    <leaf>1</leaf>\n"
                                                 "  </group>\n"
                                                 "</kfml>\n");
+    std::string const deep = written([](BXXMLWriteStream& stream) {
+        for (int i = 0; i < 40; ++i) {
+            stream.startElement(2);
+        }
+    });
+    EXPECT_NE(deep.find("\n" + std::string(80, ' ') + "<leaf/>\n" + std::string(78, ' ') + "</leaf>\n"),
+              std::string::npos);
     EXPECT_EQ(written([](BXXMLWriteStream&) {}), std::string(kDeclaration) + "<kfml version=\"5.13\"/>\n");
 }
 
@@ -481,33 +490,46 @@ TEST(BXHashWriteStream, TellsNeighboursApart) {
         hashOf(BXUUID{{1, 0, 0, 0}}),
         hashOf(BXUUID{{0, 0, 0, 1}}),
     };
-    // What has been written grows by one call at a time, each of which counts.
-    BXHashWriteStream stream;
-    EXPECT_TRUE(stream.isHashStream());
-    for (int step = 0; step < 6; ++step) {
-        switch (step) {
-        case 0:
-        case 1:
-            stream.startElement(1);
-            break;
-        case 2:
-        case 3:
-            stream.writeAttribute(static_cast<std::uint32_t>(step), 1.0);
-            break;
-        default:
-            stream.endElement();
+    // Elements with attributes inside each other and beside each other; a scope around it tells what lies inside.
+    for (bool const isInside : {false, true}) {
+        BXHashWriteStream stream;
+        EXPECT_TRUE(stream.isHashStream());
+        stream.startElement(1);
+        if (isInside) {
+            stream.pushScope(kRootScope);
         }
-        hashes.push_back(stream.getHash());
+        for (std::uint32_t const tag : {1u, 2u}) {
+            stream.startElement(tag);
+            stream.writeAttribute(tag, 1.0);
+            hashes.push_back(stream.getHash());
+        }
     }
     for (std::size_t i = 0; i < hashes.size(); ++i) {
         EXPECT_EQ(std::count(hashes.begin(), hashes.end(), hashes[i]), 1) << i;
     }
+}
 
-    auto const before = stream.getHash();
-    stream.endElement(); // nothing is open
-    stream.endLine();
-    stream.pushScope(kRootScope);
-    EXPECT_EQ(stream.getHash(), before);
+TEST(BXHashWriteStream, TakesEndsWithoutStarts) {
+    BXHashWriteStream plain;
+    BXHashWriteStream withEnds;
+    for (BXHashWriteStream* stream : {&plain, &withEnds}) {
+        auto const maybeEnd = [&] {
+            if (stream == &withEnds) {
+                stream->endElement();
+                stream->endLine();
+            }
+        };
+        maybeEnd();
+        stream->startElement(1);
+        stream->pushScope(kRootScope);
+        maybeEnd(); // of a child that wrote nothing
+        stream->startElement(2);
+        stream->endElement();
+        stream->popScope();
+        stream->endElement();
+        maybeEnd();
+    }
+    EXPECT_EQ(plain.getHash(), withEnds.getHash());
 }
 
 TEST(BXHashWriteStream, DoesNotDependOnHowBytesAreCut) {
