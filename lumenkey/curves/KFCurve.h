@@ -61,8 +61,8 @@ public:
     bool operator==(KFCurve const& other) const;
     ~KFCurve() override;
 
-    // Of BXSerializer. The keypoints are written from a copy up to 4096 of them, beyond that 256 at a time under the
-    // spline's lock, so that a write may run beside evaluation. Reading replaces the keypoints, keyframable or not;
+    // Of BXSerializer. The keypoints are read 4096 at a time under the spline's lock, for a digest 256, and written
+    // without it, so that a write may run beside evaluation. Reading replaces the keypoints, keyframable or not;
     // settings that a document leaves out stay. `parseElement` answers true for whatever it is given.
     void writeHeader(BXSerializerWriteStream& stream, bool full) override;
     void writeBody(BXSerializerWriteStream& stream, bool full, bool children, bool all) override;

@@ -102,8 +102,12 @@ private:
     }
 
     template <typename Number> void put(Number number) {
-        for (std::size_t i = 0; i < sizeof(Number); ++i) {
-            _block[_used + i] = static_cast<std::uint8_t>(number >> (8 * i));
+        if constexpr (std::endian::native == std::endian::little) {
+            std::memcpy(_block.data() + _used, &number, sizeof(Number));
+        } else {
+            for (std::size_t i = 0; i < sizeof(Number); ++i) {
+                _block[_used + i] = static_cast<std::uint8_t>(number >> (8 * i));
+            }
         }
         _used += sizeof(Number);
     }
@@ -181,3 +185,13 @@ void BXHashWriteStream::writeAttribute(std::uint32_t tag, Tempus const& value) {
 }
 void BXHashWriteStream::endLine() {}
 bool BXHashWriteStream::isHashStream() const { return true; }
+
+void BXHashWriteStream::writeElement(std::uint32_t tag, double value) {
+    _digest->start(tag);
+    _digest->value(value);
+}
+
+void BXHashWriteStream::writeElement(std::uint32_t tag, Tempus const& value) {
+    _digest->start(tag);
+    _digest->value(value);
+}

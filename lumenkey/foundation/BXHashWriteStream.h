@@ -47,6 +47,8 @@ public:
     void writeAttribute(std::uint32_t tag, BXUUID const& value) override;
     void writeAttribute(std::uint32_t tag, Tempus const& value) override;
     void endLine() override;
+    void writeElement(std::uint32_t tag, double value) override;
+    void writeElement(std::uint32_t tag, Tempus const& value) override;
     bool isHashStream() const override;
 
 private:

@@ -16,6 +16,18 @@ BXStreamElement::~BXStreamElement() = default;
 
 bool BXSerializerWriteStream::isHashStream() const { return false; }
 
+void BXSerializerWriteStream::writeElement(std::uint32_t tag, double value) {
+    startElement(tag);
+    writeValue(value);
+    endElement();
+}
+
+void BXSerializerWriteStream::writeElement(std::uint32_t tag, Tempus const& value) {
+    startElement(tag);
+    writeValue(value);
+    endElement();
+}
+
 bool BXStreamElement::getAsString(BXString* out) const { return readIfThere(text(), out); }
 bool BXStreamElement::getAsUInt32(std::uint32_t* out) const { return readIfThere(text(), out); }
 bool BXStreamElement::getAsInt32(std::int32_t* out) const { return readIfThere(text(), out); }

@@ -30,7 +30,7 @@ class LUMENKEY_API BXSerializerWriteStream {
 public:
     virtual ~BXSerializerWriteStream();
 
-    /// The table isn't owned and must outlive its time on the stream.
+    /// The table isn't owned and must outlive the stream.
     virtual void pushScope(BXScope const* scope) = 0;
     virtual void popScope() = 0;
     virtual void startElement(std::uint32_t tag) = 0;
@@ -50,6 +50,9 @@ public:
     virtual void writeAttribute(std::uint32_t tag, BXUUID const& value) = 0;
     virtual void writeAttribute(std::uint32_t tag, Tempus const& value) = 0;
     virtual void endLine() = 0;
+    // An element that holds nothing but a value: start, value and end in one, which streams may do faster.
+    virtual void writeElement(std::uint32_t tag, double value);
+    virtual void writeElement(std::uint32_t tag, Tempus const& value);
     /// Whether what is written goes into a digest; here false.
     virtual bool isHashStream() const;
 };

@@ -4,10 +4,20 @@
 #include "lumenkey/foundation/BXTextForms.h"
 
 #include <algorithm>
+#include <array>
 #include <cstring>
 #include <string>
 #include <type_traits>
 #include <vector>
+
+namespace {
+
+constexpr std::string_view kSpaces = "                                ";
+/// What is written in one go: nearly everything.
+constexpr std::size_t kFastDepth = 64;
+constexpr std::size_t kFastName = 64;
+
+} // namespace
 
 class BXXMLWriteStream::Writer {
 public:
@@ -17,6 +27,7 @@ public:
     void end();
     template <typename Value> void attribute(std::uint32_t tag, Value const& value);
     template <typename Value> void content(Value const& value);
+    template <typename Value> void element(std::uint32_t tag, Value const& value);
     bool close();
 
     std::vector<BXScope const*> scopes;
@@ -26,13 +37,13 @@ private:
 
     struct Open {
         std::uint32_t tag;
-        /// Where its name begins in `_names`.
-        std::size_t name;
+        std::string_view name;
         Holds holds;
     };
 
-    char const* nameOf(std::uint64_t word) const noexcept;
+    std::string_view nameOf(std::uint64_t word) noexcept;
     void open(std::uint32_t tag, std::string_view name);
+    char* indented(char* room) const noexcept;
     void closeInnermost();
     void endStartTag();
     void newLine();
@@ -45,9 +56,15 @@ private:
     void put(BXString const& value, BXText::Place place);
 
     BXBlockWriter _out;
-    /// The root first. Names are kept here, since the scopes that gave them may be gone when their elements end.
+    /// The root first.
     std::vector<Open> _open;
-    std::string _names;
+    /// Names that the innermost scope has given before.
+    struct KnownName {
+        BXScope const* scope = nullptr;
+        std::uint64_t word = 0;
+        std::string_view name;
+    };
+    std::array<KnownName, 64> _known{};
     /// The names of the innermost element's attributes, each behind a zero and followed by one.
     std::string _attributeNames;
     bool _isStartTagOpen = false;
@@ -67,20 +84,33 @@ BXXMLWriteStream::Writer::Writer(BXStream& sink, unsigned int major, unsigned in
     _out.append("\"");
 }
 
-char const* BXXMLWriteStream::Writer::nameOf(std::uint64_t word) const noexcept {
+/// Without data where no scope has one.
+std::string_view BXXMLWriteStream::Writer::nameOf(std::uint64_t word) noexcept {
+    if (scopes.empty()) {
+        return {};
+    }
+    auto const place =
+        reinterpret_cast<std::uintptr_t>(scopes.back()) / sizeof(BXScope) + word + (word >> 32) * 7;
+    KnownName& known = _known[place % _known.size()];
+    if (known.scope == scopes.back() && known.word == word) {
+        return known.name;
+    }
     for (auto scope = scopes.rbegin(); scope != scopes.rend(); ++scope) {
         for (BXScope const* row = *scope; row->name != nullptr; ++row) {
             if (row->word == word) {
+                if (scope == scopes.rbegin()) {
+                    known = {*scope, word, row->name};
+                }
                 return row->name;
             }
         }
     }
-    return nullptr;
+    return {};
 }
 
 void BXXMLWriteStream::Writer::start(std::uint32_t tag) {
-    char const* const name = _leftOutDepth == 0 && !_isClosed ? nameOf(tag) : nullptr;
-    if (name == nullptr) {
+    std::string_view const name = _leftOutDepth == 0 && !_isClosed ? nameOf(tag) : std::string_view();
+    if (name.data() == nullptr) {
         _isWhole = false;
         _leftOutDepth += _isClosed ? 0 : 1;
         return;
@@ -91,12 +121,18 @@ void BXXMLWriteStream::Writer::start(std::uint32_t tag) {
 }
 
 void BXXMLWriteStream::Writer::open(std::uint32_t tag, std::string_view name) {
-    newLine();
-    _out.append("<");
-    _out.append(name);
-    _open.push_back({tag, _names.size(), Holds::Nothing});
-    _names += name;
-    _attributeNames.assign(1, '\0');
+    if (_open.size() <= kFastDepth && name.size() <= kFastName) {
+        char* to = indented(_out.room(2 + 2 * kFastDepth + kSpaces.size() + kFastName));
+        *to++ = '<';
+        std::memcpy(to, name.data(), name.size());
+        _out.taken(to + name.size());
+    } else {
+        newLine();
+        _out.append("<");
+        _out.append(name);
+    }
+    _open.push_back({tag, name, Holds::Nothing});
+    _attributeNames.clear();
     _isStartTagOpen = true;
 }
 
@@ -118,11 +154,19 @@ void BXXMLWriteStream::Writer::closeInnermost() {
         if (last.holds == Holds::Elements) {
             newLine();
         }
-        _out.append("</");
-        _out.append(std::string_view(_names).substr(last.name));
-        _out.append(">");
+        std::string_view const name = last.name;
+        if (name.size() <= kFastName) {
+            char* const to = _out.room(kFastName + 3);
+            std::memcpy(to, "</", 2);
+            std::memcpy(to + 2, name.data(), name.size());
+            to[2 + name.size()] = '>';
+            _out.taken(to + name.size() + 3);
+        } else {
+            _out.append("</");
+            _out.append(name);
+            _out.append(">");
+        }
     }
-    _names.resize(last.name);
 }
 
 void BXXMLWriteStream::Writer::endStartTag() {
@@ -132,21 +176,33 @@ void BXXMLWriteStream::Writer::endStartTag() {
     }
 }
 
+/// For depths up to `kFastDepth`: a line feed and the indentation, all of it in stores of a whole row of spaces.
+char* BXXMLWriteStream::Writer::indented(char* room) const noexcept {
+    *room++ = '\n';
+    std::size_t const width = 2 * _open.size();
+    for (std::size_t i = 0; i <= width; i += kSpaces.size()) {
+        std::memcpy(room + i, kSpaces.data(), kSpaces.size());
+    }
+    return room + width;
+}
+
 void BXXMLWriteStream::Writer::newLine() {
-    static constexpr std::string_view kSpaces = "                                ";
+    if (_open.size() <= kFastDepth) {
+        _out.taken(indented(_out.room(1 + 2 * kFastDepth + kSpaces.size())));
+        return;
+    }
     _out.append("\n");
-    std::size_t left = 2 * _open.size();
-    do {
-        // All of them in one go, which is quicker than few, and only as many count as are wanted.
+    for (std::size_t left = 2 * _open.size(); left != 0;) {
         std::size_t const some = std::min(left, kSpaces.size());
-        char* const room = _out.room(kSpaces.size());
-        std::memcpy(room, kSpaces.data(), kSpaces.size());
-        _out.taken(room + some);
+        _out.append(kSpaces.substr(0, some));
         left -= some;
-    } while (left != 0);
+    }
 }
 
 bool BXXMLWriteStream::Writer::isNewAttribute(std::string_view name) {
+    if (_attributeNames.empty()) {
+        _attributeNames += '\0';
+    }
     std::size_t const before = _attributeNames.size() - 1;
     _attributeNames += name;
     _attributeNames += '\0';
@@ -163,8 +219,9 @@ template <typename Value> void BXXMLWriteStream::Writer::attribute(std::uint32_t
         return;
     }
     bool const hasPlace = _isStartTagOpen && _open.size() > 1;
-    char const* const name = hasPlace ? nameOf(_open.back().tag | std::uint64_t{tag} << 32) : nullptr;
-    if (name == nullptr || !isNewAttribute(name)) {
+    std::string_view const name =
+        hasPlace ? nameOf(_open.back().tag | std::uint64_t{tag} << 32) : std::string_view();
+    if (name.data() == nullptr || !isNewAttribute(name)) {
         _isWhole = false;
         return;
     }
@@ -191,6 +248,29 @@ template <typename Value> void BXXMLWriteStream::Writer::content(Value const& va
     endStartTag();
     _open.back().holds = Holds::Value;
     put(value, BXText::Place::Content);
+}
+
+/// The usual case in one go, the others as they come.
+template <typename Value> void BXXMLWriteStream::Writer::element(std::uint32_t tag, Value const& value) {
+    std::string_view const name = _leftOutDepth == 0 && !_isClosed ? nameOf(tag) : std::string_view();
+    if (name.data() == nullptr || name.size() > kFastName || _open.size() > kFastDepth) {
+        start(tag);
+        content(value);
+        end();
+        return;
+    }
+    endStartTag();
+    _open.back().holds = Holds::Elements;
+    char* to = indented(_out.room(5 + 2 * kFastDepth + kSpaces.size() + 2 * kFastName + BXText::kLongest));
+    *to++ = '<';
+    to = std::copy(name.begin(), name.end(), to);
+    *to++ = '>';
+    to = BXText::write(to, value);
+    *to++ = '<';
+    *to++ = '/';
+    to = std::copy(name.begin(), name.end(), to);
+    *to++ = '>';
+    _out.taken(to);
 }
 
 void BXXMLWriteStream::Writer::put(BXString const& value, BXText::Place place) {
@@ -263,3 +343,6 @@ void BXXMLWriteStream::writeAttribute(std::uint32_t tag, Tempus const& value) {
     _writer->attribute(tag, value);
 }
 void BXXMLWriteStream::endLine() {}
+
+void BXXMLWriteStream::writeElement(std::uint32_t tag, double value) { _writer->element(tag, value); }
+void BXXMLWriteStream::writeElement(std::uint32_t tag, Tempus const& value) { _writer->element(tag, value); }

@@ -66,6 +66,8 @@ public:
     void writeAttribute(std::uint32_t tag, Tempus const& value) override;
     /// Every element stands on a line of its own anyway.
     void endLine() override;
+    void writeElement(std::uint32_t tag, double value) override;
+    void writeElement(std::uint32_t tag, Tempus const& value) override;
 
 private:
     class Writer;

@@ -6,16 +6,18 @@
 #include "lumenkey/splines/KFSplineAccess.h"
 #include "lumenkey/splines/KFTangent.h"
 
-#include <array>
+#include <algorithm>
 #include <cmath>
 #include <limits>
+#include <vector>
 
 namespace {
 
 constexpr double kTolerance = 1e-7;
 constexpr double kNeutralBias = 1.0;
-/// Curves up to this many keypoints are copied while they are written.
-constexpr std::uint32_t kMostKeypointsCopied = 4096;
+/// So many keypoints are read at once: a curve of no more is written as it is at one moment. In a digest, few.
+constexpr std::uint32_t kKeypointsAtOnce = 4096;
+constexpr std::uint32_t kKeypointsAtOnceForDigest = 256;
 
 bool counts(double number) { return std::fabs(number) >= kTolerance; }
 
@@ -32,12 +34,13 @@ struct KeypointRecord {
     KFTangent out;
 };
 
-/// The keypoints of a spline in order, a stretch under its lock at a time: others may evaluate the spline meanwhile,
-/// and nothing is allocated. Where another thread edits between two stretches, reading goes on behind the time that
+/// The keypoints of a spline in order, a stretch under its lock at a time: others may evaluate the spline meanwhile. Where
+/// another thread edits between two stretches, reading goes on behind the time that
 /// was reached.
 class KeypointReader {
 public:
-    explicit KeypointReader(KFSpline& spline) : _spline(spline) {}
+    KeypointReader(KFSpline& spline, std::size_t atOnce)
+        : _spline(spline), _records(std::min(atOnce, spline.getNumberOfVertices())) {}
 
     KeypointRecord const* next() {
         if (_position == _count)
@@ -85,7 +88,7 @@ private:
     }
 
     KFSpline& _spline;
-    std::array<KeypointRecord, 256> _records{};
+    std::vector<KeypointRecord> _records;
     std::size_t _position = 0;
     std::size_t _count = 0;
     KFVertex const* _last = nullptr;
@@ -160,12 +163,7 @@ void KFCurve::writeSettings(BXSerializerWriteStream& stream) {
 
 /// Limits, continuation and keypoints. Their number comes first: on reading it clears the curve.
 void KFCurve::writeKeypoints(BXSerializerWriteStream& stream) {
-    std::uint32_t const count = getNumberOfKeypoints();
-    std::unique_ptr<KFCurveInterface> copy;
-    if (!stream.isHashStream() && count <= kMostKeypointsCopied)
-        copy.reset(getCurveWorkingCopy());
-    auto* const copied = dynamic_cast<KFCurve*>(copy.get());
-    KFSpline* const spline = count == 0 ? nullptr : (copied != nullptr ? copied : this)->getSpline();
+    KFSpline* const spline = getNumberOfKeypoints() == 0 ? nullptr : getSpline();
     if (spline != nullptr)
         KFWriteElement(stream, kNumberOfKeypointsElement,
                        static_cast<std::uint32_t>(spline->getNumberOfVertices()));
@@ -186,7 +184,9 @@ void KFCurve::writeKeypoints(BXSerializerWriteStream& stream) {
         KFWriteElement(stream, kClosedElement, true);
     if (spline == nullptr)
         return;
-    KeypointReader reader(*spline);
+    KeypointReader reader(*spline, stream.isHashStream() ? kKeypointsAtOnceForDigest : kKeypointsAtOnce);
+    bool const derives = isCurveDeriveTangents();
+    double const scale = handleScale();
     while (KeypointRecord const* const keypoint = reader.next())
-        writeKeypoint(stream, *keypoint, isCurveDeriveTangents(), handleScale());
+        writeKeypoint(stream, *keypoint, derives, scale);
 }

@@ -3,12 +3,18 @@
 
 #include "lumenkey/persistence/KFDocumentScopes.h"
 
+#include <type_traits>
+
 /// An element that holds nothing but a value.
 template <class Value>
 void KFWriteElement(BXSerializerWriteStream& stream, std::uint32_t tag, Value const& value) {
-    stream.startElement(tag);
-    stream.writeValue(value);
-    stream.endElement();
+    if constexpr (std::is_same_v<Value, double> || std::is_same_v<Value, Tempus>) {
+        stream.writeElement(tag, value);
+    } else {
+        stream.startElement(tag);
+        stream.writeValue(value);
+        stream.endElement();
+    }
 }
 
 /// The UUID of a class as it stands in documents; not for texts that are none.

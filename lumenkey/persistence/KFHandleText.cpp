@@ -43,19 +43,34 @@ bool readLong(std::string_view text, long double* out) {
     return std::from_chars(text.data() + start, end, *out).ec == std::errc();
 }
 
+/// The double next to the product that gives the tangent back; the product itself where none does.
+double handleOf(double tangent, double scale) {
+    double const product = tangent * scale;
+    if (product / scale == tangent)
+        return product;
+    for (double const end : {-HUGE_VAL, HUGE_VAL}) {
+        double const neighbour = std::nextafter(product, end);
+        if (neighbour / scale == tangent)
+            return neighbour;
+    }
+    return product;
+}
+
 } // namespace
 
 void KFWriteHandle(BXSerializerWriteStream& stream, std::uint32_t tag, double tangent, double scale) {
-    stream.startElement(tag);
-    long double const exact = static_cast<long double>(tangent) * static_cast<long double>(scale);
-    double const handle = static_cast<double>(exact);
     if (stream.isHashStream()) {
-        stream.writeValue(tangent);
-    } else if (handle / scale == tangent || !std::isfinite(tangent) || !std::isfinite(handle)) {
-        stream.writeValue(handle);
-    } else {
-        stream.writeValue(BXString(longText(exact)));
+        stream.writeElement(tag, tangent);
+        return;
     }
+    double const handle = handleOf(tangent, scale);
+    if (handle / scale == tangent || !std::isfinite(handle)) {
+        stream.writeElement(tag, handle);
+        return;
+    }
+    stream.startElement(tag);
+    stream.writeValue(
+        BXString(longText(static_cast<long double>(tangent) * static_cast<long double>(scale))));
     stream.endElement();
 }
 
