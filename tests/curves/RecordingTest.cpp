@@ -125,6 +125,34 @@ TEST(Recording, GuardsATakeAndCommitsByItsScope) {
     }
 }
 
+TEST(Recording, HoldsTheStartAndTheLastValueAndKeepsTheExtremes) {
+    Taken curve;
+    ASSERT_TRUE(curve.beginPlayback(at(1), kKFRecordingScopeWrite, 0, at(kStep)));
+    curve.beginRecording(at(3));
+    EXPECT_EQ(curve.value(3), 1) << "the value where playback began";
+    curve.set(4, 50);
+    curve.set(4, -50); // what is held from here on
+    curve.updateCurrentRecordingTime(at(5));
+    EXPECT_EQ(curve.value(5), -50);
+    curve.set(6, 60);
+    for (double t = 7; t < 9; t += 0.5)
+        curve.set(t, 5);
+    double highest = 0;
+    double lowest = 0;
+    curve.getCurrentMaxValueV(&highest, false);
+    curve.getCurrentMinValueV(&lowest, false);
+    EXPECT_EQ(highest, 60);
+    EXPECT_EQ(lowest, -50);
+    curve.endRecording(at(9));
+
+    // Begun anew before it became keypoints.
+    curve.begin(3, kKFRecordingScopeJoin);
+    curve.getCurrentMinValueV(&lowest, false);
+    EXPECT_EQ(lowest, 0);
+    curve.end(4);
+    EXPECT_EQ(curve.keypoints(), kOld);
+}
+
 TEST(Recording, MakesTheHeadGuardLinear) {
     Taken curve;
     curve.setCurveInterpolation(kKFInterpolationBezier);
