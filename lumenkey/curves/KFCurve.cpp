@@ -64,6 +64,12 @@ KFCurve::~KFCurve() {
 void KFCurve::copyRoots(KFCurve const& other, bool withRecorded) {
     _constantNode = other._constantNode;
     _splineNode = other._splineNode;
+    if (withRecorded && _recordingNode != nullptr && other._recordingNode != nullptr) {
+        // In place: whether this curve plays is its own.
+        *_recordingNode = *other._recordingNode;
+        adoptRoot(other._rootKind);
+        return;
+    }
     std::unique_ptr<KFRecordingNode> recording;
     if (other._recordingNode != nullptr) {
         recording = std::make_unique<KFRecordingNode>(*other._recordingNode, &_splineNode);

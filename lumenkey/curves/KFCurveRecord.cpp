@@ -6,9 +6,14 @@ bool KFCurve::beginPlayback(Tempus const& t, std::uint32_t scope, std::uint32_t 
                             Tempus const& resolution) {
     if (getSpline() == nullptr)
         return false;
-    if (_recordingNode == nullptr)
-        _recordingNode = std::make_unique<KFRecordingNode>(&_splineNode);
-    return _recordingNode->beginPlayback(t, scope, mode, resolution);
+    if (_recordingNode != nullptr)
+        return _recordingNode->beginPlayback(t, scope, mode, resolution);
+    // A refusal leaves no node behind, in which recording could begin all the same.
+    auto made = std::make_unique<KFRecordingNode>(&_splineNode);
+    if (!made->beginPlayback(t, scope, mode, resolution))
+        return false;
+    _recordingNode = std::move(made);
+    return true;
 }
 
 bool KFCurve::endPlayback(Tempus const& t) {

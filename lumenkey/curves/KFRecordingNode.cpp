@@ -32,9 +32,10 @@ KFRecordingNode& KFRecordingNode::operator=(KFRecordingNode const& other) {
     if (this == &other)
         return *this;
     // The source's lock is given back before the own one is taken: two assignments may cross.
-    KFRecordingNode taken(other, _splineNode);
+    KFRecordingNode taken(_splineNode);
     {
         Sentry const sentry(other._lock);
+        taken.copyTake(other);
         *taken._points = *other._points;
     }
     Sentry const sentry(_lock);
@@ -145,9 +146,15 @@ KFCurveNode* KFRecordingNode::cloneNode() const { return new KFRecordingNode(*th
 
 bool KFRecordingNode::compare(KFCurveNode const* other) const {
     auto const* const node = dynamic_cast<KFRecordingNode const*>(other);
-    return node != nullptr && _scope == node->_scope && _mode == node->_mode && *_points == *node->_points &&
-           _startTime == node->_startTime && _resolution == node->_resolution &&
-           areClose(_startValue, node->_startValue) && areClose(_lastValue, node->_lastValue);
+    if (node == nullptr)
+        return false;
+    // A copy, so that the two locks are never held together.
+    KFRecordingNode theirs(node->_splineNode);
+    theirs = *node;
+    Sentry const sentry(_lock);
+    return _scope == theirs._scope && _mode == theirs._mode && *_points == *theirs._points &&
+           _startTime == theirs._startTime && _resolution == theirs._resolution &&
+           areClose(_startValue, theirs._startValue) && areClose(_lastValue, theirs._lastValue);
 }
 
 // --- Recording ---

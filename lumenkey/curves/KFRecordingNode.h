@@ -36,8 +36,8 @@ enum KFRecordingScope : std::uint32_t {
 /// forward: a value before the last one is dropped, one at the very same time replaces it.
 ///
 /// Threads: a spin lock guards the points, so any number of threads may read while one records, and while a take
-/// begins, ends and becomes keypoints. The lock of the spline is taken inside it. Copying and comparing must not run
-/// beside the beginning of a take of the source.
+/// begins, ends and becomes keypoints. The lock of the spline is taken inside it. Copying and comparing hold the
+/// locks of both nodes one after the other.
 ///
 /// Cost: a point is O(1), whatever the length of the take; reading is O(log n), extremes O(1) beside the spline's.
 class LUMENKEY_API KFRecordingNode : public KFCurveNode {

@@ -125,6 +125,34 @@ TEST(Recording, GuardsATakeAndCommitsByItsScope) {
     }
 }
 
+TEST(Recording, HoldsTheStartAndTheLastValueAndKeepsTheExtremes) {
+    Taken curve;
+    ASSERT_TRUE(curve.beginPlayback(at(1), kKFRecordingScopeWrite, 0, at(kStep)));
+    curve.beginRecording(at(3));
+    EXPECT_EQ(curve.value(3), 1) << "the value where playback began";
+    curve.set(4, 50);
+    curve.set(4, -50); // what is held from here on
+    curve.updateCurrentRecordingTime(at(5));
+    EXPECT_EQ(curve.value(5), -50);
+    curve.set(6, 60);
+    for (double t = 7; t < 9; t += 0.5)
+        curve.set(t, 5);
+    double highest = 0;
+    double lowest = 0;
+    curve.getCurrentMaxValueV(&highest, false);
+    curve.getCurrentMinValueV(&lowest, false);
+    EXPECT_EQ(highest, 60);
+    EXPECT_EQ(lowest, -50);
+    curve.endRecording(at(9));
+
+    // Begun anew before it became keypoints.
+    curve.begin(3, kKFRecordingScopeJoin);
+    curve.getCurrentMinValueV(&lowest, false);
+    EXPECT_EQ(lowest, 0);
+    curve.end(4);
+    EXPECT_EQ(curve.keypoints(), kOld);
+}
+
 TEST(Recording, MakesTheHeadGuardLinear) {
     Taken curve;
     curve.setCurveInterpolation(kKFInterpolationBezier);
@@ -187,6 +215,8 @@ TEST(Recording, RefusesWhatOpensNoTake) {
     EXPECT_FALSE(curve.beginPlayback(kTempusZero, 4, 0, at(1)));
     EXPECT_FALSE(curve.beginPlayback(kTempusIndefinite, 1, 0, at(1)));
     EXPECT_FALSE(curve.beginPlayback(kTempusZero, 1, 0, at(-1)));
+    EXPECT_FALSE(curve.beginRecording(kTempusZero)) << "what was refused opened nothing";
+    EXPECT_FALSE(curve.isRecording());
     std::uint32_t scope = 9;
     EXPECT_FALSE(curve.isPlaying(&scope, nullptr, nullptr));
     EXPECT_EQ(scope, 9U);
@@ -234,6 +264,13 @@ TEST(Recording, IsCopiedWithoutWhatWasRecordedButAssignedWithIt) {
     assigned = curve;
     EXPECT_TRUE(assigned == curve);
     EXPECT_EQ(assigned.value(3), 30);
+    assigned.endRecording(at(3));
+    ASSERT_TRUE(assigned.beginPlayback(at(1), kKFRecordingScopeLatch, 0, at(kStep)));
+    assigned = curve;
+    EXPECT_TRUE(assigned.isPlaying(nullptr, nullptr, nullptr)) << "its own";
+    EXPECT_TRUE(assigned == curve);
+    assigned.set(4, 40);
+    EXPECT_FALSE(assigned == curve);
     assigned = Taken();
     EXPECT_FALSE(assigned.isRecording());
     EXPECT_EQ(assigned.value(3), 3);
@@ -262,6 +299,26 @@ TEST(RecordingThreads, ReadersSeeATakeBeginGrowAndEnd) {
     isOver = true;
     reader.join();
     EXPECT_EQ(wrong, 0);
+}
+
+TEST(RecordingThreads, ATakeIsCopiedAndComparedWhileItGrows) {
+    Taken curve;
+    curve.begin(1, kKFRecordingScopeJoin);
+    std::atomic<bool> isOver{false};
+    std::thread copier([&] {
+        Taken copy;
+        do {
+            copy = curve;
+            // Either answer may be right by now; the copy itself is of one moment.
+            static_cast<void>(copy == curve);
+            EXPECT_NEAR(copy.value(3), 3, 1e-9);
+        } while (!isOver);
+    });
+    for (int i = 100; i <= 900; ++i)
+        curve.set(i / 100.0, i / 100.0);
+    isOver = true;
+    copier.join();
+    curve.end(9);
 }
 
 } // namespace
