@@ -63,9 +63,9 @@ void Peak::start() noexcept {
     isWatched = true;
 }
 
-std::size_t Peak::risenBy() noexcept {
+Peak::Rise Peak::stop() noexcept {
     isWatched = false;
-    return static_cast<std::size_t>(highest);
+    return {highest, risen};
 }
 
 std::size_t objectBytes(void* object) noexcept { return malloc_usable_size(object); }
