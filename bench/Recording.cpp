@@ -6,7 +6,10 @@
 #include "lumenkey/curves/KFTypedCurves.h"
 
 #include <benchmark/benchmark.h>
+#include <limits>
+#include <malloc.h>
 #include <memory>
+#include <vector>
 
 namespace {
 
@@ -35,19 +38,32 @@ struct Take {
     }
 };
 
-/// Each pass grows the take by half a thousandth of its length or more, but from a thousand points by half: that take
-/// begins anew each time, beside the clock.
+/// The heap keeps what is freed while it lives: else only the large take would pay for pages that are new from the
+/// system.
+class KeptHeap {
+public:
+    KeptHeap() { mallopt(M_TRIM_THRESHOLD, std::numeric_limits<int>::max()); }
+    ~KeptHeap() { mallopt(M_TRIM_THRESHOLD, kUsual); }
+    KeptHeap(KeptHeap const&) = delete;
+    KeptHeap& operator=(KeptHeap const&) = delete;
+
+private:
+    static constexpr int kUsual = 128 * 1024;
+};
+
+/// From a thousand points on each pass has a take of its own.
 Measurement recording(Bench const& bench, std::int64_t points) {
     return [points, passes = bench.repetitions > 5 ? 20 : 5] {
         std::chrono::duration<double, std::nano> total{};
-        auto take = std::make_unique<Take>(points);
+        KeptHeap const keptHeap;
+        std::vector<std::unique_ptr<Take>> takes;
         for (int pass = 0; pass < passes; ++pass) {
+            if (takes.empty() || points == kSmall)
+                takes.push_back(std::make_unique<Take>(points));
             std::int64_t const from = points + 2 + (points == kLarge ? pass * kPass : 0);
             auto const start = std::chrono::steady_clock::now();
-            take->record(from, kPass);
+            takes.back()->record(from, kPass);
             total += std::chrono::steady_clock::now() - start;
-            if (points == kSmall)
-                take = std::make_unique<Take>(points);
         }
         return total.count() / static_cast<double>(passes * kPass);
     };
