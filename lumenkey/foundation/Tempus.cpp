@@ -1,5 +1,6 @@
 #include "lumenkey/foundation/Tempus.h"
 
+#include <cassert>
 #include <bit>
 #include <cmath>
 #include <limits>
@@ -92,6 +93,7 @@ bool sumOverOneTimescale(Tempus const& a, Tempus const& b, int64_t sign, Tempus&
     if (!TempusIsNumeric(a) || !TempusIsNumeric(b) || (a.epoch | b.epoch) != 0) {
         return false;
     }
+    assert(a.timescale > 0 && b.timescale > 0); // they are numbers
     bool const isOverA = a.timescale % b.timescale == 0;
     if (!isOverA && b.timescale % a.timescale != 0) {
         return false;

@@ -100,7 +100,8 @@ double SlowSpline::valueAt(Tempus const& u) const {
     Key const a = before(u);
     Key const b = after(u);
     if (a == nullptr || b == nullptr) {
-        return list.empty() ? 0.0 : a == nullptr ? b->v : a->v;
+        Key const end = a == nullptr ? b : a;
+        return end == nullptr ? 0.0 : end->v;
     }
     return a->type == 0 ? a->v : a->v + (b->v - a->v) * (seconds(u - a->u) / seconds(b->u - a->u));
 }
