@@ -61,7 +61,7 @@ public:
     bool operator==(KFCurve const& other) const;
     ~KFCurve() override;
 
-    // Of BXSerializer. The keypoints are read 4096 at a time under the spline's lock, for a digest 256, and written
+    // Of BXSerializer. The keypoints are read 4096 at a time under the spline's lock, for a digest 128, and written
     // without it, so that a write may run beside evaluation. Reading replaces the keypoints, keyframable or not;
     // settings that a document leaves out stay. `parseElement` answers true for whatever it is given.
     void writeHeader(BXSerializerWriteStream& stream, bool full) override;

@@ -7,8 +7,10 @@
 #include "lumenkey/splines/KFTangent.h"
 
 #include <algorithm>
+#include <array>
 #include <cmath>
 #include <limits>
+#include <span>
 #include <vector>
 
 namespace {
@@ -16,8 +18,8 @@ namespace {
 constexpr double kTolerance = 1e-7;
 constexpr double kNeutralBias = 1.0;
 /// So many keypoints are read at once: a curve of no more is written as it is at one moment. In a digest, few.
-constexpr std::uint32_t kKeypointsAtOnce = 4096;
-constexpr std::uint32_t kKeypointsAtOnceForDigest = 256;
+constexpr std::size_t kKeypointsAtOnce = 4096;
+constexpr std::size_t kKeypointsAtOnceForDigest = 128;
 
 bool counts(double number) { return std::fabs(number) >= kTolerance; }
 
@@ -39,8 +41,8 @@ struct KeypointRecord {
 /// was reached.
 class KeypointReader {
 public:
-    KeypointReader(KFSpline& spline, std::size_t atOnce)
-        : _spline(spline), _records(std::min(atOnce, spline.getNumberOfVertices())) {}
+    /// `room` is for as many as are read at once, and isn't empty.
+    KeypointReader(KFSpline& spline, std::span<KeypointRecord> room) : _spline(spline), _records(room) {}
 
     KeypointRecord const* next() {
         if (_position == _count)
@@ -88,7 +90,7 @@ private:
     }
 
     KFSpline& _spline;
-    std::vector<KeypointRecord> _records;
+    std::span<KeypointRecord> _records;
     std::size_t _position = 0;
     std::size_t _count = 0;
     KFVertex const* _last = nullptr;
@@ -184,9 +186,18 @@ void KFCurve::writeKeypoints(BXSerializerWriteStream& stream) {
         KFWriteElement(stream, kClosedElement, true);
     if (spline == nullptr)
         return;
-    KeypointReader reader(*spline, stream.isHashStream() ? kKeypointsAtOnceForDigest : kKeypointsAtOnce);
-    bool const derives = isCurveDeriveTangents();
-    double const scale = handleScale();
-    while (KeypointRecord const* const keypoint = reader.next())
-        writeKeypoint(stream, *keypoint, derives, scale);
+    auto const writeAll = [&](std::span<KeypointRecord> room) {
+        KeypointReader reader(*spline, room);
+        bool const derives = isCurveDeriveTangents();
+        double const scale = handleScale();
+        while (KeypointRecord const* const keypoint = reader.next())
+            writeKeypoint(stream, *keypoint, derives, scale);
+    };
+    if (stream.isHashStream()) {
+        std::array<KeypointRecord, kKeypointsAtOnceForDigest> few;
+        writeAll(few);
+    } else {
+        std::vector<KeypointRecord> many(std::min(kKeypointsAtOnce, spline->getNumberOfVertices() + 1));
+        writeAll(many);
+    }
 }

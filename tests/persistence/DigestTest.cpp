@@ -4,6 +4,7 @@
 #include "lumenkey/Channels/KFScalarChannels.h"
 #include "lumenkey/curves/KFCurve.h"
 #include "lumenkey/foundation/BXHashWriteStream.h"
+#include "tests/curves/CountedMemory.h"
 #include "tests/persistence/RandomTree.h"
 
 #include <gtest/gtest.h>
@@ -139,6 +140,22 @@ TEST(Digest, LeavesOutNodesThatAreExcluded) {
     EXPECT_EQ(unsaved.root.getHash(), leftOut);
     unsaved.channel.setFlag(kChannelFlagSaveWhenAtDefault, true);
     EXPECT_NE(unsaved.root.getHash(), leftOut) << "a digest takes in what would be saved at its default";
+}
+
+TEST(Digest, AsksForTheSameMemoryWhateverTheTree) {
+    auto const allocationsFor = [](int keypoints) {
+        KFChannelObjectRootBase root("Root", nullptr, 1, 0, 0);
+        KFChannelDouble one(0.0, "One", &root, 1, 0);
+        KFChannelDouble other(0.0, "Other", &root, 2, 0);
+        for (KFChannelDouble* const channel : {&one, &other}) {
+            for (int i = 0; i < keypoints; ++i)
+                channel->appendKeyframe(s(i), i, true);
+        }
+        std::size_t const before = allocationsOfThisThread();
+        root.getHash();
+        return allocationsOfThisThread() - before;
+    };
+    EXPECT_EQ(allocationsFor(2000), allocationsFor(0));
 }
 
 TEST(Digest, OfOneMomentKnowsWhatIsSeenOnly) {
