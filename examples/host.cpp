@@ -143,6 +143,30 @@ int main() {
     // [threads]
     good &= check(finite, "the second thread read whole values while keypoints were set");
 
+    // [take]
+    // The user drags a slider while the project plays: what is set is recorded, can be read at once, and becomes
+    // keypoints at the end. Here it runs into the old curve over one frame on both sides.
+    x.beginPlayback(TempusMake(5, 1), kKFRecordingScopeTouch, 0, TempusMake(1, 24));
+    x.beginRecording(TempusMake(5, 1));
+    for (int frame = 121; frame < 144; ++frame) {
+        x.setValue(TempusMake(frame, 24), 20.0, true);
+    }
+    x.endRecording(TempusMake(6, 1));
+    x.endPlayback(TempusMake(6, 1));
+    // [take]
+    good &= check(x.getValueAsDouble(TempusMake(11, 2), 0.0) == 20.0, "the take has become keypoints");
+
+    // [save]
+    // A blob that a host puts into its own files. What is read replaces keypoints and values, and leaves alone what the
+    // document doesn't mention.
+    BXData const saved = layer.createChannelState(true, true);
+    auto const digest = layer.getHash();
+    x.setValue(TempusMake(11, 2), 0.0, true);
+    bool const unsaved = layer.getHash() != digest;
+    bool const read = layer.configureWithState(saved);
+    // [save]
+    good &= check(unsaved && read && layer.getHash() == digest, "the saved state comes back");
+
     // [undo]
     while (layer.undo()) {
     }
