@@ -1,7 +1,7 @@
 #include "lumenkey/foundation/Tempus.h"
 
-#include <cassert>
 #include <bit>
+#include <cassert>
 #include <cmath>
 #include <limits>
 #include <numeric>

@@ -63,8 +63,9 @@ TEST(BXUUID, ReadsItsOwnTextAndNothingElse) {
     EXPECT_EQ(uuid.text(), text);
 
     BXUUID const before = uuid;
-    for (std::string const& wrong : {text.substr(1), text + "0", std::string("0B00DE81x2292-11D7-AC3D-00039389B702"),
-                              std::string("0B00DE81-2292-11D7-AC3D-00039389B7G2"), std::string()}) {
+    for (std::string const& wrong :
+         {text.substr(1), text + "0", std::string("0B00DE81x2292-11D7-AC3D-00039389B702"),
+          std::string("0B00DE81-2292-11D7-AC3D-00039389B7G2"), std::string()}) {
         EXPECT_FALSE(BXUUID::fromText(wrong, &uuid)) << wrong;
     }
     EXPECT_EQ(uuid, before);
