@@ -24,6 +24,13 @@ void BXDocumentReader::pushHandler(BXSerializer* handler) {
     }
 }
 
+bool BXDocumentReader::allowsNode() {
+    if (_depth > kGreatestDepthOfNodes) {
+        fail("nodes lie more than " + std::to_string(kGreatestDepthOfNodes) + " elements deep in each other");
+    }
+    return _problem.empty();
+}
+
 void BXDocumentReader::skipElement() noexcept {
     if (_isHandingOver) {
         _skippedDepth = _depth;

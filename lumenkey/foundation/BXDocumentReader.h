@@ -20,6 +20,9 @@ class BXSerializer;
 class BXDocumentReader final : public BXStreamElement {
 public:
     static constexpr std::uint32_t kGreatestDepth = 1000;
+    /// Of an element that something is made for. What that will write inside of such an element, which may be more
+    /// than it has read, must not be too deep to be read again.
+    static constexpr std::uint32_t kGreatestDepthOfNodes = kGreatestDepth - 10;
     static constexpr std::size_t kLongestText = std::size_t{64} << 20;
 
     /// Handlers get the stream, which isn't owned.
@@ -28,6 +31,7 @@ public:
     void pushScope(BXScope const* scope);
     void pushHandler(BXSerializer* handler);
     void skipElement() noexcept;
+    bool allowsNode();
 
     /// Attributes are pairs of name and value, ended by null; they are copied.
     void start(char const* name, char const* const* attributes);

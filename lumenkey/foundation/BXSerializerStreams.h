@@ -112,6 +112,9 @@ public:
     virtual void pushHandler(BXSerializer* handler) = 0;
     /// Passes over all that is inside the element that is handed over now.
     virtual void skipElement() = 0;
+    /// Whether something may be made for the element that is handed over now, such as a child of a folder; handlers
+    /// ask before they make it. If the element lies too deep for that, the reading fails. Here true.
+    virtual bool allowsNode();
 
     // The same questions of an element, asked through the stream.
     bool getAsInt32(BXStreamElement const& element, std::int32_t* out) const {

@@ -18,6 +18,10 @@ constexpr std::uint64_t kBlock = 64 << 10;
 constexpr std::uint64_t kLongestToken = BXDocumentReader::kLongestText;
 constexpr std::uint64_t kUsualSizeLimit = std::uint64_t{4} << 30;
 
+bool startsWithMark(std::string_view text) {
+    return text.starts_with("\xEF\xBB\xBF") || text.starts_with("\xFF\xFE") || text.starts_with("\xFE\xFF");
+}
+
 struct FreeParser {
     void operator()(XML_Parser parser) const noexcept { XML_ParserFree(parser); }
 };
@@ -83,6 +87,8 @@ private:
     std::unique_ptr<BXByteSource> _source;
     Parser _parser;
     std::uint64_t _fed = 0;
+    /// The parser takes a byte order mark for a character of the first line.
+    bool _hasMark = false;
     std::exception_ptr _thrown;
     State _state = State::Fresh;
 };
@@ -157,6 +163,9 @@ bool BXXMLReadStream::Reading::feed(std::uint64_t* size, bool* isLast) {
         failHere("the document is larger than " + std::to_string(sizeLimit) + " bytes");
         return false;
     }
+    if (_fed == 0) {
+        _hasMark = startsWithMark({static_cast<char const*>(room), *got});
+    }
     _fed += *got;
     *isLast = *got < *size;
     if (XML_ParseBuffer(_parser.get(), static_cast<int>(*got), *isLast) != XML_STATUS_OK) {
@@ -170,7 +179,9 @@ void BXXMLReadStream::Reading::failHere(std::string reason) {
     failure = BXReadFailure{0, 0, std::move(reason)};
     if (_parser) {
         failure->line = XML_GetCurrentLineNumber(_parser.get());
-        failure->column = XML_GetCurrentColumnNumber(_parser.get()) + 1;
+        bool const countsMark = _hasMark && failure->line == 1;
+        std::uint64_t const before = XML_GetCurrentColumnNumber(_parser.get());
+        failure->column = before + (countsMark && before != 0 ? 0 : 1);
     }
 }
 
@@ -197,3 +208,4 @@ BXReadFailure const* BXXMLReadStream::failure() const {
 void BXXMLReadStream::pushScope(BXScope const* scope) { _reading->reader.pushScope(scope); }
 void BXXMLReadStream::pushHandler(BXSerializer* handler) { _reading->reader.pushHandler(handler); }
 void BXXMLReadStream::skipElement() { _reading->reader.skipElement(); }
+bool BXXMLReadStream::allowsNode() { return _reading->reader.allowsNode(); }

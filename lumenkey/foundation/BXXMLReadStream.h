@@ -12,7 +12,7 @@
 
 /// Why a document could not be read, and where that was noticed.
 struct BXReadFailure {
-    /// Both counted from 1, columns in characters; 0 for what concerns the file and no place in it.
+    /// Both counted from 1, columns in characters, a byte order mark being none; 0 for what concerns the file and no place in it.
     std::uint64_t line = 0;
     std::uint64_t column = 0;
     std::string reason;
@@ -27,8 +27,9 @@ struct BXReadFailure {
 /// The text may be UTF-8, UTF-16, ISO-8859-1 or US-ASCII, as a byte order mark or the declaration tells. Text beside
 /// elements in an element counts nowhere, so `readSignificantWhiteSpace` is never asked. Namespaces are no more than
 /// parts of names. What is read may be hostile: document type declarations, and so entities but XML's own, are
-/// refused; elements lie at most 1,000 deep, the root counted; a text, or a tag with all its attributes, is at most
-/// 64 MiB long. Memory follows the longest of those and the number of different names, not the document.
+/// refused; elements lie at most 1,000 deep, the root counted, and those that something is made for (`allowsNode`) at
+/// most 990, so that it can be written and read again; a text, or a tag with all its attributes, is at most 64 MiB
+/// long. Memory follows the longest of those and the number of different names, not the document.
 ///
 /// The first failure stops the reading; what handlers did until then stays. A handler that answers false is a failure
 /// too, and what one throws comes out of `parse`. One object belongs to one thread; any number may read at once.
@@ -60,6 +61,7 @@ public:
     void pushScope(BXScope const* scope) override;
     void pushHandler(BXSerializer* handler) override;
     void skipElement() override;
+    bool allowsNode() override;
 
 private:
     class Reading;

@@ -64,7 +64,10 @@ bool KFChannelBase::parseEnd(BXSerializerReadStream&) { return true; }
 /// The flags of a document that stands alone. They replace the whole word, but for what a node is: a document can't
 /// make a folder of a value. A root is locked only when its children have been read, and keeps the bit that no document
 /// holds.
-bool KFChannelBase::parseElement(BXSerializerReadStream&, BXStreamElement& element) {
+bool KFChannelBase::parseElement(BXSerializerReadStream& stream, BXStreamElement& element) {
+    // This was a folder for the writer; what its children hold isn't for this node.
+    if (element.tag() == kParameterElement && !testFlag(kChannelFlagIsFolder))
+        stream.skipElement();
     std::uint64_t flags = 0;
     if (element.tag() != kFlagsElement || !element.getAsUInt64(&flags))
         return true;

@@ -127,6 +127,7 @@ void KFChannel::parseFadeOffset(BXStreamElement const& element) {
     if (!element.getAsTime(&length) || (_impl->getFades() == nullptr && !(length > kTempusZero)))
         return;
     KFFadeBlock& fades = fadesToWrite();
+    willBeModified(kModifyData);
     bool const fadesIn = element.tag() == kFadeInOffsetElement;
     (fadesIn ? fades.fadeInOffset : fades.fadeOutOffset) = TempusMaximum(length, kTempusZero);
 }
@@ -140,5 +141,6 @@ void KFChannel::parseFadeShape(BXStreamElement const& element) {
     if (_impl->getFades() == nullptr && shape == 0)
         return;
     KFFadeBlock& fades = fadesToWrite();
+    willBeModified(kModifyData);
     (element.tag() == kFadeInCurveElement ? fades.fadeInCurve : fades.fadeOutCurve) = shape;
 }

@@ -6,6 +6,8 @@
 #include "lumenkey/Channels/KFFactory.h"
 #include "lumenkey/persistence/KFDocumentElements.h"
 
+#include <memory>
+
 namespace {
 
 constexpr std::uint32_t kFoldFlagsOfDigest = 0x7FF8DFF0;
@@ -77,18 +79,24 @@ KFChannelBase* KFChannelFolder::childForElement(BXStreamElement const& element) 
         return present;
     std::uint32_t fileID = 0;
     element.getAttributeAsUInt32(kFactoryIDAttributeOfNode, &fileID);
-    auto* const factory = dynamic_cast<KFChannelFactory*>(KFFactories::getInstance().lookupFactory(fileID));
+    // 0 stands for no factory, whatever a document gives that number to.
+    auto* const factory = dynamic_cast<KFChannelFactory*>(
+        fileID == 0 ? nullptr : KFFactories::getInstance().lookupFactory(fileID));
     if (factory == nullptr)
         return nullptr;
     BXString name;
     element.getAttributeAsString(kNameAttribute, &name);
-    KFChannelBase* const made = factory->createChannel(name, id);
-    push_back(made);
-    return made;
+    std::unique_ptr<KFFactoryBase> made(factory->create(name, id));
+    auto* const child = dynamic_cast<KFChannelBase*>(made.get());
+    if (child == nullptr)
+        return nullptr;
+    (void)made.release(); // whoever owns the tree owns it
+    push_back(child);
+    return child;
 }
 
 void KFChannelFolder::parseChild(BXSerializerReadStream& stream, BXStreamElement& element) {
-    KFChannelBase* const child = childForElement(element);
+    KFChannelBase* const child = stream.allowsNode() ? childForElement(element) : nullptr;
     if (child == nullptr) {
         stream.skipElement();
         return;

@@ -35,10 +35,11 @@ bool KFCurve::parseEnd(BXSerializerReadStream&) {
 
 /// The flags come last: a locked keypoint takes nothing else.
 void KFCurve::flushParseRecord() {
-    if (_parseRecord == nullptr || _parseRecord->handle == nullptr)
+    KFSpline* const spline = rootSpline();
+    if (spline == nullptr || _parseRecord == nullptr || _parseRecord->handle == nullptr)
         return;
-    KFSplineAccess const access(*getSpline());
-    getSpline()->setVertexFlags(_parseRecord->handle, _parseRecord->flags);
+    KFSplineAccess const access(*spline);
+    spline->setVertexFlags(_parseRecord->handle, _parseRecord->flags);
 }
 
 bool KFCurve::parseElement(BXSerializerReadStream& stream, BXStreamElement& element) {
@@ -60,8 +61,9 @@ bool KFCurve::parseElement(BXSerializerReadStream& stream, BXStreamElement& elem
         break;
     }
     case kClosedElement: {
-        std::uint32_t closed = 0;
-        if (element.getAsUInt32(&closed) && closed != 0)
+        std::uint32_t number = 0;
+        bool closed = false;
+        if (element.getAsBool(&closed) ? closed : element.getAsUInt32(&number) && number != 0)
             closeCurve();
         break;
     }
@@ -145,7 +147,7 @@ void KFCurve::parseKeypointElement(BXSerializerReadStream const& stream, BXStrea
             setParsedAttribute(&KFSpline::setVertexBiasLinear, number);
         break;
     case kNormalElement:
-        if (element.getAsDouble(&number))
+        if (isSpline() && element.getAsDouble(&number))
             setParsedAttribute(&KFSpline::setVertexNormal, number);
         break;
     default:

@@ -8,8 +8,10 @@
 #include "tools/import/CsvTree.h"
 #include "tools/import/MotionTree.h"
 
+#include <cmath>
 #include <cstdio>
 #include <cstdlib>
+#include <limits>
 
 namespace {
 
@@ -26,14 +28,39 @@ std::string_view textOf(FuzzBytes bytes) {
     return {reinterpret_cast<char const*>(bytes.data()), bytes.size()};
 }
 
-void readEverything(KFChannelFolder& folder) {
+template <class Visit> void forEachValue(KFChannelFolder& folder, Visit const& visit) {
     std::vector<KFChannelBase*> channels;
     folder.getAllDescendantsFlattened(channels, 0, false);
-    for (KFChannelBase* const node : channels) {
-        auto& channel = static_cast<KFChannel&>(*node);
+    for (KFChannelBase* const node : channels)
+        visit(static_cast<KFChannel&>(*node));
+}
+
+void readEverything(KFChannelFolder& folder) {
+    forEachValue(folder, [](KFChannel& channel) {
         for (std::int64_t i = -2; i < 3; ++i)
             channel.getValueAsDouble(TempusMake(i, 2), 0.0);
-    }
+        std::uint32_t count = 20;
+        std::vector<Tempus> times;
+        std::vector<double> values;
+        channel.getCurveInterface()->getCurveSamples(TempusMake(-1, 1), TempusMake(1, 8), count, &times,
+                                                     &values);
+    });
+}
+
+/// Where a minimum is above its maximum, a value below both is clamped to the one, and that to the other, and so each
+/// writing gives another. Infinite limits are none to a reader, and may come to lie so.
+void uncrossLimits(KFChannelFolder& folder) {
+    forEachValue(folder, [](KFChannel& channel) {
+        KFCurve& curve = *channel.getCurveInterface();
+        double least = 0.0;
+        double most = 0.0;
+        curve.getAbsoluteMinValueV(&least);
+        curve.getAbsoluteMaxValueV(&most);
+        if (least > most || std::isinf(least) || std::isinf(most)) {
+            curve.setAbsoluteMinValueV(-std::numeric_limits<double>::max());
+            curve.setAbsoluteMaxValueV(std::numeric_limits<double>::max());
+        }
+    });
 }
 
 } // namespace
@@ -42,6 +69,7 @@ void fuzzDocument(FuzzBytes bytes) {
     OwnedTree const tree(new KFChannelObjectRootBase("Root", nullptr, 1, 0, 0));
     tree->configureWithState(dataOf(bytes));
     readEverything(*tree);
+    uncrossLimits(*tree);
     OwnedTree const second(new KFChannelObjectRootBase("Root", nullptr, 1, 0, 0));
     require(second->configureWithState(tree->createChannelState(true, true)),
             "a tree can't read what it wrote");

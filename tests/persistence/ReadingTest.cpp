@@ -1,7 +1,9 @@
 // What a document does to the tree that reads it: what comes in, what stays, what is passed over.
 
+#include "lumenkey/Channels/KFChannelFactoryTable.h"
 #include "lumenkey/Channels/KFChannelImpl.h"
 #include "lumenkey/Channels/KFFactories.h"
+#include "lumenkey/Channels/KFFactory.h"
 #include "lumenkey/Channels/KFScalarChannels.h"
 #include "lumenkey/curves/KFCurve.h"
 #include "lumenkey/foundation/BXURL.h"
@@ -147,6 +149,58 @@ TEST_F(Reading, IsNotStoppedByALock) {
     ASSERT_TRUE(readDocument(folder(), documentWith("<parameter id=\"1\"/>")));
     EXPECT_FALSE(child(1).hasFadeHandles());
     EXPECT_TRUE(child(1).getImpl()->isShared());
+}
+
+TEST_F(Reading, KeepsAWritersFolderOutOfAValue) {
+    auto* const mine = new KFChannelDouble(4.0, "Mine", &folder(), 1, 0);
+    KFChannelFlags const flags = mine->getFlags();
+    ASSERT_TRUE(readDocument(
+        folder(), documentWith("<parameter id=\"1\"><parameter id=\"1\" factoryID=\"2\"><flags>4</flags>"
+                               "<fadeInOffset>3/1</fadeInOffset>"
+                               "<curve type=\"1\" value=\"9\"><numberOfKeypoints>1</numberOfKeypoints>"
+                               "<keypoint><time>0/1</time><value>9</value></keypoint></curve></parameter>"
+                               "<fadeOutOffset>3/1</fadeOutOffset></parameter>")));
+    EXPECT_EQ(mine->getFlags(), flags);
+    EXPECT_EQ(mine->getInitialValue(), 4);
+    EXPECT_EQ(mine->getNumberOfKeyframes(), 0U);
+    EXPECT_EQ(mine->getFadeInOffset(), kTempusZero);
+    EXPECT_EQ(mine->getFadeOutOffset(), TempusMake(3, 1)) << "what follows is its own again";
+}
+
+namespace {
+
+/// A host's own class of channels, made in the one way that a factory has to know.
+struct HostFactory : KFChannelFactory {
+    HostFactory() : KFChannelFactory({{1, 2, 3, 6}}, KFChannelFactoryUUID("KFChannelDouble"), 1) {}
+    KFFactoryBase* create(BXString const& name, unsigned int id) override {
+        return new HostChannel(this, name, id, nullptr, nullptr);
+    }
+};
+
+struct HostRoot : KFChannelObjectRootBase {
+    using KFChannelObjectRootBase::KFChannelObjectRootBase;
+    void willModifyChannel(KFChannelBase* channel, unsigned int kind) override {
+        announced += channel->getName().str() + (kind == kModifyData ? " data, " : " state, ");
+    }
+    std::string announced;
+};
+
+} // namespace
+
+TEST(ReadingOfHosts, MakesTheirClassesAndTellsThem) {
+    static HostFactory factory;
+    KFFactories::getInstance().addFactory(&factory);
+    OwnedTree const top(new HostRoot("Root", nullptr, 1, 0, 0));
+    ASSERT_TRUE(readDocument(
+        *top, "<kfml version=\"5.13\"><factory id=\"1\" uuid=\"00000001-0000-0002-0000-000300000006\"/>"
+              "<factory uuid=\"" +
+                  std::string(kDoubleUUID) +
+                  "\"/><parameter><parameter id=\"1\" name=\"Host\" factoryID=\"1\" value=\"3\">"
+                  "<fadeInOffset>1/1</fadeInOffset><fadeInCurve>2</fadeInCurve></parameter>"
+                  "<parameter id=\"2\" factoryID=\"0\"/></parameter></kfml>"));
+    EXPECT_NE(dynamic_cast<HostChannel*>(top->getDescendant(1)), nullptr);
+    EXPECT_EQ(top->getDescendant(2), nullptr) << "0 is no factory";
+    EXPECT_EQ(static_cast<HostRoot&>(*top).announced, "Root data, Host data, Host data, Host data, ");
 }
 
 TEST_F(Reading, LocksARootBehindItsChildren) {
