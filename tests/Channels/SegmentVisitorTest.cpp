@@ -13,10 +13,17 @@
 #include <algorithm>
 #include <cmath>
 #include <limits>
+#include <locale>
 #include <random>
 #include <sstream>
 
 namespace {
+
+std::ostringstream inTheCLocale() {
+    std::ostringstream text;
+    text.imbue(std::locale::classic());
+    return text;
+}
 
 using Time = Tempus const&;
 constexpr double kMost = std::numeric_limits<double>::max();
@@ -112,7 +119,7 @@ private:
 /// Writes the visits down: "value@time", "value@start..end", "type:source..source@start..end+offset".
 class Notes : public PieceVisitor {
 public:
-    std::ostringstream text;
+    std::ostringstream text = inTheCLocale();
 
     void visitConstant(double value, Time start, Time end) override {
         text << value << '@' << seconds(start) << (start == end ? "" : "..");

@@ -8,6 +8,8 @@
 
 #include <atomic>
 #include <cmath>
+#include <locale>
+#include <sstream>
 #include <thread>
 
 namespace {
@@ -35,16 +37,14 @@ public:
     }
     /// `time value` of each keypoint, the linear ones' type left out.
     std::string keypoints() {
-        std::string text;
+        std::ostringstream text;
+        text.imbue(std::locale::classic());
         std::vector<std::pair<Tempus, std::pair<double, unsigned>>> keys;
         getKeypointsTimeAndValue({kTempusZero, at(1000)}, keys, nullptr, nullptr);
-        for (auto const& [time, key] : keys) {
-            char buffer[64];
-            snprintf(buffer, sizeof buffer, "%g:%g%s ", TempusGetSeconds(time), key.first,
-                     key.second == kKFInterpolationLinear ? "" : "*");
-            text += buffer;
-        }
-        return text;
+        for (auto const& [time, key] : keys)
+            text << TempusGetSeconds(time) << ':' << key.first
+                 << (key.second == kKFInterpolationLinear ? "" : "*") << ' ';
+        return text.str();
     }
 };
 

@@ -8,6 +8,7 @@
 
 #include <cmath>
 #include <gtest/gtest.h>
+#include <locale>
 #include <nlohmann/json.hpp>
 
 namespace lumenkey::tools {
@@ -107,6 +108,7 @@ TEST_F(EditVerbsTest, ReportsWhatChanged) {
 /// A line, a wave, a wave that jumps, and noise that nothing can draw with fewer keypoints; 30 rows a second.
 std::string wavyTable() {
     std::ostringstream text;
+    text.imbue(std::locale::classic());
     text.precision(17);
     text << "t,line,wave,jumps,noise\n";
     unsigned noise = 1;

@@ -6,6 +6,7 @@
 
 #include <charconv>
 #include <gtest/gtest.h>
+#include <locale>
 #include <random>
 
 namespace lumenkey::tools {
@@ -16,6 +17,7 @@ using samples::kSmallMotion;
 /// Everything but the name of the file, numbers to the last bit.
 std::string described(Motion const& motion) {
     std::ostringstream text;
+    text.imbue(std::locale::classic());
     text << std::hexfloat << motion.frameDuration.value << "/" << motion.frameDuration.timescale << "\n";
     for (MotionJoint const& joint : motion.joints) {
         text << joint.name << " in " << static_cast<std::ptrdiff_t>(joint.parent) << " at";
