@@ -177,8 +177,7 @@ Tempus randomTime(Random& random) {
 std::string randomName(Random& random) {
     constexpr char const* kPieces[] = {"Size",
                                        " ",
-                                       "Gr\xC3\xB6\xC3\x9F"
-                                       "e",
+                                       "Gr\u00F6\u00DFe",
                                        "\xE5\xA4\xA7\xE3\x81\x8D\xE3\x81\x95",
                                        "\n",
                                        "\t",
