@@ -25,7 +25,7 @@ std::string listing(ChannelTree const& tree) {
     std::string text;
     for (ChannelTree::Node node = 0; node < tree.count(); ++node) {
         text += tree.path(node) + " " + tree.base(node).getName().str() + " " +
-                std::string(nodeTypeName(tree.type(node))) + "\n";
+                tree.typeName(node) + "\n";
     }
     return text;
 }

@@ -16,7 +16,7 @@ std::string readBack(std::string_view text) {
         std::string result;
         for (ChannelTree::Node const channel : tree->channelsBelow(ChannelTree::kTop)) {
             result += std::to_string(tree->base(channel).getID()) + " " + tree->dottedName(channel) + ":";
-            KFSpline& spline = tree->spline(channel);
+            KFSpline& spline = *tree->spline(channel);
             std::vector<void*> handles;
             spline.getAllVerticesHandles(handles);
             for (void* const handle : handles) {

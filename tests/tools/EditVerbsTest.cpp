@@ -268,7 +268,7 @@ TEST_F(EditVerbsTest, WrongArgumentsAreToldBeforeAnythingIsWritten) {
         std::string target;
         char const* complaint;
     } const cases[] = {
-        {none, {"reverse"}, "out.txt", "must end in .csv or .bvh"},
+        {none, {"reverse"}, "out.txt", "must end in .lumen, .csv or .bvh"},
         {none, {"reverse"}, "out.bvh", "a table (CSV) has no skeleton"},
         {_folder.write("table", "t,X\n0,1\n"), {"reverse"}, "out.bvh", "a table (CSV) has no skeleton"},
         {none, {"reverse", "--plot", "p.bmp"}, "out.csv", "must end in .svg, .png or .pdf"},

@@ -2,10 +2,12 @@
 
 #include "tools/cli/NearMatch.h"
 #include "tools/cli/Progress.h"
+#include "tools/cli/TimeArgument.h"
 #include "tools/cli/UsageError.h"
 #include "tools/output/StandardOutput.h"
 #include "tools/output/TextForms.h"
 
+#include <CLI/CLI.hpp>
 #include <algorithm>
 #include <unistd.h>
 
@@ -16,14 +18,35 @@ namespace {
 /// Names that are longer aren't compared with what may have been meant.
 constexpr std::size_t kLongestNearName = 300;
 
-ChannelFile openWithProgress(std::string const& file) {
+ChannelFile openWithProgress(InputOptions const& options) {
+    std::optional<Tempus> frameDuration;
+    if (!options.frameRate.empty()) {
+        frameDuration = stepOfRate(options.frameRate);
+    }
     Progress bar("reading");
-    return openChannelFile(file, [&bar](double share) { bar.update(share); });
+    ChannelFile opened = openChannelFile(
+        options.file, [&bar](double share) { bar.update(share); }, frameDuration);
+    if (frameDuration && opened.format != ChannelFormat::Document) {
+        throw UsageError{"--frame-rate is for documents: '" + options.file + "' has a rate of its own"};
+    }
+    return opened;
 }
 
 } // namespace
 
-ChannelInput::ChannelInput(std::string const& file) : _file(openWithProgress(file)) {}
+void InputOptions::add(CLI::App& verb) {
+    verb.add_option("FILE", file, kFileHelp)->option_text(" ")->required();
+    addFrameRate(verb);
+}
+
+void InputOptions::addFrameRate(CLI::App& verb) {
+    verb.add_option("--frame-rate", frameRate,
+                    "Of a document: frames a second, where times are given in frames (else as its keypoints "
+                    "stand), or where it is an old one that counts frames (else 30)")
+        ->option_text("R");
+}
+
+ChannelInput::ChannelInput(InputOptions const& options) : _file(openWithProgress(options)) {}
 
 void ChannelInput::failForName(std::string const& text) const {
     // As much of each name is compared as the text has of its own.

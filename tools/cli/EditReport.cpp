@@ -57,6 +57,12 @@ std::string keypointsText(KeypointTotals const& totals) {
     return totals.after == 0 || totals.areEqual() ? text : text + ", " + ratioText(totals) + " to 1";
 }
 
+std::string countedIn(ChannelFormat format) {
+    return format == ChannelFormat::Motion     ? "frames"
+           : format == ChannelFormat::Document ? "keypoints"
+                                               : "rows";
+}
+
 void writeChannelJson(JsonWriter& json, EditedChannel const& channel, std::string const& difference) {
     json.beginObject(JsonLayout::Inline);
     json.key("channel");
@@ -98,8 +104,7 @@ void EditReport::writeTable(OutputSink& out) const {
                                      tableText(TempusGetSeconds(channel->change.at)) + " s");
     }
     line("stretch", timeText(span.from) + " s to " + timeText(span.to) + " s");
-    line("written", printableText(output) + ", " + std::to_string(written.count) +
-                        (channelFormatNamed(output) == ChannelFormat::Motion ? " frames" : " rows") +
+    line("written", printableText(output) + ", " + std::to_string(written.count) + " " + countedIn(format) +
                         " from " + timeText(written.start) + " s on\n");
     Table table;
     table.columns = {{"channel"},
@@ -135,7 +140,7 @@ void EditReport::writeJson(OutputSink& out) const {
     json.string(words.name);
     json.key("output");
     json.string(output);
-    json.key(channelFormatNamed(output) == ChannelFormat::Motion ? "frames" : "rows");
+    json.key(format == ChannelFormat::Document ? "written" : countedIn(format));
     json.integer(written.count);
     json.key("start");
     json.string(timeText(written.start));

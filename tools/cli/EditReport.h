@@ -22,6 +22,7 @@ struct EditedChannel {
 struct EditReport {
     EditWords words;
     std::string output;
+    ChannelFormat format{};
     TimeSpan span;
     WrittenRows written;
     std::vector<EditedChannel> channels;

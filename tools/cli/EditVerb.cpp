@@ -2,6 +2,7 @@
 
 #include "tools/cli/ChannelInput.h"
 #include "tools/cli/EditReport.h"
+#include "tools/cli/OutputOptions.h"
 #include "tools/cli/PlotOptions.h"
 #include "tools/cli/Progress.h"
 #include "tools/cli/UsageError.h"
@@ -27,28 +28,15 @@ constexpr std::int32_t kShareBeside = 8;
 constexpr std::int32_t kStepsOfUnevenRows = 1'000;
 
 struct EditOptions {
-    std::string file;
+    InputOptions input;
     std::vector<std::string> channels;
-    std::string output;
+    OutputOptions output;
     std::string from;
     std::string to;
     std::string rows;
     std::string plot;
     bool json = false;
 };
-
-/// What the name of the output asks for. Throws `UsageError` for what can't be written from this input; of an unknown
-/// input it says nothing.
-ChannelFormat requireOutputFormat(std::string const& output, std::optional<ChannelFormat> input) {
-    std::optional<ChannelFormat> const format = channelFormatNamed(output);
-    if (!format) {
-        throw UsageError{"'" + output + "' must end in .csv or .bvh, which tells what to write"};
-    }
-    if (format == ChannelFormat::Motion && input == ChannelFormat::Csv) {
-        throw UsageError{"'" + output + "' can't be a BVH: a table (CSV) has no skeleton"};
-    }
-    return *format;
-}
 
 /// One run of a verb.
 class EditRun {
@@ -57,14 +45,14 @@ public:
 
     void run(OutputSink& out) {
         readOptions();
-        ChannelInput const input(_options.file);
-        _format = requireOutputFormat(_options.output, input.file().format);
+        ChannelInput const input(_options.input);
+        _format = _options.output.formatFor(input.file().format);
         std::vector<Node> const channels = channelsOf(input);
         _span = spanOf(input.file());
         _verb.prepare(input.file(), _span);
         editAll(input, channels);
 
-        EditReport report{_verb.words(), _options.output, _span, {}, std::move(_edited)};
+        EditReport report{_verb.words(), target(), _format, _span, {}, std::move(_edited)};
         report.written = writeFile(input, channels);
         if (_picture) {
             savePicture(report);
@@ -73,10 +61,12 @@ public:
     }
 
 private:
+    std::string const& target() const { return _options.output.target(_options.input.file); }
+
     void readOptions() {
-        ChannelFormat const format = requireOutputFormat(_options.output, channelFormatNamed(_options.file));
-        if (format != ChannelFormat::Csv && !_options.rows.empty()) {
-            throw UsageError{"--rows is for a table: '" + _options.output + "' must end in .csv then"};
+        std::optional<ChannelFormat> const format = _options.output.check(_options.input.file);
+        if (format && *format != ChannelFormat::Csv && !_options.rows.empty()) {
+            throw UsageError{"--rows is for a table: '" + target() + "' must end in .csv then"};
         }
         if (!_options.plot.empty()) {
             _picture = requirePlotFormat(_options.plot);
@@ -117,10 +107,11 @@ private:
         }
     }
 
-    TimeSpan keyedSpan(KFChannel const& channel) const {
+    TimeSpan keyedSpan(KFChannel& channel) const {
         TimeSpan keyed;
-        channel.getFirstKeyframe(&keyed.from, nullptr);
-        channel.getLastKeyframe(&keyed.to, nullptr);
+        KFCurve& curve = *channel.getCurveInterface();
+        curve.getFirstKeypoint(&keyed.from, nullptr);
+        curve.getLastKeypoint(&keyed.to, nullptr);
         return {TempusMaximum(_span.from, keyed.from), TempusMinimum(_span.to, keyed.to)};
     }
 
@@ -131,13 +122,13 @@ private:
         std::unique_ptr<KFCurveInterface> const copy(tree.curve(node).cloneCurve());
         auto& before = static_cast<KFCurve&>(*copy);
         TimeSpan const keyed = keyedSpan(channel);
-        if (edited.keypointsBefore > 0 && !(keyed.to < keyed.from)) {
+        if (edited.keypointsBefore > 0 && !(keyed.to < keyed.from) && !channel.isLocked(true)) {
             _verb.apply(channel, keyed);
         }
         edited.keypointsAfter = channel.getNumberOfKeyframes();
         edited.change = changeBetween(before, tree.curve(node), _span, step);
         if (_picture) {
-            addToPicture(tree, node, *before.getSpline(), edited);
+            addToPicture(tree, node, before, edited);
         }
         return edited;
     }
@@ -145,9 +136,9 @@ private:
     WrittenRows writeFile(ChannelInput const& input, std::vector<Node> const& channels) const {
         bool const areKeypoints = _options.rows.empty() ? !_verb.sampleStep() : _options.rows == "keypoints";
         Progress bar("writing");
-        return writeChannelFile({input.file(), _format, areKeypoints ? RowsOf::Keypoints : RowsOf::Input,
-                                 channels, _options.output},
-                                [&bar](double share) { bar.update(share); });
+        return writeChannelFile(
+            {input.file(), _format, areKeypoints ? RowsOf::Keypoints : RowsOf::Input, channels, target()},
+            [&bar](double share) { bar.update(share); });
     }
 
     /// The stretch and where it comes to; around a part of the file, some of what lies beside it.
@@ -161,17 +152,18 @@ private:
         return {_from ? shown.from - beside : shown.from, _to ? shown.to + beside : shown.to};
     }
 
-    void addToPicture(ChannelTree const& tree, Node node, KFSpline& before, EditedChannel const& edited) {
+    void addToPicture(ChannelTree const& tree, Node node, KFCurve& before, EditedChannel const& edited) {
         TimeSpan const shown = shownSpan();
         double const pixels = widthOfCurves(kPictureWidth);
         _chart.seconds = PlotRange::sound(TempusGetSeconds(shown.from), TempusGetSeconds(shown.to));
         CurvePicture old = traceCurve(before, shown.from, shown.to, pixels);
-        CurvePicture now = traceCurve(tree.spline(node), shown.from, shown.to, pixels);
+        CurvePicture now = traceCurve(tree.curve(node), shown.from, shown.to, pixels);
         panelOfUnit(_chart, edited.unit).curves.push_back({edited.channel, std::move(now), std::move(old)});
     }
 
     void savePicture(EditReport const& report) {
-        _chart.title = _verb.words().name + " " + std::filesystem::path(_options.file).filename().string();
+        _chart.title =
+            _verb.words().name + " " + std::filesystem::path(_options.input.file).filename().string();
         _chart.subtitle = report.summary();
         PlotCanvas canvas(*_picture, kPictureWidth, kPictureHeight);
         _chart.draw(canvas);
@@ -190,12 +182,9 @@ private:
 };
 
 void addCommonOptions(CLI::App& verb, EditOptions& options) {
-    verb.add_option("FILE", options.file, kFileHelp)->option_text(" ")->required();
+    options.input.add(verb);
     verb.add_option("CHANNEL", options.channels, kChannelHelp)->option_text("...");
-    verb.add_option("-o,--output", options.output,
-                    "The whole file anew: OUT.csv, or OUT.bvh where FILE is a BVH. OUT may be FILE")
-        ->option_text("OUT")
-        ->required();
+    options.output.add(verb);
     verb.add_option("--from", options.from, "The first time that is edited (else the first of the file)")
         ->option_text("T");
     verb.add_option("--to", options.to, "The last time that is edited (else the last of the file)")
@@ -212,10 +201,11 @@ void addCommonOptions(CLI::App& verb, EditOptions& options) {
 std::string footerOf(EditWords const& words, bool draws) {
     return words.notes +
            "A time is VALUE/TIMESCALE (1001/24000), seconds (0.5) or frames of the file (12f).\n"
-           "Without CHANNEL all channels are edited; the others are written as they are.\n"
+           "Locked channels stay as they are. Without CHANNEL all channels are edited; the others are "
+           "written as they are.\n"
            "A BVH has frames as long as those of FILE, from 0, or from the first keypoint before it, to the "
            "last.\n"
-           "A CSV has " +
+           "A document keeps all else that it holds. A CSV has " +
            (draws ? "the rows of the input" : "a row for each keypoint") +
            ", if --rows doesn't say otherwise.\n\nExample: " + words.example;
 }
@@ -241,8 +231,8 @@ Verb declareEdit(CLI::App& program, std::shared_ptr<EditVerb> const& verb) {
     arguments->footer(footerOf(words, verb->sampleStep().has_value()));
     return {arguments,
             "FILE [CHANNEL...] " + words.usage + (words.usage.empty() ? "" : " ") +
-                "-o OUT.csv|bvh [--from T] [--to T] [--rows input|keypoints] [--plot PICTURE.svg|png|pdf] "
-                "[--json]",
+                "(-o OUT.lumen|csv|bvh | --in-place) [--from T] [--to T] [--rows input|keypoints] "
+                "[--plot PICTURE.svg|png|pdf] [--frame-rate R] [--json]",
             [verb, options](OutputSink& out) { EditRun(*verb, *options).run(out); }};
 }
 

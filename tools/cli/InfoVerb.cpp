@@ -6,18 +6,72 @@
 #include "tools/output/TextForms.h"
 
 #include <CLI/CLI.hpp>
+#include <cstdint>
+#include <filesystem>
 #include <memory>
+#include <optional>
 
 namespace lumenkey::tools {
 
 namespace {
 
 struct InfoOptions {
-    std::string file;
+    InputOptions input;
     bool json = false;
 };
 
 bool isMotion(ChannelInput const& input) { return input.file().format == ChannelFormat::Motion; }
+
+bool isDocument(ChannelInput const& input) { return input.file().format == ChannelFormat::Document; }
+
+/// Nothing for what isn't a plain file.
+std::optional<std::uintmax_t> sizeOf(std::string const& file) {
+    std::error_code error;
+    std::uintmax_t const size = std::filesystem::file_size(file, error);
+    return error ? std::nullopt : std::optional(size);
+}
+
+std::string versionText(DocumentFile const& document) {
+    return std::to_string(document.major) + "." + std::to_string(document.minor);
+}
+
+void writeDocumentJson(DocumentFile const& document, JsonWriter& json) {
+    json.key("version");
+    json.string(versionText(document));
+    json.key("factories");
+    json.beginArray();
+    for (DocumentFactory const& factory : document.factories) {
+        json.beginObject(JsonLayout::Inline);
+        json.key("id");
+        json.integer(factory.number);
+        json.key("uuid");
+        json.string(factory.uuid.text());
+        json.key("description");
+        json.string(factory.description);
+        json.key("class");
+        json.string(factory.className);
+        json.endObject();
+    }
+    json.endArray();
+}
+
+std::string nameOf(DocumentFactory const& factory) {
+    if (!factory.className.empty()) {
+        return shortClassName(factory.className);
+    }
+    return factory.description.empty() ? factory.uuid.text() : factory.description;
+}
+
+std::string factoriesText(DocumentFile const& document) {
+    std::string text;
+    std::size_t unknown = 0;
+    for (DocumentFactory const& factory : document.factories) {
+        text += (text.empty() ? ": " : ", ") + nameOf(factory);
+        unknown += factory.isKnown() ? 0 : 1;
+    }
+    return std::to_string(document.factories.size()) + text +
+           (unknown == 0 ? "" : "; " + std::to_string(unknown) + " unknown");
+}
 
 std::uint64_t keypointCount(ChannelInput const& input, std::vector<ChannelTree::Node> const& channels) {
     std::uint64_t count = 0;
@@ -32,7 +86,14 @@ void writeJson(ChannelInput const& input, std::vector<ChannelTree::Node> const& 
     JsonWriter json(out);
     json.beginObject();
     json.key("format");
-    json.string(isMotion(input) ? "BVH" : "CSV");
+    json.string(channelFormatName(file.format));
+    if (isDocument(input)) {
+        writeDocumentJson(file.document, json);
+    }
+    if (std::optional<std::uintmax_t> const size = sizeOf(file.file)) {
+        json.key("bytes");
+        json.integer(*size);
+    }
     json.key("channels");
     json.integer(channels.size());
     json.key("keypoints");
@@ -49,8 +110,10 @@ void writeJson(ChannelInput const& input, std::vector<ChannelTree::Node> const& 
         json.key("joints");
         json.integer(file.joints);
     }
-    json.key(isMotion(input) ? "frames" : "rows");
-    json.integer(file.rows);
+    if (!isDocument(input)) {
+        json.key(isMotion(input) ? "frames" : "rows");
+        json.integer(file.rows);
+    }
     json.key("channelNames");
     json.beginArray();
     for (ChannelTree::Node const channel : channels) {
@@ -90,13 +153,24 @@ void writeSummary(ChannelInput const& input, std::vector<ChannelTree::Node> cons
                   OutputSink& out) {
     ChannelFile const& file = input.file();
     out.write("file       " + printableText(file.file) + "\n");
-    out.write(isMotion(input) ? "format     BVH (motion capture)\n" : "format     CSV (values over time)\n");
+    if (isDocument(input)) {
+        out.write("format     document, version " + versionText(file.document) + "\n");
+        out.write("factories  " + printableText(factoriesText(file.document)) + "\n");
+    } else {
+        out.write(isMotion(input) ? "format     BVH (motion capture)\n"
+                                  : "format     CSV (values over time)\n");
+    }
+    if (std::optional<std::uintmax_t> const size = sizeOf(file.file)) {
+        out.write("size       " + std::to_string(*size) + " bytes\n");
+    }
     if (isMotion(input)) {
         out.write("joints     " + std::to_string(file.joints) + "\n");
     }
     out.write("channels   " + std::to_string(channels.size()) + "\n");
     out.write("keypoints  " + std::to_string(keypointCount(input, channels)) + "\n");
-    out.write(rowsText(input));
+    if (!isDocument(input)) {
+        out.write(rowsText(input));
+    }
     if (!isMotion(input)) {
         out.write("start      " + tableText(TempusGetSeconds(file.firstTime)) + " s, exactly " +
                   timeText(file.firstTime) + " s\n");
@@ -106,7 +180,8 @@ void writeSummary(ChannelInput const& input, std::vector<ChannelTree::Node> cons
 }
 
 std::string extremeText(ChannelTree const& tree, ChannelTree::Node channel, bool least) {
-    double value = 0;
+    // Without keypoints it is the same at all times.
+    double value = tree.curve(channel).getValue(kTempusZero, 0.0);
     if (tree.channel(channel).getNumberOfKeyframes() > 0) {
         least ? tree.curve(channel).getCurrentMinValueV(&value, false)
               : tree.curve(channel).getCurrentMaxValueV(&value, false);
@@ -132,7 +207,7 @@ void writeChannels(ChannelTree const& tree, std::vector<ChannelTree::Node> const
 }
 
 void runInfo(InfoOptions const& options, OutputSink& out) {
-    ChannelInput const input(options.file);
+    ChannelInput const input(options.input);
     std::vector<ChannelTree::Node> const channels = input.tree().channelsBelow(ChannelTree::kTop);
     if (options.json) {
         writeJson(input, channels, out);
@@ -147,11 +222,11 @@ void runInfo(InfoOptions const& options, OutputSink& out) {
 Verb declareInfo(CLI::App& program) {
     auto const options = std::make_shared<InfoOptions>();
     CLI::App* const verb = program.add_subcommand("info", "Tell what a file holds");
-    verb->add_option("FILE", options->file, kFileHelp)->option_text(" ")->required();
+    options->input.add(*verb);
     verb->add_flag("--json", options->json,
                    "For programs: counts, exact times and the names of the channels");
     verb->footer("Example: lumenkey info walk.bvh");
-    return {verb, "FILE [--json]", [options](OutputSink& out) { runInfo(*options, out); }};
+    return {verb, "FILE [--frame-rate R] [--json]", [options](OutputSink& out) { runInfo(*options, out); }};
 }
 
 } // namespace lumenkey::tools

@@ -15,7 +15,7 @@ namespace lumenkey::tools {
 namespace {
 
 struct KeysOptions {
-    std::string file;
+    InputOptions input;
     std::string channel;
     bool json = false;
 };
@@ -47,7 +47,12 @@ void writeKeypoint(JsonWriter& json, Keypoint const& key) {
     json.endObject();
 }
 
-void writeJson(std::string const& channel, KFSpline& spline, OutputSink& out) {
+/// A channel may have no spline.
+std::vector<void*> handlesOf(KFSpline* spline) {
+    return spline == nullptr ? std::vector<void*>() : keypointHandles(*spline);
+}
+
+void writeJson(std::string const& channel, KFSpline* spline, OutputSink& out) {
     JsonWriter json(out);
     json.beginObject();
     json.key("channel");
@@ -55,9 +60,9 @@ void writeJson(std::string const& channel, KFSpline& spline, OutputSink& out) {
     json.key("keypoints");
     json.beginArray();
     Progress bar("writing", ProgressOf::Output);
-    std::vector<void*> const handles = keypointHandles(spline);
+    std::vector<void*> const handles = handlesOf(spline);
     for (std::size_t i = 0; i < handles.size(); ++i) {
-        writeKeypoint(json, readKeypoint(spline, handles[i]));
+        writeKeypoint(json, readKeypoint(*spline, handles[i]));
         bar.update(static_cast<double>(i) / static_cast<double>(handles.size()));
     }
     json.endArray();
@@ -90,8 +95,8 @@ std::string cellOf(Keypoint const& key, std::size_t column) {
     }
 }
 
-void writeTable(KFSpline& spline, std::string_view unit, OutputSink& out) {
-    std::vector<void*> const handles = keypointHandles(spline);
+void writeTable(KFSpline* spline, std::string_view unit, OutputSink& out) {
+    std::vector<void*> const handles = handlesOf(spline);
     std::string const value = "value (" + std::string(unit) + ")";
     Table table;
     table.columns = {
@@ -101,15 +106,15 @@ void writeTable(KFSpline& spline, std::string_view unit, OutputSink& out) {
     Progress bar("writing", ProgressOf::Output);
     table.progress = [&bar](double share) { bar.update(share); };
     table.cell = [&](std::size_t row, std::size_t column) {
-        return cellOf(readKeypoint(spline, handles[row]), column);
+        return cellOf(readKeypoint(*spline, handles[row]), column);
     };
     table.write(out);
 }
 
 void runKeys(KeysOptions const& options, OutputSink& out) {
-    ChannelInput const input(options.file);
+    ChannelInput const input(options.input);
     ChannelTree::Node const channel = input.channelNamed(options.channel);
-    KFSpline& spline = input.tree().spline(channel);
+    KFSpline* const spline = input.tree().spline(channel);
     if (options.json) {
         writeJson(input.tree().dottedName(channel), spline, out);
     } else {
@@ -122,7 +127,7 @@ void runKeys(KeysOptions const& options, OutputSink& out) {
 Verb declareKeys(CLI::App& program) {
     auto const options = std::make_shared<KeysOptions>();
     CLI::App* const verb = program.add_subcommand("keys", "List the keypoints of a channel");
-    verb->add_option("FILE", options->file, kFileHelp)->option_text(" ")->required();
+    options->input.add(*verb);
     verb->add_option("CHANNEL", options->channel,
                      "Its name with dots, the end of that, or its path of IDs (./1/3)")
         ->option_text(" ")
@@ -130,7 +135,8 @@ Verb declareKeys(CLI::App& program) {
     verb->add_flag("--json", options->json,
                    "For programs: every number in full, handles as [seconds, value]");
     verb->footer("Example: lumenkey keys walk.bvh Hips.Yposition");
-    return {verb, "FILE CHANNEL [--json]", [options](OutputSink& out) { runKeys(*options, out); }};
+    return {verb, "FILE CHANNEL [--frame-rate R] [--json]",
+            [options](OutputSink& out) { runKeys(*options, out); }};
 }
 
 } // namespace lumenkey::tools

@@ -19,7 +19,7 @@ namespace lumenkey::tools {
 namespace {
 
 struct PlotOptions {
-    std::string file;
+    InputOptions input;
     std::vector<std::string> channels;
     std::string output;
     std::string from;
@@ -52,15 +52,16 @@ PlotChart chartOf(ChannelInput const& input, std::vector<ChannelTree::Node> cons
         ChartPanel& panel = panelOfUnit(chart, input.tree().unit(channel));
         panel.curves.push_back(
             {input.tree().dottedName(channel),
-             traceCurve(input.tree().spline(channel), span.from, span.to, widthOfCurves(width)),
+             traceCurve(input.tree().curve(channel), span.from, span.to, widthOfCurves(width)),
              std::nullopt});
         bar.update(static_cast<double>(++done) / static_cast<double>(channels.size()));
     }
     CurvePicture const& first = chart.panels.front().curves.front().picture;
     bool const areMarked = marksFor(first, widthOfCurves(width)) != KeypointMarks::None;
     Tempus const frame = input.file().frameDuration;
+    bool const standsOnFrames = TempusIsNumeric(frame) && input.file().format != ChannelFormat::Document;
     chart.subtitle = std::to_string(first.keypoints.size()) + " keypoints" +
-                     (TempusIsNumeric(frame) ? ", " + timeText(frame) + " s apart" : "") +
+                     (standsOnFrames ? ", " + timeText(frame) + " s apart" : "") +
                      (areMarked ? "" : ", too close to mark");
     return chart;
 }
@@ -69,7 +70,7 @@ void runPlot(PlotOptions const& options) {
     PlotFormat const format = requirePlotFormat(options.output);
     std::optional<TimeArgument> const from = TimeArgument::parseIfGiven(options.from);
     std::optional<TimeArgument> const to = TimeArgument::parseIfGiven(options.to);
-    ChannelInput const input(options.file);
+    ChannelInput const input(options.input);
     std::vector<ChannelTree::Node> const channels = input.channelsNamed(options.channels);
     if (channels.size() > kMostDistinctCurves) {
         throw UsageError{std::to_string(channels.size()) +
@@ -94,7 +95,7 @@ PlotFormat requirePlotFormat(std::string const& file) {
 Verb declarePlot(CLI::App& program) {
     auto const options = std::make_shared<PlotOptions>();
     CLI::App* const verb = program.add_subcommand("plot", "Draw channels over time");
-    verb->add_option("FILE", options->file, kFileHelp)->option_text(" ")->required();
+    options->input.add(*verb);
     verb->add_option("CHANNEL", options->channels, kChannelHelp)->option_text("...");
     verb->add_option("-o,--output", options->output, "The picture: OUT.svg, OUT.png or OUT.pdf")
         ->option_text("OUT")
@@ -113,7 +114,9 @@ Verb declarePlot(CLI::App& program) {
     verb->footer("A time is VALUE/TIMESCALE (1001/24000), seconds (0.5) or frames of the file (12f).\n"
                  "Rotations and other values get a panel each. What lies outside the keypoints is dashed.\n\n"
                  "Example: lumenkey plot walk.bvh LeftLeg.Xrotation RightLeg.Xrotation -o legs.svg");
-    return {verb, "FILE [CHANNEL...] -o OUT.svg|png|pdf [--from T] [--to T] [--width N] [--height N]",
+    return {verb,
+            "FILE [CHANNEL...] -o OUT.svg|png|pdf [--from T] [--to T] [--width N] [--height N] "
+            "[--frame-rate R]",
             [options](OutputSink&) { runPlot(*options); }};
 }
 

@@ -51,10 +51,10 @@ public:
             "lumenkey VERB --help tells more, with an example.\n"
             "It exits 0 when done, 1 when an input is at fault or an output can't be written, and 2 for "
             "wrong arguments.");
-        _verbs = {declareInfo(_app),   declareTree(_app),    declareKeys(_app),     declareSample(_app),
-                  declarePlot(_app),   declareGallery(_app), declareSimplify(_app), declareBake(_app),
-                  declareSmooth(_app), declareReverse(_app), declareOffset(_app),   declareScale(_app),
-                  declareRetime(_app)};
+        _verbs = {declareInfo(_app),  declareTree(_app),    declareKeys(_app),    declareSample(_app),
+                  declarePlot(_app),  declareGallery(_app), declareConvert(_app), declareSimplify(_app),
+                  declareBake(_app),  declareSmooth(_app),  declareReverse(_app), declareOffset(_app),
+                  declareScale(_app), declareRetime(_app)};
         for (Verb const& verb : _verbs) {
             _usages[verb.arguments->get_name()] = verb.usage;
             verb.arguments->formatter(std::make_shared<HelpFormatter>(_usages));

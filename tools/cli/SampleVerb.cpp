@@ -27,7 +27,7 @@ constexpr std::uint64_t kMostValues = 10'000'000;
 constexpr std::size_t kValuesInBlock = 65'536;
 
 struct SampleOptions {
-    std::string file;
+    InputOptions input;
     std::vector<std::string> channels;
     std::string at;
     std::string from;
@@ -303,7 +303,7 @@ void writeTable(std::vector<Series> const& all, SampleTimes const& times, Output
 
 void runSample(SampleOptions const& options, OutputSink& out) {
     TimeWishes const wishes(options);
-    ChannelInput const input(options.file);
+    ChannelInput const input(options.input);
     std::vector<ChannelTree::Node> const channels = input.channelsNamed(options.channels);
     std::uint64_t const columns = channels.size() * (options.slope ? 2 : 1);
     SampleTimes const times = timesFor(wishes, input.file(), options.csv ? 1 : columns);
@@ -324,7 +324,7 @@ void runSample(SampleOptions const& options, OutputSink& out) {
 Verb declareSample(CLI::App& program) {
     auto const options = std::make_shared<SampleOptions>();
     CLI::App* const verb = program.add_subcommand("sample", "Read channels at any times");
-    verb->add_option("FILE", options->file, kFileHelp)->option_text(" ")->required();
+    options->input.add(*verb);
     verb->add_option("CHANNEL", options->channels, kChannelHelp)->option_text("...");
     auto* const at =
         verb->add_option("--at", options->at, "Times, with commas between them")->option_text("T[,T...]");
@@ -357,7 +357,7 @@ Verb declareSample(CLI::App& program) {
     return {
         verb,
         "FILE [CHANNEL...] (--at T[,T...] | [--from T] [--to T] (--step T | --rate R | --count N)) [--slope] "
-        "[--json | --csv]",
+        "[--frame-rate R] [--json | --csv]",
         [options](OutputSink& out) { runSample(*options, out); }};
 }
 

@@ -17,13 +17,13 @@ namespace {
 using Node = ChannelTree::Node;
 
 struct TreeOptions {
-    std::string file;
+    InputOptions input;
     std::size_t depth = std::numeric_limits<std::size_t>::max();
     bool json = false;
 };
 
 double startValue(ChannelInput const& input, Node node) {
-    return input.tree().channel(node).getValueAsDouble(input.file().firstTime, 0.0);
+    return input.tree().curve(node).getValue(input.file().firstTime, 0.0);
 }
 
 void writeNode(JsonWriter& json, ChannelInput const& input, Node node) {
@@ -38,9 +38,9 @@ void writeNode(JsonWriter& json, ChannelInput const& input, Node node) {
     json.key("name");
     json.string(tree.base(node).getName().view());
     json.key("type");
-    json.string(nodeTypeName(tree.type(node)));
+    json.string(tree.typeName(node));
     json.key("class");
-    json.string(nodeClassName(tree.type(node)));
+    json.string(tree.className(node));
     if (tree.isChannel(node)) {
         json.key("default");
         json.number(tree.channel(node).getDefaultValue());
@@ -75,7 +75,7 @@ std::string cellOf(ChannelInput const& input, Node node, std::size_t column) {
     case 1:
         return std::to_string(tree.base(node).getID());
     case 2:
-        return std::string(nodeTypeName(tree.type(node)));
+        return tree.typeName(node);
     default:
         break;
     }
@@ -108,7 +108,7 @@ void writeTable(ChannelInput const& input, std::vector<Node> const& nodes, Outpu
 }
 
 void runTree(TreeOptions const& options, OutputSink& out) {
-    ChannelInput const input(options.file);
+    ChannelInput const input(options.input);
     std::vector<Node> nodes;
     for (Node node = ChannelTree::kTop; node < input.tree().count(); ++node) {
         if (input.tree().depth(node) <= options.depth) {
@@ -128,7 +128,7 @@ Verb declareTree(CLI::App& program) {
     auto const options = std::make_shared<TreeOptions>();
     CLI::App* const verb =
         program.add_subcommand("tree", "List the folders and channels of a file as the tree they are");
-    verb->add_option("FILE", options->file, kFileHelp)->option_text(" ")->required();
+    options->input.add(*verb);
     verb->add_option("--depth", options->depth, "Only so many levels below the top")
         ->check(CLI::NonNegativeNumber)
         ->option_text("N");
@@ -136,7 +136,8 @@ Verb declareTree(CLI::App& program) {
                    "For programs: a list in tree order, with the path of IDs and the class of each node");
     verb->footer("IDs are those of paths: ./1/3 is the node 3 below the node 1 below the top.\n\n"
                  "Example: lumenkey tree walk.bvh --depth 2");
-    return {verb, "FILE [--depth N] [--json]", [options](OutputSink& out) { runTree(*options, out); }};
+    return {verb, "FILE [--depth N] [--frame-rate R] [--json]",
+            [options](OutputSink& out) { runTree(*options, out); }};
 }
 
 } // namespace lumenkey::tools

@@ -27,7 +27,9 @@ Verb declareSample(CLI::App& program);
 Verb declarePlot(CLI::App& program);
 Verb declareGallery(CLI::App& program);
 
-// Those that write: see `EditVerb`.
+Verb declareConvert(CLI::App& program);
+
+// Those that edit curves: see `EditVerb`.
 Verb declareSimplify(CLI::App& program);
 Verb declareBake(CLI::App& program);
 Verb declareSmooth(CLI::App& program);

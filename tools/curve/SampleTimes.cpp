@@ -54,9 +54,9 @@ void SampleTimes::readValues(KFCurve& curve, std::size_t first, std::size_t numb
     }
 }
 
-void SampleTimes::readSlopes(KFSpline& spline, std::size_t first, std::size_t number, double* slopes) const {
+void SampleTimes::readSlopes(KFSpline* spline, std::size_t first, std::size_t number, double* slopes) const {
     for (std::size_t i = 0; i < number; ++i) {
-        slopes[i] = spline.getDerivativeValue(at(first + i), kTempusZero, true);
+        slopes[i] = spline == nullptr ? 0 : spline->getDerivativeValue(at(first + i), kTempusZero, true);
     }
 }
 
@@ -66,7 +66,7 @@ std::vector<double> SampleTimes::values(KFCurve& curve) const {
     return values;
 }
 
-std::vector<double> SampleTimes::slopes(KFSpline& spline) const {
+std::vector<double> SampleTimes::slopes(KFSpline* spline) const {
     std::vector<double> slopes(count());
     readSlopes(spline, 0, count(), slopes.data());
     return slopes;

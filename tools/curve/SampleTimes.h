@@ -24,12 +24,12 @@ public:
     /// The values of a curve at `number` of these times from time `first` on, into room for as many. A row is
     /// read in one walk.
     void readValues(KFCurve& curve, std::size_t first, std::size_t number, double* values) const;
-    /// Likewise the slopes of its spline.
-    void readSlopes(KFSpline& spline, std::size_t first, std::size_t number, double* slopes) const;
+    /// Likewise the slopes of its spline; all 0 where it has none.
+    void readSlopes(KFSpline* spline, std::size_t first, std::size_t number, double* slopes) const;
 
     /// At all these times.
     std::vector<double> values(KFCurve& curve) const;
-    std::vector<double> slopes(KFSpline& spline) const;
+    std::vector<double> slopes(KFSpline* spline) const;
 
 private:
     bool _isRow = false;

@@ -1,16 +1,18 @@
 #include "tools/export/ChannelFileWriter.h"
 
 #include "tools/curve/Keypoint.h"
-#include "tools/curve/SampleTimes.h"
-#include "tools/export/MotionWriter.h"
-#include "tools/import/MotionTree.h"
+#include "tools/export/DocumentWriter.h"
+#include "tools/export/MotionFrames.h"
+#include "tools/export/MotionSkeleton.h"
 #include "tools/output/CsvWriter.h"
 #include "tools/output/SafeOutputFile.h"
 #include "tools/output/TextForms.h"
 
 #include <algorithm>
 #include <cmath>
+#include <iterator>
 #include <limits>
+#include <optional>
 
 namespace lumenkey::tools {
 
@@ -20,96 +22,19 @@ using Node = ChannelTree::Node;
 
 constexpr double kNoValue = std::numeric_limits<double>::quiet_NaN();
 
-void checkAmount(FileToWrite const& wanted, std::uint64_t rows, std::size_t columns) {
-    if (rows > kMostWrittenValues / std::max<std::size_t>(columns, 1)) {
-        throw OutputError{wanted.target,
-                          "it would hold more than " + std::to_string(kMostWrittenValues) + " values"};
-    }
-}
-
-// --- Motions ---
-
-/// Whole frames, numbered from that at time zero.
-struct FrameSpan {
-    std::int64_t first = 0;
-    std::uint64_t count = 0;
-};
-
-FrameSpan framesOver(ChannelFile const& file) {
-    if (file.columns.empty()) {
-        return {0, file.rows};
-    }
-    constexpr std::int64_t farthest = std::int64_t{1} << 52; // beyond what can be written
-    std::int64_t begin = 0;
-    std::int64_t end = 0;
-    for (Node const channel : file.columns) {
-        Tempus first{};
-        Tempus last{};
-        if (file.tree->channel(channel).getFirstKeyframe(&first, nullptr) &&
-            file.tree->channel(channel).getLastKeyframe(&last, nullptr)) {
-            std::int64_t const floor = TempusFloorQuotient(first, file.frameDuration);
-            std::int64_t const ceiling = -std::max(TempusFloorQuotient(-last, file.frameDuration), -farthest);
-            begin = std::min(begin, std::max(floor, -farthest));
-            end = std::max(end, ceiling + 1);
-        }
-    }
-    return {begin, static_cast<std::uint64_t>(end - begin)};
-}
-
-/// The number of degrees that was read as this many radians: of those that give the same bits the one with the
-/// shortest text. The quotient alone may be a neighbour of it.
-double degreesOf(double radians) {
-    constexpr std::size_t shortText = 12;
-    double const nearest = radians / kRadiansOfDegree;
-    double best = nearest;
-    std::size_t bestLength = nearest * kRadiansOfDegree == radians ? shortestText(nearest).size()
-                                                                   : std::numeric_limits<std::size_t>::max();
-    double const infinity = std::numeric_limits<double>::infinity();
-    double candidate = std::nextafter(std::nextafter(nearest, -infinity), -infinity);
-    for (int i = 0; i < 5 && bestLength > shortText; ++i) {
-        if (candidate * kRadiansOfDegree == radians) {
-            std::size_t const length = shortestText(candidate).size();
-            best = length < bestLength ? candidate : best;
-            bestLength = std::min(length, bestLength);
-        }
-        candidate = std::nextafter(candidate, infinity);
-    }
-    return best;
-}
-
-WrittenRows writeMotion(FileToWrite const& wanted, OutputSink& out, ReadingProgress const& progress) {
-    ChannelFile const& file = wanted.file;
-    FrameSpan const span = framesOver(file);
-    std::size_t const width = file.columns.size();
-    checkAmount(wanted, span.count, width);
-    Tempus const start = file.frameDuration * TempusMake(span.first, 1);
-    SampleTimes const times = SampleTimes::row(start, file.frameDuration, span.count);
-    Motion motion = file.skeleton;
-    motion.frameCount = span.count;
-    motion.values.resize(width * span.count);
-    for (std::size_t i = 0; i < width; ++i) {
-        std::vector<double> const values = times.values(file.tree->curve(file.columns[i]));
-        bool const turns = isRotation(motion.channels[i].kind);
-        for (std::size_t frame = 0; frame < span.count; ++frame) {
-            motion.values[frame * width + i] = turns ? degreesOf(values[frame]) : values[frame];
-        }
-    }
-    writeMotionText(motion, out, progress);
-    return {span.count, start};
-}
-
-// --- Tables ---
-
 /// The keypoints of a channel, in the order of time.
 struct KeypointColumn {
     std::vector<Tempus> times;
     std::vector<double> values;
 };
 
-KeypointColumn keypointsOf(KFSpline& spline) {
+KeypointColumn keypointsOf(KFSpline* spline) {
     KeypointColumn column;
-    for (void* const handle : keypointHandles(spline)) {
-        Keypoint const key = readKeypoint(spline, handle);
+    if (spline == nullptr) {
+        return column;
+    }
+    for (void* const handle : keypointHandles(*spline)) {
+        Keypoint const key = readKeypoint(*spline, handle);
         column.times.push_back(key.time);
         column.values.push_back(key.value);
     }
@@ -186,9 +111,20 @@ void writeRows(std::vector<std::vector<double>> const& columns, std::vector<Temp
     }
 }
 
+/// All channels; of a document only those with keypoints, if there are any: it has many others.
+std::vector<Node> channelsOfTable(ChannelFile const& file) {
+    std::vector<Node> const all = file.tree->channelsBelow(ChannelTree::kTop);
+    if (file.format != ChannelFormat::Document) {
+        return all;
+    }
+    std::vector<Node> keyed = all;
+    std::erase_if(keyed, [&](Node node) { return file.tree->curve(node).getNumberOfKeypoints() == 0; });
+    return keyed.empty() ? all : keyed;
+}
+
 WrittenRows writeTable(FileToWrite const& wanted, OutputSink& out, ReadingProgress const& progress) {
     ChannelTree& tree = *wanted.file.tree;
-    std::vector<Node> const channels = tree.channelsBelow(ChannelTree::kTop);
+    std::vector<Node> const channels = channelsOfTable(wanted.file);
     std::vector<KeypointColumn> keypoints;
     CsvWriter csv(out);
     csv.field("time");
@@ -198,9 +134,10 @@ WrittenRows writeTable(FileToWrite const& wanted, OutputSink& out, ReadingProgre
         csv.field(tree.dottedName(channel));
     }
     csv.endRow();
-    bool const isByKeypoints = wanted.rows == RowsOf::Keypoints;
+    bool const isByKeypoints =
+        wanted.rows == RowsOf::Keypoints || wanted.file.format == ChannelFormat::Document;
     std::vector<Tempus> const times = isByKeypoints ? timesOfKeypoints(keypoints) : timesOfInput(wanted.file);
-    checkAmount(wanted, times.size(), channels.size());
+    checkWrittenValues(wanted, times.size(), channels.size());
     std::vector<bool> isEdited(tree.count());
     for (Node const channel : wanted.edited) {
         isEdited[channel] = true;
@@ -216,12 +153,44 @@ WrittenRows writeTable(FileToWrite const& wanted, OutputSink& out, ReadingProgre
     return {times.size(), times.empty() ? kTempusZero : times.front()};
 }
 
+WrittenRows writeWholeDocument(FileToWrite const& wanted, OutputSink& out) {
+    ChannelTree& tree = *wanted.file.tree;
+    std::optional<SkeletonChannels> skeleton;
+    if (wanted.file.format == ChannelFormat::Motion) {
+        skeleton.emplace(wanted.file.skeleton, tree);
+    }
+    writeDocument(tree.base(ChannelTree::kTop), out);
+    std::size_t keypoints = 0;
+    for (Node const node : tree.channelsBelow(ChannelTree::kTop)) {
+        keypoints += tree.curve(node).getNumberOfKeypoints();
+    }
+    std::optional<BXTimeRange> const keyed = tree.keyedRange();
+    return {keypoints, keyed ? keyed->start : kTempusZero};
+}
+
+WrittenRows writeAs(FileToWrite const& wanted, OutputSink& out, ReadingProgress const& progress) {
+    switch (wanted.format) {
+    case ChannelFormat::Motion:
+        return writeMotionOf(wanted, out, progress);
+    case ChannelFormat::Document:
+        return writeWholeDocument(wanted, out);
+    default:
+        return writeTable(wanted, out, progress);
+    }
+}
+
 } // namespace
+
+void checkWrittenValues(FileToWrite const& wanted, std::uint64_t rows, std::size_t columns) {
+    if (rows > kMostWrittenValues / std::max<std::size_t>(columns, 1)) {
+        throw OutputError{wanted.target,
+                          "it would hold more than " + std::to_string(kMostWrittenValues) + " values"};
+    }
+}
 
 WrittenRows writeChannelFile(FileToWrite const& wanted, ReadingProgress const& progress) {
     SafeOutputFile out(wanted.target);
-    WrittenRows const rows = wanted.format == ChannelFormat::Motion ? writeMotion(wanted, out, progress)
-                                                                    : writeTable(wanted, out, progress);
+    WrittenRows const rows = writeAs(wanted, out, progress);
     out.close();
     return rows;
 }

@@ -23,18 +23,18 @@ enum class RowsOf {
 /// What is written of a file, and where to.
 struct FileToWrite {
     ChannelFile const& file;
-    /// A motion only where the file was opened from one.
+    /// A motion only where the file was opened from one, or is a document that holds one.
     ChannelFormat format{};
     /// Of a table.
     RowsOf rows{};
     /// The channels whose keypoints needn't be those of the file any more.
-    std::vector<ChannelTree::Node> const& edited;
+    std::vector<ChannelTree::Node> edited;
     std::string target;
 };
 
 /// How a file came out.
 struct WrittenRows {
-    /// Frames of a motion, rows of a table.
+    /// Frames of a motion, rows of a table, keypoints of a document.
     std::size_t count = 0;
     /// Of the first one; zero where there is none.
     Tempus start{};
@@ -48,7 +48,13 @@ struct WrittenRows {
 ///
 /// A table has times, seconds, and a column for each channel. A cell is empty where its channel has nothing to say: with
 /// the rows of the keypoints where it has no keypoint; with those of the input, for an edited channel, outside its
-/// keypoints.
+/// keypoints. Of a document only channels with keypoints have a column, unless none has any, and a row stands at each
+/// keypoint.
+///
+/// A document holds the tree; that of a motion, its skeleton too (`SkeletonChannels`).
 WrittenRows writeChannelFile(FileToWrite const& wanted, ReadingProgress const& progress = {});
+
+/// Throws `OutputError` for more than `kMostWrittenValues`.
+void checkWrittenValues(FileToWrite const& wanted, std::uint64_t rows, std::size_t columns);
 
 } // namespace lumenkey::tools

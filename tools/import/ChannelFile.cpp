@@ -1,8 +1,8 @@
 #include "tools/import/ChannelFile.h"
 
 #include "tools/import/CsvTree.h"
-#include "tools/import/MotionScanner.h"
 #include "tools/import/MotionTree.h"
+#include "tools/output/TextForms.h"
 
 #include <algorithm>
 #include <utility>
@@ -45,9 +45,30 @@ ChannelFile openCsv(std::string_view text, std::string const& file, ReadingProgr
     return opened;
 }
 
+ChannelFile openDocument(DocumentFile document, std::string const& file,
+                         std::optional<Tempus> const& frameDuration) {
+    ChannelFile opened;
+    opened.file = file;
+    opened.format = ChannelFormat::Document;
+    opened.tree = std::move(document.tree);
+    opened.document = std::move(document);
+    opened.frameDuration = frameDuration ? *frameDuration : frameDurationOfKeypoints(*opened.tree);
+    opened.firstTime = kTempusZero;
+    opened.lastTime = kTempusZero;
+    if (std::optional<BXTimeRange> const keyed = opened.tree->keyedRange()) {
+        opened.firstTime = keyed->start;
+        opened.lastTime = TempusRangeGetEnd(*keyed);
+    }
+    opened.duration = opened.lastTime - opened.firstTime;
+    return opened;
+}
+
 ChannelFormat formatOf(std::string_view text, std::string_view file) {
     if (std::optional<ChannelFormat> const named = channelFormatNamed(file)) {
         return *named;
+    }
+    if (looksLikeDocument(text)) {
+        return ChannelFormat::Document;
     }
     bool const hasComma = text.substr(0, text.find('\n')).find(',') != std::string_view::npos;
     return hasComma ? ChannelFormat::Csv : ChannelFormat::Motion;
@@ -55,18 +76,44 @@ ChannelFormat formatOf(std::string_view text, std::string_view file) {
 
 } // namespace
 
-std::optional<ChannelFormat> channelFormatNamed(std::string_view file) {
-    std::string_view const ending = file.substr(file.size() - std::min<std::size_t>(file.size(), 4));
-    if (sameWord(ending, ".csv")) {
-        return ChannelFormat::Csv;
+std::string_view channelFormatName(ChannelFormat format) {
+    switch (format) {
+    case ChannelFormat::Motion:
+        return "BVH";
+    case ChannelFormat::Csv:
+        return "CSV";
+    case ChannelFormat::Document:
+        return "document";
     }
-    return sameWord(ending, ".bvh") ? std::optional(ChannelFormat::Motion) : std::nullopt;
+    return "";
 }
 
-ChannelFile openChannelFile(std::string const& file, ReadingProgress const& progress) {
+std::optional<ChannelFormat> channelFormatNamed(std::string_view file) {
+    constexpr std::pair<std::string_view, ChannelFormat> endings[] = {
+        {".csv", ChannelFormat::Csv}, {".bvh", ChannelFormat::Motion}, {".lumen", ChannelFormat::Document}};
+    for (auto const& [ending, format] : endings) {
+        if (sameWord(file.substr(file.size() - std::min(file.size(), ending.size())), ending)) {
+            return format;
+        }
+    }
+    return std::nullopt;
+}
+
+ChannelFile openChannelFile(std::string const& file, ReadingProgress const& progress,
+                            std::optional<Tempus> const& frameDuration) {
+    Tempus const counted = frameDuration.value_or(defaultFrameDuration());
+    if (channelFormatNamed(file) == ChannelFormat::Document) {
+        return openDocument(readDocumentFile(file, counted), file, frameDuration);
+    }
     std::string const text = readInputText(file);
-    return formatOf(text, file) == ChannelFormat::Csv ? openCsv(text, file, progress)
-                                                      : openMotion(text, file, progress);
+    switch (formatOf(text, file)) {
+    case ChannelFormat::Csv:
+        return openCsv(text, file, progress);
+    case ChannelFormat::Document:
+        return openDocument(readDocumentText(text, file, counted), file, frameDuration);
+    default:
+        return openMotion(text, file, progress);
+    }
 }
 
 } // namespace lumenkey::tools

@@ -1,5 +1,6 @@
 #pragma once
 
+#include "tools/import/DocumentFile.h"
 #include "tools/import/InputText.h"
 #include "tools/import/MotionFile.h"
 #include "tools/tree/ChannelTree.h"
@@ -13,7 +14,10 @@
 
 namespace lumenkey::tools {
 
-enum class ChannelFormat { Motion, Csv };
+enum class ChannelFormat { Motion, Csv, Document };
+
+/// `BVH`, `CSV` or `document`.
+std::string_view channelFormatName(ChannelFormat format);
 
 /// A file opened as a tree of channels, and what else there is to tell about it.
 struct ChannelFile {
@@ -23,12 +27,13 @@ struct ChannelFile {
     std::size_t joints = 0;
     /// Frames of a motion, rows of a table.
     std::size_t rows = 0;
-    /// Invalid where the rows of a table aren't evenly spaced.
+    /// Invalid where the rows of a table aren't evenly spaced. Of a document: see `frameDurationOfKeypoints`.
     Tempus frameDuration{};
-    /// Both zero without rows.
+    /// Of a document, those of its first and last keypoint. Both zero without rows or keypoints.
     Tempus firstTime{};
     Tempus lastTime{};
-    /// From the first time on: all frames of a motion, the last one to its end; of a table, to the last row.
+    /// From the first time on: all frames of a motion, the last one to its end; of a table, to the last row; of a
+    /// document, to its last keypoint.
     Tempus duration{};
     std::unique_ptr<ChannelTree> tree;
     /// Of a motion, what its file says beside the frames, which are left out here.
@@ -37,13 +42,20 @@ struct ChannelFile {
     std::vector<ChannelTree::Node> columns;
     /// Of a table.
     std::vector<Tempus> rowTimes;
+    /// Of a document; its tree is the one above.
+    DocumentFile document;
 };
 
-/// What the end of a name tells: `.csv` or `.bvh`, in any case.
+/// What the end of a name tells: `.csv`, `.bvh` or `.lumen`, in any case.
 std::optional<ChannelFormat> channelFormatNamed(std::string_view file);
 
-/// A name that ends in `.csv` is that of a table, one that ends in `.bvh` of a motion. Otherwise the content tells:
-/// a table has a comma in its first line. Throws `InputError`.
-ChannelFile openChannelFile(std::string const& file, ReadingProgress const& progress = {});
+/// A name that ends in `.csv` is that of a table, one that ends in `.bvh` of a motion, one that ends in `.lumen` of a
+/// document. Otherwise the content tells: a document begins with `<`, a table has a comma in its first line. Throws
+/// `InputError`.
+///
+/// `frameDuration` is that of a document, which doesn't say it itself; without one that of its keypoints is taken, and
+/// in documents that count frames the default.
+ChannelFile openChannelFile(std::string const& file, ReadingProgress const& progress = {},
+                            std::optional<Tempus> const& frameDuration = std::nullopt);
 
 } // namespace lumenkey::tools

@@ -22,7 +22,7 @@ std::unique_ptr<ChannelTree> treeOfCsv(CsvFile const& table) {
             }
         }
         ChannelTree::Node const channel =
-            tree->addChannel(ChannelTree::kTop, table.names[column], NodeType::Double);
+            tree->addChannel(ChannelTree::kTop, table.names[column], ValueType::Double);
         tree->setKeypoints(channel, times, values);
     }
     bool const isEmpty = table.times.empty();

@@ -1,5 +1,7 @@
 #include "tools/import/MotionReaders.h"
 
+#include "tools/output/TextForms.h"
+
 #include <algorithm>
 #include <charconv>
 #include <optional>

@@ -1,5 +1,7 @@
 #include "tools/import/MotionScanner.h"
 
+#include "tools/output/TextForms.h"
+
 #include <algorithm>
 #include <charconv>
 #include <cmath>
@@ -12,18 +14,12 @@ namespace {
 bool isBlank(char c) { return c == ' ' || c == '\t' || c == '\r' || c == '\v' || c == '\f'; }
 bool isSpace(char c) { return isBlank(c) || c == '\n'; }
 bool isBrace(char c) { return c == '{' || c == '}'; }
-char lower(char c) { return c >= 'A' && c <= 'Z' ? static_cast<char>(c - 'A' + 'a') : c; }
 
 unsigned limited(std::size_t n) {
     return static_cast<unsigned>(std::min<std::size_t>(n, std::numeric_limits<unsigned>::max()));
 }
 
 } // namespace
-
-bool sameWord(std::string_view a, std::string_view b) {
-    return std::equal(a.begin(), a.end(), b.begin(), b.end(),
-                      [](char x, char y) { return lower(x) == lower(y); });
-}
 
 std::string quoted(std::string_view text) {
     constexpr std::size_t longest = 40;

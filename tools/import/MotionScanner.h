@@ -65,8 +65,6 @@ private:
     std::size_t _token = 0;
 };
 
-/// ASCII letters without case.
-bool sameWord(std::string_view a, std::string_view b);
 /// In quotes, and shortened where it is long.
 std::string quoted(std::string_view text);
 

@@ -22,7 +22,7 @@ std::vector<ChannelTree::Node> addJoints(Motion const& motion, ChannelTree& tree
         for (std::size_t i = joint.firstChannel; i < joint.firstChannel + joint.channelCount; ++i) {
             MotionChannelKind const kind = motion.channels[i].kind;
             channels[i] = tree.addChannel(folders.back(), std::string(motionChannelKindName(kind)),
-                                          isRotation(kind) ? NodeType::Angle : NodeType::Double);
+                                          isRotation(kind) ? ValueType::Angle : ValueType::Double);
         }
     }
     return channels;

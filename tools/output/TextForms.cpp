@@ -1,5 +1,6 @@
 #include "tools/output/TextForms.h"
 
+#include <algorithm>
 #include <array>
 #include <charconv>
 #include <cmath>
@@ -16,6 +17,8 @@ using NumberBuffer = std::array<char, 64>;
 std::string textOf(NumberBuffer const& buffer, std::to_chars_result result) {
     return {buffer.data(), static_cast<std::size_t>(result.ptr - buffer.data())};
 }
+
+char lowerCase(char c) { return c >= 'A' && c <= 'Z' ? static_cast<char>(c - 'A' + 'a') : c; }
 
 } // namespace
 
@@ -87,6 +90,11 @@ std::string printableText(std::string_view text) {
 std::string systemErrorText(int error) {
     char const* const text = ::strerrordesc_np(error);
     return text != nullptr ? text : "error " + std::to_string(error);
+}
+
+bool sameWord(std::string_view a, std::string_view b) {
+    return std::equal(a.begin(), a.end(), b.begin(), b.end(),
+                      [](char x, char y) { return lowerCase(x) == lowerCase(y); });
 }
 
 std::size_t widthOfText(std::string_view text) {

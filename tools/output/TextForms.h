@@ -24,6 +24,9 @@ std::string printableText(std::string_view text);
 /// What the system calls an error, such as "No such file or directory"; in English whatever the locale.
 std::string systemErrorText(int error);
 
+/// Whether two words are the same but for the case of ASCII letters.
+bool sameWord(std::string_view a, std::string_view b);
+
 /// The number of characters of UTF-8 text; a byte that is no part of one counts as one.
 std::size_t widthOfText(std::string_view text);
 

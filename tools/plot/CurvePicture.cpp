@@ -188,6 +188,16 @@ CurvePicture traceCurve(KFSpline& spline, Tempus const& from, Tempus const& to, 
     return picture;
 }
 
+CurvePicture traceCurve(KFCurve& curve, Tempus const& from, Tempus const& to, double pixels) {
+    if (curve.getSpline() != nullptr && curve.getNumberOfKeypoints() > 0) {
+        return traceCurve(*curve.getSpline(), from, to, pixels);
+    }
+    CurvePicture picture;
+    double const value = curve.getValue(from, 0.0);
+    picture.before = {{TempusGetSeconds(from), value}, {TempusGetSeconds(to), value}};
+    return picture;
+}
+
 PlotPoint PlotFrame::at(double second, double value) const {
     return {area.x + area.width * seconds.share(second), area.bottom() - area.height * values.share(value)};
 }

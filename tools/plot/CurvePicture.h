@@ -1,5 +1,6 @@
 #pragma once
 
+#include "lumenkey/curves/KFCurve.h"
 #include "lumenkey/splines/KFSpline.h"
 #include "tools/curve/Keypoint.h"
 #include "tools/plot/PlotAxis.h"
@@ -27,6 +28,8 @@ struct CurvePicture {
 /// Follows the curve to half a pixel where it bends, and no finer where keypoints stand closer: of the points
 /// in half a pixel the first, the lowest, the highest and the last stay.
 CurvePicture traceCurve(KFSpline& spline, Tempus const& from, Tempus const& to, double pixels);
+/// The same for any curve: one without keypoints is a level line.
+CurvePicture traceCurve(KFCurve& curve, Tempus const& from, Tempus const& to, double pixels);
 
 /// Where seconds and values stand in a picture.
 struct PlotFrame {

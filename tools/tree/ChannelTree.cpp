@@ -1,50 +1,38 @@
 #include "tools/tree/ChannelTree.h"
 
+#include "lumenkey/Channels/KFFactory.h"
+#include "tools/tree/FileRoot.h"
+
 #include <algorithm>
+#include <utility>
 
 namespace lumenkey::tools {
 
 namespace {
 
-/// The object that a file is.
-class FileRoot : public KFChannelObjectRootBase {
-public:
-    FileRoot(std::string const& name, Tempus const& frameDuration)
-        : KFChannelObjectRootBase(name, nullptr, 1, 0, 0), _frameDuration(frameDuration) {}
-
-    Tempus getFrameDuration() const override {
-        return TempusIsNumeric(_frameDuration) ? _frameDuration : KFChannelObjectRootBase::getFrameDuration();
-    }
-
-private:
-    Tempus _frameDuration;
-};
+/// How many children a folder's class makes for itself; an object of it tells.
+std::size_t componentCountOf(KFChannelFolder const& folder) {
+    auto* const factory = dynamic_cast<KFChannelFactory*>(folder.getFactory());
+    std::unique_ptr<KFChannelBase> const made(factory == nullptr ? nullptr : factory->createChannel("", 1));
+    auto const* const like = dynamic_cast<KFChannelFolder const*>(made.get());
+    return like == nullptr ? 0 : like->getNumberOfDescendants();
+}
 
 } // namespace
-
-std::string_view nodeTypeName(NodeType type) {
-    switch (type) {
-    case NodeType::ObjectRoot:
-        return "ObjectRoot";
-    case NodeType::Folder:
-        return "Folder";
-    case NodeType::Double:
-        return "Double";
-    case NodeType::Angle:
-        return "Angle";
-    }
-    return "";
-}
-
-std::string nodeClassName(NodeType type) {
-    return "KFChannel" + std::string(nodeTypeName(type)) + (type == NodeType::ObjectRoot ? "Base" : "");
-}
 
 // --- Building ---
 
 ChannelTree::ChannelTree(std::string const& name, Tempus const& frameDuration) {
-    _entries.push_back(
-        {std::make_unique<FileRoot>(name, frameDuration), NodeType::ObjectRoot, kTop, 0, 0, kTop + 1});
+    auto root = std::make_unique<FileRoot>(name, 1, frameDuration);
+    KFChannelBase* const top = root.get();
+    _entries.push_back({top, std::move(root), kTop, 0, 0, kTop + 1});
+}
+
+ChannelTree::ChannelTree(std::unique_ptr<KFChannelBase> top) {
+    KFChannelBase* const channel = top.get();
+    _entries.push_back({channel, std::move(top), kTop, 0, 0, kTop + 1});
+    adoptBelow(kTop);
+    setEnds();
 }
 
 ChannelTree::~ChannelTree() {
@@ -58,28 +46,52 @@ unsigned ChannelTree::nextID(Node parent) const {
     return static_cast<unsigned>(folder(parent).getNumberOfDescendants()) + 1;
 }
 
-ChannelTree::Node ChannelTree::add(Node parent, std::unique_ptr<KFChannelBase> channel, NodeType type) {
+ChannelTree::Node ChannelTree::add(Node parent, KFChannelBase* channel,
+                                   std::unique_ptr<KFChannelBase> owned) {
     Entry const& above = _entries[parent];
     std::size_t const dot = parent == kTop ? 0 : 1;
     std::size_t const nameLength = above.nameLength + dot + channel->getName().size();
-    _entries.push_back({std::move(channel), type, parent, above.depth + 1, nameLength, _entries.size() + 1});
+    _entries.push_back({channel, std::move(owned), parent, above.depth + 1, nameLength, _entries.size() + 1});
     return _entries.size() - 1;
+}
+
+ChannelTree::Node ChannelTree::add(Node parent, std::unique_ptr<KFChannelBase> channel) {
+    KFChannelBase* const added = channel.get();
+    return add(parent, added, std::move(channel));
+}
+
+/// By the class's own number of children, which stand in front of those that were added.
+void ChannelTree::adoptBelow(Node node) {
+    KFChannelFolder* const above = asFolder(node);
+    if (above == nullptr || above->getDescendants() == nullptr) {
+        return;
+    }
+    std::vector<KFChannelBase*> const children = *above->getDescendants();
+    std::size_t const components = componentCountOf(*above);
+    for (std::size_t i = 0; i < children.size(); ++i) {
+        std::unique_ptr<KFChannelBase> owned(i < components ? nullptr : children[i]);
+        adoptBelow(add(node, children[i], std::move(owned)));
+    }
+}
+
+void ChannelTree::setEnds() {
+    for (Node node = count() - 1; node != kTop; --node) {
+        Entry& above = _entries[_entries[node].parent];
+        above.end = std::max(above.end, _entries[node].end);
+    }
 }
 
 ChannelTree::Node ChannelTree::addFolder(Node parent, std::string const& name) {
     unsigned const id = nextID(parent);
-    return add(parent, std::make_unique<KFChannelFolder>(name, &folder(parent), id, 0, 0), NodeType::Folder);
+    return add(parent, std::make_unique<KFChannelFolder>(name, &folder(parent), id, 0, 0));
 }
 
-ChannelTree::Node ChannelTree::addChannel(Node parent, std::string const& name, NodeType type) {
+ChannelTree::Node ChannelTree::addChannel(Node parent, std::string const& name, ValueType type) {
     unsigned const id = nextID(parent);
-    std::unique_ptr<KFChannelBase> channel;
-    if (type == NodeType::Angle) {
-        channel = std::make_unique<KFChannelAngle>(name, &folder(parent), id, 0);
-    } else {
-        channel = std::make_unique<KFChannelDouble>(name, &folder(parent), id, 0);
+    if (type == ValueType::Angle) {
+        return add(parent, std::make_unique<KFChannelAngle>(name, &folder(parent), id, 0));
     }
-    return add(parent, std::move(channel), type);
+    return add(parent, std::make_unique<KFChannelDouble>(name, &folder(parent), id, 0));
 }
 
 void ChannelTree::setKeypoints(Node node, std::vector<Tempus> const& times,
@@ -91,10 +103,7 @@ void ChannelTree::setKeypoints(Node node, std::vector<Tempus> const& times,
 }
 
 void ChannelTree::finish(BXTimeRange const& extent) {
-    for (Node node = count() - 1; node != kTop; --node) {
-        Entry& above = _entries[_entries[node].parent];
-        above.end = std::max(above.end, _entries[node].end);
-    }
+    setEnds();
     static_cast<KFChannelObjectRootBase&>(base(kTop)).setTimeExtent(extent, true);
     base(kTop).finishInitializing();
 }
@@ -107,6 +116,22 @@ std::vector<ChannelTree::Node> ChannelTree::channelsBelow(Node node) const {
         }
     }
     return channels;
+}
+
+std::optional<BXTimeRange> ChannelTree::keyedRange() const {
+    std::optional<BXTimeRange> range;
+    Tempus last{};
+    for (Node const node : channelsBelow(kTop)) {
+        Tempus from{};
+        Tempus to{};
+        if (curve(node).getNumberOfKeypoints() > 0 && curve(node).getFirstKeypoint(&from, nullptr) &&
+            curve(node).getLastKeypoint(&to, nullptr)) {
+            last = range ? TempusMaximum(last, to) : to;
+            Tempus const first = range ? TempusMinimum(range->start, from) : from;
+            range = BXTimeRange{first, last - first};
+        }
+    }
+    return range;
 }
 
 // --- Names ---
@@ -146,7 +171,7 @@ std::optional<ChannelTree::Node> ChannelTree::atPath(std::string_view path) cons
         return std::nullopt;
     }
     auto const place = std::find_if(_entries.begin(), _entries.end(),
-                                    [found](Entry const& entry) { return entry.channel.get() == found; });
+                                    [found](Entry const& entry) { return entry.channel == found; });
     return static_cast<Node>(place - _entries.begin());
 }
 

@@ -4,6 +4,7 @@
 #include "lumenkey/Channels/KFScalarChannels.h"
 #include "lumenkey/curves/KFCurve.h"
 #include "lumenkey/splines/KFSpline.h"
+#include "tools/tree/ChannelClass.h"
 
 #include <cstddef>
 #include <memory>
@@ -14,16 +15,13 @@
 
 namespace lumenkey::tools {
 
-/// What a node is: the library's class without its `KFChannel` in front and `Base` behind.
-enum class NodeType { ObjectRoot, Folder, Double, Angle };
-
-std::string_view nodeTypeName(NodeType type);
-std::string nodeClassName(NodeType type);
+/// What can be added to a tree beside folders.
+enum class ValueType { Double, Angle };
 
 /// The channels of a file as a tree of the library, which it owns, and the names of its nodes.
 ///
-/// A node is told by its place in tree order: a folder, then all that lies below it. IDs count from 1 among the
-/// children of each folder, in the order in which they are added.
+/// A node is told by its place in tree order: a folder, then all that lies below it. In a tree that is built here, IDs
+/// count from 1 among the children of each folder, in the order in which they are added.
 ///
 /// The dotted name of a node is the names from the top's children down to it, with dots between them:
 /// `Hips.LeftLeg.Xrotation`. Names may hold dots themselves. The top has no dotted name.
@@ -34,6 +32,9 @@ public:
 
     /// `frameDuration` is what the root answers for it; with an invalid one it answers the library's default.
     ChannelTree(std::string const& name, Tempus const& frameDuration);
+    /// A tree of any classes that is there already, such as that of a document; it stays as it is. All nodes but those
+    /// that a class makes for itself, such as the components of a compound, belong to the tree from now on.
+    explicit ChannelTree(std::unique_ptr<KFChannelBase> top);
     ~ChannelTree();
     ChannelTree(ChannelTree const&) = delete;
     ChannelTree& operator=(ChannelTree const&) = delete;
@@ -41,8 +42,8 @@ public:
     // Building: nodes are added in tree order, so a parent is the node added last or one above it.
 
     Node addFolder(Node parent, std::string const& name);
-    /// A value channel, `Double` or `Angle`.
-    Node addChannel(Node parent, std::string const& name, NodeType type);
+    /// A value channel.
+    Node addChannel(Node parent, std::string const& name, ValueType type);
     /// By the bulk path, in ascending order of time; once for each value channel, also where there are none.
     void setKeypoints(Node channel, std::vector<Tempus> const& times, std::vector<double> const& values);
     /// To be called once everything is there, and before anything below.
@@ -51,13 +52,22 @@ public:
     // Nodes.
 
     std::size_t count() const { return _entries.size(); }
-    NodeType type(Node node) const { return _entries[node].type; }
-    bool isChannel(Node node) const {
-        return type(node) == NodeType::Double || type(node) == NodeType::Angle;
-    }
+    /// Whether it is a value channel.
+    bool isChannel(Node node) const { return base(node).isValueChannel(); }
+    /// Null for what is none.
+    KFChannelFolder* asFolder(Node node) const { return dynamic_cast<KFChannelFolder*>(&base(node)); }
+    /// Whether its class makes it, as it does the components of a compound.
+    bool isComponent(Node node) const { return _entries[node].owned == nullptr; }
     /// 0 for the top.
     std::size_t depth(Node node) const { return _entries[node].depth; }
+    Node parent(Node node) const { return _entries[node].parent; }
+    /// Behind the last node below.
+    Node end(Node node) const { return _entries[node].end; }
     KFChannelBase& base(Node node) const { return *_entries[node].channel; }
+    /// Such as `KFChannelDouble`.
+    std::string className(Node node) const { return classNameOf(base(node)); }
+    /// Such as `Double`.
+    std::string typeName(Node node) const { return shortClassName(className(node)); }
     /// The value channels at a node or below it, in tree order.
     std::vector<Node> channelsBelow(Node node) const;
 
@@ -65,9 +75,12 @@ public:
 
     KFChannel& channel(Node node) const { return static_cast<KFChannel&>(base(node)); }
     KFCurve& curve(Node node) const { return *channel(node).getCurveInterface(); }
-    KFSpline& spline(Node node) const { return *curve(node).getSpline(); }
+    /// Null where the channel takes no keypoints, or never had one.
+    KFSpline* spline(Node node) const { return curve(node).getSpline(); }
     /// `rad` or `units`.
-    std::string_view unit(Node node) const { return type(node) == NodeType::Angle ? "rad" : "units"; }
+    std::string_view unit(Node node) const { return unitOf(base(node)); }
+    /// The time of the first keypoint of all, and of the last, as their curves count time; nothing without any.
+    std::optional<BXTimeRange> keyedRange() const;
 
     // Names. Each costs as much as the name is long, or the node deep.
 
@@ -88,8 +101,8 @@ public:
 
 private:
     struct Entry {
-        std::unique_ptr<KFChannelBase> channel;
-        NodeType type;
+        KFChannelBase* channel;
+        std::unique_ptr<KFChannelBase> owned;
         Node parent;
         std::size_t depth;
         /// Of the dotted name, in bytes.
@@ -99,7 +112,10 @@ private:
     };
     enum class Naming { No, ByEnd, Whole };
 
-    Node add(Node parent, std::unique_ptr<KFChannelBase> channel, NodeType type);
+    Node add(Node parent, KFChannelBase* channel, std::unique_ptr<KFChannelBase> owned);
+    Node add(Node parent, std::unique_ptr<KFChannelBase> channel);
+    void adoptBelow(Node folder);
+    void setEnds();
     KFChannelFolder& folder(Node node) const { return static_cast<KFChannelFolder&>(base(node)); }
     unsigned nextID(Node parent) const;
     std::string_view name(Node node) const { return base(node).getName().view(); }

@@ -1,0 +1,26 @@
+#pragma once
+
+#include "lumenkey/Channels/KFChannelBase.h"
+
+#include <string>
+#include <string_view>
+
+class KFFactory;
+
+namespace lumenkey::tools {
+
+/// The library's name of the class that a factory stands for, such as `KFChannelDouble`.
+std::string classNameOf(KFFactory const& factory);
+/// The same for a channel: that of its factory, or of its own class where it has none.
+std::string classNameOf(KFChannelBase const& channel);
+
+/// A class's name as people write it: `Double` for `KFChannelDouble`, `ObjectRoot` for `KFChannelObjectRootBase`.
+std::string shortClassName(std::string_view className);
+
+/// The registered factory of a class by its short or long name, regardless of case; null for none.
+KFFactory* factoryOfClass(std::string_view name);
+
+/// `rad` for angles, else `units`.
+std::string_view unitOf(KFChannelBase const& channel);
+
+} // namespace lumenkey::tools
