@@ -77,6 +77,7 @@ void fuzzDocument(FuzzBytes bytes) {
     OwnedTree const third(new KFChannelObjectRootBase("Root", nullptr, 1, 0, 0));
     require(third->configureWithState(written), "a tree can't read what it wrote the second time");
     require(third->createChannelState(true, true) == written, "the second and the third writing differ");
+    require(third->getHash() == second->getHash(), "the digests of equal documents differ");
 }
 
 void fuzzState(FuzzBytes bytes) {
@@ -88,6 +89,9 @@ void fuzzState(FuzzBytes bytes) {
     value->setKeyframe(kTempusZero, 1.0, true);
     value->setKeyframe(TempusMake(1, 1), 2.0, true);
     root.configureWithState(dataOf(bytes));
+    readEverything(root);
+    // In place, from what it says of itself.
+    require(root.configureWithState(root.createChannelState(true, true)), "a tree can't read what it wrote");
     readEverything(root);
     value->lock(false, false);
     value->setKeyframe(TempusMake(1, 3), 3.0, true);

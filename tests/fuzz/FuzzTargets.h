@@ -13,7 +13,7 @@ using FuzzBytes = std::span<std::uint8_t const>;
 /// A document read into an empty tree. What came in is written, read and written again: the second and the third
 /// writing agree.
 void fuzzDocument(FuzzBytes bytes);
-/// A state read into a tree in use, which then still answers, edits, writes itself and has a digest.
+/// A state read into a tree in use, which then still answers, reads itself, edits, and has a digest.
 void fuzzState(FuzzBytes bytes);
 /// A motion capture, and the tree that it becomes.
 void fuzzMotion(FuzzBytes bytes);
