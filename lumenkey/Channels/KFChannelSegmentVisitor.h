@@ -63,7 +63,8 @@ public:
     /// - Else an `end` before `start` is an empty stretch.
     /// - A keypoint in the stretch is visited as a point, with the value that the curve has there, then the segment
     ///   behind it as far as the stretch goes. All keypoints cut, the disabled ones too, although the curve passes
-    ///   these by. A stretch without length inside a segment is a piece without length.
+    ///   these by. Several at one time are one point, and the last of them begins the segment behind, as in the curve.
+    ///   A stretch without length inside a segment is a piece without length.
     /// - A Constant segment is a constant with the value in its middle. A segment of a type that has no visit is left
     ///   out, so that its keypoints alone are visited: SCurve, Convex, Concave, `kKFInterpolationLinearToo`, the types
     ///   that draw a whole curve, and numbers that name no type.

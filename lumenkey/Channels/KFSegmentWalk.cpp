@@ -19,6 +19,8 @@ bool areNumbersOfOneEpoch(std::initializer_list<Tempus> times) {
     return true;
 }
 
+KFVertex const& vertexOf(void* handle) { return *static_cast<KFVertex*>(handle); }
+
 double valueOf(KFVertex const& vertex) { return vertex.getValueV(kTempusZero); }
 
 using Visit = void (KFChannelSegmentVisitor::*)(KFSpline&, void*, void*, Tempus const&, Tempus const&,
@@ -106,11 +108,21 @@ void KFSegmentWalk::walk(Tempus const& start, Tempus const& end) {
         walkOutside(Side::After, TempusMaximum(lastTime, start), end);
 }
 
+/// Of several keypoints at one time the last, with which the segment behind them begins. They are one point.
+KFVertexIterator KFSegmentWalk::lastTogetherWith(KFVertexIterator place) const noexcept {
+    for (KFVertexIterator next;; place = next) {
+        next = _spline.nextPlace(place);
+        if (next == _spline.endVertices() || timeAt(next) != timeAt(place))
+            return place;
+    }
+}
+
 /// From the keypoint at `place`; true when it came to the last one.
 bool KFSegmentWalk::walkInside(KFVertexIterator place, Tempus const& start, Tempus const& end,
                                Tempus* lastTime) {
     bool mayShorten = _extremes != nullptr;
     for (KFVertexIterator next;; place = next) {
+        place = lastTogetherWith(place);
         Tempus const time = timeAt(place);
         if (time > end)
             return false;
@@ -131,8 +143,7 @@ bool KFSegmentWalk::walkInside(KFVertexIterator place, Tempus const& start, Temp
             *lastTime = time;
             return true;
         }
-        // Two keypoints at one time have no segment between them; a stretch without length inside a segment has a
-        // piece.
+        // A stretch without length inside a segment has a piece; one at its keypoint has none.
         Tempus const to = TempusMinimum(timeAt(next), end);
         if (from < to || (from == to && !isPoint))
             visitPiece({_spline.vertexAt(place), _spline.vertexAt(next), from, to, from, to});
@@ -174,6 +185,25 @@ void KFSegmentWalk::walkRepeats(Side side, std::uint32_t mode, Tempus const& sta
     }
 }
 
+/// From the first valid keypoint to the last one. Of several at the end the curve takes the last one behind them, and
+/// the first one, whose value it has there, in front of them.
+double KFSegmentWalk::riseOfCycle(Side side) {
+    void* first = nullptr;
+    void* last = nullptr;
+    if (!_spline.getFirstValidVertexWithLock(&first, kTempusZero) ||
+        !_spline.getLastValidVertexWithLock(&last, kTempusZero)) {
+        return 0.0;
+    }
+    double const start = valueOf(vertexOf(first));
+    if (side == Side::After)
+        return valueOf(vertexOf(last)) - start;
+    for (void* before = nullptr; _spline.getPreviousValidVertexWithLock(last, &before, kTempusZero) &&
+                                 vertexOf(before).getValueU() == vertexOf(last).getValueU();) {
+        last = before;
+    }
+    return start - valueOf(vertexOf(last));
+}
+
 /// False when nothing lies between the first and the last keypoint.
 bool KFSegmentWalk::cyclesOf(Side side, std::uint32_t mode, Tempus const& start, Cycles& cycles) {
     Tempus const minTime = _spline.getMinValueU(kTempusZero, true);
@@ -182,24 +212,15 @@ bool KFSegmentWalk::cyclesOf(Side side, std::uint32_t mode, Tempus const& start,
         return false;
     Run const run{minTime, maxTime};
     cycles = {minTime, maxTime - minTime, run, run, true, 0.0, side == Side::Before ? minTime : maxTime};
-    void* first = nullptr;
-    void* last = nullptr;
-    if (mode == kKFExtrapolationProgressiveRepeat &&
-        _spline.getFirstValidVertexWithLock(&first, kTempusZero) &&
-        _spline.getLastValidVertexWithLock(&last, kTempusZero)) {
-        double const firstValue = valueOf(*static_cast<KFVertex*>(first));
-        double const lastValue = valueOf(*static_cast<KFVertex*>(last));
-        cycles.rise = side == Side::Before ? firstValue - lastValue : lastValue - firstValue;
-    }
+    if (mode == kKFExtrapolationProgressiveRepeat)
+        cycles.rise = riseOfCycle(side);
     if (mode != kKFExtrapolationPingPong)
         return true;
     cycles.odd = {maxTime, minTime};
     Tempus const step = _spline.getStep();
-    if (side == Side::Before || !_spline.getState()->retimingExtrapolation || cycles.length < step ||
-        step <= kTempusZero) {
+    cycles.havePoints = side == Side::Before || !_spline.getState()->retimingExtrapolation;
+    if (cycles.havePoints || cycles.length < step || step <= kTempusZero)
         return true;
-    }
-    cycles.havePoints = false;
     if (cycles.length == step) {
         // `mapPingPong` stays at the first keypoint: each piece starts there anew.
         KFVertexIterator const second = _spline.placeAfter(minTime);

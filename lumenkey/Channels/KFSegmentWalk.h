@@ -67,9 +67,11 @@ private:
 
     void walk(Tempus const& start, Tempus const& end);
     bool walkInside(KFVertexIterator place, Tempus const& start, Tempus const& end, Tempus* lastTime);
+    KFVertexIterator lastTogetherWith(KFVertexIterator place) const noexcept;
     void walkOutside(Side side, Tempus const& start, Tempus const& end);
     void walkRepeats(Side side, std::uint32_t mode, Tempus const& start, Tempus const& end);
     bool cyclesOf(Side side, std::uint32_t mode, Tempus const& start, Cycles& cycles);
+    double riseOfCycle(Side side);
     void walkCycles(Side side, Cycles const& cycles, Tempus const& start, Tempus const& end);
     bool walkCycle(Cycles const& cycles, Cycle const& cycle, Tempus target, Tempus const& end);
     KFVertexIterator placeBehind(KFVertexIterator place, Tempus const& source, bool forward) const noexcept;

@@ -196,7 +196,7 @@ std::vector<Tempus> ends(KFSpline& spline) {
 
 TEST(KFChannelSegmentVisitor, VisitsPieceByPiece) {
     Keys const three{{s(0), 0.0, 1}, {s(1), 4.0, 4}, {s(3), 1.0, 1}};
-    Keys const mixed{{s(0), 2.0, 0}, {s(0), 7.0, 0}, {s(1), 4.0, 19}, {s(2), 5.0, 1}};
+    Keys const mixed{{s(0), 2.0, 1}, {s(0), 7.0, 0}, {s(1), 4.0, 19}, {s(2), 5.0, 1}};
     struct Case {
         Keys keys;
         std::uint32_t mode;
@@ -213,7 +213,8 @@ TEST(KFChannelSegmentVisitor, VisitsPieceByPiece) {
         {three, 0, s(1), s(1), "4@1 "},
         {three, 0, s(1, 2), s(1, 2), "1:0.5..0.5@0.5..0.5 "},
         {three, 0, s(2), s(1, 2), ""},
-        {mixed, 0, s(0), s(2), "2@0 7@0..1 4@1 5@2 "},
+        // Of two at one time the first has the value, and the second begins the segment.
+        {mixed, 0, s(-1), s(2), "2@-1..0 2@0 7@0..1 4@1 5@2 "},
         // Outside.
         {three, 0, s(-2), s(-1), "0@-2..-1 "},
         {three, 0, s(-1), s(0), "0@-1..0 0@0 "},
@@ -229,6 +230,12 @@ TEST(KFChannelSegmentVisitor, VisitsPieceByPiece) {
         {three, 4, s(-7), s(-2),
          "4:2..3@-7..-6+-3 -2@-6 1:0..1@-6..-5+-2 2@-5 4:1..3@-5..-3+-2 -1@-3 1:0..1@-3..-2+-1 3@-2 "},
         {three, 4, s(3), s(7), "1@3 1:0..1@3..4+1 5@4 4:1..3@4..6+1 2@6 1:0..1@6..7+2 6@7 "},
+        // Of two at the end, the first is the rise in front of the keypoints, the second the one behind them.
+        {{{s(0), 1.0, 1}, {s(1), 4.0, 1}, {s(1), 9.0, 1}},
+         4,
+         s(-2),
+         s(2),
+         "-5@-2 1:0..1@-2..-1+-6 -2@-1 1:0..1@-1..0+-3 1@0 1:0..1@0..1 4@1 1:0..1@1..2+8 17@2 "},
         // What repeats without end, in no time, or from a time that is none.
         {three, 3, kTempusNegativeInfinity, s(0), "0@0 "},
         {three, 3, s(3), kTempusPositiveInfinity, "1@3 "},
@@ -236,12 +243,7 @@ TEST(KFChannelSegmentVisitor, VisitsPieceByPiece) {
         // Retimed: the point at the end is read a frame further. One frame starts anew again and again.
         {three, 2, s(3), s(8), "4@3 4:2..1@3..4 1:1..0@4..5 4:1..3@5..7 4:2..1@7..8 ", true},
         {{{s(0), 0.0, 1}, {s(1), 6.0, 1}}, 2, s(2), s(7, 2), "1:0..1@2..3 1:0..0.5@3..3.5 ", true},
-        {{{s(0), 0.0, 1}, {s(1, 2), 6.0, 1}},
-         2,
-         s(1),
-         s(2),
-         "0@1 1:0..0.5@1..1.5 6@1.5 1:0.5..0@1.5..2 0@2 ",
-         true},
+        {{{s(0), 0.0, 1}, {s(1, 2), 6.0, 1}}, 2, s(1), s(2), "1:0..0.5@1..1.5 1:0.5..0@1.5..2 ", true},
     };
     for (Case const& c : cases) {
         EXPECT_EQ(shown(c.keys, c.mode, c.retiming).visit(Notes(), c.start, c.end).text.str(), c.visits)
