@@ -52,7 +52,8 @@ public:
             "It exits 0 when done, 1 when an input is at fault or an output can't be written, and 2 for "
             "wrong arguments.");
         _verbs = {declareInfo(_app),  declareTree(_app),    declareKeys(_app),    declareSample(_app),
-                  declarePlot(_app),  declareGallery(_app), declareConvert(_app), declareSimplify(_app),
+                  declarePlot(_app),  declareGallery(_app), declareConvert(_app), declareNew(_app),
+                  declareAdd(_app),   declareSet(_app),     declareRemove(_app),  declareSimplify(_app),
                   declareBake(_app),  declareSmooth(_app),  declareReverse(_app), declareOffset(_app),
                   declareScale(_app), declareRetime(_app)};
         for (Verb const& verb : _verbs) {

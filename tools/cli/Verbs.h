@@ -29,6 +29,12 @@ Verb declareGallery(CLI::App& program);
 
 Verb declareConvert(CLI::App& program);
 
+// Those that make documents channel by channel: see `AuthorOptions`.
+Verb declareNew(CLI::App& program);
+Verb declareAdd(CLI::App& program);
+Verb declareSet(CLI::App& program);
+Verb declareRemove(CLI::App& program);
+
 // Those that edit curves: see `EditVerb`.
 Verb declareSimplify(CLI::App& program);
 Verb declareBake(CLI::App& program);

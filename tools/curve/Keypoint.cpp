@@ -1,5 +1,7 @@
 #include "tools/curve/Keypoint.h"
 
+#include "tools/output/TextForms.h"
+
 #include <array>
 #include <string_view>
 #include <utility>
@@ -27,6 +29,12 @@ constexpr std::array<std::pair<std::uint32_t, std::string_view>, 17> kNames{
      {kKFInterpolationConcave, "concave"},
      {kKFInterpolationSCurve, "s-curve"}}};
 
+std::string lettersOf(std::string_view name) {
+    std::string letters(name);
+    std::erase_if(letters, [](char c) { return c == ' ' || c == '-' || c == '_'; });
+    return letters;
+}
+
 } // namespace
 
 Keypoint readKeypoint(KFSpline& spline, void* handle) {
@@ -53,6 +61,23 @@ std::string interpolationName(std::uint32_t type) {
         }
     }
     return "bezier (" + std::to_string(type) + ")";
+}
+
+std::optional<std::uint32_t> interpolationNamed(std::string_view name) {
+    for (auto const& [number, known] : kNames) {
+        if (sameWord(lettersOf(known), lettersOf(name))) {
+            return number;
+        }
+    }
+    return std::nullopt;
+}
+
+std::string interpolationNames() {
+    std::string names;
+    for (auto const& [number, name] : kNames) {
+        names += (names.empty() ? "" : ", ") + std::string(name);
+    }
+    return names;
 }
 
 } // namespace lumenkey::tools

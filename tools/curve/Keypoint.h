@@ -3,7 +3,9 @@
 #include "lumenkey/splines/KFSpline.h"
 
 #include <cstdint>
+#include <optional>
 #include <string>
+#include <string_view>
 #include <vector>
 
 namespace lumenkey::tools {
@@ -35,5 +37,9 @@ std::vector<void*> keypointHandles(KFSpline& spline);
 
 /// The name of a type, such as "linear"; an unknown number draws as Bezier and is called "bezier (99)".
 std::string interpolationName(std::uint32_t type);
+/// The type with that name, without regard to case, hyphens and blanks; nothing for none.
+std::optional<std::uint32_t> interpolationNamed(std::string_view name);
+/// All names, with commas between them.
+std::string interpolationNames();
 
 } // namespace lumenkey::tools

@@ -17,16 +17,6 @@ using Node = ChannelTree::Node;
 constexpr char const* kOffsetName = "Offset";
 constexpr char const* kEndSiteName = "End Site";
 
-unsigned freeID(KFChannelFolder const& folder) {
-    unsigned id = 0;
-    if (auto const* const children = folder.getDescendants()) {
-        for (KFChannelBase const* const child : *children) {
-            id = std::max(id, child->getID());
-        }
-    }
-    return id + 1;
-}
-
 std::optional<MotionChannelKind> kindNamed(std::string_view name) {
     for (MotionChannelKind const kind :
          {MotionChannelKind::Xposition, MotionChannelKind::Yposition, MotionChannelKind::Zposition,
@@ -169,13 +159,13 @@ SkeletonChannels::SkeletonChannels(Motion const& motion, ChannelTree const& tree
     }
     for (MotionEndSite const& site : motion.endSites) {
         KFChannelFolder& joint = *joints[site.joint];
-        _ends.push_back(std::make_unique<KFChannelFolder>(kEndSiteName, &joint, freeID(joint), 0, 0));
+        _ends.push_back(std::make_unique<KFChannelFolder>(kEndSiteName, &joint, freeIDBelow(joint), 0, 0));
         addOffset(*_ends.back(), site.offset);
     }
 }
 
 void SkeletonChannels::addOffset(KFChannelFolder& joint, std::array<double, 3> const& offset) {
-    _offsets.push_back(std::make_unique<KFChannel3D>(kOffsetName, &joint, freeID(joint), 0));
+    _offsets.push_back(std::make_unique<KFChannel3D>(kOffsetName, &joint, freeIDBelow(joint), 0));
     KFChannel3D& added = *_offsets.back();
     added.x.setInitialValue(offset[0], true);
     added.y.setInitialValue(offset[1], true);

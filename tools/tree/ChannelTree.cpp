@@ -226,4 +226,14 @@ ChannelTree::Match ChannelTree::find(std::string_view text) const {
     return whole.first ? whole : byEnd;
 }
 
+unsigned freeIDBelow(KFChannelFolder const& folder) {
+    unsigned highest = 0;
+    if (auto const* const children = folder.getDescendants()) {
+        for (KFChannelBase const* const child : *children) {
+            highest = std::max(highest, child->getID());
+        }
+    }
+    return highest + 1;
+}
+
 } // namespace lumenkey::tools

@@ -125,4 +125,7 @@ private:
     std::vector<Entry> _entries;
 };
 
+/// Above the IDs of a folder's children.
+unsigned freeIDBelow(KFChannelFolder const& folder);
+
 } // namespace lumenkey::tools

@@ -1,0 +1,55 @@
+#include "tools/cli/AuthorOptions.h"
+
+#include "tools/cli/OutputOptions.h"
+#include "tools/cli/Progress.h"
+#include "tools/cli/UsageError.h"
+#include "tools/export/ChannelFileWriter.h"
+#include "tools/output/TextForms.h"
+
+#include <CLI/CLI.hpp>
+
+namespace lumenkey::tools {
+
+void AuthorOptions::add(CLI::App& verb) {
+    verb.add_option("FILE", input.file, kFileHelp)->option_text(" ")->required();
+}
+
+void AuthorOptions::addRest(CLI::App& verb) {
+    verb.add_option("-o,--output", output, "Leave FILE as it is and write OUT.lumen, .csv or .bvh")
+        ->option_text("OUT");
+    input.addFrameRate(verb);
+}
+
+void AuthorOptions::check() const {
+    if (!output.empty()) {
+        requireOutputFormat(output, channelFormatNamed(input.file));
+    }
+}
+
+void AuthorOptions::write(ChannelInput const& opened) const {
+    ChannelFormat const own = opened.file().format;
+    ChannelFormat const format = output.empty() ? own : requireOutputFormat(output, own);
+    Progress bar("writing");
+    writeChannelFile({opened.file(), format, RowsOf::Keypoints, {}, output.empty() ? input.file : output},
+                     [&bar](double share) { bar.update(share); });
+}
+
+std::string limitsText(KFChannel const& channel, double value) {
+    return "doesn't take " + shortestText(value) + ", but values from " + shortestText(channel.getMin()) +
+           " to " + shortestText(channel.getMax());
+}
+
+void setConstant(KFChannel& channel, double value, std::string const& name) {
+    channel.setInitialValue(value, true);
+    if (channel.getInitialValue() != value) {
+        throw UsageError{"'" + name + "' " + limitsText(channel, value)};
+    }
+}
+
+void requireDocument(ChannelInput const& input) {
+    if (input.file().format != ChannelFormat::Document) {
+        throw UsageError{"'" + input.file().file + "' is no document: make one of it with lumenkey convert"};
+    }
+}
+
+} // namespace lumenkey::tools

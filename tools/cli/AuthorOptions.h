@@ -1,0 +1,34 @@
+#pragma once
+
+#include "tools/cli/ChannelInput.h"
+
+#include <string>
+
+namespace lumenkey::tools {
+
+/// What the verbs are told that change single channels of a file: it, and where to put it.
+struct AuthorOptions {
+    InputOptions input;
+    /// Empty for the file itself.
+    std::string output;
+
+    /// Declares FILE, and `-o`.
+    void add(CLI::App& verb);
+    /// The rest, to be called behind the verb's own arguments.
+    void addRest(CLI::App& verb);
+
+    /// Before the file is read. Throws `UsageError` for an output that can't be written.
+    void check() const;
+    /// Throws `OutputError`, or `UsageError` for an output that can't be written from this input.
+    void write(ChannelInput const& input) const;
+};
+
+/// The value of a channel without keypoints. Throws `UsageError` where the channel doesn't take it.
+void setConstant(KFChannel& channel, double value, std::string const& name);
+/// Why a channel doesn't take a value.
+std::string limitsText(KFChannel const& channel, double value);
+
+/// Throws `UsageError` where the file is no document: only those hold channels of any class.
+void requireDocument(ChannelInput const& input);
+
+} // namespace lumenkey::tools
