@@ -1,0 +1,95 @@
+// A save that dies on its way leaves the file as it was, or as it was to become.
+
+#include "tests/tools/MotionSamples.h"
+#include "tests/tools/RunProgram.h"
+#include "tests/tools/TestFolder.h"
+
+#include <gtest/gtest.h>
+
+#include <chrono>
+#include <csignal>
+#include <random>
+#include <spawn.h>
+#include <sys/wait.h>
+#include <thread>
+
+extern char** environ;
+
+namespace lumenkey::tools {
+namespace {
+
+using Microseconds = std::chrono::microseconds;
+
+class AtomicSaveTest : public ::testing::Test {
+protected:
+    TestFolder const _folder;
+    std::string const _file = _folder.file("f.lumen");
+
+    void SetUp() override {
+        std::string table = "time,A,B\n";
+        for (int i = 0; i < 3000; ++i)
+            table += std::to_string(i) + "/24," + std::to_string(i + 1) + ",7\n";
+        ASSERT_EQ(runLumenkey({"convert", _folder.write("t.csv", table), _file}).exit, 0);
+        // Once there and back: a time may be written in another timescale than the table's.
+        ASSERT_EQ(runLumenkey(turn()).exit, 0);
+        ASSERT_EQ(runLumenkey(turn()).exit, 0);
+    }
+    /// Turns the signs of all values round, and back when done again.
+    std::vector<std::string> turn() const { return {"scale", _file, "--factor", "-1", "--in-place"}; }
+
+    /// Runs that, to be killed after a while; true if it came to its end before.
+    bool turnKilledAfter(Microseconds time) const {
+        std::string const program = programPath();
+        std::vector<std::string> words = turn();
+        std::vector<char*> arguments{const_cast<char*>(program.c_str())};
+        for (std::string& word : words)
+            arguments.push_back(word.data());
+        arguments.push_back(nullptr);
+        posix_spawn_file_actions_t actions;
+        posix_spawn_file_actions_init(&actions);
+        posix_spawn_file_actions_addopen(&actions, 1, "/dev/null", 1, 0);
+        pid_t child = 0;
+        EXPECT_EQ(posix_spawn(&child, program.c_str(), &actions, nullptr, arguments.data(), environ), 0);
+        posix_spawn_file_actions_destroy(&actions);
+        std::this_thread::sleep_for(time);
+        kill(child, SIGKILL);
+        int status = 0;
+        waitpid(child, &status, 0);
+        return WIFEXITED(status);
+    }
+};
+
+TEST_F(AtomicSaveTest, KilledAnywhereLeavesOneOfTheTwoFiles) {
+    std::string const before = contentOf(_file);
+    auto const start = std::chrono::steady_clock::now();
+    ASSERT_EQ(runLumenkey(turn()).exit, 0);
+    auto const whole = std::chrono::duration_cast<Microseconds>(std::chrono::steady_clock::now() - start);
+    std::string const after = contentOf(_file);
+    ASSERT_NE(after, before);
+
+    std::mt19937 random(1);
+    int killed = 0;
+    for (int i = 0; i < 60; ++i) {
+        std::string const content = contentOf(_file);
+        killed += turnKilledAfter(whole * (random() % 1000) / 1000) ? 0 : 1;
+        std::string const now = contentOf(_file);
+        ASSERT_TRUE(now == before || now == after) << "a mixture of " << now.size() << " bytes";
+    }
+    EXPECT_GT(killed, 0);
+    ASSERT_EQ(runLumenkey(turn()).exit, 0) << "what is left behind is in nobody's way";
+}
+
+TEST_F(AtomicSaveTest, AFullDiskLeavesTheOldFile) {
+    std::string const before = contentOf(_file);
+    for (char const* const blocks : {"0", "1", "40"}) {
+        Outcome const outcome = runProgramFile(
+            "/bin/sh", {"-c", "trap '' XFSZ; ulimit -f " + std::string(blocks) + "; exec \"$0\" \"$@\"",
+                        programPath(), "scale", _file, "--factor", "-1", "--in-place"});
+        EXPECT_NE(outcome.exit, 0);
+        EXPECT_EQ(contentOf(_file), before);
+    }
+    EXPECT_EQ(_folder.entryCount(), 2U) << "nothing is left behind";
+}
+
+} // namespace
+} // namespace lumenkey::tools
