@@ -50,12 +50,13 @@ public:
         _app.footer(
             "lumenkey VERB --help tells more, with an example.\n"
             "It exits 0 when done, 1 when an input is at fault or an output can't be written, and 2 for "
-            "wrong arguments.");
-        _verbs = {declareInfo(_app),  declareTree(_app),    declareKeys(_app),    declareSample(_app),
-                  declarePlot(_app),  declareGallery(_app), declareConvert(_app), declareNew(_app),
-                  declareAdd(_app),   declareSet(_app),     declareRemove(_app),  declareSimplify(_app),
-                  declareBake(_app),  declareSmooth(_app),  declareReverse(_app), declareOffset(_app),
-                  declareScale(_app), declareRetime(_app)};
+            "wrong arguments;\ndiff as diff does.");
+        _verbs = {declareInfo(_app),   declareTree(_app),    declareKeys(_app),     declareSample(_app),
+                  declarePlot(_app),   declareGallery(_app), declareConvert(_app),  declareHash(_app),
+                  declareDiff(_app),   declareUpgrade(_app), declareNew(_app),      declareAdd(_app),
+                  declareSet(_app),    declareRemove(_app),  declareSimplify(_app), declareBake(_app),
+                  declareSmooth(_app), declareReverse(_app), declareOffset(_app),   declareScale(_app),
+                  declareRetime(_app)};
         for (Verb const& verb : _verbs) {
             _usages[verb.arguments->get_name()] = verb.usage;
             verb.arguments->formatter(std::make_shared<HelpFormatter>(_usages));
@@ -65,10 +66,11 @@ public:
 
     int run(int argc, char const* const* argv) {
         StandardOutput out;
+        int exit = kExitDone;
         try {
             checkVerb(argc, argv);
             _app.parse(argc, argv);
-            chosenVerb().run(out);
+            exit = runVerb(chosenVerb(), out);
         } catch (CLI::CallForHelp const&) {
             out.write(chosenApp().help());
         } catch (CLI::CallForVersion const& version) {
@@ -79,10 +81,25 @@ public:
             return wrongArguments(error.what);
         }
         out.flush();
-        return kExitDone;
+        return exit;
     }
 
 private:
+    static int runVerb(Verb const& verb, OutputSink& out) {
+        try {
+            if (verb.runForExit) {
+                return verb.runForExit(out);
+            }
+            verb.run(out);
+            return kExitDone;
+        } catch (InputError const& error) {
+            complain(error.text());
+        } catch (OutputError const& error) {
+            complain(printableText(error.target) + ": " + error.what);
+        }
+        return verb.exitInTrouble;
+    }
+
     int wrongArguments(std::string const& what) {
         complain(printableText(what));
         writeFully(STDERR_FILENO, "usage: " + usageOf(chosenApp(), _usages) + "see: lumenkey " +
@@ -134,9 +151,7 @@ private:
 int runProgram(int argc, char const* const* argv) {
     try {
         return Program().run(argc, argv);
-    } catch (InputError const& error) {
-        complain(error.text());
-    } catch (OutputError const& error) {
+    } catch (OutputError const& error) { // at the end of standard output
         complain(printableText(error.target) + ": " + error.what);
     } catch (std::bad_alloc const&) {
         complain("out of memory");

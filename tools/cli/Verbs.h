@@ -1,5 +1,6 @@
 #pragma once
 
+#include "tools/cli/Program.h"
 #include "tools/output/OutputSink.h"
 
 #include <functional>
@@ -18,6 +19,10 @@ struct Verb {
     std::string usage;
     /// What it does once its arguments are read. Throws `InputError`, `OutputError` or `UsageError`.
     std::function<void(OutputSink&)> run;
+    /// In the place of `run`, for a verb that says by its exit code what it found.
+    std::function<int(OutputSink&)> runForExit = {};
+    /// What it exits with where an input is at fault or an output can't be written.
+    int exitInTrouble = kExitFailed;
 };
 
 Verb declareInfo(CLI::App& program);
@@ -28,6 +33,10 @@ Verb declarePlot(CLI::App& program);
 Verb declareGallery(CLI::App& program);
 
 Verb declareConvert(CLI::App& program);
+
+Verb declareHash(CLI::App& program);
+Verb declareDiff(CLI::App& program);
+Verb declareUpgrade(CLI::App& program);
 
 // Those that make documents channel by channel: see `AuthorOptions`.
 Verb declareNew(CLI::App& program);

@@ -153,7 +153,19 @@ WrittenRows writeTable(FileToWrite const& wanted, OutputSink& out, ReadingProgre
     return {times.size(), times.empty() ? kTempusZero : times.front()};
 }
 
+/// Channels of unknown classes were passed over on reading; a document without them must not come in its place.
+void checkNothingIsLost(FileToWrite const& wanted) {
+    for (DocumentFactory const& factory : wanted.file.document.factories) {
+        if (!factory.isKnown()) {
+            throw OutputError{wanted.target, "not written: " + printableText(wanted.file.file) +
+                                                 " names a class that is unknown, " + factory.uuid.text() +
+                                                 ", whose channels would be lost; see lumenkey check"};
+        }
+    }
+}
+
 WrittenRows writeWholeDocument(FileToWrite const& wanted, OutputSink& out) {
+    checkNothingIsLost(wanted);
     ChannelTree& tree = *wanted.file.tree;
     std::optional<SkeletonChannels> skeleton;
     if (wanted.file.format == ChannelFormat::Motion) {

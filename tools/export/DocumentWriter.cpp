@@ -10,9 +10,6 @@ namespace lumenkey::tools {
 
 namespace {
 
-constexpr unsigned int kMajorVersion = 5;
-constexpr unsigned int kMinorVersion = 13;
-
 /// Hands the library's text on. Nothing may be thrown through the library: it is kept until the library has returned.
 class SinkStream : public BXStream {
 public:
@@ -45,7 +42,7 @@ private:
 
 void writeDocument(KFChannelBase& top, OutputSink& out) {
     SinkStream sink(out);
-    BXXMLWriteStream stream(sink, kMajorVersion, kMinorVersion);
+    BXXMLWriteStream stream(sink, kWrittenMajor, kWrittenMinor);
     top.markFactoriesForSerialization(stream, false);
     KFFactories::getInstance().saveFactories(stream);
     top.writeHeader(stream, true);

@@ -1,0 +1,189 @@
+// Documents made and changed from a shell, and what tells them apart.
+
+#include "lumenkey/Channels/KFChannelObjectRootBase.h"
+#include "lumenkey/foundation/BXURL.h"
+#include "tests/tools/RunProgram.h"
+#include "tests/tools/TestFolder.h"
+#include "tools/tree/ChannelTree.h"
+
+#include <gtest/gtest.h>
+#include <nlohmann/json.hpp>
+
+namespace lumenkey::tools {
+namespace {
+
+using Json = nlohmann::json;
+
+class AuthorVerbsTest : public ::testing::Test {
+protected:
+    TestFolder const _folder;
+    std::string const _file = _folder.file("ball.lumen");
+
+    static std::string done(std::vector<std::string> const& arguments, int exit = 0) {
+        Outcome const outcome = runLumenkey(arguments);
+        EXPECT_EQ(outcome.exit, exit) << Json(arguments) << outcome.err;
+        EXPECT_EQ(outcome.err, "");
+        return outcome.out;
+    }
+    void expectRefused(std::vector<std::string> arguments, std::string const& complaint, int exit = 2) const {
+        std::string const before = contentOf(_file);
+        arguments.insert(arguments.begin() + 1, _file);
+        Outcome const outcome = runLumenkey(arguments);
+        EXPECT_EQ(outcome.exit, exit) << Json(arguments);
+        EXPECT_NE(outcome.err.find(complaint), std::string::npos) << outcome.err;
+        EXPECT_EQ(contentOf(_file), before);
+    }
+    void makeBall() const {
+        done({"new", _file});
+        EXPECT_EQ(done({"add", _file, "./", "Double", "Height", "--value", "1.5"}), "./1\n");
+        EXPECT_EQ(done({"add", _file, "./", "folder", "Body"}), "./2\n");
+        EXPECT_EQ(done({"add", _file, "Body", "KFChannel3D", "Place"}), "./2/1\n");
+        EXPECT_EQ(done({"add", _file, "./2", "Bool", "On", "--value", "1"}), "./2/2\n");
+        done({"set", _file, "Height", "--at", "1/2", "--value", "0", "--interpolation", "Catmull Rom"});
+        done({"set", _file, "Height", "--at", "0", "--value", "3", "--interpolation", "constant"});
+        done({"set", _file, "Height", "--at", "1", "--value", "2"});
+        done({"set", _file, "Place.Y", "--value", "-5"});
+    }
+};
+
+TEST_F(AuthorVerbsTest, MakesADocumentFromNothing) {
+    makeBall();
+    Json const nodes = Json::parse(done({"tree", _file, "--json"}))["nodes"];
+    std::string all;
+    for (Json const& node : nodes) {
+        all += node["path"].get<std::string>() + " " + node["name"].get<std::string>() + " " +
+               node["class"].get<std::string>() +
+               (node.contains("start") ? " " + node["start"].dump() : std::string()) + "\n";
+    }
+    EXPECT_EQ(all, "./ ball KFChannelObjectRootBase\n"
+                   "./1 Height KFChannelDouble 3\n"
+                   "./2 Body KFChannelFolder\n"
+                   "./2/1 Place KFChannel3D\n"
+                   "./2/1/1 X KFChannelDouble 0\n"
+                   "./2/1/2 Y KFChannelDouble -5\n"
+                   "./2/1/3 Z KFChannelDouble 0\n"
+                   "./2/2 On KFChannelBool 1\n");
+    Json const keys = Json::parse(done({"keys", _file, "Height", "--json"}))["keypoints"];
+    ASSERT_EQ(keys.size(), 3U);
+    EXPECT_EQ(keys[0]["interpolation"], 0);
+    EXPECT_EQ(keys[1]["time"], "1/2");
+    EXPECT_EQ(keys[1]["interpolation"], 6);
+    EXPECT_EQ(keys[2]["value"], 2.0);
+
+    done({"set", _file, "Height", "--at", "1", "--delete"});
+    done({"set", _file, "Height", "--at", "0", "--value", "4"});
+    std::string const copy = _folder.file("copy.lumen");
+    done({"remove", _file, "Place", "-o", copy});
+    EXPECT_EQ(Json::parse(done({"tree", copy, "--json"}))["nodes"].size(), 4U);
+    EXPECT_EQ(Json::parse(done({"tree", _file, "--json"}))["nodes"].size(), 8U);
+    Json const left = Json::parse(done({"keys", copy, "Height", "--json"}))["keypoints"];
+    ASSERT_EQ(left.size(), 2U);
+    EXPECT_EQ(left[0]["value"], 4.0);
+    EXPECT_EQ(left[0]["interpolation"], 0) << "a new value leaves the rest of its keypoint";
+}
+
+TEST_F(AuthorVerbsTest, RefusesWhatChannelsDoNotTake) {
+    makeBall();
+    expectRefused({"add", "./", "Dubble", "X"}, "did you mean 'Double'?");
+    expectRefused({"add", "Height", "Double", "X"}, "is no folder");
+    expectRefused({"add", "Place", "Double", "W"}, "is no folder");
+    expectRefused({"add", "Body", "Double", "On"}, "has a channel 'On' already");
+    expectRefused({"add", "Body", "3D", "P", "--value", "1"}, "none or several");
+    expectRefused({"add", "Body", "Percent", "P", "--value", "50"}, "values from 0 to 1");
+    expectRefused({"set", "Height", "--value", "1"}, "say which with --at");
+    expectRefused({"set", "Height", "--at", "1/3", "--delete"}, "has no keypoint at 1/3 s");
+    expectRefused({"set", "Height", "--at", "0", "--value", "1", "--interpolation", "wavy"},
+                  "there are constant");
+    expectRefused({"set", "On", "--at", "0", "--value", "0"}, "takes no keypoints");
+    expectRefused({"set", "Body", "--value", "0"}, "is a folder");
+    expectRefused({"remove", "./"}, "the top");
+    expectRefused({"remove", "Place.X"}, "only go as a whole");
+    expectRefused({"new"}, "it is there already", 1);
+}
+
+TEST_F(AuthorVerbsTest, HashIsThatOfTheLibrary) {
+    makeBall();
+    KFChannelObjectRootBase root("ball", nullptr, 1, 0, 0);
+    ASSERT_TRUE(root.configureWithURL(BXURL(_file)));
+    std::string expected;
+    for (unsigned const byte : root.getHash()) {
+        expected += "0123456789abcdef"[byte / 16];
+        expected += "0123456789abcdef"[byte % 16];
+    }
+    for (KFChannelBase* const child : std::vector<KFChannelBase*>(*root.getDescendants())) {
+        root.removeDescendant(child);
+        ChannelTree const owner{std::unique_ptr<KFChannelBase>(child)};
+    }
+    EXPECT_EQ(done({"hash", _file}), expected + "\n");
+    std::string const early = done({"hash", _file, "Height", "--at", "0"});
+    EXPECT_EQ(done({"hash", _file, "Height", "--at", "1/4"}), early) << "the value is held";
+    EXPECT_NE(done({"hash", _file, "Height", "--at", "3/4"}), early);
+    std::string const body = done({"hash", _file, "Body"});
+    done({"set", _file, "Height", "--at", "1/4", "--value", "3"});
+    EXPECT_EQ(done({"hash", _file, "Body"}), body);
+    EXPECT_NE(done({"hash", _file}), expected + "\n");
+}
+
+TEST_F(AuthorVerbsTest, DiffTellsWhatDiffersAndByItsExitCode) {
+    makeBall();
+    std::string const other = _folder.file("other.lumen");
+    std::filesystem::copy_file(_file, other);
+    EXPECT_EQ(done({"diff", _file, other}), "");
+    done({"set", other, "Height", "--at", "1/4", "--value", "9"});
+    done({"add", other, "Body", "Angle", "Turn"});
+    done({"remove", other, "On"});
+    done({"set", other, "Place.X", "--value", "0.25"});
+    EXPECT_EQ(done({"diff", _file, other}, 1),
+              "changed Height: by up to 6.000000 units, at 1/4 s; number of keypoints 3 became 4\n"
+              "changed Body.Place.X: by up to 0.250000 units, at 0/1 s\n"
+              "added   Body.Turn\n"
+              "removed Body.On\n");
+    Json const json = Json::parse(done({"diff", other, _file, "--json"}, 1))["differences"];
+    ASSERT_EQ(json.size(), 4U);
+    EXPECT_EQ(json[0]["worst"], 6.0);
+    EXPECT_EQ(json[2]["kind"], "added");
+    // What draws the same curve may still be another one.
+    std::filesystem::copy_file(_file, other, std::filesystem::copy_options::overwrite_existing);
+    done({"set", other, "Height", "--at", "1", "--interpolation", "ease"});
+    EXPECT_EQ(done({"diff", _file, other}, 1),
+              "changed Height: keypoints or settings of a curve with the same values\n");
+    EXPECT_EQ(runLumenkey({"diff", _file, _folder.file("none")}).exit, 2);
+    EXPECT_EQ(runLumenkey({"diff", _file}).exit, 2);
+}
+
+TEST_F(AuthorVerbsTest, UpgradeWritesOldDocumentsInTodaysVersion) {
+    std::vector<std::string> files;
+    std::string const data = LUMENKEY_TEST_SOURCE_DIR "/tests/persistence/data/";
+    for (char const* const name : {"version2.lumen", "version3.lumen", "version4.lumen"}) {
+        files.push_back(_folder.write(name, contentOf(data + name)));
+    }
+    std::vector<std::string> arguments{"upgrade", "--frame-rate", "24"};
+    arguments.insert(arguments.end(), files.begin(), files.end());
+    EXPECT_EQ(done(arguments), files[0] + ": from version 2.1 to 5.13\n" + files[1] +
+                                   ": from version 3.1 to 5.13\n" + files[2] +
+                                   ": from version 4.1 to 5.13\n");
+    for (std::string const& file : files) {
+        std::string const text = contentOf(file);
+        EXPECT_NE(text.find("<timing in=\"10/24\" out=\"100/24\" offset=\"30/24\"/>"), std::string::npos)
+            << text;
+        EXPECT_NE(text.find("<time>30/24</time>"), std::string::npos) << text;
+        EXPECT_EQ(done({"diff", file, files[0]}), "");
+        EXPECT_EQ(done({"upgrade", file}), file + ": version 5.13 already\n");
+        EXPECT_EQ(contentOf(file), text);
+    }
+    arguments.push_back(_folder.file("none.lumen"));
+    EXPECT_EQ(runLumenkey(arguments).exit, 1);
+
+    // A document that would lose channels stays.
+    std::string const unknown = _folder.write(
+        "unknown.lumen", "<kfml version=\"4.0\"><factory id=\"1\" uuid=\"00000000-0000-0000-0000-"
+                         "000000000001\"/><parameter name=\"R\"/></kfml>");
+    std::string const before = contentOf(unknown);
+    Outcome const refused = runLumenkey({"upgrade", unknown});
+    EXPECT_EQ(refused.exit, 1);
+    EXPECT_NE(refused.err.find("would be lost"), std::string::npos) << refused.err;
+    EXPECT_EQ(contentOf(unknown), before);
+}
+
+} // namespace
+} // namespace lumenkey::tools
