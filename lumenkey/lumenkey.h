@@ -32,6 +32,7 @@
 #include "lumenkey/curves/KFSplineNode.h"
 #include "lumenkey/curves/KFTypedCurves.h"
 #include "lumenkey/foundation/BXAlgorithm.h"
+#include "lumenkey/foundation/BXAsciiStream.h"
 #include "lumenkey/foundation/BXCurveFit.h"
 #include "lumenkey/foundation/BXExport.h"
 #include "lumenkey/foundation/BXHashWriteStream.h"
