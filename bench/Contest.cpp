@@ -56,7 +56,7 @@ void run(Bench& bench, ContestEntry const& entry, benchmark::State& state) {
 } // namespace
 
 void registerContest(Bench& bench, ContestEntry entry) {
-    int const repetitions = entry.repeats ? bench.repetitions : 1;
+    int const repetitions = entry.repeats ? std::min(bench.repetitions, entry.mostRepetitions) : 1;
     auto const shared = std::make_shared<ContestEntry const>(std::move(entry));
     benchmark::RegisterBenchmark(shared->name.c_str(),
                                  [&bench, shared](benchmark::State& state) { run(bench, *shared, state); })

@@ -5,6 +5,7 @@
 #include <chrono>
 #include <cstddef>
 #include <functional>
+#include <limits>
 #include <string>
 
 /// How long and how often is measured, and where to the results go.
@@ -43,6 +44,8 @@ struct ContestEntry {
     };
     /// False for what comes out the same every time.
     bool repeats = true;
+    /// For what takes seconds.
+    int mostRepetitions = std::numeric_limits<int>::max();
 };
 void registerContest(Bench& bench, ContestEntry entry);
 

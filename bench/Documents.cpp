@@ -23,6 +23,9 @@
 
 namespace {
 
+/// Reading a million keypoints takes seconds.
+int mostRepetitions(std::size_t keypoints) { return keypoints > 100000 ? 3 : keypoints > 1000 ? 9 : 25; }
+
 constexpr std::size_t kDocumentSizes[] = {1000, 100000, 1000000};
 constexpr std::size_t kKeypointsOfChannel = 1000;
 constexpr std::size_t kSizeBesideJson = 100000;
@@ -277,11 +280,13 @@ void registerMemoryOfDocuments(Bench& bench, std::size_t size) {
 
 void registerGrowthOfDocuments(Bench& bench) {
     auto const growth = [&bench](std::string const& what, Measurement (*measure)(Trees const&)) {
-        registerContest(bench,
-                        {what + " a keypoint/1000000", "a keypoint of 100000", Bound::atMost(1.1), [measure] {
-                             return Contest{measure(std::make_shared<DocumentTree>(1000000)),
-                                            measure(std::make_shared<DocumentTree>(100000))};
-                         }});
+        ContestEntry entry{what + " a keypoint/1000000", "a keypoint of 100000", Bound::atMost(1.1),
+                           [measure] {
+                               return Contest{measure(std::make_shared<DocumentTree>(1000000)),
+                                              measure(std::make_shared<DocumentTree>(100000))};
+                           }};
+        entry.mostRepetitions = mostRepetitions(1000000);
+        registerContest(bench, std::move(entry));
     };
     growth("read", reading);
     growth("write", writing);
@@ -289,35 +294,41 @@ void registerGrowthOfDocuments(Bench& bench) {
 }
 
 void registerJson(Bench& bench) {
-    registerContest(bench, {"beside JSON/read", "nlohmann-json", Bound::none(), [] {
-                                auto const tree = std::make_shared<DocumentTree>(kSizeBesideJson);
-                                auto const text = std::make_shared<std::string>(jsonOf(*tree).dump());
-                                return Contest{reading(tree), perKeypoint(kSizeBesideJson, [text] {
-                                                   return nanoseconds([&] {
-                                                       benchmark::DoNotOptimize(nlohmann::json::parse(*text));
-                                                   });
-                                               })};
-                            }});
-    registerContest(bench, {"beside JSON/write", "nlohmann-json", Bound::none(), [] {
-                                auto const tree = std::make_shared<DocumentTree>(kSizeBesideJson);
-                                return Contest{writing(tree), perKeypoint(kSizeBesideJson, [tree] {
-                                                   return nanoseconds([&] {
-                                                       benchmark::DoNotOptimize(jsonOf(*tree).dump());
-                                                   });
-                                               })};
-                            }});
+    auto const beside = [&bench](std::string const& what, Contest (*prepare)()) {
+        ContestEntry entry{"beside JSON/" + what, "nlohmann-json", Bound::none(), prepare};
+        entry.mostRepetitions = mostRepetitions(kSizeBesideJson);
+        registerContest(bench, std::move(entry));
+    };
+    beside("read", [] {
+        auto const tree = std::make_shared<DocumentTree>(kSizeBesideJson);
+        auto const text = std::make_shared<std::string>(jsonOf(*tree).dump());
+        return Contest{reading(tree), perKeypoint(kSizeBesideJson, [text] {
+                           return nanoseconds(
+                               [&] { benchmark::DoNotOptimize(nlohmann::json::parse(*text)); });
+                       })};
+    });
+    beside("write", [] {
+        auto const tree = std::make_shared<DocumentTree>(kSizeBesideJson);
+        return Contest{writing(tree), perKeypoint(kSizeBesideJson, [tree] {
+                           return nanoseconds([&] { benchmark::DoNotOptimize(jsonOf(*tree).dump()); });
+                       })};
+    });
 }
 
 } // namespace
 
 void registerDocuments(Bench& bench) {
     for (std::size_t const size : kDocumentSizes) {
-        registerContest(bench, {withSize("read a document", size), "expat with empty handlers",
-                                Bound::atMost(2.5), [size] { return readingContest(size); }});
-        registerContest(bench, {withSize("write a document", size), "its numbers by to_chars",
-                                Bound::atMost(2.0), [size] { return writingContest(size); }});
-        registerContest(bench, {withSize("digest", size), "XXH3 of its numbers, one by one",
-                                Bound::atMost(1.5), [size] { return digestContest(size); }});
+        auto const contest = [&bench, size](std::string const& what, std::string const& against,
+                                            double atMost, Contest (*prepare)(std::size_t)) {
+            ContestEntry entry{withSize(what, size), against, Bound::atMost(atMost),
+                               [size, prepare] { return prepare(size); }};
+            entry.mostRepetitions = mostRepetitions(size);
+            registerContest(bench, std::move(entry));
+        };
+        contest("read a document", "expat with empty handlers", 2.5, readingContest);
+        contest("write a document", "its numbers by to_chars", 2.0, writingContest);
+        contest("digest", "XXH3 of its numbers, one by one", 1.5, digestContest);
         registerMemoryOfDocuments(bench, size);
     }
     registerGrowthOfDocuments(bench);
