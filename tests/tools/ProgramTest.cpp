@@ -315,9 +315,10 @@ TEST_F(ProgramTest, FailuresToWriteExitWithOne) {
 }
 
 TEST_F(ProgramTest, EveryVerbHelpsWithAnExample) {
-    for (char const* const verb : {"info", "tree", "keys", "sample", "plot", "gallery", "simplify", "bake",
-                                   "smooth", "reverse", "offset", "scale", "retime", "convert", "new", "add", "set",
-                                   "remove", "hash", "diff", "check", "upgrade", "types", "completion", "manual"}) {
+    for (char const* const verb :
+         {"info",    "tree",   "keys",  "sample",  "plot",    "gallery",    "simplify", "bake", "smooth",
+          "reverse", "offset", "scale", "retime",  "convert", "new",        "add",      "set",  "remove",
+          "hash",    "diff",   "check", "upgrade", "types",   "completion", "manual"}) {
         Outcome const help = runLumenkey({verb, "--help"});
         EXPECT_EQ(help.exit, 0);
         EXPECT_NE(help.out.find("Usage: lumenkey " + std::string(verb)), std::string::npos) << help.out;
@@ -337,8 +338,9 @@ TEST_F(ProgramTest, ManualAndCompletionAreMadeOfTheSameTexts) {
         EXPECT_NE(manual.find(word), std::string::npos) << word;
     }
     auto const completionsOf = [&](std::string const& words, int count) {
-        std::string const line = ". '" + script + "'; COMP_WORDS=(" + words + "); COMP_CWORD=" +
-                                 std::to_string(count) + "; _lumenkey; echo \"${COMPREPLY[*]}\"";
+        std::string const line = ". '" + script + "'; COMP_WORDS=(" + words +
+                                 "); COMP_CWORD=" + std::to_string(count) +
+                                 "; _lumenkey; echo \"${COMPREPLY[*]}\"";
         return runProgramFile("/bin/bash", {"-c", line}).out;
     };
     EXPECT_EQ(completionsOf("lumenkey sm", 1), "smooth\n");
@@ -348,7 +350,8 @@ TEST_F(ProgramTest, ManualAndCompletionAreMadeOfTheSameTexts) {
 
 TEST_F(ProgramTest, TypesListsAllClasses) {
     Json const types = jsonOf({"types", "--json"})["types"];
-    auto const found = std::find_if(types.begin(), types.end(), [](Json const& type) { return type["name"] == "Percent"; });
+    auto const found =
+        std::find_if(types.begin(), types.end(), [](Json const& type) { return type["name"] == "Percent"; });
     ASSERT_NE(found, types.end());
     EXPECT_EQ(*found, Json::parse(R"({"name": "Percent", "class": "KFChannelPercent",
         "uuid": "27F3EE8B-2292-11D7-925A-00039389B702", "superclass": "KFChannel", "least": 0.0, "greatest": 1.0})"));
