@@ -4,6 +4,7 @@
 #include "tests/tools/RunProgram.h"
 #include "tests/tools/TestFolder.h"
 
+#include <algorithm>
 #include <gtest/gtest.h>
 #include <nlohmann/json.hpp>
 #include <numbers>
@@ -314,8 +315,10 @@ TEST_F(ProgramTest, FailuresToWriteExitWithOne) {
 }
 
 TEST_F(ProgramTest, EveryVerbHelpsWithAnExample) {
-    for (char const* const verb : {"info", "tree", "keys", "sample", "plot", "gallery", "simplify", "bake",
-                                   "smooth", "reverse", "offset", "scale", "retime"}) {
+    for (char const* const verb :
+         {"info",    "tree",   "keys",  "sample",  "plot",    "gallery",    "simplify", "bake", "smooth",
+          "reverse", "offset", "scale", "retime",  "convert", "new",        "add",      "set",  "remove",
+          "hash",    "diff",   "check", "upgrade", "types",   "completion", "manual"}) {
         Outcome const help = runLumenkey({verb, "--help"});
         EXPECT_EQ(help.exit, 0);
         EXPECT_NE(help.out.find("Usage: lumenkey " + std::string(verb)), std::string::npos) << help.out;
@@ -324,6 +327,35 @@ TEST_F(ProgramTest, EveryVerbHelpsWithAnExample) {
     }
     EXPECT_NE(runLumenkey({"--help"}).out.find("sample"), std::string::npos);
     EXPECT_TRUE(runLumenkey({"--version"}).out.starts_with("lumenkey "));
+}
+
+TEST_F(ProgramTest, ManualAndCompletionAreMadeOfTheSameTexts) {
+    std::string const manual = runLumenkey({"manual"}).out;
+    std::string const script = _folder.write("completion", runLumenkey({"completion", "bash"}).out);
+    EXPECT_TRUE(manual.starts_with(".TH LUMENKEY 1"));
+    EXPECT_EQ(manual.find("\n'"), std::string::npos) << "a line that begins like a request of the formatter";
+    for (char const* const word : {"Tell how two files differ", "\\-\\-in\\-place", "lumenkey diff A B"}) {
+        EXPECT_NE(manual.find(word), std::string::npos) << word;
+    }
+    auto const completionsOf = [&](std::string const& words, int count) {
+        std::string const line = ". '" + script + "'; COMP_WORDS=(" + words +
+                                 "); COMP_CWORD=" + std::to_string(count) +
+                                 "; _lumenkey; echo \"${COMPREPLY[*]}\"";
+        return runProgramFile("/bin/bash", {"-c", line}).out;
+    };
+    EXPECT_EQ(completionsOf("lumenkey sm", 1), "smooth\n");
+    EXPECT_EQ(completionsOf("lumenkey set f.lumen --in", 3), "--interpolation\n");
+    EXPECT_EQ(completionsOf("lumenkey info '" + _folder.file("sma") + "'", 2), _file + "\n");
+}
+
+TEST_F(ProgramTest, TypesListsAllClasses) {
+    Json const types = jsonOf({"types", "--json"})["types"];
+    auto const found =
+        std::find_if(types.begin(), types.end(), [](Json const& type) { return type["name"] == "Percent"; });
+    ASSERT_NE(found, types.end());
+    EXPECT_EQ(*found, Json::parse(R"({"name": "Percent", "class": "KFChannelPercent",
+        "uuid": "27F3EE8B-2292-11D7-925A-00039389B702", "superclass": "KFChannel", "least": 0.0, "greatest": 1.0})"));
+    EXPECT_NE(runLumenkey({"types"}).out.find("\nAngle "), std::string::npos);
 }
 
 TEST_F(ProgramTest, WorksOnMotionThatItsGeneratorMakes) {

@@ -51,12 +51,14 @@ public:
             "lumenkey VERB --help tells more, with an example.\n"
             "It exits 0 when done, 1 when an input is at fault or an output can't be written, and 2 for "
             "wrong arguments;\ndiff as diff does.");
-        _verbs = {declareInfo(_app),   declareTree(_app),    declareKeys(_app),     declareSample(_app),
-                  declarePlot(_app),   declareGallery(_app), declareConvert(_app),  declareHash(_app),
-                  declareDiff(_app),   declareUpgrade(_app), declareNew(_app),      declareAdd(_app),
-                  declareSet(_app),    declareRemove(_app),  declareSimplify(_app), declareBake(_app),
-                  declareSmooth(_app), declareReverse(_app), declareOffset(_app),   declareScale(_app),
-                  declareRetime(_app)};
+        _verbs = {declareInfo(_app),     declareTree(_app),    declareKeys(_app),    declareSample(_app),
+                  declarePlot(_app),     declareGallery(_app), declareConvert(_app), declareHash(_app),
+                  declareDiff(_app),     declareCheck(_app),   declareUpgrade(_app), declareTypes(_app),
+                  declareNew(_app),      declareAdd(_app),     declareSet(_app),     declareRemove(_app),
+                  declareSimplify(_app), declareBake(_app),    declareSmooth(_app),  declareReverse(_app),
+                  declareOffset(_app),   declareScale(_app),   declareRetime(_app)};
+        _verbs.push_back(declareCompletion(_app, _verbs));
+        _verbs.push_back(declareManual(_app, _verbs));
         for (Verb const& verb : _verbs) {
             _usages[verb.arguments->get_name()] = verb.usage;
             verb.arguments->formatter(std::make_shared<HelpFormatter>(_usages));

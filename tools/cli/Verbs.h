@@ -5,6 +5,7 @@
 
 #include <functional>
 #include <string>
+#include <vector>
 
 namespace CLI {
 class App;
@@ -36,7 +37,13 @@ Verb declareConvert(CLI::App& program);
 
 Verb declareHash(CLI::App& program);
 Verb declareDiff(CLI::App& program);
+Verb declareCheck(CLI::App& program);
 Verb declareUpgrade(CLI::App& program);
+Verb declareTypes(CLI::App& program);
+
+// Those that tell about the program itself; `verbs` are all others, and live as long as the program.
+Verb declareCompletion(CLI::App& program, std::vector<Verb> const& verbs);
+Verb declareManual(CLI::App& program, std::vector<Verb> const& verbs);
 
 // Those that make documents channel by channel: see `AuthorOptions`.
 Verb declareNew(CLI::App& program);

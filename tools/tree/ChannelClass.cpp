@@ -40,10 +40,14 @@ std::string classNameOf(KFChannelBase const& channel) {
 
 std::string shortClassName(std::string_view className) {
     for (std::string_view const prefix : {"KFChannel", "KFChan", "KF"}) {
-        if (className.starts_with(prefix) && className.size() > prefix.size()) {
+        // The class KFChannel itself is a channel.
+        if (className.starts_with(prefix) && className != "KFChannel") {
             className.remove_prefix(prefix.size());
             break;
         }
+    }
+    if (className == "KFChannel") {
+        return "Channel";
     }
     return className == "Base" ? "Base" : withoutEnd(std::string(className), "Base");
 }

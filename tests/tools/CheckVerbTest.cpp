@@ -1,0 +1,102 @@
+// What `lumenkey check` finds in documents.
+
+#include "tests/tools/MotionSamples.h"
+#include "tests/tools/RunProgram.h"
+#include "tests/tools/TestFolder.h"
+
+#include <gtest/gtest.h>
+
+namespace lumenkey::tools {
+namespace {
+
+constexpr char const* kHead =
+    "<kfml version=\"5.13\">\n"
+    "<factory id=\"1\" uuid=\"E7BF3809-2290-11D7-98E5-00039389B702\"/>\n"
+    "<factory id=\"2\" uuid=\"27F3EE8B-2292-11D7-925A-00039389B702\"/><!-- a percentage, 0 to 1 -->\n";
+
+class CheckVerbTest : public ::testing::Test {
+protected:
+    TestFolder const _folder;
+
+    /// Without the file's name in front of each line.
+    std::string findingsIn(std::string const& text) const {
+        std::string const file = _folder.write("f.lumen", text);
+        Outcome const outcome = runLumenkey({"check", file});
+        EXPECT_EQ(outcome.exit, outcome.out.empty() ? 0 : 1);
+        EXPECT_EQ(outcome.err, "");
+        EXPECT_EQ(contentOf(file), text);
+        std::string findings = outcome.out;
+        for (std::size_t at = 0; (at = findings.find(file + ":")) != std::string::npos;) {
+            findings.erase(at, file.size() + 1);
+        }
+        return findings;
+    }
+};
+
+TEST_F(CheckVerbTest, FindsWhatIsOddWithItsPlace) {
+    struct {
+        char const* body;
+        char const* findings;
+    } const cases[] = {
+        {"<parameter id=\"1\" factoryID=\"1\"/>", ""},
+        {"<parameter id=\"1\" factoryID=\"1\">\n <shiny><curve/></shiny>\n</parameter>",
+         "5:2: the element 'shiny' is unknown here: it is passed over\n"},
+        {"<factory id=\"3\" uuid=\"00000000-0000-0000-0000-000000000001\"/>\n<parameter id=\"1\" "
+         "factoryID=\"1\">\n"
+         "<parameter name=\"P\" id=\"4\" factoryID=\"3\"><odd/></parameter></parameter>",
+         "4:1: the class 00000000-0000-0000-0000-000000000001 is unknown: its channels are passed over\n"
+         "6:1: the channel 'P' is of factory 3, which is unknown: it is passed over\n"},
+        {"<parameter id=\"1\" factoryID=\"1\">\n<parameter id=\"4\" factoryID=\"9\"/>\n<parameter "
+         "id=\"5\"/>\n"
+         "<parameter name=\"Q\" id=\"4\" factoryID=\"2\"/></parameter>",
+         "5:1: the channel '' is of factory 9, which isn't listed: it is passed over\n"
+         "6:1: the channel '' names no class: it is passed over\n"
+         "7:1: the channel 'Q' has the ID 4 of one before it: it is read into that one\n"},
+        {"<parameter id=\"1\" "
+         "factoryID=\"2\">\n<foldFlags>1</foldFlags>\n<fadeInCurve>4</fadeInCurve>\n<curve "
+         "type=\"1\" value=\"2\">\n<preExtrapolation>-1</preExtrapolation>\n<keypoint interpolation=\"99\">\n"
+         "<time>1/2</time>\n<value>0.5</value></keypoint>\n<keypoint><time>1/3</time>\n<value>1.5</"
+         "value>\n<bias>"
+         "big</bias></keypoint><max>2</max>\n<keypoint><time>3/4@x</time>\n<value>1.5</value></keypoint>\n"
+         "</curve></parameter>",
+         "5:1: the element 'foldFlags' is none of a channel of the class Percent: it is passed over\n"
+         "6:1: the number 4 is out of the limits of 'fadeInCurve', 0 to 3\n"
+         "7:1: the value 2 is out of the limits of its curve, 0 to 1\n"
+         "8:1: '-1' is no whole number\n"
+         "9:1: the interpolation '99' is unknown: it counts as Bezier\n"
+         "12:11: the keypoint lies before the one in front of it\n"
+         "13:1: the value 1.5 is out of the limits of its curve, 0 to 1\n"
+         "14:1: 'big' is no number\n"
+         "15:11: '3/4@x' is no time\n"},
+        {"<parameter id=\"1\" factoryID=\"1\">\n<flags></wrong>", "5:10: mismatched tag\n"},
+    };
+    for (auto const& each : cases) {
+        EXPECT_EQ(findingsIn(std::string(kHead) + each.body + "</kfml>"), each.findings);
+    }
+    EXPECT_EQ(findingsIn("<kfml/>"), "1:1: the document holds no channel\n");
+    EXPECT_EQ(findingsIn(contentOf(LUMENKEY_TEST_SOURCE_DIR "/tests/persistence/data/version2.lumen")), "");
+}
+
+TEST_F(CheckVerbTest, ChecksManyFilesInTheirOrder) {
+    std::vector<std::string> arguments{"check"};
+    std::string expected;
+    for (int i = 0; i < 24; ++i) {
+        std::string const name = "f" + std::to_string(i) + (i % 3 == 0 ? ".bvh" : ".lumen");
+        bool const isFaulty = i % 4 == 0;
+        std::string const sound(samples::kSmallMotion);
+        std::string const motion = isFaulty ? samples::replaced(sound, "91.5", "high") : sound;
+        std::string const document = isFaulty ? "<kfml>" : "<kfml><parameter/></kfml>";
+        arguments.push_back(_folder.write(name, i % 3 == 0 ? motion : document));
+        if (isFaulty) {
+            expected += arguments.back() +
+                        (i % 3 == 0 ? ":20:3: 'high' is not a number\n" : ":1:7: no element found\n");
+        }
+    }
+    Outcome const outcome = runLumenkey(arguments);
+    EXPECT_EQ(outcome.exit, 1);
+    EXPECT_EQ(outcome.out, expected);
+    EXPECT_EQ(outcome.err, "");
+}
+
+} // namespace
+} // namespace lumenkey::tools

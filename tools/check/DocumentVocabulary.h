@@ -1,0 +1,36 @@
+#pragma once
+
+#include <cstdint>
+#include <optional>
+#include <string_view>
+
+namespace lumenkey::tools {
+
+enum class TextKind { None, Any, Bool, Whole32, Whole64, Number, Time };
+
+/// Whose element it is, as bits.
+enum : unsigned { kOfValues = 1, kOfFolders = 2, kOfRoots = 4, kOfAll = 7 };
+
+/// An element that the library reads.
+struct DocumentWord {
+    std::string_view parent;
+    std::string_view name;
+    TextKind text = TextKind::None;
+    /// Of a whole number.
+    std::uint64_t greatest = UINT64_MAX;
+    /// Of elements of channels: which have it.
+    unsigned classes = kOfAll;
+};
+
+/// Null for an element that is unknown there. The parent of the outermost element has an empty name.
+DocumentWord const* documentWord(std::string_view parent, std::string_view name);
+
+/// Whether a text can be read as its kind; `countsFrames` is for documents below version 5, where times are numbers.
+bool canBeRead(std::string_view text, TextKind kind, bool countsFrames);
+/// What such a text should have been: `a number`, and so on.
+std::string_view nameOfTextKind(TextKind kind);
+
+std::optional<double> readNumber(std::string_view text);
+std::optional<std::uint64_t> readWhole(std::string_view text);
+
+} // namespace lumenkey::tools
