@@ -24,8 +24,7 @@ std::unique_ptr<ChannelTree> treeOfJoints(std::string const& joints) {
 std::string listing(ChannelTree const& tree) {
     std::string text;
     for (ChannelTree::Node node = 0; node < tree.count(); ++node) {
-        text += tree.path(node) + " " + tree.base(node).getName().str() + " " +
-                tree.typeName(node) + "\n";
+        text += tree.path(node) + " " + tree.base(node).getName().str() + " " + tree.typeName(node) + "\n";
     }
     return text;
 }
