@@ -74,6 +74,12 @@ TEST_F(CheckVerbTest, FindsWhatIsOddWithItsPlace) {
         EXPECT_EQ(findingsIn(std::string(kHead) + each.body + "</kfml>"), each.findings);
     }
     EXPECT_EQ(findingsIn("<kfml/>"), "1:1: the document holds no channel\n");
+    EXPECT_EQ(findingsIn("<!DOCTYPE kfml><kfml/>"), "1:15: a document type declaration, which is refused\n");
+    std::string deep = std::string(kHead) + "<parameter id=\"1\" factoryID=\"1\">";
+    for (int i = 0; i < 1'000; ++i) {
+        deep += "<parameter id=\"1\" factoryID=\"1\">";
+    }
+    EXPECT_NE(findingsIn(deep + "</kfml>").find("more than 1000 deep"), std::string::npos);
     EXPECT_EQ(findingsIn(contentOf(LUMENKEY_TEST_SOURCE_DIR "/tests/persistence/data/version2.lumen")), "");
 }
 

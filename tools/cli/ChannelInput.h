@@ -29,6 +29,8 @@ struct InputOptions {
     void addFrameRate(CLI::App& verb);
 };
 
+void addFrameRateOption(CLI::App& verb, std::string& rate);
+
 /// The file that a verb works on, opened as a tree of channels with a progress bar, and the channels that its user
 /// names.
 class ChannelInput {

@@ -1,6 +1,7 @@
 #include "tools/cli/Verbs.h"
 
 #include "tools/cli/ChannelInput.h"
+#include "tools/cli/SeveralFiles.h"
 #include "tools/output/JsonWriter.h"
 #include "tools/output/Table.h"
 #include "tools/output/TextForms.h"
@@ -16,7 +17,8 @@ namespace lumenkey::tools {
 namespace {
 
 struct InfoOptions {
-    InputOptions input;
+    std::vector<std::string> files;
+    std::string frameRate;
     bool json = false;
 };
 
@@ -206,15 +208,25 @@ void writeChannels(ChannelTree const& tree, std::vector<ChannelTree::Node> const
     table.write(out);
 }
 
-void runInfo(InfoOptions const& options, OutputSink& out) {
-    ChannelInput const input(options.input);
+int tellFile(std::string const& file, InfoOptions const& options, OutputSink& out) {
+    ChannelInput const input(InputOptions{file, options.frameRate});
     std::vector<ChannelTree::Node> const channels = input.tree().channelsBelow(ChannelTree::kTop);
     if (options.json) {
         writeJson(input, channels, out);
-        return;
+        return kExitDone;
+    }
+    if (file != options.files.front()) {
+        out.write("\n");
     }
     writeSummary(input, channels, out);
     writeChannels(input.tree(), channels, out);
+    return kExitDone;
+}
+
+int runInfo(InfoOptions const& options, OutputSink& out) {
+    return forSeveralFiles(options.files, out, [&options](std::string const& file, OutputSink& text) {
+        return tellFile(file, options, text);
+    });
 }
 
 } // namespace
@@ -222,11 +234,14 @@ void runInfo(InfoOptions const& options, OutputSink& out) {
 Verb declareInfo(CLI::App& program) {
     auto const options = std::make_shared<InfoOptions>();
     CLI::App* const verb = program.add_subcommand("info", "Tell what a file holds");
-    options->input.add(*verb);
+    verb->add_option("FILE", options->files, kFileHelp)->option_text("...")->required();
+    addFrameRateOption(*verb, options->frameRate);
     verb->add_flag("--json", options->json,
                    "For programs: counts, exact times and the names of the channels");
     verb->footer("Example: lumenkey info walk.bvh");
-    return {verb, "FILE [--frame-rate R] [--json]", [options](OutputSink& out) { runInfo(*options, out); }};
+    Verb declared{verb, "FILE... [--frame-rate R] [--json]", {}};
+    declared.runForExit = [options](OutputSink& out) { return runInfo(*options, out); };
+    return declared;
 }
 
 } // namespace lumenkey::tools
