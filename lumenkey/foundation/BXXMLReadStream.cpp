@@ -38,6 +38,7 @@ public:
 
     BXDocumentReader reader;
     std::uint64_t sizeLimit = kUsualSizeLimit;
+    std::function<void(std::uint64_t)> progress;
     std::optional<BXReadFailure> failure;
 
 private:
@@ -172,6 +173,9 @@ bool BXXMLReadStream::Reading::feed(std::uint64_t* size, bool* isLast) {
         failByParser();
         return false;
     }
+    if (progress) {
+        progress(_fed);
+    }
     return true;
 }
 
@@ -200,6 +204,9 @@ BXXMLReadStream::BXXMLReadStream(BXURL const& url)
 BXXMLReadStream::~BXXMLReadStream() = default;
 
 void BXXMLReadStream::setSizeLimit(std::uint64_t bytes) { _reading->sizeLimit = bytes; }
+void BXXMLReadStream::setProgress(std::function<void(std::uint64_t)> progress) {
+    _reading->progress = std::move(progress);
+}
 bool BXXMLReadStream::parse() { return _reading->parse(); }
 BXReadFailure const* BXXMLReadStream::failure() const {
     return _reading->failure ? &*_reading->failure : nullptr;

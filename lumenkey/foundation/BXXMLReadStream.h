@@ -6,6 +6,7 @@
 #include "lumenkey/foundation/BXURL.h"
 
 #include <cstdint>
+#include <functional>
 #include <memory>
 #include <span>
 #include <string>
@@ -48,6 +49,8 @@ public:
 
     /// A document of more bytes is a failure. 4 GiB unless set.
     void setSizeLimit(std::uint64_t bytes);
+    /// Called with the bytes that have been read, after every block of some 64 KiB.
+    void setProgress(std::function<void(std::uint64_t bytes)> progress);
 
     /// Handlers that are pushed before stand below all others and get the root element; scopes that are pushed before
     /// the first handler hold for the whole document. At the end, after a failure too, all handlers that haven't ended

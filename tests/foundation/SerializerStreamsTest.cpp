@@ -384,6 +384,18 @@ TEST(BXXMLReadStream, TakesTheEncodingsOfXml) {
     EXPECT_EQ(reading("<?xml version='1.0' encoding='ISO-8859-1'?><leaf>\xC4</leaf>"), "( 2'\u00C4' ) ");
 }
 
+TEST(BXXMLReadStream, TellsHowFarItIs) {
+    std::string const text = "<a>" + std::string(200000, ' ') + "</a>";
+    BXData const data(text.begin(), text.end());
+    BXXMLReadStream stream(data);
+    std::vector<std::uint64_t> told;
+    stream.setProgress([&told](std::uint64_t bytes) { told.push_back(bytes); });
+    EXPECT_TRUE(stream.parse());
+    EXPECT_GE(told.size(), 3U);
+    EXPECT_TRUE(std::is_sorted(told.begin(), told.end()));
+    EXPECT_EQ(told.back(), text.size());
+}
+
 TEST(BXXMLReadStream, KeepsItsLimits) {
     auto const nested = [](std::size_t depth) {
         std::string text;

@@ -103,14 +103,14 @@ ChannelFile openChannelFile(std::string const& file, ReadingProgress const& prog
                             std::optional<Tempus> const& frameDuration) {
     Tempus const counted = frameDuration.value_or(defaultFrameDuration());
     if (channelFormatNamed(file) == ChannelFormat::Document) {
-        return openDocument(readDocumentFile(file, counted), file, frameDuration);
+        return openDocument(readDocumentFile(file, counted, progress), file, frameDuration);
     }
     std::string const text = readInputText(file);
     switch (formatOf(text, file)) {
     case ChannelFormat::Csv:
         return openCsv(text, file, progress);
     case ChannelFormat::Document:
-        return openDocument(readDocumentText(text, file, counted), file, frameDuration);
+        return openDocument(readDocumentText(text, file, counted, progress), file, frameDuration);
     default:
         return openMotion(text, file, progress);
     }

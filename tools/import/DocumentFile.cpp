@@ -11,6 +11,7 @@
 
 #include <algorithm>
 #include <charconv>
+#include <filesystem>
 #include <limits>
 #include <numeric>
 #include <span>
@@ -168,6 +169,14 @@ DocumentFile readDocument(BXXMLReadStream& stream, std::string const& file, Temp
     return document;
 }
 
+void tellProgress(BXXMLReadStream& stream, std::uintmax_t size, ReadingProgress const& progress) {
+    if (progress && size > 0) {
+        stream.setProgress([size, progress](std::uint64_t bytes) {
+            progress(std::min(1.0, static_cast<double>(bytes) / static_cast<double>(size)));
+        });
+    }
+}
+
 /// A positive fraction of a second, in lowest terms.
 struct Fraction {
     std::int64_t numerator = 0;
@@ -198,14 +207,19 @@ std::optional<Fraction> commonStep(Fraction const& a, Tempus const& time) {
 
 } // namespace
 
-DocumentFile readDocumentFile(std::string const& file, Tempus const& frameDuration) {
+DocumentFile readDocumentFile(std::string const& file, Tempus const& frameDuration,
+                              ReadingProgress const& progress) {
     BXXMLReadStream stream{BXURL(file)};
+    std::error_code unknown;
+    tellProgress(stream, std::filesystem::file_size(file, unknown), unknown ? ReadingProgress() : progress);
     return readDocument(stream, file, frameDuration);
 }
 
-DocumentFile readDocumentText(std::string_view text, std::string const& file, Tempus const& frameDuration) {
+DocumentFile readDocumentText(std::string_view text, std::string const& file, Tempus const& frameDuration,
+                              ReadingProgress const& progress) {
     BXXMLReadStream stream(
         std::span<std::uint8_t const>(reinterpret_cast<std::uint8_t const*>(text.data()), text.size()));
+    tellProgress(stream, text.size(), progress);
     return readDocument(stream, file, frameDuration);
 }
 

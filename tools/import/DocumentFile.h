@@ -2,6 +2,7 @@
 
 #include "lumenkey/foundation/BXUUID.h"
 #include "tools/import/InputError.h"
+#include "tools/import/InputText.h"
 #include "tools/tree/ChannelTree.h"
 
 #include <cstdint>
@@ -42,10 +43,12 @@ inline Tempus defaultFrameDuration() { return TempusMake(1, 30); }
 /// class, and for anything but one channel.
 ///
 /// Documents below version 5 count frames of `frameDuration`.
-DocumentFile readDocumentFile(std::string const& file, Tempus const& frameDuration);
+DocumentFile readDocumentFile(std::string const& file, Tempus const& frameDuration,
+                              ReadingProgress const& progress = {});
 
 /// The same for the content of a file; `file` is only its name.
-DocumentFile readDocumentText(std::string_view text, std::string const& file, Tempus const& frameDuration);
+DocumentFile readDocumentText(std::string_view text, std::string const& file, Tempus const& frameDuration,
+                              ReadingProgress const& progress = {});
 
 /// Whether a text begins as an XML document does, in any of the encodings that are read.
 bool looksLikeDocument(std::string_view text);
