@@ -28,8 +28,8 @@ struct KFFadeBlock;
 /// a step to a neighbouring keypoint never ends where it began. Doubles are equal within 1e-7.
 ///
 /// A locked channel (bit 2 of its own) ignores every form of setting, removing and moving values, `offsetChannel`,
-/// `scaleChannel`, the limits, the switches of the curve's shape, and the beginning of takes. It obeys `resetToDefault`, `setInitialValue`,
-/// `setDefaultValue`, the info setters, `copy` and `assign`.
+/// `scaleChannel`, the limits, the switches of the curve's shape, and the beginning of takes. It obeys `resetToDefault`,
+/// `setInitialValue`, `setDefaultValue`, the info setters, `copy` and `assign`.
 ///
 /// Threads: values may be read on any number of threads beside one that edits keypoints or the constant of a channel
 /// with a local record. Not beside reads of that channel may run: what exchanges the record, the curve or its root (the
@@ -175,8 +175,8 @@ public:
     /// there is no piece, as in a stretch whose end is before its start, the outputs are the largest and the lowest
     /// finite double. An output may be null; false, with nothing done, if both are.
     ///
-    /// The time grows with the keypoints, but not with the number of cycles of a curve that repeats. The spline's lock is
-    /// held while whole segments are looked at; nobody may edit the curve meanwhile.
+    /// The time grows with the keypoints, but not with the number of cycles of a curve that repeats. The spline's lock
+    /// is held while whole segments are looked at; nobody may edit the curve meanwhile.
     virtual bool getCurrentMinAndMax(Tempus const& from, Tempus const& to, double* minimum, double* maximum);
     virtual unsigned int getNumberOfKeyframes() const;
     /// By handle, in curve time. False on a locked channel.

@@ -64,19 +64,15 @@ KFCurve::~KFCurve() {
 void KFCurve::copyRoots(KFCurve const& other, bool withRecorded) {
     _constantNode = other._constantNode;
     _splineNode = other._splineNode;
-    if (withRecorded && _recordingNode != nullptr && other._recordingNode != nullptr) {
-        // In place: whether this curve plays is its own.
-        *_recordingNode = *other._recordingNode;
-        adoptRoot(other._rootKind);
-        return;
-    }
-    std::unique_ptr<KFRecordingNode> recording;
+    // A take that the other has none of goes last: it may have been what is read.
+    std::unique_ptr<KFRecordingNode> const givenUp =
+        other._recordingNode == nullptr ? std::move(_recordingNode) : nullptr;
     if (other._recordingNode != nullptr) {
-        recording = std::make_unique<KFRecordingNode>(*other._recordingNode, &_splineNode);
+        if (_recordingNode == nullptr)
+            _recordingNode = std::make_unique<KFRecordingNode>(*other._recordingNode, &_splineNode);
         if (withRecorded)
-            *recording = *other._recordingNode;
+            *_recordingNode = *other._recordingNode; // whether this curve plays is its own
     }
-    _recordingNode.swap(recording);
     adoptRoot(other._rootKind);
 }
 

@@ -18,17 +18,19 @@ struct KFCurveParseRecord;
 ///
 /// The root is a constant or a spline of keypoints; `getCurveType` tells 0 from 1. A curve that may be keyframed
 /// usually has the spline root from the start, which answers its constant until the first keypoint. While values are
-/// recorded into it, a recording is the root, which counts as a spline. The chain is the host's; the clamp to the absolute minimum and maximum acts on the final value only, where the maximum wins if the
-/// two cross, and a not-a-number passes.
+/// recorded into it, a recording is the root, which counts as a spline. The chain is the host's; the clamp to the
+/// absolute minimum and maximum acts on the final value only, where the maximum wins if the two cross, and a
+/// not-a-number passes.
 ///
 /// `force` in an edit means: act although the process-wide animate switch is off and the curve has no keypoint. A
 /// curve that is not keyframable refuses also then.
 ///
 /// Threads: a curve has no lock. Reading may run beside one thread that edits keypoints or constants, which the
-/// spline's lock keeps apart, and beside a take, its beginning and its end; creating the first and deleting the last keypoint, switching the root and changing the
-/// chain or the settings record must not run beside anything else, nor comparing curves beside an edit of one. Whether
-/// a handle is valid and what is then done by it are two steps: who reads by handle beside an editing thread knows that
-/// the keypoint stays. Long readers take a `getCurveWorkingCopy`.
+/// spline's lock keeps apart, and beside a take, its beginning and its end. Not beside anything else may run: making the
+/// first keypoint and deleting the last, the first `beginPlayback`, switching the root, and changing the chain or the
+/// settings record; nor comparing curves beside an edit of one. Whether a handle is valid and what is then done by it
+/// are two steps: who reads by handle beside an editing thread knows that the keypoint stays. Long readers take a
+/// `getCurveWorkingCopy`.
 class LUMENKEY_API KFCurve : public KFCurveInterface {
 public:
     /// Kinds of root: the numbers of `_rootKind`.
@@ -50,8 +52,9 @@ public:
     /// The initial value goes to the constant node; the spline node starts at 0. The settings record is null until
     /// `setSplineState`.
     KFCurve(double minimum, double maximum, double initialValue);
-    /// A copy without owner channel, and without what a take has recorded so far. A shared settings record is shared, a local one copied; the processing nodes are
-    /// cloned with `cloneChain`, else the chain is empty (and the flags about it stay as they were).
+    /// A copy without owner channel, and without what a take has recorded so far. A shared settings record is shared, a
+    /// local one copied; the processing nodes are cloned with `cloneChain`, else the chain is empty (and the flags about
+    /// it stay as they were).
     KFCurve(KFCurve const& other, bool cloneChain);
     KFCurve(KFCurve const&) = delete;
     /// Everything but the chain and the owner channel. With a chain of its own the curve also keeps the flags about it.

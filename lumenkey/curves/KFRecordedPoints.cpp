@@ -14,8 +14,23 @@ void KFRecordedPoints::clear() noexcept {
     _lowestBefore = std::numeric_limits<double>::max();
 }
 
-void KFRecordedPoints::append(Tempus const& time, double value) {
-    _points.push_back({time, value});
+void KFRecordedPoints::append(Point const& point) {
+    _points.push_back(point);
+    settle();
+}
+
+void KFRecordedPoints::append(Point const& head, Point const& point, Point const& tail) {
+    _points.insert(_points.end(), {head, point, tail});
+    settle();
+}
+
+void KFRecordedPoints::replaceLast(Point const& point, Point const& tail) {
+    _points.push_back(tail);
+    _points[_points.size() - 2] = point;
+    settle();
+}
+
+void KFRecordedPoints::settle() noexcept {
     if (_points.size() <= kStillOpen)
         return;
     double const settled = _points[_points.size() - kStillOpen - 1].value;

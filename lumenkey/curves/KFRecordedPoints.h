@@ -27,7 +27,11 @@ public:
     bool operator==(KFRecordedPoints const& other) const { return _points == other._points; }
 
     void clear() noexcept;
-    void append(Tempus const& time, double value);
+    // Each adds all of its points or, for want of memory, none.
+    void append(Point const& point);
+    void append(Point const& head, Point const& point, Point const& tail);
+    /// In the place of the last one.
+    void replaceLast(Point const& point, Point const& tail);
     /// Of one of the last two.
     void setValue(std::size_t index, double value) noexcept { _points[index].value = value; }
     /// The extremes stay those of all that was there.
@@ -43,6 +47,9 @@ public:
     static double between(Point const& from, Point const& to, Tempus const& t) noexcept;
 
 private:
+    /// The point that is none of the last two any more enters the extremes.
+    void settle() noexcept;
+
     std::deque<Point> _points;
     double _highestBefore = -std::numeric_limits<double>::max();
     double _lowestBefore = std::numeric_limits<double>::max();

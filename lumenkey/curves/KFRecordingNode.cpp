@@ -211,18 +211,14 @@ void KFRecordingNode::record(Tempus const& t, double value) {
 }
 
 void KFRecordingNode::recordBehind(Tempus const& t, double value) {
-    if (hasGuards()) {
-        if (_points->empty()) {
-            Tempus const head = t - _resolution;
-            _points->append(head, splineValue(head));
-        } else {
-            _points->removeLast();
-        }
-    }
-    _points->append(t, value);
-    if (hasGuards()) {
-        Tempus const tail = t + _resolution;
-        _points->append(tail, splineValue(tail));
+    KFRecordedPoints::Point const point{t, value};
+    auto const guardAt = [this](Tempus const& u) { return KFRecordedPoints::Point{u, splineValue(u)}; };
+    if (!hasGuards()) {
+        _points->append(point);
+    } else if (_points->empty()) {
+        _points->append(guardAt(t - _resolution), point, guardAt(t + _resolution));
+    } else {
+        _points->replaceLast(point, guardAt(t + _resolution));
     }
     _lastValue = value;
 }

@@ -7,7 +7,6 @@
 #include <memory>
 
 class KFRecordedPoints;
-class KFSpline;
 class KFSplineNode;
 
 /// How the values of a take stand beside the keypoints around them, and when they become keypoints.
