@@ -35,6 +35,16 @@ public:
         endRecording(at(t));
         endPlayback(at(t));
     }
+    double highest() {
+        double value = 0;
+        getCurrentMaxValueV(&value, false);
+        return value;
+    }
+    double lowest() {
+        double value = 0;
+        getCurrentMinValueV(&value, false);
+        return value;
+    }
     /// `time value` of each keypoint, the linear ones' type left out.
     std::string keypoints() {
         std::ostringstream text;
@@ -111,12 +121,8 @@ TEST(Recording, GuardsATakeAndCommitsByItsScope) {
         EXPECT_EQ(curve.value(2.75), 2.75);
         EXPECT_EQ(curve.value(5.25), 3.25) << "half way to the guard at 5.5";
         EXPECT_EQ(curve.value(7), 7);
-        double highest = 0;
-        double lowest = 0;
-        curve.getCurrentMaxValueV(&highest, false);
-        curve.getCurrentMinValueV(&lowest, false);
-        EXPECT_EQ(highest, 10);
-        EXPECT_EQ(lowest, 0);
+        EXPECT_EQ(curve.highest(), 10);
+        EXPECT_EQ(curve.lowest(), 0);
         curve.endRecording(at(5.5));
         EXPECT_EQ(curve.keypoints(), c.afterRecording) << c.scope;
         EXPECT_FALSE(curve.isRecording());
@@ -137,18 +143,13 @@ TEST(Recording, HoldsTheStartAndTheLastValueAndKeepsTheExtremes) {
     curve.set(6, 60);
     for (double t = 7; t < 9; t += 0.5)
         curve.set(t, 5);
-    double highest = 0;
-    double lowest = 0;
-    curve.getCurrentMaxValueV(&highest, false);
-    curve.getCurrentMinValueV(&lowest, false);
-    EXPECT_EQ(highest, 60);
-    EXPECT_EQ(lowest, -50);
+    EXPECT_EQ(curve.highest(), 60);
+    EXPECT_EQ(curve.lowest(), -50);
     curve.endRecording(at(9));
 
     // Begun anew before it became keypoints.
     curve.begin(3, kKFRecordingScopeJoin);
-    curve.getCurrentMinValueV(&lowest, false);
-    EXPECT_EQ(lowest, 0);
+    EXPECT_EQ(curve.lowest(), 0);
     curve.end(4);
     EXPECT_EQ(curve.keypoints(), kOld);
 }
@@ -172,9 +173,7 @@ TEST(Recording, LeavesTheKeypointsOfATakeThatIsDropped) {
         curve.set(3, 50);
         curve.set(5, -50);
         EXPECT_EQ(curve.value(5), -50);
-        double lowest = 0;
-        curve.getCurrentMinValueV(&lowest, false);
-        EXPECT_EQ(lowest, -50);
+        EXPECT_EQ(curve.lowest(), -50);
         curve.end(7);
         EXPECT_EQ(curve.keypoints(), kOld) << scope;
         EXPECT_EQ(curve.value(5), 5);
@@ -196,8 +195,7 @@ TEST(Recording, TakesOverlapAndReachBeyondTheKeypoints) {
     curve.end(12);
     curve.begin(5, kKFRecordingScopeJoin); // empty
     curve.end(6);
-    std::uint32_t const count = curve.getNumberOfKeypoints();
-    EXPECT_EQ(count, 3U);
+    EXPECT_EQ(curve.getNumberOfKeypoints(), 3U);
     EXPECT_EQ(curve.value(-3), 7);
     EXPECT_EQ(curve.value(0), 1);
     EXPECT_EQ(curve.value(12), 1);
