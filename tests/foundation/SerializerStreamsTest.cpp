@@ -117,7 +117,7 @@ constexpr std::string_view kDeclaration = "<?xml version=\"1.0\" encoding=\"UTF-
 
 } // namespace
 
-// Writing -------------------------------------------------------------------------------------------------------------
+// Writing ---------------------------------------------------------------------------------------------------
 
 TEST(BXXMLWriteStream, WritesLinesAndAttributesInOrder) {
     std::string const text = written([](BXXMLWriteStream& stream) {
@@ -208,7 +208,7 @@ TEST(BXXMLWriteStream, RemembersThatTheSinkRefused) {
     }
 }
 
-// Reading -------------------------------------------------------------------------------------------------------------
+// Reading ---------------------------------------------------------------------------------------------------
 
 TEST(BXXMLReadStream, HandsOverContainersFirstAndLeavesAtTheirEnd) {
     EXPECT_EQ(reading("<kfml version='5.13'>\n"
@@ -474,7 +474,7 @@ TEST(BXXMLReadStream, ReadsFilesBlockByBlock) {
     std::remove(path.c_str());
 }
 
-// Digests -------------------------------------------------------------------------------------------------------------
+// Digests ---------------------------------------------------------------------------------------------------
 
 template <typename... Value> std::array<std::uint8_t, 16> hashOf(Value const&... values) {
     BXHashWriteStream stream;
@@ -502,7 +502,8 @@ TEST(BXHashWriteStream, TellsNeighboursApart) {
         hashOf(BXUUID{{1, 0, 0, 0}}),
         hashOf(BXUUID{{0, 0, 0, 1}}),
     };
-    // Elements with attributes inside each other and beside each other; a scope around it tells what lies inside.
+    // Elements with attributes inside each other and beside each other; a scope around it tells what lies
+    // inside.
     for (bool const isInside : {false, true}) {
         BXHashWriteStream stream;
         EXPECT_TRUE(stream.isHashStream());
@@ -545,7 +546,8 @@ TEST(BXHashWriteStream, TakesEndsWithoutStarts) {
 }
 
 TEST(BXHashWriteStream, DoesNotDependOnHowBytesAreCut) {
-    // Asking in between cuts the input elsewhere; strings around the size of its block are what could go wrong.
+    // Asking in between cuts the input elsewhere; strings around the size of its block are what could go
+    // wrong.
     BXHashWriteStream whole;
     BXHashWriteStream cut;
     for (std::size_t size = 0; size < 3000; size += 7) {

@@ -47,8 +47,8 @@ void readEverything(KFChannelFolder& folder) {
     });
 }
 
-/// Where a minimum is above its maximum, a value below both is clamped to the one, and that to the other, and so each
-/// writing gives another. Infinite limits are none to a reader, and may come to lie so.
+/// Where a minimum is above its maximum, a value below both is clamped to the one, and that to the other, and
+/// so each writing gives another. Infinite limits are none to a reader, and may come to lie so.
 void uncrossLimits(KFChannelFolder& folder) {
     forEachValue(folder, [](KFChannel& channel) {
         KFCurve& curve = *channel.getCurveInterface();

@@ -1,5 +1,5 @@
-// Documents by someone who means ill: each is refused at a line, a column and for a reason, or read as its text says,
-// and the tree that was being read into goes on working.
+// Documents by someone who means ill: each is refused at a line, a column and for a reason, or read as its
+// text says, and the tree that was being read into goes on working.
 
 #include "tests/persistence/Victim.h"
 

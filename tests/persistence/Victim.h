@@ -30,7 +30,8 @@ struct Victim {
     std::string read(Bytes document);
     std::string read(std::string const& document);
 
-    /// Reads, edits, writes and digests whatever the tree has become, and makes it good again by a good document.
+    /// Reads, edits, writes and digests whatever the tree has become, and makes it good again by a good
+    /// document.
     void expectUsable();
 };
 

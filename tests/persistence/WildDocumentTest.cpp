@@ -1,5 +1,5 @@
-// Documents that are well-formed and full of what nothing should hold: times and numbers that are none, curves that
-// run backwards.
+// Documents that are well-formed and full of what nothing should hold: times and numbers that are none,
+// curves that run backwards.
 
 #include "lumenkey/curves/KFCurve.h"
 #include "tests/persistence/Victim.h"
