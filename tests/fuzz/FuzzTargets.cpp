@@ -13,6 +13,8 @@
 #include <cstdlib>
 #include <limits>
 
+using namespace lumenkey::tools;
+
 namespace {
 
 void require(bool holds, char const* what) {
@@ -63,6 +65,15 @@ void uncrossLimits(KFChannelFolder& folder) {
     });
 }
 
+/// Most inputs are refused.
+template <class Read> void orRefused(Read const& read) {
+    try {
+        read();
+    } catch (InputError const&) {
+        return;
+    }
+}
+
 } // namespace
 
 void fuzzDocument(FuzzBytes bytes) {
@@ -101,19 +112,11 @@ void fuzzState(FuzzBytes bytes) {
 }
 
 void fuzzMotion(FuzzBytes bytes) {
-    try {
-        lumenkey::tools::treeOfMotion(lumenkey::tools::readMotionText(textOf(bytes), "fuzz.bvh"));
-    } catch (lumenkey::tools::InputError const&) {
-        // Refused, as most inputs are.
-    }
+    orRefused([&] { treeOfMotion(readMotionText(textOf(bytes), "fuzz.bvh")); });
 }
 
 void fuzzCsv(FuzzBytes bytes) {
-    try {
-        lumenkey::tools::treeOfCsv(lumenkey::tools::readCsvText(textOf(bytes), "fuzz.csv"));
-    } catch (lumenkey::tools::InputError const&) {
-        // Refused, as most inputs are.
-    }
+    orRefused([&] { treeOfCsv(readCsvText(textOf(bytes), "fuzz.csv")); });
 }
 
 void fuzzPath(FuzzBytes bytes) {
