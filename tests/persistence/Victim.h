@@ -37,4 +37,5 @@ struct Victim {
 
 /// The most memory that this process has had since `forgetPeak`, in MiB.
 std::size_t peakMiB();
-void forgetPeak();
+/// Answers what the process has now.
+std::size_t forgetPeak();

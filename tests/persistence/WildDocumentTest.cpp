@@ -66,8 +66,7 @@ TEST(WildDocument, HoldsNumbersThatAreNone) {
                     number + "</min>" + one + keypointElement("2/1", "5", handles),
                 "type='1' value='" + number + "' default='" + number + "'");
             Victim victim;
-            forgetPeak();
-            std::size_t const before = peakMiB();
+            std::size_t const before = forgetPeak();
             EXPECT_EQ(victim.read(document), "");
             EXPECT_LT(peakMiB() - before, 16U) << "what a document only promises takes no memory";
             victim.expectUsable();
