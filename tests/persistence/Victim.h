@@ -10,7 +10,9 @@
 
 using Bytes = std::span<std::uint8_t const>;
 
-/// Around the children of the node that a document is for; folders are class 1, doubles 2.
+/// The start of a document: folders are class 1, doubles 2.
+extern std::string const kDocumentFactories;
+/// Around the children of the node that it is for.
 extern std::string const kDocumentHead;
 extern std::string const kDocumentTail;
 
