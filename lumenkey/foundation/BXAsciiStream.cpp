@@ -1,5 +1,7 @@
 #include "lumenkey/foundation/BXAsciiStream.h"
 
+#include "lumenkey/foundation/BXTextForms.h"
+
 #include <algorithm>
 #include <array>
 #include <cstring>
@@ -18,8 +20,6 @@ constexpr std::array<std::uint8_t, 256> kValues = [] {
         values[static_cast<std::uint8_t>(kDigits[i])] = static_cast<std::uint8_t>(i);
     return values;
 }();
-
-constexpr bool isSpace(char c) { return c == ' ' || c == '\t' || c == '\n' || c == '\r'; }
 
 } // namespace
 
@@ -71,7 +71,7 @@ bool BXAsciiStream::decode(std::string_view text) {
     std::size_t digits = 0;
     std::size_t padding = 0;
     for (char const c : text) {
-        if (isSpace(c))
+        if (BXText::isSpace(c))
             continue;
         std::uint8_t const value = kValues[static_cast<std::uint8_t>(c)];
         bool const isPadding = c == '=' && digits >= 2;

@@ -9,7 +9,8 @@
 #include <string>
 #include <string_view>
 
-/// Bytes as text of letters, digits, "+", "/" and "=" (Base64, RFC 4648), for what documents hold as text, and back.
+/// Bytes as text of letters, digits, "+", "/" and "=" (Base64, RFC 4648), for what documents hold as text,
+/// and back.
 ///
 ///     BXAsciiStream out;                       BXAsciiStream in;
 ///     out.write(bytes, size);                  if (in.open(text)) {
@@ -17,18 +18,18 @@
 ///     text = out.getString();                      in.close();
 ///                                              }
 ///
-/// Four characters stand for three bytes, so the bytes are never more than the characters. One object belongs to one
-/// thread at a time, and does one of the two at a time.
+/// Four characters stand for three bytes, so the bytes are never more than the characters. One object belongs
+/// to one thread at a time, and does one of the two at a time.
 class LUMENKEY_API BXAsciiStream final : public BXStream {
 public:
-    /// Adds bytes to the text. False, with nothing added, once it is closed and while a text is open, and for want of
-    /// memory.
+    /// Adds bytes to the text. False, with nothing added, once it is closed and while a text is open, and for
+    /// want of memory.
     bool write(void const* bytes, std::size_t size) override;
     /// The text of all that was written, whole once the stream is closed.
     BXString getString() const;
 
-    /// Begins to read a text; what was written before is gone. False, with nothing to read, for a text that no writer
-    /// gives. White space doesn't count.
+    /// Begins to read a text; what was written before is gone. False, with nothing to read, for a text that
+    /// no writer gives. White space doesn't count.
     bool open(BXString const& text);
     /// How many of the next bytes were written at `out`: fewer than `size` only at the end.
     std::size_t read(void* out, std::size_t size);

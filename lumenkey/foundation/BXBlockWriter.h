@@ -8,8 +8,8 @@
 #include <memory>
 #include <string_view>
 
-/// Gathers text for a sink that is called for every 32 KiB. The first refusal of the sink is remembered, and nothing
-/// more is given to it.
+/// Gathers text for a sink that is called for every 32 KiB. The first refusal of the sink is remembered, and
+/// nothing more is given to it.
 class BXBlockWriter {
 public:
     explicit BXBlockWriter(BXStream& sink) : _sink(sink), _block(std::make_unique<char[]>(kBlock)) {}

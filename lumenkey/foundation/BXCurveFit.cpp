@@ -10,15 +10,16 @@ using Point = BXVector2<double>;
 
 /// Improvements of the parameters tried on a piece before it is cut (Schneider's number).
 constexpr int kImprovementLimit = 4;
-/// A piece farther off than this many tolerances is cut at once: improving it seldom helps (Schneider's number).
+/// A piece farther off than this many tolerances is cut at once: improving it seldom helps (Schneider's
+/// number).
 constexpr double kHopelessFactor = 4.0;
-/// Ordered points: the part of a piece's x range that a handle may take. Below 1, x keeps rising along the piece by
-/// a good measure, and the y at a given x is well defined.
+/// Ordered points: the part of a piece's x range that a handle may take. Below 1, x keeps rising along the
+/// piece by a good measure, and the y at a given x is well defined.
 constexpr double kLongestHandle = 0.95;
 /// Cuts at the worst point may shave off one point at a time; below this depth they halve.
 constexpr int kWorstPointDepth = 32;
-/// Stretches of more points than the second are first looked at through the first number of their points: far too long
-/// ones, as most are at the beginning of a long row, so cost little. Tuned.
+/// Stretches of more points than the second are first looked at through the first number of their points: far
+/// too long ones, as most are at the beginning of a long row, so cost little. Tuned.
 constexpr std::size_t kProbePoints = 64;
 constexpr std::size_t kLongestUnprobed = 256;
 /// A least-squares handle below this part of the chord is degenerate (Schneider's number).
@@ -88,7 +89,8 @@ private:
         return s.depth < kWorstPointDepth ? worst : s.first + (s.last - s.first) / 2;
     }
 
-    /// Whether a long stretch is so far from its piece, by a few of its points, that it must be cut at `cutAt`.
+    /// Whether a long stretch is so far from its piece, by a few of its points, that it must be cut at
+    /// `cutAt`.
     bool isHopeless(Stretch const& s, std::size_t& cutAt) const {
         std::size_t const length = s.last - s.first;
         if (length <= kLongestUnprobed) {
@@ -184,9 +186,9 @@ private:
         return withHandles(s, (x0 * c11 - x1 * c01) / determinant, (c00 * x1 - c01 * x0) / determinant);
     }
 
-    /// The piece with handles of these lengths; if one of them is degenerate both take a third of the chord. So is
-    /// a handle longer than the way along the points: least squares of few points may send the curve far out and
-    /// back between two of them.
+    /// The piece with handles of these lengths; if one of them is degenerate both take a third of the chord.
+    /// So is a handle longer than the way along the points: least squares of few points may send the curve
+    /// far out and back between two of them.
     Cubic withHandles(Stretch const& s, double leaving, double entering) const noexcept {
         Point const& from = _points[s.first];
         Point const& to = _points[s.last];
@@ -210,7 +212,8 @@ private:
         return piece;
     }
 
-    /// How far the piece misses the points between its ends. Ordered points first get the parameters of their x.
+    /// How far the piece misses the points between its ends. Ordered points first get the parameters of their
+    /// x.
     Deviation measure(Stretch const& s, Cubic const& piece) noexcept {
         Deviation worst{0.0, s.first + (s.last - s.first) / 2};
         // From the piece's own start: far along x, rounding would keep the search from coming to an end.
@@ -232,7 +235,8 @@ private:
         return worst;
     }
 
-    /// One step of Newton-Raphson toward the nearest place of the piece. Ordered points have their places already.
+    /// One step of Newton-Raphson toward the nearest place of the piece. Ordered points have their places
+    /// already.
     void improveParameters(Stretch const& s, Cubic const& piece) noexcept {
         if (_ordered) {
             return;

@@ -4,7 +4,7 @@
 
 #include <algorithm>
 
-// What handlers ask for -------------------------------------------------------------------------------------------
+// What handlers ask for -------------------------------------------------------------------------------------
 
 void BXDocumentReader::pushScope(BXScope const* scope) {
     if (scope != nullptr) {
@@ -60,7 +60,7 @@ void BXDocumentReader::numberAttributes() const {
     }
 }
 
-// What the parser brings ------------------------------------------------------------------------------------------
+// What the parser brings ------------------------------------------------------------------------------------
 
 void BXDocumentReader::start(char const* name, char const* const* attributes) {
     if (!_problem.empty()) {

@@ -15,13 +15,13 @@ class BXSerializer;
 /// Between a parser and the handlers: takes starts, texts and ends, and hands over elements by the rules of
 /// `BXSerializerReadStream`. It is itself the one element that is being handed over.
 ///
-/// Once there is a problem nothing is taken any more. Nothing recurses on the depth of a document, and buffers are
-/// reused, so that nothing is allocated for an element once they have grown.
+/// Once there is a problem nothing is taken any more. Nothing recurses on the depth of a document, and
+/// buffers are reused, so that nothing is allocated for an element once they have grown.
 class BXDocumentReader final : public BXStreamElement {
 public:
     static constexpr std::uint32_t kGreatestDepth = 1000;
-    /// Of an element that something is made for. What that will write inside of such an element, which may be more
-    /// than it has read, must not be too deep to be read again.
+    /// Of an element that something is made for. What that will write inside of such an element, which may be
+    /// more than it has read, must not be too deep to be read again.
     static constexpr std::uint32_t kGreatestDepthOfNodes = kGreatestDepth - 10;
     static constexpr std::size_t kLongestText = std::size_t{64} << 20;
 

@@ -38,8 +38,8 @@ struct FreeState {
 
 } // namespace
 
-/// Numbers are gathered, low byte first, and go into the hash a kilobyte at a time: the digest is that of the bytes,
-/// however they are cut.
+/// Numbers are gathered, low byte first, and go into the hash a kilobyte at a time: the digest is that of the
+/// bytes, however they are cut.
 class BXHashWriteStream::Digest {
 public:
     Digest() : _state(XXH3_createState()) {

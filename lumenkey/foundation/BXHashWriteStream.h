@@ -7,14 +7,15 @@
 #include <cstdint>
 #include <memory>
 
-/// Makes a digest of all that is written, in constant memory and without a text: the 128-bit XXH3 of the calls, by
-/// kind, tag and value, in one order of bytes, so that it is the same on every machine. It tells states apart; it isn't
-/// proof against forgery.
+/// Makes a digest of all that is written, in constant memory and without a text: the 128-bit XXH3 of the
+/// calls, by kind, tag and value, in one order of bytes, so that it is the same on every machine. It tells
+/// states apart; it isn't proof against forgery.
 ///
-/// Calls that differ in a tag, in the type or in a bit of a value give another input: "ab" and "c" aren't "a" and "bc",
-/// a 32-bit 1 isn't a 64-bit one, 0.0 isn't -0.0. What lies inside what is told by how many scopes are in force when an
-/// element starts, since everything that writes children pushes its scope around them. So the end of an element gives
-/// nothing, and one that never started leaves no trace. Names and line ends don't enter.
+/// Calls that differ in a tag, in the type or in a bit of a value give another input: "ab" and "c" aren't "a"
+/// and "bc", a 32-bit 1 isn't a 64-bit one, 0.0 isn't -0.0. What lies inside what is told by how many scopes
+/// are in force when an element starts, since everything that writes children pushes its scope around them.
+/// So the end of an element gives nothing, and one that never started leaves no trace. Names and line ends
+/// don't enter.
 ///
 /// One object belongs to one thread at a time.
 class LUMENKEY_API BXHashWriteStream final : public BXSerializerWriteStream {

@@ -94,20 +94,24 @@ BXScopeStates::Name BXScopeStates::intern(std::string_view text) {
         return known;
     }
     _names.push_back(text);
-    growSlots();
-    return static_cast<Name>(_names.size() - 1);
+    Name const added = static_cast<Name>(_names.size() - 1);
+    if (_names.size() * 2 > _slots.size()) {
+        _slots.assign(_slots.size() * 2, 0);
+        for (Name name = 1; name < added; ++name) {
+            takeSlot(name);
+        }
+    }
+    takeSlot(added);
+    return added;
 }
 
-void BXScopeStates::growSlots() {
-    std::size_t const size = _names.size() * 2 > _slots.size() ? _slots.size() * 2 : _slots.size();
-    _slots.assign(size, 0);
-    for (Name name = 1; name < _names.size(); ++name) {
-        std::size_t slot = hashOf(_names[name]) & (size - 1);
-        while (_slots[slot] != 0) {
-            slot = (slot + 1) & (size - 1);
-        }
-        _slots[slot] = name;
+void BXScopeStates::takeSlot(Name name) {
+    std::size_t const mask = _slots.size() - 1;
+    std::size_t slot = hashOf(_names[name]) & mask;
+    while (_slots[slot] != 0) {
+        slot = (slot + 1) & mask;
     }
+    _slots[slot] = name;
 }
 
 bool BXScopeStates::elementTag(State state, Name name, std::uint32_t* tag) const noexcept {

@@ -9,10 +9,10 @@
 
 /// What names mean under the scopes in force while a document is read.
 ///
-/// The scopes in force are a state, a small number. Of a table that is pushed twice only the last push matters, since
-/// it is asked first and knows the same, so a state is a row of different tables: however deep folders lie in each
-/// other, a reading goes through a handful of states. Each is made once, with all its names resolved; from then on an
-/// element costs one look-up in a table of hashes and one in an array.
+/// The scopes in force are a state, a small number. Of a table that is pushed twice only the last push
+/// matters, since it is asked first and knows the same, so a state is a row of different tables: however deep
+/// folders lie in each other, a reading goes through a handful of states. Each is made once, with all its
+/// names resolved; from then on an element costs one look-up in a table of hashes and one in an array.
 class BXScopeStates {
 public:
     using State = std::uint32_t;
@@ -42,7 +42,8 @@ private:
     struct Meaning {
         std::uint32_t elementTag = 0;
         bool isElement = false;
-        /// One above the place of the first of its meanings as an attribute, which are linked, innermost first.
+        /// One above the place of the first of its meanings as an attribute, which are linked, innermost
+        /// first.
         std::uint32_t firstAttribute = 0;
     };
     struct Push {
@@ -60,7 +61,7 @@ private:
     State make(std::vector<BXScope const*> scopes);
     static void addMeaning(Content& content, Name name, std::uint64_t word);
     Name intern(std::string_view text);
-    void growSlots();
+    void takeSlot(Name name);
 
     std::vector<Content> _states;
     /// By number; the texts are those of the scopes.

@@ -11,8 +11,9 @@
 
 class BXSerializer;
 
-/// A row of a table that gives the names of a document their numbers: the low half of the word is the tag of an
-/// element, the high half, if not zero, the tag of an attribute of that element. A null name ends the table.
+/// A row of a table that gives the names of a document their numbers: the low half of the word is the tag of
+/// an element, the high half, if not zero, the tag of an attribute of that element. A null name ends the
+/// table.
 struct BXScope {
     char const* name;
     std::uint64_t word;
@@ -24,8 +25,8 @@ struct BXScope {
     static constexpr BXScope end() noexcept { return {nullptr, 0}; }
 };
 
-/// Takes a document as elements, attributes and values. Tags have the names that the scopes in force give them, the one
-/// that was pushed last first. All attributes of an element are written before its content.
+/// Takes a document as elements, attributes and values. Tags have the names that the scopes in force give
+/// them, the one that was pushed last first. All attributes of an element are written before its content.
 class LUMENKEY_API BXSerializerWriteStream {
 public:
     virtual ~BXSerializerWriteStream();
@@ -59,9 +60,10 @@ public:
 
 /// An element that is being read: its tag, its attributes and, where it holds no element, its text.
 ///
-/// Each reading is false, with the output as it was, for what isn't there and for a text that isn't wholly of the kind.
-/// The output may not be null. Spaces around numbers, bools, times and UUIDs don't count. Readings of 32 bits give the
-/// low half of any number that 64 bits hold. An element with children has no text; one that is empty has an empty one.
+/// Each reading is false, with the output as it was, for what isn't there and for a text that isn't wholly of
+/// the kind. The output may not be null. Spaces around numbers, bools, times and UUIDs don't count. Readings
+/// of 32 bits give the low half of any number that 64 bits hold. An element with children has no text; one
+/// that is empty has an empty one.
 ///
 /// Valid as long as the handler that it is given to works on it.
 class LUMENKEY_API BXStreamElement {
@@ -88,7 +90,8 @@ public:
     /// A new one, which the caller frees; null where there is none.
     BXUUID* getAttributeAsUUID(std::uint32_t tag) const;
 
-    /// The text as it stands in the document, entities resolved, if the element has one. Valid until the next call.
+    /// The text as it stands in the document, entities resolved, if the element has one. Valid until the next
+    /// call.
     virtual std::optional<std::string_view> text() const = 0;
     /// Of the attribute with that tag in the scopes in force now.
     virtual std::optional<std::string_view> attributeText(std::uint32_t tag) const = 0;
@@ -96,24 +99,27 @@ public:
 
 /// Gives a document to handlers, element by element.
 ///
-/// The handler on top of a stack gets the elements (`parseElement`). One that is pushed while it gets an element gets
-/// all that follow, until that element closes; its `parseBegin` is called by the push, its `parseEnd` when the element
-/// closes. The element that caused the push isn't passed to it. Scopes pushed by a handler end with it. Names are
-/// looked up from the scope that was pushed last to the first; an element without a name there is passed over whole.
+/// The handler on top of a stack gets the elements (`parseElement`). One that is pushed while it gets an
+/// element gets all that follow, until that element closes; its `parseBegin` is called by the push, its
+/// `parseEnd` when the element closes. The element that caused the push isn't passed to it. Scopes pushed by
+/// a handler end with it. Names are looked up from the scope that was pushed last to the first; an element
+/// without a name there is passed over whole.
 ///
 /// A container is handed over before its first child, with all attributes and no text; a leaf when it ends.
 class LUMENKEY_API BXSerializerReadStream {
 public:
     virtual ~BXSerializerReadStream();
 
-    /// The table isn't owned; it must outlive the stream, which remembers names and tags by it, and not change.
+    /// The table isn't owned; it must outlive the stream, which remembers names and tags by it, and not
+    /// change.
     virtual void pushScope(BXScope const* scope) = 0;
-    /// Not owned; must outlive the element. Null does nothing, and so does a push out of a handler's `parseEnd`.
+    /// Not owned; must outlive the element. Null does nothing, and so does a push out of a handler's
+    /// `parseEnd`.
     virtual void pushHandler(BXSerializer* handler) = 0;
     /// Passes over all that is inside the element that is handed over now.
     virtual void skipElement() = 0;
-    /// Whether something may be made for the element that is handed over now, such as a child of a folder; handlers
-    /// ask before they make it. If the element lies too deep for that, the reading fails. Here true.
+    /// Whether something may be made for the element that is handed over now, such as a child of a folder;
+    /// handlers ask before they make it. If the element lies too deep for that, the reading fails. Here true.
     virtual bool allowsNode();
 
     // The same questions of an element, asked through the stream.
@@ -142,7 +148,8 @@ public:
         return element.getAttributeAsUUID(tag);
     }
 
-    /// The version of the document; a handler sets it as soon as it is read. Until then that of new documents.
+    /// The version of the document; a handler sets it as soon as it is read. Until then that of new
+    /// documents.
     std::uint32_t major = 5;
     std::uint32_t minor = 13;
     // For documents below version 5, whose times are frames. Set by who opens the stream.

@@ -26,13 +26,11 @@ template <typename Number> char* digits(char* out, Number value) {
     return std::to_chars(out, out + BXText::kLongest, value).ptr;
 }
 
-constexpr bool isSpace(char c) { return c == ' ' || c == '\t' || c == '\n' || c == '\r'; }
-
 std::string_view trimmed(std::string_view text) {
-    while (!text.empty() && isSpace(text.front())) {
+    while (!text.empty() && BXText::isSpace(text.front())) {
         text.remove_prefix(1);
     }
-    while (!text.empty() && isSpace(text.back())) {
+    while (!text.empty() && BXText::isSpace(text.back())) {
         text.remove_suffix(1);
     }
     return text;

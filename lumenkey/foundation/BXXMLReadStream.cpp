@@ -49,8 +49,8 @@ private:
     void failHere(std::string reason);
     void failByParser();
 
-    /// Does what a callback is for, and stops the parser if that gives a problem, which is noted at once: a stopped
-    /// parser has already gone on. Nothing may be thrown through the parser, which is written in C.
+    /// Does what a callback is for, and stops the parser if that gives a problem, which is noted at once: a
+    /// stopped parser has already gone on. Nothing may be thrown through the parser, which is written in C.
     template <typename Call> void guarded(Call const& call) noexcept {
         try {
             call();
@@ -136,8 +136,8 @@ void BXXMLReadStream::Reading::run() {
     std::uint64_t block = kBlock;
     bool isLast = false;
     while (!isLast && feed(&block, &isLast)) {
-        // The parser begins a token that a block cuts off anew with the next one. Blocks as long as what is left over
-        // keep that linear, and none reaches past the longest token.
+        // The parser begins a token that a block cuts off anew with the next one. Blocks as long as what is
+        // left over keep that linear, and none reaches past the longest token.
         XML_Index const done = XML_GetCurrentByteIndex(_parser.get());
         std::uint64_t const left = done < 0 ? 0 : _fed - std::min(_fed, static_cast<std::uint64_t>(done));
         if (left >= kLongestToken) {

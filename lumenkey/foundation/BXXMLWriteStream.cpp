@@ -176,7 +176,8 @@ void BXXMLWriteStream::Writer::endStartTag() {
     }
 }
 
-/// For depths up to `kFastDepth`: a line feed and the indentation, all of it in stores of a whole row of spaces.
+/// For depths up to `kFastDepth`: a line feed and the indentation, all of it in stores of a whole row of
+/// spaces.
 char* BXXMLWriteStream::Writer::indented(char* room) const noexcept {
     *room++ = '\n';
     std::size_t const width = 2 * _open.size();

@@ -16,20 +16,22 @@
 ///       </keypoint>
 ///     </kfml>
 ///
-/// Two spaces for each level, line feeds, attributes in the order of the calls, a value directly in its element. The
-/// root element is the stream's own. The text goes out in blocks; memory follows the depth of elements only. The same
-/// calls give the same bytes everywhere, whatever the locale.
+/// Two spaces for each level, line feeds, attributes in the order of the calls, a value directly in its
+/// element. The root element is the stream's own. The text goes out in blocks; memory follows the depth of
+/// elements only. The same calls give the same bytes everywhere, whatever the locale.
 ///
-/// Values as text: bool 1 or 0; whole numbers in decimal; a double as the shortest decimal that gives the same bits
-/// again, or inf, -inf, nan; a time as VALUE/TIMESCALE with @EPOCH behind it unless that is 0 and ~ at the end if it has
-/// been rounded (48/24, 1/3~), or as invalid, indefinite, +infinity, -infinity; a UUID in upper case. A string stands as
-/// it is, but for XML's own escapes; a byte that XML can't hold, such as a zero or one that is no valid UTF-8, is \xHH,
-/// and a backslash that would read as the start of that is \x5C, so that every string comes back byte for byte.
+/// Values as text: bool 1 or 0; whole numbers in decimal; a double as the shortest decimal that gives the
+/// same bits again, or inf, -inf, nan; a time as VALUE/TIMESCALE with @EPOCH behind it unless that is 0 and ~
+/// at the end if it has been rounded (48/24, 1/3~), or as invalid, indefinite, +infinity, -infinity; a UUID
+/// in upper case. A string stands as it is, but for XML's own escapes; a byte that XML can't hold, such as a
+/// zero or one that is no valid UTF-8, is \xHH, and a backslash that would read as the start of that is \x5C,
+/// so that every string comes back byte for byte.
 ///
-/// What has no place is left out, and the text stays well-formed: an element whose tag has no name in the scopes in
-/// force, with all inside it; an attribute without a name, behind content, or that its element has already; a value
-/// outside any element or behind a child; anything behind `close`. An `endElement` too many does nothing. An element
-/// holds either children or a value: readers give nobody the value in front of a child.
+/// What has no place is left out, and the text stays well-formed: an element whose tag has no name in the
+/// scopes in force, with all inside it; an attribute without a name, behind content, or that its element has
+/// already; a value outside any element or behind a child; anything behind `close`. An `endElement` too many
+/// does nothing. An element holds either children or a value: readers give nobody the value in front of a
+/// child.
 ///
 /// One object belongs to one thread at a time.
 class LUMENKEY_API BXXMLWriteStream final : public BXSerializerWriteStream {
@@ -42,8 +44,8 @@ public:
     BXXMLWriteStream(BXXMLWriteStream const&) = delete;
     BXXMLWriteStream& operator=(BXXMLWriteStream const&) = delete;
 
-    /// Ends the elements that are open and the root. True if the sink took everything and nothing was left out. Further
-    /// calls only answer.
+    /// Ends the elements that are open and the root. True if the sink took everything and nothing was left
+    /// out. Further calls only answer.
     bool close();
 
     void pushScope(BXScope const* scope) override;

@@ -87,8 +87,8 @@ struct CommonScale {
     int64_t timescale;
 };
 
-/// The usual sum of two timescales, in 64 bits: one divides the other, and nothing overflows. `sign` is 1 or -1. False,
-/// with `result` as it was, for any other.
+/// The usual sum of two timescales, in 64 bits: one divides the other, and nothing overflows. `sign` is 1 or
+/// -1. False, with `result` as it was, for any other.
 bool sumOverOneTimescale(Tempus const& a, Tempus const& b, int64_t sign, Tempus& result) noexcept {
     if (!TempusIsNumeric(a) || !TempusIsNumeric(b) || (a.epoch | b.epoch) != 0) {
         return false;
@@ -176,7 +176,7 @@ Wide floorDivide(Wide n, Wide d) noexcept {
 
 } // namespace
 
-// Doubles ----------------------------------------------------------------------------------------------------
+// Doubles ---------------------------------------------------------------------------------------------------
 
 double TempusDetail::seconds(Tempus const& t) noexcept {
     switch (TempusGetKind(t)) {
@@ -270,7 +270,7 @@ Tempus KFChronoForChannelSeconds(double seconds, uint32_t timescale) noexcept {
     return {dyadic.negative ? -magnitude64 : magnitude64, static_cast<int32_t>(timescale), flags, 0};
 }
 
-// Sums -------------------------------------------------------------------------------------------------------
+// Sums ------------------------------------------------------------------------------------------------------
 
 Tempus TempusDetail::add(Tempus const& a, Tempus const& b) noexcept {
     Tempus result;
@@ -318,7 +318,7 @@ Tempus TempusReduced(Tempus const& t) noexcept {
     return fromSigned(t.value, static_cast<UWide>(t.timescale), {t.flags, t.epoch, 0});
 }
 
-// Products and quotients -------------------------------------------------------------------------------------
+// Products and quotients ------------------------------------------------------------------------------------
 
 Tempus operator*(Tempus const& a, Tempus const& b) noexcept {
     Tempus result;
@@ -383,7 +383,7 @@ Tempus operator/(Tempus const& a, int32_t b) noexcept { return dividedByInteger(
 Tempus operator*(Tempus const& a, uint32_t b) noexcept { return timesInteger(a, b); }
 Tempus operator/(Tempus const& a, uint32_t b) noexcept { return dividedByInteger(a, b); }
 
-// Cycles -----------------------------------------------------------------------------------------------------
+// Cycles ----------------------------------------------------------------------------------------------------
 
 Tempus BX_TempusFloorToSampleDuration(Tempus const& t, Tempus const& d) noexcept {
     if (!TempusIsNumeric(t) || !TempusIsNumeric(d) || d.value <= 0 || d.epoch != 0) {

@@ -61,9 +61,9 @@ bool KFChannelBase::parseBegin(BXSerializerReadStream& stream) {
 
 bool KFChannelBase::parseEnd(BXSerializerReadStream&) { return true; }
 
-/// The flags of a document that stands alone. They replace the whole word, but for what a node is: a document can't
-/// make a folder of a value. A root is locked only when its children have been read, and keeps the bit that no document
-/// holds.
+/// The flags of a document that stands alone. They replace the whole word, but for what a node is: a document
+/// can't make a folder of a value. A root is locked only when its children have been read, and keeps the bit
+/// that no document holds.
 bool KFChannelBase::parseElement(BXSerializerReadStream& stream, BXStreamElement& element) {
     // This was a folder for the writer; what its children hold isn't for this node.
     if (element.tag() == kParameterElement && !testFlag(kChannelFlagIsFolder))

@@ -5,12 +5,6 @@
 #include "lumenkey/Channels/KFChannelImpl.h"
 #include "lumenkey/persistence/KFDocumentElements.h"
 
-namespace {
-
-constexpr std::uint32_t kUnnamedElement = 0;
-
-} // namespace
-
 void KFChannelBase::calcHashForState(BXSerializerWriteStream&, Tempus const&) {}
 
 void KFChannel::calcHashForState(BXSerializerWriteStream& stream, Tempus const& t) {

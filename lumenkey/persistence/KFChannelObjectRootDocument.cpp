@@ -16,8 +16,6 @@ constexpr KFChannelFlags kClassFlags = kChannelFlagIsFolder | kChannelFlagIsObje
 constexpr KFChannelFlags kLowWord = 0xFFFFFFFF;
 constexpr KFChannelFlags kSelfDigestFlags = kChannelFlagDisabled | kChannelFlagSolo;
 constexpr std::uint32_t kSelfDigestFoldFlagsLeftOut = 0x7200F;
-constexpr std::uint32_t kFirstVersionWithTimes = 5;
-constexpr std::uint32_t kUnnamedElement = 0;
 
 constexpr BXUUID kVaryingFolder = KFClassUUID("46C844A8-13D3-11D8-A438-000A95AF9F7E");
 

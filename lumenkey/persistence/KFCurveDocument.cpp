@@ -17,7 +17,8 @@ namespace {
 
 constexpr double kTolerance = 1e-7;
 constexpr double kNeutralBias = 1.0;
-/// So many keypoints are read at once: a curve of no more is written as it is at one moment. In a digest, few.
+/// So many keypoints are read at once: a curve of no more is written as it is at one moment. In a digest,
+/// few.
 constexpr std::size_t kKeypointsAtOnce = 4096;
 constexpr std::size_t kKeypointsAtOnceForDigest = 128;
 
@@ -36,9 +37,9 @@ struct KeypointRecord {
     KFTangent out;
 };
 
-/// The keypoints of a spline in order, a stretch under its lock at a time: others may evaluate the spline meanwhile. Where
-/// another thread edits between two stretches, reading goes on behind the time that
-/// was reached.
+/// The keypoints of a spline in order, a stretch under its lock at a time: others may evaluate the spline
+/// meanwhile. Where another thread edits between two stretches, reading goes on behind the time that was
+/// reached.
 class KeypointReader {
 public:
     /// `room` is for as many as are read at once, and isn't empty.

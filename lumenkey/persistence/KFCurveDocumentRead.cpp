@@ -1,14 +1,14 @@
-// A curve in a document: what it reads. Keypoints stand in the order of the document: appending doesn't sort them.
+// A curve in a document: what it reads. Keypoints stand in the order of the document: appending doesn't sort
+// them.
 
 #include "lumenkey/curves/KFCurve.h"
 #include "lumenkey/curves/KFCurveParseRecord.h"
-#include "lumenkey/persistence/KFDocumentScopes.h"
+#include "lumenkey/persistence/KFDocumentElements.h"
 #include "lumenkey/persistence/KFHandleText.h"
 #include "lumenkey/splines/KFSplineAccess.h"
 
 namespace {
 
-constexpr std::uint32_t kFirstVersionWithTimes = 5;
 /// Was written by old versions.
 constexpr std::uint32_t kObsoleteKeypointFlag = 0x20;
 
@@ -19,7 +19,8 @@ bool KFCurve::parseBegin(BXSerializerReadStream& stream) {
     return true;
 }
 
-/// Also called on the curve that a class's channels share, by several threads at once: nothing of it is written.
+/// Also called on the curve that a class's channels share, by several threads at once: nothing of it is
+/// written.
 bool KFCurve::parseEnd(BXSerializerReadStream&) {
     if (_parseRecord != nullptr) {
         flushParseRecord();
@@ -99,8 +100,8 @@ void KFCurve::parseSettings(BXStreamElement const& element) {
         setRetimingExtrapolation(on);
 }
 
-/// Whatever was there goes, also on a curve that takes no keypoints from its user; the constant behind it, which the
-/// document has given by now, stays.
+/// Whatever was there goes, also on a curve that takes no keypoints from its user; the constant behind it,
+/// which the document has given by now, stays.
 void KFCurve::beginParsingKeypoints(std::uint32_t count) {
     _parseRecord.reset(); // its handle goes with the keypoints
     _splineNode.destroySpline();
@@ -169,8 +170,8 @@ void KFCurve::setParsedAttribute(bool (KFSpline::*set)(void*, double, Tempus con
     }
 }
 
-/// Both parts of a handle are set with the second one, and the enabled state behind the output handle: a disabled
-/// keypoint takes no handles.
+/// Both parts of a handle are set with the second one, and the enabled state behind the output handle: a
+/// disabled keypoint takes no handles.
 void KFCurve::parseHandle(BXSerializerReadStream const& stream, BXStreamElement const& element) {
     KFCurveParseRecord& record = parseRecord();
     double const scale = handleScale();

@@ -5,6 +5,11 @@
 
 #include <type_traits>
 
+/// Older documents count frames.
+inline constexpr std::uint32_t kFirstVersionWithTimes = 5;
+/// Of what only goes into a digest.
+inline constexpr std::uint32_t kUnnamedElement = 0;
+
 /// An element that holds nothing but a value.
 template <class Value>
 void KFWriteElement(BXSerializerWriteStream& stream, std::uint32_t tag, Value const& value) {

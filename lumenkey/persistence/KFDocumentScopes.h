@@ -3,8 +3,9 @@
 
 #include "lumenkey/foundation/BXSerializerStreams.h"
 
-// The names of a document's elements and attributes. A number means what the innermost scope in force says, so one may
-// stand for different things in different tables. They reach documents: never rename or renumber one.
+// The names of a document's elements and attributes. A number means what the innermost scope in force says,
+// so one may stand for different things in different tables. They reach documents: never rename or renumber
+// one.
 
 // Elements.
 inline constexpr std::uint32_t kOldDocumentElement = 90;

@@ -101,62 +101,7 @@ TEST(BXTextForms, ReadTimesBackBitForBit) {
     }
 }
 
-TEST(BXTextForms, ReadStringsBackByteForByte) {
-    std::mt19937_64 random(3);
-    // What makes up escapes and characters, so that random strings hold whole and broken ones.
-    static constexpr std::string_view kPieces[] = {"\\",
-                                                   "\\x",
-                                                   "x",
-                                                   "4",
-                                                   "F",
-                                                   "f",
-                                                   "&",
-                                                   "<",
-                                                   ">",
-                                                   "\"",
-                                                   "'",
-                                                   "]]>",
-                                                   "\r",
-                                                   "\n",
-                                                   "\t",
-                                                   " ",
-                                                   "\x7F",
-                                                   "\xC3",
-                                                   "\xA4",
-                                                   "\xEF",
-                                                   "\xBF",
-                                                   "\xBE",
-                                                   "\xED\xA0\x80",
-                                                   "\xF0\x9F\x8E\xA8",
-                                                   "\xE2\x82\xAC",
-                                                   "\xC0\x80"};
-    for (int i = 0; i < 100000; ++i) {
-        std::string text;
-        for (auto n = random() % 8; n != 0; --n) {
-            if (random() % 3 == 0) {
-                text += static_cast<char>(random());
-            } else {
-                text += kPieces[random() % std::size(kPieces)];
-            }
-        }
-        // The parser's part, the entities, is undone where documents are read.
-        std::string made = escapedText(text, BXText::Place::Attribute);
-        for (auto const& [entity, plain] : {std::pair{"&lt;", "<"},
-                                            {"&gt;", ">"},
-                                            {"&quot;", "\""},
-                                            {"&#9;", "\t"},
-                                            {"&#10;", "\n"},
-                                            {"&#13;", "\r"},
-                                            {"&amp;", "&"}}) {
-            for (auto at = made.find(entity); at != std::string::npos; at = made.find(entity, at + 1)) {
-                made.replace(at, std::string_view(entity).size(), plain);
-            }
-        }
-        BXString back;
-        ASSERT_TRUE(BXText::read(made, &back));
-        ASSERT_EQ(back.str(), text) << made;
-    }
-
+TEST(BXTextForms, EscapeOnlyWhatXmlCannotHold) {
     using enum BXText::Place;
     EXPECT_EQ(escapedText("C:\\temp\\x\\x4", Content), "C:\\temp\\x\\x4");
     EXPECT_EQ(escapedText("\\x4f", Content), "\\x5Cx4f");
@@ -186,8 +131,9 @@ TEST(BXTextForms, TakeOnlyWholeValues) {
     for (char const* text : {"", "1,5", "1x", "1e999", "0x10", "1 2"}) {
         EXPECT_TRUE(reads<double>(text, 0)) << text;
     }
-    for (char const* text : {"1", "1/", "1/0", "1/-2", "1/2@", "1/2~~", "1/2@3#", "1/2 ~", "infinity",
-                             "invalid~~", "1/2147483648", "1/2#3~", "~"}) {
+    for (char const* text :
+         {"1", "1/", "1/0", "1/-2", "-1/-1", "1/2/3", "1/2@", "1/2~~", "1/2@3#", "1/1#-1", "1/2 ~", "nan",
+          "inf", "infinity", "invalid~~", "1/2147483648", "9223372036854775808/1", "1/2#3~", "~"}) {
         EXPECT_TRUE(reads<Tempus>(text, Tempus{})) << text;
     }
 }

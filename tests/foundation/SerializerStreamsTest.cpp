@@ -117,7 +117,7 @@ constexpr std::string_view kDeclaration = "<?xml version=\"1.0\" encoding=\"UTF-
 
 } // namespace
 
-// Writing -------------------------------------------------------------------------------------------------------------
+// Writing ---------------------------------------------------------------------------------------------------
 
 TEST(BXXMLWriteStream, WritesLinesAndAttributesInOrder) {
     std::string const text = written([](BXXMLWriteStream& stream) {
@@ -208,7 +208,7 @@ TEST(BXXMLWriteStream, RemembersThatTheSinkRefused) {
     }
 }
 
-// Reading -------------------------------------------------------------------------------------------------------------
+// Reading ---------------------------------------------------------------------------------------------------
 
 TEST(BXXMLReadStream, HandsOverContainersFirstAndLeavesAtTheirEnd) {
     EXPECT_EQ(reading("<kfml version='5.13'>\n"
@@ -293,10 +293,13 @@ TEST(BXXMLReadStream, FindsAttributesByTheScopesOfTheMoment) {
 TEST(BXXMLReadStream, ReadsWhatWasWritten) {
     std::mt19937_64 random(4);
     std::vector<std::string> texts;
-    for (int i = 0; i < 300; ++i) {
+    // What makes up escapes and characters, so that there are whole and broken ones.
+    static constexpr std::string_view kBytes = "\\\\\\xx4Ff&<>\"']\r\n\t \x7F\xC3\xA4\xEF\xBF\xBE"
+                                               "\xED\xA0\x80\xF0\x9F\x8E\xE2\x82\xAC\xC0";
+    for (int i = 0; i < 20000; ++i) {
         std::string& text = texts.emplace_back();
         for (auto n = random() % 40; n != 0; --n) {
-            text += static_cast<char>(random() % 2 == 0 ? random() : "\\x41&<\r\n\t \xC3\xA4"[random() % 12]);
+            text += static_cast<char>(random() % 4 == 0 ? random() : kBytes[random() % kBytes.size()]);
         }
     }
     BXUUID const uuid{{0x4B723EA5, 0x244311D7, 0x9C750003, 0x9366FB58}};
@@ -339,7 +342,7 @@ TEST(BXXMLReadStream, FailsAtEveryCut) {
     }
 }
 
-TEST(BXXMLReadStream, TellsWhereAndWhyItFailed) {
+TEST(BXXMLReadStream, TakesTheEncodingsOfXmlAndTellsWhereItFailed) {
     struct Row {
         std::string document;
         char const* log;
@@ -348,17 +351,11 @@ TEST(BXXMLReadStream, TellsWhereAndWhyItFailed) {
     Row const rows[] = {
         {"", "( ) 1:1: no element found"},
         {"<kfml>\n <leaf></group>\n</kfml>", "( 91 ) 2:10: mismatched tag"},
-        {"<kfml>\n\n  a\0b</kfml>"s, "( ) 3:4: not well-formed (invalid token)"},
         {"<kfml>\u00C4\xFF</kfml>", "( ) 1:8: not well-formed (invalid token)"},
-        {"<kfml/><kfml/>", "( 91'' ) 1:8: junk after document element"},
-        {"<kfml a='1' a='2'/>", "( ) 1:13: duplicate attribute"},
-        {"<kfml>&x;</kfml>", "( ) 1:7: undefined entity"},
-        {"<!DOCTYPE kfml>\n<kfml/>", "( ) 1:15: a document type declaration is not allowed"},
-        {"<!DOCTYPE kfml [<!ENTITY a 'aa'><!ENTITY b '&a;&a;'>]><kfml>&b;</kfml>",
-         "( ) 1:16: a document type declaration is not allowed"},
-        {"<!DOCTYPE kfml SYSTEM 'file:///etc/passwd'><kfml/>",
-         "( ) 1:43: a document type declaration is not allowed"},
         {"<?xml version='1.0' encoding='EBCDIC'?><kfml/>", "( ) 1:31: unknown encoding"},
+        {"<?xml version='1.0' encoding='ISO-8859-1'?><leaf>\xC4</leaf>", "( 2'\u00C4' ) "},
+        {"\xEF\xBB\xBF<leaf>\u00C4</leaf>", "( 2'\u00C4' ) "},
+        {"\xFF\xFE<\0l\0e\0a\0f\0>\0a\0\xC4\0<\0/\0l\0e\0a\0f\0>\0"s, "( 2'a\u00C4' ) "},
     };
     for (Row const& row : rows) {
         EXPECT_EQ(reading(row.document), row.log) << row.document;
@@ -371,17 +368,6 @@ TEST(BXXMLReadStream, TellsWhereAndWhyItFailed) {
     BXXMLReadStream folder(BXURL("/"));
     EXPECT_FALSE(folder.parse());
     EXPECT_EQ(folder.failure()->reason.find("the file can't be read: "), 0u);
-}
-
-TEST(BXXMLReadStream, TakesTheEncodingsOfXml) {
-    std::string utf16("\xFF\xFE");
-    for (char const c : std::string_view("<leaf>a\xC4</leaf>")) {
-        utf16 += c;
-        utf16 += '\0';
-    }
-    EXPECT_EQ(reading(utf16), "( 2'a\u00C4' ) ");
-    EXPECT_EQ(reading("\xEF\xBB\xBF<leaf>\u00C4</leaf>"), "( 2'\u00C4' ) ");
-    EXPECT_EQ(reading("<?xml version='1.0' encoding='ISO-8859-1'?><leaf>\xC4</leaf>"), "( 2'\u00C4' ) ");
 }
 
 TEST(BXXMLReadStream, TellsHowFarItIs) {
@@ -397,24 +383,14 @@ TEST(BXXMLReadStream, TellsHowFarItIs) {
 }
 
 TEST(BXXMLReadStream, KeepsItsLimits) {
-    auto const nested = [](std::size_t depth) {
-        std::string text;
-        for (std::size_t i = 0; i < depth; ++i) {
-            text += "<leaf>";
-        }
-        for (std::size_t i = 0; i < depth; ++i) {
-            text += "</leaf>";
-        }
-        return text;
-    };
-    EXPECT_EQ(reading(nested(1000)).find("deep"), std::string::npos);
-    std::string const deep = reading(nested(1'000'000));
-    EXPECT_NE(deep.find(") 1:6001: elements lie more than 1000 deep in each other"), std::string::npos)
-        << deep.substr(deep.size() - 100);
-    EXPECT_NE(reading("<x>" + nested(1'000'000) + "</x>").find("1000 deep"), std::string::npos)
-        << "passed over";
+    std::string deep;
+    for (int i = 0; i < 1001; ++i) {
+        deep += "<leaf>";
+    }
+    EXPECT_NE(reading(deep).find(") 1:6001: elements lie more than 1000 deep in each other"),
+              std::string::npos);
 
-    std::string const document = nested(1);
+    std::string_view const document = "<leaf></leaf>";
     for (std::uint64_t const limit : {document.size(), document.size() - 1}) {
         BXXMLReadStream stream(bytesOf(document));
         stream.setSizeLimit(limit);
@@ -433,12 +409,7 @@ TEST(BXXMLReadStream, ReadsLongTextsAndTagsInLinearTime) {
         return true;
     };
     auto const fails = [&](std::string const& document) {
-        BXXMLReadStream stream(bytesOf(document));
-        std::string log;
-        Recorder bottom("", log, measure);
-        stream.pushScope(kRootScope);
-        stream.pushHandler(&bottom);
-        return !stream.parse();
+        return reading(document, measure).find(" is longer than 67108864 bytes") != std::string::npos;
     };
     EXPECT_FALSE(fails("<leaf>" + fits + "</leaf>"));
     EXPECT_EQ(size, limit);
@@ -474,7 +445,7 @@ TEST(BXXMLReadStream, ReadsFilesBlockByBlock) {
     std::remove(path.c_str());
 }
 
-// Digests -------------------------------------------------------------------------------------------------------------
+// Digests ---------------------------------------------------------------------------------------------------
 
 template <typename... Value> std::array<std::uint8_t, 16> hashOf(Value const&... values) {
     BXHashWriteStream stream;
@@ -502,7 +473,8 @@ TEST(BXHashWriteStream, TellsNeighboursApart) {
         hashOf(BXUUID{{1, 0, 0, 0}}),
         hashOf(BXUUID{{0, 0, 0, 1}}),
     };
-    // Elements with attributes inside each other and beside each other; a scope around it tells what lies inside.
+    // Elements with attributes inside each other and beside each other; a scope around it tells what lies
+    // inside.
     for (bool const isInside : {false, true}) {
         BXHashWriteStream stream;
         EXPECT_TRUE(stream.isHashStream());
@@ -545,7 +517,8 @@ TEST(BXHashWriteStream, TakesEndsWithoutStarts) {
 }
 
 TEST(BXHashWriteStream, DoesNotDependOnHowBytesAreCut) {
-    // Asking in between cuts the input elsewhere; strings around the size of its block are what could go wrong.
+    // Asking in between cuts the input elsewhere; strings around the size of its block are what could go
+    // wrong.
     BXHashWriteStream whole;
     BXHashWriteStream cut;
     for (std::size_t size = 0; size < 3000; size += 7) {

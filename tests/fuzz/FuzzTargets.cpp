@@ -13,6 +13,8 @@
 #include <cstdlib>
 #include <limits>
 
+using namespace lumenkey::tools;
+
 namespace {
 
 void require(bool holds, char const* what) {
@@ -47,8 +49,8 @@ void readEverything(KFChannelFolder& folder) {
     });
 }
 
-/// Where a minimum is above its maximum, a value below both is clamped to the one, and that to the other, and so each
-/// writing gives another. Infinite limits are none to a reader, and may come to lie so.
+/// Where a minimum is above its maximum, a value below both is clamped to the one, and that to the other, and
+/// so each writing gives another. Infinite limits are none to a reader, and may come to lie so.
 void uncrossLimits(KFChannelFolder& folder) {
     forEachValue(folder, [](KFChannel& channel) {
         KFCurve& curve = *channel.getCurveInterface();
@@ -61,6 +63,15 @@ void uncrossLimits(KFChannelFolder& folder) {
             curve.setAbsoluteMaxValueV(std::numeric_limits<double>::max());
         }
     });
+}
+
+/// Most inputs are refused.
+template <class Read> void orRefused(Read const& read) {
+    try {
+        read();
+    } catch (InputError const&) {
+        return;
+    }
 }
 
 } // namespace
@@ -101,19 +112,11 @@ void fuzzState(FuzzBytes bytes) {
 }
 
 void fuzzMotion(FuzzBytes bytes) {
-    try {
-        lumenkey::tools::treeOfMotion(lumenkey::tools::readMotionText(textOf(bytes), "fuzz.bvh"));
-    } catch (lumenkey::tools::InputError const&) {
-        // Refused, as most inputs are.
-    }
+    orRefused([&] { treeOfMotion(readMotionText(textOf(bytes), "fuzz.bvh")); });
 }
 
 void fuzzCsv(FuzzBytes bytes) {
-    try {
-        lumenkey::tools::treeOfCsv(lumenkey::tools::readCsvText(textOf(bytes), "fuzz.csv"));
-    } catch (lumenkey::tools::InputError const&) {
-        // Refused, as most inputs are.
-    }
+    orRefused([&] { treeOfCsv(readCsvText(textOf(bytes), "fuzz.csv")); });
 }
 
 void fuzzPath(FuzzBytes bytes) {

@@ -1,5 +1,5 @@
-// Documents by someone who means ill: each is refused at a line, a column and for a reason, or read as its text says,
-// and the tree that was being read into goes on working.
+// Documents by someone who means ill: each is refused at a line, a column and for a reason, or read as its
+// text says, and the tree that was being read into goes on working.
 
 #include "tests/persistence/Victim.h"
 
@@ -138,12 +138,12 @@ TEST(Attack, IsRefusedWithPlaceAndReason) {
     for (Row const& row : rows) {
         SCOPED_TRACE(row.name);
         Victim victim;
-        forgetPeak();
-        std::size_t const before = peakMiB();
+        std::size_t const before = forgetPeak();
         EXPECT_EQ(victim.read(row.document), row.expected);
         EXPECT_LT(peakMiB() - before, 2 * (row.document.size() >> 20) + 16);
-        EXPECT_EQ(victim.value->getInitialValue(),
-                  row.expected.empty() ? 7.0 : victim.value->getInitialValue());
+        if (row.expected.empty()) {
+            EXPECT_EQ(victim.value->getInitialValue(), 7.0);
+        }
         victim.expectUsable();
     }
 }
@@ -167,8 +167,7 @@ TEST(Attack, OfAGibibyteEndsEarly) {
         SCOPED_TRACE(start.substr(start.size() - 8));
         Gibibyte const document(start);
         Victim victim;
-        forgetPeak();
-        std::size_t const before = peakMiB();
+        std::size_t const before = forgetPeak();
         auto const begin = std::chrono::steady_clock::now();
         std::string const refusal = victim.read(document.bytes());
         EXPECT_NE(refusal.find("longer than 67108864 bytes"), std::string::npos) << refusal;

@@ -52,6 +52,19 @@ struct Group {
         folder.finishInitializing();
     }
 };
+/// Of a group's blur.
+constexpr char const* kBlurCurve = R"(      <curve type="1" default="0" value="0">
+        <numberOfKeypoints>2</numberOfKeypoints>
+        <keypoint flags="0">
+          <time>0/600</time>
+          <value>0</value>
+        </keypoint>
+        <keypoint flags="0">
+          <time>600/600</time>
+          <value>10</value>
+        </keypoint>
+      </curve>
+)";
 
 } // namespace
 
@@ -78,18 +91,8 @@ TEST(Document, StandsAlone) {
     </parameter>
     <parameter name="Blur" id="2" factoryID="2">
       <flags>8589934608</flags>
-      <curve type="1" default="0" value="0">
-        <numberOfKeypoints>2</numberOfKeypoints>
-        <keypoint flags="0">
-          <time>0/600</time>
-          <value>0</value>
-        </keypoint>
-        <keypoint flags="0">
-          <time>600/600</time>
-          <value>10</value>
-        </keypoint>
-      </curve>
-    </parameter>
+)" + std::string(kBlurCurve) +
+                  R"(    </parameter>
   </parameter>
 </kfml>
 )");
@@ -103,25 +106,15 @@ TEST(Document, StandsInsideAnother) {
     EXPECT_EQ(inHostsDocument(group.folder, false, true, false),
               R"(  <parameter name="Group" id="7" flags="8589938704">
     <parameter name="Blur" id="2" flags="8589934608">
-      <curve type="1" default="0" value="0">
-        <numberOfKeypoints>2</numberOfKeypoints>
-        <keypoint flags="0">
-          <time>0/600</time>
-          <value>0</value>
-        </keypoint>
-        <keypoint flags="0">
-          <time>600/600</time>
-          <value>10</value>
-        </keypoint>
-      </curve>
-    </parameter>
+)" + std::string(kBlurCurve) +
+                  R"(    </parameter>
   </parameter>
 )");
 }
 
 TEST(Document, WritesOfAChannelWhatIsNotAsUsual) {
     struct Case {
-        char const* expected;
+        std::string expected;
         std::function<void(KFChannelDouble&, KFCurve&)> change;
     };
     auto const key = [](KFCurve& curve, unsigned type) {
@@ -130,7 +123,19 @@ TEST(Document, WritesOfAChannelWhatIsNotAsUsual) {
         curve.setKeypointInterpolation(handle, type, true);
         return handle;
     };
-    constexpr char const* kHead = "  <parameter name=\"V\" id=\"1\" flags=\"16\"";
+    std::string const head = "  <parameter name=\"V\" id=\"1\" flags=\"16\"";
+    auto const keyed = [](std::string const& handles) {
+        return R"(>
+    <curve type="1" default="0" value="0">
+      <numberOfKeypoints>1</numberOfKeypoints>
+      <keypoint flags="128">
+        <time>600/600</time>
+        <value>2</value>
+)" + handles + R"(      </keypoint>
+    </curve>
+  </parameter>
+)";
+    };
     Case const cases[] = {
         {" default=\"1\" value=\"2\"/>\n",
          [](auto&, KFCurve& curve) {
@@ -143,14 +148,23 @@ TEST(Document, WritesOfAChannelWhatIsNotAsUsual) {
         {">\n    <fadeOutOffset>1200/600</fadeOutOffset>\n    <curve type=\"1\" default=\"0\" value=\"0\"/>\n"
          "  </parameter>\n",
          [](KFChannelDouble& channel, auto&) { channel.setFadeOutOffset(s(2), false); }},
-        {">\n    <curve type=\"1\" default=\"0\" value=\"0\" parametric=\"1\" round=\"0\" "
-         "retimingExtrapolation=\"1\">\n      <numberOfKeypoints>1</numberOfKeypoints>\n      "
-         "<min>-5</min>\n      "
-         "<max>5</max>\n      <preExtrapolation>3</preExtrapolation>\n      "
-         "<postExtrapolation>2</postExtrapolation>\n      <closed>1</closed>\n      <keypoint "
-         "interpolation=\"1\" "
-         "enabled=\"0\" flags=\"17\">\n        <time>600/600</time>\n        <value>2</value>\n        "
-         "<bias>0.5</bias>\n        <normal>3</normal>\n      </keypoint>\n    </curve>\n  </parameter>\n",
+        {R"(>
+    <curve type="1" default="0" value="0" parametric="1" round="0" retimingExtrapolation="1">
+      <numberOfKeypoints>1</numberOfKeypoints>
+      <min>-5</min>
+      <max>5</max>
+      <preExtrapolation>3</preExtrapolation>
+      <postExtrapolation>2</postExtrapolation>
+      <closed>1</closed>
+      <keypoint interpolation="1" enabled="0" flags="17">
+        <time>600/600</time>
+        <value>2</value>
+        <bias>0.5</bias>
+        <normal>3</normal>
+      </keypoint>
+    </curve>
+  </parameter>
+)",
          [&](auto&, KFCurve& curve) {
              void* const handle = key(curve, 1);
              curve.setKeypointBiasLinear(handle, 0.5);
@@ -167,21 +181,14 @@ TEST(Document, WritesOfAChannelWhatIsNotAsUsual) {
              curve.setCurveExtrapolation(2, 0);
          }},
         // Handles are twelve times what is stored; both parts of one, and only where tangents count.
-        {">\n    <curve type=\"1\" default=\"0\" value=\"0\">\n      "
-         "<numberOfKeypoints>1</numberOfKeypoints>\n"
-         "      <keypoint flags=\"128\">\n        <time>600/600</time>\n        <value>2</value>\n        "
-         "<outputTangentTime>0</outputTangentTime>\n        <outputTangentValue>6</outputTangentValue>\n     "
-         " "
-         "</keypoint>\n    </curve>\n  </parameter>\n",
+        {keyed("        <outputTangentTime>0</outputTangentTime>\n"
+               "        <outputTangentValue>6</outputTangentValue>\n"),
          [&](auto&, KFCurve& curve) {
              void* const handle = key(curve, 4);
              curve.setKeypointBiasLinear(handle, 1.0000000001);
              curve.setKeypointOutputNormalizedTangents(handle, 0, 0.5, true);
          }},
-        {">\n    <curve type=\"1\" default=\"0\" value=\"0\">\n      "
-         "<numberOfKeypoints>1</numberOfKeypoints>\n"
-         "      <keypoint flags=\"128\">\n        <time>600/600</time>\n        <value>2</value>\n      "
-         "</keypoint>\n    </curve>\n  </parameter>\n",
+        {keyed(""),
          [&](auto&, KFCurve& curve) {
              curve.setKeypointOutputNormalizedTangents(key(curve, 4), 0, 0.5, true);
              curve.setCurveDeriveTangents(false);
@@ -190,7 +197,7 @@ TEST(Document, WritesOfAChannelWhatIsNotAsUsual) {
     for (Case const& c : cases) {
         KFChannelDouble channel(0.0, "V", nullptr, 1, 0);
         c.change(channel, *channel.createLocalChannelImplementation()->getCurve());
-        EXPECT_EQ(inHostsDocument(channel, false, true, true), std::string(kHead) + c.expected);
+        EXPECT_EQ(inHostsDocument(channel, false, true, true), head + c.expected);
     }
 }
 

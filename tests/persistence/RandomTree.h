@@ -17,11 +17,12 @@ struct DeleteTree {
 };
 using OwnedTree = std::unique_ptr<KFChannelFolder, DeleteTree>;
 
-/// A tree of everything that a document can hold, told by its seed: all classes that factories make, settings, limits,
-/// fades, keypoints of all types with attributes and handles, names in any script, times of any timescale and epoch.
+/// A tree of everything that a document can hold, told by its seed: all classes that factories make,
+/// settings, limits, fades, keypoints of all types with attributes and handles, names in any script, times of
+/// any timescale and epoch.
 ///
-/// What a document leaves out by its rules isn't there: handles and biases that are too small to be written, children
-/// that aren't saved, and disabled keypoints without an output handle, which come back enabled.
+/// What a document leaves out by its rules isn't there: handles and biases that are too small to be written,
+/// children that aren't saved, and disabled keypoints without an output handle, which come back enabled.
 OwnedTree randomTree(std::uint64_t seed);
 
 /// A number of any magnitude, sometimes a special one.

@@ -10,9 +10,10 @@
 
 #include <fstream>
 
-std::string const kDocumentHead =
+std::string const kDocumentFactories =
     "<kfml version='5.13'><factory id='1' uuid='E7BF3809-2290-11D7-98E5-00039389B702'/>"
-    "<factory id='2' uuid='FDC1944B-2291-11D7-B1C3-00039389B702'/><parameter id='1'>";
+    "<factory id='2' uuid='FDC1944B-2291-11D7-B1C3-00039389B702'/>";
+std::string const kDocumentHead = kDocumentFactories + "<parameter id='1'>";
 std::string const kDocumentTail = "</parameter></kfml>";
 
 namespace {
@@ -103,4 +104,7 @@ std::size_t peakMiB() {
             status >> kibibytes;
     return kibibytes >> 10;
 }
-void forgetPeak() { std::ofstream("/proc/self/clear_refs") << 5; }
+std::size_t forgetPeak() {
+    std::ofstream("/proc/self/clear_refs") << 5;
+    return peakMiB();
+}

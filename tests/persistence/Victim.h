@@ -10,7 +10,9 @@
 
 using Bytes = std::span<std::uint8_t const>;
 
-/// Around the children of the node that a document is for; folders are class 1, doubles 2.
+/// The start of a document: folders are class 1, doubles 2.
+extern std::string const kDocumentFactories;
+/// Around the children of the node that it is for.
 extern std::string const kDocumentHead;
 extern std::string const kDocumentTail;
 
@@ -30,10 +32,12 @@ struct Victim {
     std::string read(Bytes document);
     std::string read(std::string const& document);
 
-    /// Reads, edits, writes and digests whatever the tree has become, and makes it good again by a good document.
+    /// Reads, edits, writes and digests whatever the tree has become, and makes it good again by a good
+    /// document.
     void expectUsable();
 };
 
 /// The most memory that this process has had since `forgetPeak`, in MiB.
 std::size_t peakMiB();
-void forgetPeak();
+/// Answers what the process has now.
+std::size_t forgetPeak();

