@@ -14,6 +14,13 @@ namespace {
 
 using Time = Tempus const&;
 
+/// Those between two keypoints differ in nothing but whom they ask.
+#define VISIT_BY_INTERPOLATOR(Type)                                                                          \
+    void visit##Type(KFSpline& spline, void* first, void* second, Time sourceStart, Time sourceEnd, Time,    \
+                     Time, double valueOffset) override {                                                    \
+        include<KF##Type##Interpolator>(spline, first, second, sourceStart, sourceEnd, valueOffset);         \
+    }
+
 class MinMaxValuesVisitor : public KFChannelSegmentVisitor {
 public:
     KFValueExtremes extremes;
@@ -31,42 +38,15 @@ public:
             include(linear.interpolate(spline, kTempusZero, first, second, source, false, false) +
                     valueOffset);
     }
-    void visitBezier(KFSpline& spline, void* first, void* second, Time sourceStart, Time sourceEnd, Time,
-                     Time, double valueOffset) override {
-        include<KFBezierInterpolator>(spline, first, second, sourceStart, sourceEnd, valueOffset);
-    }
-    void visitCatmullRom(KFSpline& spline, void* first, void* second, Time sourceStart, Time sourceEnd, Time,
-                         Time, double valueOffset) override {
-        include<KFCatmullRomInterpolator>(spline, first, second, sourceStart, sourceEnd, valueOffset);
-    }
-    void visitEaseIn(KFSpline& spline, void* first, void* second, Time sourceStart, Time sourceEnd, Time,
-                     Time, double valueOffset) override {
-        include<KFEaseInInterpolator>(spline, first, second, sourceStart, sourceEnd, valueOffset);
-    }
-    void visitEaseOut(KFSpline& spline, void* first, void* second, Time sourceStart, Time sourceEnd, Time,
-                      Time, double valueOffset) override {
-        include<KFEaseOutInterpolator>(spline, first, second, sourceStart, sourceEnd, valueOffset);
-    }
-    void visitEase(KFSpline& spline, void* first, void* second, Time sourceStart, Time sourceEnd, Time, Time,
-                   double valueOffset) override {
-        include<KFEaseInterpolator>(spline, first, second, sourceStart, sourceEnd, valueOffset);
-    }
-    void visitAccelerate(KFSpline& spline, void* first, void* second, Time sourceStart, Time sourceEnd, Time,
-                         Time, double valueOffset) override {
-        include<KFAccelerateInterpolator>(spline, first, second, sourceStart, sourceEnd, valueOffset);
-    }
-    void visitDecelerate(KFSpline& spline, void* first, void* second, Time sourceStart, Time sourceEnd, Time,
-                         Time, double valueOffset) override {
-        include<KFDecelerateInterpolator>(spline, first, second, sourceStart, sourceEnd, valueOffset);
-    }
-    void visitExponential(KFSpline& spline, void* first, void* second, Time sourceStart, Time sourceEnd, Time,
-                          Time, double valueOffset) override {
-        include<KFExponentialInterpolator>(spline, first, second, sourceStart, sourceEnd, valueOffset);
-    }
-    void visitLogarithmic(KFSpline& spline, void* first, void* second, Time sourceStart, Time sourceEnd, Time,
-                          Time, double valueOffset) override {
-        include<KFLogarithmicInterpolator>(spline, first, second, sourceStart, sourceEnd, valueOffset);
-    }
+    VISIT_BY_INTERPOLATOR(Bezier)
+    VISIT_BY_INTERPOLATOR(CatmullRom)
+    VISIT_BY_INTERPOLATOR(EaseIn)
+    VISIT_BY_INTERPOLATOR(EaseOut)
+    VISIT_BY_INTERPOLATOR(Ease)
+    VISIT_BY_INTERPOLATOR(Accelerate)
+    VISIT_BY_INTERPOLATOR(Decelerate)
+    VISIT_BY_INTERPOLATOR(Exponential)
+    VISIT_BY_INTERPOLATOR(Logarithmic)
 
 private:
     void include(double value) { extremes.include(value, value); }
@@ -79,6 +59,8 @@ private:
         extremes.include(of.lowest + valueOffset, of.highest + valueOffset);
     }
 };
+
+#undef VISIT_BY_INTERPOLATOR
 
 } // namespace
 

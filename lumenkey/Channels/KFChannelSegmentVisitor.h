@@ -17,6 +17,11 @@ class KFSpline;
 /// handles of the spline, good until it is edited.
 class LUMENKEY_API KFChannelSegmentVisitor {
 public:
+    /// The signature of the visits of a piece, one for each type of interpolation.
+    using SegmentVisit = void(KFSpline& spline, void* first, void* second, Tempus const& sourceStart,
+                              Tempus const& sourceEnd, Tempus const& targetStart, Tempus const& targetEnd,
+                              double valueOffset);
+
     virtual ~KFChannelSegmentVisitor();
 
     // The order of the virtual operations is fixed: hosts are built against it.
@@ -25,36 +30,16 @@ public:
     virtual void visitConstant(double value, Tempus const& start, Tempus const& end);
     /// The continuation along a slope has one vertex, and the other is null: before the keypoints it is `second`, after
     /// them `first`. Source and target are the same then, and the values are those of the spline there.
-    virtual void visitLinear(KFSpline& spline, void* first, void* second, Tempus const& sourceStart,
-                             Tempus const& sourceEnd, Tempus const& targetStart, Tempus const& targetEnd,
-                             double valueOffset);
-    virtual void visitBezier(KFSpline& spline, void* first, void* second, Tempus const& sourceStart,
-                             Tempus const& sourceEnd, Tempus const& targetStart, Tempus const& targetEnd,
-                             double valueOffset);
-    virtual void visitCatmullRom(KFSpline& spline, void* first, void* second, Tempus const& sourceStart,
-                                 Tempus const& sourceEnd, Tempus const& targetStart, Tempus const& targetEnd,
-                                 double valueOffset);
-    virtual void visitEaseIn(KFSpline& spline, void* first, void* second, Tempus const& sourceStart,
-                             Tempus const& sourceEnd, Tempus const& targetStart, Tempus const& targetEnd,
-                             double valueOffset);
-    virtual void visitEaseOut(KFSpline& spline, void* first, void* second, Tempus const& sourceStart,
-                              Tempus const& sourceEnd, Tempus const& targetStart, Tempus const& targetEnd,
-                              double valueOffset);
-    virtual void visitEase(KFSpline& spline, void* first, void* second, Tempus const& sourceStart,
-                           Tempus const& sourceEnd, Tempus const& targetStart, Tempus const& targetEnd,
-                           double valueOffset);
-    virtual void visitAccelerate(KFSpline& spline, void* first, void* second, Tempus const& sourceStart,
-                                 Tempus const& sourceEnd, Tempus const& targetStart, Tempus const& targetEnd,
-                                 double valueOffset);
-    virtual void visitDecelerate(KFSpline& spline, void* first, void* second, Tempus const& sourceStart,
-                                 Tempus const& sourceEnd, Tempus const& targetStart, Tempus const& targetEnd,
-                                 double valueOffset);
-    virtual void visitExponential(KFSpline& spline, void* first, void* second, Tempus const& sourceStart,
-                                  Tempus const& sourceEnd, Tempus const& targetStart, Tempus const& targetEnd,
-                                  double valueOffset);
-    virtual void visitLogarithmic(KFSpline& spline, void* first, void* second, Tempus const& sourceStart,
-                                  Tempus const& sourceEnd, Tempus const& targetStart, Tempus const& targetEnd,
-                                  double valueOffset);
+    virtual SegmentVisit visitLinear;
+    virtual SegmentVisit visitBezier;
+    virtual SegmentVisit visitCatmullRom;
+    virtual SegmentVisit visitEaseIn;
+    virtual SegmentVisit visitEaseOut;
+    virtual SegmentVisit visitEase;
+    virtual SegmentVisit visitAccelerate;
+    virtual SegmentVisit visitDecelerate;
+    virtual SegmentVisit visitExponential;
+    virtual SegmentVisit visitLogarithmic;
 
     /// Visits the pieces from `start` to `end`, both curve times and counted in, in the order of their targets.
     ///

@@ -23,8 +23,7 @@ KFVertex const& vertexOf(void* handle) { return *static_cast<KFVertex*>(handle);
 
 double valueOf(KFVertex const& vertex) { return vertex.getValueV(kTempusZero); }
 
-using Visit = void (KFChannelSegmentVisitor::*)(KFSpline&, void*, void*, Tempus const&, Tempus const&,
-                                                Tempus const&, Tempus const&, double);
+using Visit = KFChannelSegmentVisitor::SegmentVisit KFChannelSegmentVisitor::*;
 
 /// Null for a type that has no visit.
 Visit visitOf(std::uint32_t type) {

@@ -52,36 +52,20 @@ class PieceVisitor : public KFChannelSegmentVisitor {
 public:
     virtual void piece(Piece const& piece) = 0;
 
-    void visitLinear(KFSpline& k, void* a, void* b, Time c, Time d, Time e, Time f, double o) final {
-        piece({1, minMaxOf<KFLinearInterpolator>, k, a, b, c, d, e, f, o});
+#define VISIT_PIECE(Type, number)                                                                            \
+    void visit##Type(KFSpline& k, void* a, void* b, Time c, Time d, Time e, Time f, double o) final {        \
+        piece({number, minMaxOf<KF##Type##Interpolator>, k, a, b, c, d, e, f, o});                           \
     }
-    void visitBezier(KFSpline& k, void* a, void* b, Time c, Time d, Time e, Time f, double o) final {
-        piece({4, minMaxOf<KFBezierInterpolator>, k, a, b, c, d, e, f, o});
-    }
-    void visitCatmullRom(KFSpline& k, void* a, void* b, Time c, Time d, Time e, Time f, double o) final {
-        piece({6, minMaxOf<KFCatmullRomInterpolator>, k, a, b, c, d, e, f, o});
-    }
-    void visitEaseIn(KFSpline& k, void* a, void* b, Time c, Time d, Time e, Time f, double o) final {
-        piece({7, minMaxOf<KFEaseInInterpolator>, k, a, b, c, d, e, f, o});
-    }
-    void visitEaseOut(KFSpline& k, void* a, void* b, Time c, Time d, Time e, Time f, double o) final {
-        piece({8, minMaxOf<KFEaseOutInterpolator>, k, a, b, c, d, e, f, o});
-    }
-    void visitExponential(KFSpline& k, void* a, void* b, Time c, Time d, Time e, Time f, double o) final {
-        piece({13, minMaxOf<KFExponentialInterpolator>, k, a, b, c, d, e, f, o});
-    }
-    void visitLogarithmic(KFSpline& k, void* a, void* b, Time c, Time d, Time e, Time f, double o) final {
-        piece({14, minMaxOf<KFLogarithmicInterpolator>, k, a, b, c, d, e, f, o});
-    }
-    void visitEase(KFSpline& k, void* a, void* b, Time c, Time d, Time e, Time f, double o) final {
-        piece({15, minMaxOf<KFEaseInterpolator>, k, a, b, c, d, e, f, o});
-    }
-    void visitAccelerate(KFSpline& k, void* a, void* b, Time c, Time d, Time e, Time f, double o) final {
-        piece({16, minMaxOf<KFAccelerateInterpolator>, k, a, b, c, d, e, f, o});
-    }
-    void visitDecelerate(KFSpline& k, void* a, void* b, Time c, Time d, Time e, Time f, double o) final {
-        piece({17, minMaxOf<KFDecelerateInterpolator>, k, a, b, c, d, e, f, o});
-    }
+    VISIT_PIECE(Linear, 1)
+    VISIT_PIECE(Bezier, 4)
+    VISIT_PIECE(CatmullRom, 6)
+    VISIT_PIECE(EaseIn, 7)
+    VISIT_PIECE(EaseOut, 8)
+    VISIT_PIECE(Exponential, 13)
+    VISIT_PIECE(Logarithmic, 14)
+    VISIT_PIECE(Ease, 15)
+    VISIT_PIECE(Accelerate, 16)
+    VISIT_PIECE(Decelerate, 17)
 };
 
 /// The extremes piece by piece, each as its interpolator has them: what a host could write.
