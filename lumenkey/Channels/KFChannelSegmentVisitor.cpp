@@ -2,7 +2,6 @@
 
 #include "lumenkey/Channels/KFChannel.h"
 #include "lumenkey/Channels/KFSegmentWalk.h"
-#include "lumenkey/foundation/BXMath.h"
 
 #include <limits>
 
@@ -65,7 +64,7 @@ Mapped pingPong(Time t, Span const& span, Time step, bool retiming) {
     Tempus const shown = range - step;
     if (shown == kTempusZero)
         return {span.minTime};
-    Tempus const m = BXMath::mod(t - span.maxTime, shown * 2);
+    Tempus const m = TempusModulo(t - span.maxTime, shown * 2);
     return m < shown ? Mapped{shown - m + span.minTime, true} : Mapped{m - shown + step + span.minTime};
 }
 

@@ -8,6 +8,7 @@
 #include "lumenkey/splines/KFSplineState.h"
 #include "lumenkey/splines/KFVertex.h"
 #include "tests/Channels/AddingNode.h"
+#include "tests/Channels/Keypoints.h"
 #include "tests/Channels/RecordingRoot.h"
 
 #include <gtest/gtest.h>
@@ -20,13 +21,13 @@ Tempus s(double t) { return KFChronoForChannelSeconds(t, 600); }
 
 // The columns.
 enum Time { kNone, kCurve, kGlobal };
-enum Linked { kItself, kCompound };
 enum Announced { kSilent, kFirst, kOnceLocal }; // kFirst: before the record is local
-enum Record { kAsItIs, kLocal };
 // Exceptions.
 constexpr unsigned kIgnoresLock = 1;
 constexpr unsigned kKeysTheEmpty = 2; // a curve without keypoints, while nothing is animated
-constexpr unsigned kFollow = 4;       // the fellows go where the channel's keypoint came to stand
+constexpr unsigned kTakenOver = 4;    // by a linked compound
+constexpr unsigned kFollow = 8;       // then the fellows go where the channel's keypoint came to stand
+constexpr unsigned kStaysShared = 16; // the record, which else becomes local
 
 double const kSeven = 7.0;
 
@@ -47,9 +48,7 @@ struct Edit {
     char const* name;
     std::function<void(Subject const&)> run;
     Time time;
-    Linked linked;
     Announced announced;
-    Record record;
     /// What it comes to, in curve time; null where nothing shows.
     std::function<bool(Subject const&)> worked;
     unsigned exceptions = 0;
@@ -61,20 +60,6 @@ double valueAt(KFChannel const& c, double t) {
     double value = -1.0;
     c.getKeyframe(c.getKeyframe(s(t)), nullptr, &value);
     return value;
-}
-
-using Pair = std::pair<double, double>;
-
-Pair input(KFChannel const& c, void* h, bool handles) {
-    Pair p;
-    c.getKeyframeInputTangents(h, &p.first, &p.second, handles);
-    return p;
-}
-
-Pair output(KFChannel const& c, void* h, bool handles) {
-    Pair p;
-    c.getKeyframeOutputTangents(h, &p.first, &p.second, handles);
-    return p;
 }
 
 std::vector<_KFKeyframeInfo> oneKeyframe() {
@@ -93,158 +78,114 @@ std::vector<_KFKeyframeInfo> oneKeyframe() {
 #define RUN(call) #call, [](Subject const& x) { WITH_SUBJECT(x)(void)(c.call); }
 #define EFFECT(expression) [](Subject const& x) -> bool { WITH_SUBJECT(x) return expression; }
 
-// clang-format off
 std::vector<Edit> const kEdits = {
-    // operation                                                  time     linked     announced   record
-    //     effect, exceptions
-    {RUN(setKeyframe(at(3), 7.0, true)),                          kCurve,  kItself,   kSilent,    kLocal,
-     EFFECT(valueAt(c, 3) == 7.0 && input(c, c.getKeyframe(s(3)), false) != Pair()), kKeysTheEmpty},
-    {RUN(setKeyframe(at(3), 7.0, false)),                         kCurve,  kItself,   kSilent,    kLocal,
-     EFFECT(valueAt(c, 3) == 7.0 && input(c, c.getKeyframe(s(3)), false) == Pair()), kKeysTheEmpty},
-    {RUN(setKeyframe(at(3))),                                     kCurve,  kItself,   kSilent,    kLocal,
-     EFFECT(valueAt(c, 3) > 20.0), kKeysTheEmpty},
-    {RUN(setKeyframeIfRecording(at(3))),                          kCurve,  kItself,   kSilent,    kLocal,
-     EFFECT(valueAt(c, 3) > 20.0)},
-    {RUN(setKeyframe(h, at(3), 7.0)),                             kCurve,  kItself,   kSilent,    kLocal,
+    // operation, time, announced, effect, exceptions
+    {RUN(setKeyframe(at(3), 7.0, true)), kCurve, kSilent,
+     EFFECT(valueAt(c, 3) == 7.0 && input(c, c.getKeyframe(s(3)), false) != Handle()), kKeysTheEmpty},
+    {RUN(setKeyframe(at(3), 7.0, false)), kCurve, kSilent,
+     EFFECT(valueAt(c, 3) == 7.0 && input(c, c.getKeyframe(s(3)), false) == Handle()), kKeysTheEmpty},
+    {RUN(setKeyframe(at(3))), kCurve, kSilent, EFFECT(valueAt(c, 3) > 20.0), kKeysTheEmpty},
+    {RUN(setKeyframeIfRecording(at(3))), kCurve, kSilent, EFFECT(valueAt(c, 3) > 20.0)},
+    {RUN(setKeyframe(h, at(3), 7.0)), kCurve, kSilent,
      EFFECT(valueAt(c, 3) == 7.0 && c.getNumberOfKeyframes() == 3)},
-    {RUN(appendKeyframe(at(6), 7.0, true)),                       kCurve,  kItself,   kSilent,    kLocal,
-     EFFECT(valueAt(c, 6) == 7.0), kKeysTheEmpty},
-    {RUN(appendKeyframes(1, x.time(6), &kSeven, true)),           kCurve,  kItself,   kSilent,    kLocal,
-     EFFECT(valueAt(c, 6) == 7.0), kKeysTheEmpty},
-    {RUN(cloneKeyframe(h, at(3))),                                kCurve,  kItself,   kSilent,    kLocal,
-     EFFECT(valueAt(c, 3) == 20.0 && valueAt(c, 2) == 20.0)},
-    {RUN(setKeyframeValue(h, 7.0)),                               kNone,   kItself,   kSilent,    kLocal,
-     EFFECT(valueAt(c, 2) == 7.0 && valueAt(c, 1) == 10.0)},
-    {RUN(setKeyframesValue(7.0)),                                 kNone,   kItself,   kSilent,    kLocal,
+    {RUN(appendKeyframe(at(6), 7.0, true)), kCurve, kSilent, EFFECT(valueAt(c, 6) == 7.0), kKeysTheEmpty},
+    {RUN(appendKeyframes(1, x.time(6), &kSeven, true)), kCurve, kSilent, EFFECT(valueAt(c, 6) == 7.0),
+     kKeysTheEmpty},
+    {RUN(cloneKeyframe(h, at(3))), kCurve, kSilent, EFFECT(valueAt(c, 3) == 20.0 && valueAt(c, 2) == 20.0)},
+    {RUN(setKeyframeValue(h, 7.0)), kNone, kSilent, EFFECT(valueAt(c, 2) == 7.0 && valueAt(c, 1) == 10.0)},
+    {RUN(setKeyframesValue(7.0)), kNone, kSilent,
      EFFECT(c.getKeyframeMinValue(false) == 7.0 && c.getKeyframeMaxValue(false) == 7.0)},
-    {RUN(setKeyframeFlags(h, 0x19)),                              kNone,   kItself,   kSilent,    kLocal,
-     EFFECT(c.getKeyframeFlags(h) == 0x19)},
-    {RUN(deleteAllKeyframes(at(2))),                              kCurve,  kItself,   kSilent,    kLocal,
+    {RUN(setKeyframeFlags(h, 0x19)), kNone, kSilent, EFFECT(c.getKeyframeFlags(h) == 0x19)},
+    {RUN(deleteAllKeyframes(at(2))), kCurve, kSilent,
      EFFECT(!c.hasKeypoints(0) && c.getInitialValue() == 20.0)},
-    {RUN(moveKeyframe(h, at(3), true, false)),                    kCurve,  kItself,   kSilent,    kLocal,
+    {RUN(moveKeyframe(h, at(3), true, false)), kCurve, kSilent,
      EFFECT(valueAt(c, 3) == 20.0 && c.getNumberOfKeyframes() == 3)},
-    {RUN(offsetKeyframe(h, at(3))),                               kCurve,  kItself,   kSilent,    kLocal,
+    {RUN(offsetKeyframe(h, at(3))), kCurve, kSilent,
      EFFECT(valueAt(c, 3) == 20.0 && c.getNumberOfKeyframes() == 3)},
-    {RUN(generateKeyframesFromDynamicCurve(at(2), nullptr)),      kNone,   kItself,   kSilent,    kLocal,
-     nullptr},
-    {RUN(willLoadKeyframes(false, 0)),                            kNone,   kItself,   kSilent,    kLocal,
-     nullptr},
-    {RUN(linearTimeWarp(2.0, at(1))),                             kCurve,  kItself,   kSilent,    kLocal,
-     EFFECT(c.getKeyframeMaxTime() > s(4))},
-    {RUN(reverseKeyframes(c.getKeyframe(s(1)), c.getKeyframe(s(4)))),
-                                                                  kNone,   kItself,   kSilent,    kLocal,
+    {RUN(generateKeyframesFromDynamicCurve(at(2), nullptr)), kNone, kSilent, nullptr},
+    {RUN(willLoadKeyframes(false, 0)), kNone, kSilent, nullptr},
+    {RUN(linearTimeWarp(2.0, at(1))), kCurve, kSilent, EFFECT(c.getKeyframeMaxTime() > s(4))},
+    {RUN(reverseKeyframes(c.getKeyframe(s(1)), c.getKeyframe(s(4)))), kNone, kSilent,
      EFFECT(valueAt(c, 1) == 40.0)},
-    {RUN(reduceKeyframes(at(1), at(4), s(1), 1.0, 1.0, 4, 0)),    kCurve,  kItself,   kSilent,    kLocal,
+    {RUN(reduceKeyframes(at(1), at(4), s(1), 1.0, 1.0, 4, 0)), kCurve, kSilent,
      EFFECT(c.getNumberOfKeyframes() == 2)},
-    {RUN(smoothKeyframes(at(1), at(4), s(1))),                    kCurve,  kItself,   kSilent,    kLocal,
-     EFFECT(c.getKeyframe(s(3)) != nullptr)},
-    {RUN(deriveKeyframe(h)),                                      kNone,   kItself,   kSilent,    kLocal,
+    {RUN(smoothKeyframes(at(1), at(4), s(1))), kCurve, kSilent, EFFECT(c.getKeyframe(s(3)) != nullptr)},
+    {RUN(deriveKeyframe(h)), kNone, kSilent,
      EFFECT((c.getKeyframeFlags(h) & kKFVertexFlagHandlesEdited) == 0)},
-    {RUN(smoothKeyframe(h, false)),                               kNone,   kItself,   kSilent,    kLocal,
-     EFFECT(output(c, h, true) == Pair() && c.isSmoothKeyframe(h))},
-    {RUN(setKeyframeInputTangents(h, -12.0, 6.0, true)),          kNone,   kItself,   kSilent,    kLocal,
-     EFFECT(input(c, h, false) == Pair(-1.0, 0.5))},
-    {RUN(setKeyframeInputTangents(h, -1.0, 0.5, false)),          kNone,   kItself,   kSilent,    kLocal,
-     EFFECT(input(c, h, true) == Pair(-12.0, 6.0))},
-    {RUN(setKeyframeOutputTangents(h, 12.0, 6.0, true)),          kNone,   kItself,   kSilent,    kLocal,
-     EFFECT(output(c, h, false) == Pair(1.0, 0.5))},
-    {RUN(setKeyframeOutputTangents(h, 1.0, 0.5, false)),          kNone,   kItself,   kSilent,    kLocal,
-     EFFECT(output(c, h, true) == Pair(12.0, 6.0))},
-    {RUN(setKeyframeBias(h, 0.25)),                               kNone,   kItself,   kSilent,    kLocal,
-     EFFECT(c.getKeyframeBias(h) == 0.25)},
-    {RUN(setKeyframeNormal(h, 0.5)),                              kNone,   kItself,   kSilent,    kLocal,
-     EFFECT(c.getKeyframeNormal(h) == 0.5)},
-    {RUN(setKeyframeNormal(at(2), 0.5)),                          kCurve,  kItself,   kSilent,    kLocal,
-     EFFECT(c.getKeyframeNormal(h) == 0.5)},
-    {RUN(setKeyframeEnabled(h, false)),                           kNone,   kItself,   kSilent,    kLocal,
+    {RUN(smoothKeyframe(h, false)), kNone, kSilent,
+     EFFECT(output(c, h, true) == Handle() && c.isSmoothKeyframe(h))},
+    {RUN(setKeyframeInputTangents(h, -12.0, 6.0, true)), kNone, kSilent,
+     EFFECT(input(c, h, false) == Handle(-1.0, 0.5))},
+    {RUN(setKeyframeInputTangents(h, -1.0, 0.5, false)), kNone, kSilent,
+     EFFECT(input(c, h, true) == Handle(-12.0, 6.0))},
+    {RUN(setKeyframeOutputTangents(h, 12.0, 6.0, true)), kNone, kSilent,
+     EFFECT(output(c, h, false) == Handle(1.0, 0.5))},
+    {RUN(setKeyframeOutputTangents(h, 1.0, 0.5, false)), kNone, kSilent,
+     EFFECT(output(c, h, true) == Handle(12.0, 6.0))},
+    {RUN(setKeyframeBias(h, 0.25)), kNone, kSilent, EFFECT(c.getKeyframeBias(h) == 0.25)},
+    {RUN(setKeyframeNormal(h, 0.5)), kNone, kSilent, EFFECT(c.getKeyframeNormal(h) == 0.5)},
+    {RUN(setKeyframeNormal(at(2), 0.5)), kCurve, kSilent, EFFECT(c.getKeyframeNormal(h) == 0.5)},
+    {RUN(setKeyframeEnabled(h, false)), kNone, kSilent,
      EFFECT(!c.getKeyframeEnabled(h) && c.getKeyframes(true).size() == 2)},
-    {RUN(setKeyframeSelected(h, true)),                           kNone,   kItself,   kSilent,    kLocal,
+    {RUN(setKeyframeSelected(h, true)), kNone, kSilent,
      EFFECT((c.getKeyframeFlags(h) & kKFVertexFlagSelected) != 0)},
-    {RUN(setKeyframeLocked(h, true)),                             kNone,   kItself,   kSilent,    kLocal,
-     EFFECT(c.getKeyframeLocked(h))},
-    {RUN(setKeyframeTangentsBroken(h, true)),                     kNone,   kItself,   kSilent,    kLocal,
-     EFFECT(c.getKeyframeTangentsBroken(h))},
-    {RUN(setKeyframeTangentsScaled(h, true)),                     kNone,   kItself,   kSilent,    kLocal,
-     EFFECT(c.getKeyframeTangentsScaled(h))},
-    {RUN(setKeyframeTangentsFlat(h)),                             kNone,   kItself,   kSilent,    kLocal,
-     EFFECT(output(c, h, false).second == 0.0)},
-    {RUN(deleteKeyframe(h)),                                      kNone,   kItself,   kOnceLocal, kLocal,
+    {RUN(setKeyframeLocked(h, true)), kNone, kSilent, EFFECT(c.getKeyframeLocked(h))},
+    {RUN(setKeyframeTangentsBroken(h, true)), kNone, kSilent, EFFECT(c.getKeyframeTangentsBroken(h))},
+    {RUN(setKeyframeTangentsScaled(h, true)), kNone, kSilent, EFFECT(c.getKeyframeTangentsScaled(h))},
+    {RUN(setKeyframeTangentsFlat(h)), kNone, kSilent, EFFECT(output(c, h, false).second == 0.0)},
+    {RUN(deleteKeyframe(h)), kNone, kOnceLocal,
      EFFECT(c.getKeyframe(s(2)) == nullptr && c.getNumberOfKeyframes() == 2)},
-    {RUN(setKeyframeInterpolation(h, 1)),                         kNone,   kItself,   kOnceLocal, kLocal,
+    {RUN(setKeyframeInterpolation(h, 1)), kNone, kOnceLocal,
      EFFECT(c.getKeyframeInterpolation(h) == 1 && c.isSmoothKeyframe(h))},
-    {RUN(setCurveSegmentSpeed(h, 3)),                             kNone,   kItself,   kFirst,     kLocal,
-     EFFECT(c.getCurveSegmentSpeed(h) == 3)},
-    {RUN(offsetCurveSegmentSpeed(h, 2.0)),                        kNone,   kItself,   kFirst,     kLocal,
-     nullptr},
-    {RUN(purgeKeyframes()),                                       kNone,   kItself,   kSilent,    kAsItIs,
-     nullptr, kIgnoresLock},
-    {RUN(appendCurveProcessingNode(new AddingNode(1.0))),         kNone,   kItself,   kSilent,    kLocal,
+    {RUN(setCurveSegmentSpeed(h, 3)), kNone, kFirst, EFFECT(c.getCurveSegmentSpeed(h) == 3)},
+    {RUN(offsetCurveSegmentSpeed(h, 2.0)), kNone, kFirst, nullptr},
+    {RUN(purgeKeyframes()), kNone, kSilent, nullptr, kIgnoresLock | kStaysShared},
+    {RUN(appendCurveProcessingNode(new AddingNode(1.0))), kNone, kSilent,
      EFFECT(c.getNumberOfCurveProcessingNodes() == 2), kIgnoresLock},
-    {RUN(insertCurveProcessingNode(new AddingNode(1.0), nullptr)),
-                                                                  kNone,   kItself,   kSilent,    kLocal,
+    {RUN(insertCurveProcessingNode(new AddingNode(1.0), nullptr)), kNone, kSilent,
      EFFECT(c.getNumberOfCurveProcessingNodes() == 2), kIgnoresLock},
-    {RUN(deleteCurveProcessingNode(node)),                        kNone,   kItself,   kSilent,    kLocal,
-     EFFECT(c.getNumberOfCurveProcessingNodes() == 0), kIgnoresLock},
-    {RUN(removeCurveProcessingNode(node) ? delete node : void()), kNone,   kItself,   kSilent,    kLocal,
+    {RUN(deleteCurveProcessingNode(node)), kNone, kSilent, EFFECT(c.getNumberOfCurveProcessingNodes() == 0),
+     kIgnoresLock},
+    {RUN(removeCurveProcessingNode(node) ? delete node : void()), kNone, kSilent,
      EFFECT(c.getNumberOfCurveProcessingNodes() == 0), kIgnoresLock},
     // The family in global time, which a folder passes on; and what works on the curve as a whole.
-    {RUN(addKeypointAt(at(3))),                                   kGlobal, kCompound, kFirst,     kLocal,
-     EFFECT(valueAt(c, 3) > 20.0), kKeysTheEmpty},
-    {RUN(deleteKeypointAt(at(2))),                                kGlobal, kCompound, kFirst,     kLocal,
-     EFFECT(c.getNumberOfKeyframes() == 2)},
-    {RUN(moveKeypointTo(at(2), at(3), false, false)),             kGlobal, kCompound, kFirst,     kLocal,
-     EFFECT(valueAt(c, 3) == 20.0 && c.getNumberOfKeyframes() == 3), kFollow},
-    {RUN(offsetKeyframesInRange(at(2), at(4), s(1), s(0), false, false)),
-                                                                  kGlobal, kCompound, kFirst,     kLocal,
-     EFFECT(valueAt(c, 3) == 20.0 && valueAt(c, 5) == 40.0), kFollow},
-    {RUN(deleteKeypoints(at(1), at(2))),                          kCurve,  kItself,   kOnceLocal, kLocal,
-     EFFECT(c.getNumberOfKeyframes() == 2)},
-    {RUN(retimeKeypoints(2.0, at(1))),                            kCurve,  kItself,   kFirst,     kLocal,
-     EFFECT(c.getKeyframeMaxTime() > s(4))},
-    {RUN(adjustToFrameDuration(s(2))),                            kNone,   kItself,   kSilent,    kLocal,
-     EFFECT(valueAt(c, 4) == 20.0), kIgnoresLock},
-    {RUN(setInterpolation(4)),                                    kNone,   kItself,   kFirst,     kLocal,
-     EFFECT(c.getInterpolation() == 4)},
-    {RUN(setExtrapolation(2, 1)),                                 kNone,   kItself,   kFirst,     kLocal,
-     EFFECT(c.getExtrapolation(1) == 2)},
-    {RUN(closeParametricCurve()),                                 kNone,   kItself,   kSilent,    kLocal,
-     EFFECT(c.isParametricCurveClosed())},
-    {RUN(setUseRetimingExtrapolation(true)),                      kNone,   kItself,   kSilent,    kLocal,
-     EFFECT(c.useRetimingExtrapolation())},
-    {RUN(resetCurve()),                                           kNone,   kItself,   kSilent,    kLocal,
-     EFFECT(!c.hasKeypoints(0))},
-    {RUN(generateKeys(0, 1)),                                     kNone,   kItself,   kFirst,     kLocal,
-     EFFECT(c.getNumberOfKeyframes() > 3)},
-    {RUN(reparametrizeChannel()),                                 kNone,   kItself,   kSilent,    kLocal,
-     nullptr},
-    {RUN(setCustomInterpolator(nullptr, nullptr)),                kNone,   kItself,   kSilent,    kLocal,
-     nullptr},
-    {RUN(createCurveSegment(at(5), at(6), s(0.5), false)),        kCurve,  kItself,   kFirst,     kLocal,
+    {RUN(addKeypointAt(at(3))), kGlobal, kFirst, EFFECT(valueAt(c, 3) > 20.0), kKeysTheEmpty | kTakenOver},
+    {RUN(deleteKeypointAt(at(2))), kGlobal, kFirst, EFFECT(c.getNumberOfKeyframes() == 2), kTakenOver},
+    {RUN(moveKeypointTo(at(2), at(3), false, false)), kGlobal, kFirst,
+     EFFECT(valueAt(c, 3) == 20.0 && c.getNumberOfKeyframes() == 3), kFollow | kTakenOver},
+    {RUN(offsetKeyframesInRange(at(2), at(4), s(1), s(0), false, false)), kGlobal, kFirst,
+     EFFECT(valueAt(c, 3) == 20.0 && valueAt(c, 5) == 40.0), kFollow | kTakenOver},
+    {RUN(deleteKeypoints(at(1), at(2))), kCurve, kOnceLocal, EFFECT(c.getNumberOfKeyframes() == 2)},
+    {RUN(retimeKeypoints(2.0, at(1))), kCurve, kFirst, EFFECT(c.getKeyframeMaxTime() > s(4))},
+    {RUN(adjustToFrameDuration(s(2))), kNone, kSilent, EFFECT(valueAt(c, 4) == 20.0), kIgnoresLock},
+    {RUN(setInterpolation(4)), kNone, kFirst, EFFECT(c.getInterpolation() == 4)},
+    {RUN(setExtrapolation(2, 1)), kNone, kFirst, EFFECT(c.getExtrapolation(1) == 2)},
+    {RUN(closeParametricCurve()), kNone, kSilent, EFFECT(c.isParametricCurveClosed())},
+    {RUN(setUseRetimingExtrapolation(true)), kNone, kSilent, EFFECT(c.useRetimingExtrapolation())},
+    {RUN(resetCurve()), kNone, kSilent, EFFECT(!c.hasKeypoints(0))},
+    {RUN(generateKeys(0, 1)), kNone, kFirst, EFFECT(c.getNumberOfKeyframes() > 3)},
+    {RUN(reparametrizeChannel()), kNone, kSilent, nullptr},
+    {RUN(setCustomInterpolator(nullptr, nullptr)), kNone, kSilent, nullptr},
+    {RUN(createCurveSegment(at(5), at(6), s(0.5), false)), kCurve, kFirst,
      EFFECT(c.getNumberOfKeyframes() == 7), kKeysTheEmpty},
-    {RUN(setCurveSegmentValue(at(1.5), 50.0, false)),             kCurve,  kItself,   kFirst,     kLocal,
+    {RUN(setCurveSegmentValue(at(1.5), 50.0, false)), kCurve, kFirst,
      EFFECT(c.getCurveValue(s(1.5), false) > 49.0)},
-    {RUN(setCurveSegmentValue(at(1.5), 15.5, true)),              kCurve,  kItself,   kFirst,     kLocal,
-     EFFECT(valueAt(c, 1) != 10.0)},
-    {RUN(bake({at(1), s(2)}, s(1))),                              kGlobal, kItself,   kFirst,     kLocal,
+    {RUN(setCurveSegmentValue(at(1.5), 15.5, true)), kCurve, kFirst, EFFECT(valueAt(c, 1) != 10.0)},
+    {RUN(bake({at(1), s(2)}, s(1))), kGlobal, kFirst,
      EFFECT(!c.getCurveInterface()->getSplineState()->sanitizeBezier)},
-    {RUN(simplify(at(1), at(4), s(1), 1.0, 4, 0, false)),         kGlobal, kItself,   kFirst,     kLocal,
+    {RUN(simplify(at(1), at(4), s(1), 1.0, 4, 0, false)), kGlobal, kFirst,
      EFFECT(c.getNumberOfKeyframes() == 2)},
-    {RUN(copyKeyframesFromChannel(at(6), other)),                 kGlobal, kItself,   kSilent,    kLocal,
-     EFFECT(valueAt(c, 6) == 5.0), kKeysTheEmpty},
-    {RUN(offsetKeyframesValuesInRange(at(2), at(3), at(2), 7.0)), kGlobal, kItself,   kSilent,    kLocal,
+    {RUN(copyKeyframesFromChannel(at(6), other)), kGlobal, kSilent, EFFECT(valueAt(c, 6) == 5.0),
+     kKeysTheEmpty},
+    {RUN(offsetKeyframesValuesInRange(at(2), at(3), at(2), 7.0)), kGlobal, kSilent,
      EFFECT(valueAt(c, 2) == 7.0 && valueAt(c, 4) == 40.0)},
-    {RUN(setKeyframesWithInfo(at(3), oneKeyframe())),             kCurve,  kItself,   kSilent,    kLocal,
-     EFFECT(valueAt(c, 3) == 7.0), kKeysTheEmpty},
-    {RUN(setFadeInOffset(s(1), false)),                           kNone,   kItself,   kOnceLocal, kLocal,
-     EFFECT(c.getFadeInOffset() == s(1))},
-    {RUN(setFadeOutOffset(s(1), false)),                          kNone,   kItself,   kOnceLocal, kLocal,
-     EFFECT(c.getFadeOutOffset() == s(1))},
-    {RUN(setFadeInCurve(2)),                                      kNone,   kItself,   kOnceLocal, kLocal,
-     EFFECT(c.getFadeInCurve() == 2)},
-    {RUN(setFadeOutCurve(2)),                                     kNone,   kItself,   kOnceLocal, kLocal,
-     EFFECT(c.getFadeOutCurve() == 2)},
+    {RUN(setKeyframesWithInfo(at(3), oneKeyframe())), kCurve, kSilent, EFFECT(valueAt(c, 3) == 7.0),
+     kKeysTheEmpty},
+    {RUN(setFadeInOffset(s(1), false)), kNone, kOnceLocal, EFFECT(c.getFadeInOffset() == s(1))},
+    {RUN(setFadeOutOffset(s(1), false)), kNone, kOnceLocal, EFFECT(c.getFadeOutOffset() == s(1))},
+    {RUN(setFadeInCurve(2)), kNone, kOnceLocal, EFFECT(c.getFadeInCurve() == 2)},
+    {RUN(setFadeOutCurve(2)), kNone, kOnceLocal, EFFECT(c.getFadeOutCurve() == 2)},
 };
-// clang-format on
 
 // Reads: true in their own time base, and in no other.
 
@@ -411,12 +352,13 @@ TEST(KeyframeDecisions, ALinkedCompoundTakesOverWhatTheTableNames) {
             bool const obeys = (edit.exceptions & kIgnoresLock) == 0;
             EXPECT_EQ(f.point.x.compare(locked && obeys ? &before : &plain.x.c), true);
             // The lock of a component stops neither the compound nor its fellows.
-            bool const stays = edit.linked == kItself || (locked && (edit.exceptions & kFollow) != 0);
+            bool const isTakenOver = (edit.exceptions & kTakenOver) != 0;
+            bool const stays = !isTakenOver || (locked && (edit.exceptions & kFollow) != 0);
             EXPECT_EQ(f.point.y.compare(&before), stays);
             EXPECT_EQ(f.point.z.compare(&f.point.y), true);
             EXPECT_TRUE(f.point.testFoldFlag(kFoldFlagLinked));
             auto const announced = f.root.takeAnnounced();
-            if (edit.linked == kItself && (locked || edit.announced == kSilent)) {
+            if (!isTakenOver && (locked || edit.announced == kSilent)) {
                 EXPECT_TRUE(announced.empty());
             } else {
                 ASSERT_GE(announced.size(), 2U);
@@ -438,7 +380,7 @@ TEST(KeyframeDecisions, TheRecordTurnsLocalAndTheHostHearsAsTheTableSays) {
             f.root.takeAnnounced();
             edit.run(f.subject(f.alone));
             bool const acts = !(locked && obeys);
-            EXPECT_EQ(f.alone.getImpl()->isShared(), !(acts && edit.record == kLocal));
+            EXPECT_EQ(f.alone.getImpl()->isShared(), !(acts && (edit.exceptions & kStaysShared) == 0));
             auto const announced = f.root.takeAnnounced();
             ASSERT_EQ(!announced.empty(), acts && edit.announced != kSilent);
             if (!announced.empty()) {

@@ -3,14 +3,13 @@
 #include "lumenkey/Channels/KFChannelTimeConverter.h"
 #include "lumenkey/Channels/KFScalarChannels.h"
 #include "lumenkey/splines/KFInterpolation.h"
+#include "tests/Channels/Keypoints.h"
 #include "tests/Channels/RecordingRoot.h"
 
 #include <gtest/gtest.h>
 
 #include <algorithm>
-#include <cmath>
 #include <random>
-#include <tuple>
 
 namespace {
 
@@ -27,39 +26,6 @@ struct Fixture {
         root.takeAnnounced();
     }
 };
-
-/// What there is to each keypoint.
-std::vector<std::tuple<Tempus, double>> keypointsOf(KFChannel const& channel) {
-    std::vector<std::tuple<Tempus, double>> all;
-    for (void* const handle : channel.getKeyframes(false)) {
-        Tempus time;
-        double value = 0.0;
-        channel.getKeyframe(handle, &time, &value);
-        all.emplace_back(time, value);
-    }
-    return all;
-}
-
-std::vector<Tempus> timesOf(KFChannel const& channel) {
-    std::vector<Tempus> times;
-    for (auto const& keypoint : keypointsOf(channel))
-        times.push_back(std::get<0>(keypoint));
-    return times;
-}
-
-using Pair = std::pair<double, double>;
-
-Pair input(KFChannel const& c, void* h, bool handles) {
-    Pair p;
-    c.getKeyframeInputTangents(h, &p.first, &p.second, handles);
-    return p;
-}
-
-Pair output(KFChannel const& c, void* h, bool handles) {
-    Pair p;
-    c.getKeyframeOutputTangents(h, &p.first, &p.second, handles);
-    return p;
-}
 
 TEST(KFChannelKeyframes, AreFoundAgainWhereConvertingTheirTimesRounds) {
     Fixture f(s(1'234'567'891, 1'000'000'007)); // no timescale holds the sums
@@ -147,9 +113,9 @@ TEST(KFChannelKeyframes, ArePastedFromAChannelOfAnotherScale) {
     EXPECT_TRUE(f.root.takeAnnounced().empty());
     f.channel.copyKeyframesFromChannel(s(0), nullptr);
     f.channel.copyKeyframesFromChannel(s(0), &source.root);
-    EXPECT_EQ(keypointsOf(f.channel), (std::vector<std::tuple<Tempus, double>>{
-                                          {s(5), 5.0}, {s(6), 10.0}, {s(7), -1.0}, {s(8), 20.0}}));
-    EXPECT_EQ(output(f.channel, f.channel.getKeyframe(s(6)), false), Pair(0.25, 1.5));
+    EXPECT_EQ(keypointsOf(f.channel),
+              (std::vector{std::pair{s(5), 5.0}, {s(6), 10.0}, {s(7), -1.0}, {s(8), 20.0}}));
+    EXPECT_EQ(output(f.channel, f.channel.getKeyframe(s(6)), false), Handle(0.25, 1.5));
     EXPECT_EQ(f.channel.getKeyframeInterpolation(f.channel.getKeyframe(s(8))), kKFInterpolationLinear);
     EXPECT_EQ(keypointsOf(source.channel).size(), 3u);
 
@@ -171,11 +137,11 @@ TEST(KFChannelKeyframes, ASinglePastedOneLeavesALevelCurveLevel) {
     info.interpolation = kKFInterpolationBezier;
     info.outputTangentX = info.outputTangentY = 12.0;
     f.channel.setKeyframesWithInfo(s(2), {info});
-    EXPECT_EQ(output(f.channel, f.channel.getKeyframe(s(1)), false), Pair());
-    EXPECT_EQ(output(f.channel, f.channel.getKeyframe(s(2)), false), Pair());
+    EXPECT_EQ(output(f.channel, f.channel.getKeyframe(s(1)), false), Handle());
+    EXPECT_EQ(output(f.channel, f.channel.getKeyframe(s(2)), false), Handle());
     info.value = 6.0;
     f.channel.setKeyframesWithInfo(s(2), {info});
-    EXPECT_EQ(output(f.channel, f.channel.getKeyframe(s(2)), true), Pair(12.0, 12.0));
+    EXPECT_EQ(output(f.channel, f.channel.getKeyframe(s(2)), true), Handle(12.0, 12.0));
 }
 
 TEST(KFChannelKeyframes, ArePastedAtATimeOverWhatIsThereOrInItsPlace) {
@@ -220,41 +186,27 @@ struct Tree {
     }
 };
 
-testing::AssertionResult sameKeyframes(KFChannel const& channel, KFChannel const& as,
-                                       Tempus const& later = kTempusZero) {
-    auto const is = channel.getKeyframes(false);
-    auto const was = as.getKeyframes(false);
-    if (is.size() != was.size())
-        return testing::AssertionFailure() << is.size() << " and not " << was.size();
-    for (std::size_t i = 0; i < is.size(); ++i) {
-        auto const numbers = [](KFChannel const& c, void* h, Tempus* t) {
-            double value = 0.0;
-            c.getKeyframe(h, t, &value);
-            auto const [inU, inV] = input(c, h, true);
-            auto const [outU, outV] = output(c, h, true);
-            return std::vector<double>{value,
-                                       inU,
-                                       inV,
-                                       outU,
-                                       outV,
-                                       c.getKeyframeBias(h),
-                                       c.getKeyframeNormal(h),
-                                       double(c.getKeyframeFlags(h)),
-                                       double(c.getKeyframeInterpolation(h)),
-                                       double(c.getKeyframeEnabled(h))};
-        };
-        Tempus time, timeBefore;
-        auto const now = numbers(channel, is[i], &time);
-        auto const then = numbers(as, was[i], &timeBefore);
-        for (std::size_t k = 0; k < now.size(); ++k) {
-            if (std::fabs(now[k] - then[k]) > 1e-12)
-                return testing::AssertionFailure()
-                       << "keypoint " << i << ", attribute " << k << ": " << now[k] << ", not " << then[k];
-        }
-        if (time != timeBefore + later)
-            return testing::AssertionFailure() << "time of keypoint " << i;
+/// All but the times, one after the other.
+std::vector<double> attributesOf(KFChannel const& c) {
+    std::vector<double> all;
+    for (void* const h : c.getKeyframes(false)) {
+        double value = 0.0;
+        c.getKeyframe(h, nullptr, &value);
+        auto const [inU, inV] = input(c, h, true);
+        auto const [outU, outV] = output(c, h, true);
+        for (double const number : {value, inU, inV, outU, outV, c.getKeyframeBias(h), c.getKeyframeNormal(h),
+                                    double(c.getKeyframeFlags(h)), double(c.getKeyframeInterpolation(h)),
+                                    double(c.getKeyframeEnabled(h))})
+            all.push_back(number);
     }
-    return testing::AssertionSuccess();
+    return all;
+}
+
+void expectKeyframes(KFChannel const& is, KFChannel const& was, Tempus const& later = kTempusZero) {
+    ASSERT_EQ(timesOf(is), timesOf(was, later));
+    auto const now = attributesOf(is), then = attributesOf(was);
+    for (std::size_t i = 0; i < then.size(); ++i)
+        EXPECT_NEAR(now[i], then[i], 1e-12) << i;
 }
 
 /// Keypoints with attributes at random: the first, at 1 s, may be disabled (of the others only enabled ones are
@@ -293,12 +245,12 @@ TEST(KFChannelKeyframes, WhateverIsGatheredIsRestoredByPasting) {
         tree.b.deleteAllKeyframes(s(0));
         tree.root.setKeyframesWithChannelRef(s(1), s(0), gathered, round % 2 == 0);
         tree.root.setKeyframesWithChannelRef(s(1), s(0), gathered, false); // onto themselves
-        ASSERT_TRUE(sameKeyframes(tree.a, a));
-        ASSERT_TRUE(sameKeyframes(tree.b, b));
+        expectKeyframes(tree.a, a);
+        expectKeyframes(tree.b, b);
 
         target.root.setKeyframesWithChannelRef(s(3), s(0), gathered, true);
-        ASSERT_TRUE(sameKeyframes(target.a, a, s(2)));
-        ASSERT_TRUE(sameKeyframes(target.b, b, s(2)));
+        expectKeyframes(target.a, a, s(2));
+        expectKeyframes(target.b, b, s(2));
     }
 }
 

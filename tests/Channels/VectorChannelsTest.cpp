@@ -5,6 +5,7 @@
 #include "lumenkey/splines/KFCoreGlobals.h"
 #include "lumenkey/splines/KFInterpolation.h"
 #include "tests/Channels/AddingNode.h"
+#include "tests/Channels/Keypoints.h"
 #include "tests/Channels/RecordingRoot.h"
 
 #include <gtest/gtest.h>
@@ -38,23 +39,17 @@ std::array<double, 3> valuesAt(KFChannel3D const& point, std::int64_t t) {
     return values;
 }
 
-/// Input time and value, output time and value.
-std::array<double, 4> handlesAt(KFChannel& channel, std::int64_t t) {
-    std::array<double, 4> handles{};
+/// At a time, input and output.
+std::array<Handle, 2> handlesAt(KFChannel& channel, std::int64_t t) {
     void* const keypoint = channel.getKeyframe(s(t));
-    channel.getKeyframeInputTangents(keypoint, &handles[0], &handles[1], true);
-    channel.getKeyframeOutputTangents(keypoint, &handles[2], &handles[3], true);
-    return handles;
+    return {input(channel, keypoint, true), output(channel, keypoint, true)};
 }
 
-std::string keyedSeconds(KFChannel const& channel) {
-    std::string list;
-    for (void* const handle : channel.getKeyframes(false)) {
-        Tempus time;
-        channel.getKeyframe(handle, &time, nullptr);
-        list += std::to_string(time.value / time.timescale) + " ";
-    }
-    return list;
+std::vector<Tempus> seconds(std::initializer_list<std::int64_t> list) {
+    std::vector<Tempus> times;
+    for (std::int64_t const t : list)
+        times.push_back(s(t));
+    return times;
 }
 
 TEST(KFVectorChannels, ComponentsHaveTheirNamesAndIDs) {
@@ -169,14 +164,14 @@ TEST(KFVectorChannels, FlattensAndStraightensTheKeypointsOfXAndY) {
     point.flattenAtTime(s(7)); // no keypoint
     point.setLinearAtTime(s(7));
     EXPECT_TRUE(root.takeAnnounced().empty());
-    EXPECT_EQ(handlesAt(point.x, 1), (std::array{0.0, 0.0, 0.0, 0.0}));
-    EXPECT_EQ(handlesAt(point.y, 1), (std::array{0.0, 0.0, 0.0, 0.0}));
+    EXPECT_EQ(handlesAt(point.x, 1), (std::array<Handle, 2>{}));
+    EXPECT_EQ(handlesAt(point.y, 1), (std::array<Handle, 2>{}));
     EXPECT_TRUE(!isBroken(point.x) && isBroken(point.z));
     point.setLinearAtTime(s(1));
     EXPECT_FALSE(root.takeAnnounced().empty());
     EXPECT_TRUE(type(point.y) == kKFInterpolationLinear && type(point.z) == typeBefore);
     EXPECT_EQ(handlesAt(point.z, 1), before);
-    EXPECT_EQ(keyedSeconds(point.x), "0 1 2 ");
+    EXPECT_EQ(timesOf(point.x), seconds({0, 1, 2}));
 }
 
 TEST(KFVectorChannels, DerivesHandlesAlongThePath) {
@@ -194,12 +189,12 @@ TEST(KFVectorChannels, DerivesHandlesAlongThePath) {
         plane.deriveChannel(s(1)); // keys y, which has no other keypoint
         EXPECT_EQ(plane.y.getCurveValue(s(1), true), 4.0);
         double const rise = hasPrevious && hasNext ? 4.0 : hasPrevious ? 3.0 : 5.0;
-        ASSERT_EQ(keyedSeconds(plane.y), "1 ");
+        ASSERT_EQ(timesOf(plane.y), seconds({1}));
         auto const ofX = handlesAt(plane.x, 1);
         auto const ofY = handlesAt(plane.y, 1);
-        EXPECT_NEAR(ofX[1], -rise, 1e-12);
-        EXPECT_NEAR(ofX[3], rise, 1e-12);
-        EXPECT_TRUE(ofY[1] == 0.0 && ofY[3] == 0.0);
+        EXPECT_NEAR(ofX[0].second, -rise, 1e-12);
+        EXPECT_NEAR(ofX[1].second, rise, 1e-12);
+        EXPECT_TRUE(ofY[0].second == 0.0 && ofY[1].second == 0.0);
     }
 }
 
@@ -217,8 +212,8 @@ TEST(KFVectorChannels, SimplifyingKeepsTheKeypointsWhereThePathTurns) {
         plane.y.setKeyframe(s(9), 0.0, false); // x is keyed there, too
         plane.simplify(inRange ? s(0) : s(3), s(4), s(1), 1.0, KFCurve::kSimplifyToExtremes, 0, false);
         // 1 goes, so 2 isn't looked at; 3 is where the path turns.
-        EXPECT_EQ(keyedSeconds(plane.x), inRange ? "0 2 3 5 6 9 " : "0 1 2 3 5 6 9 ");
-        EXPECT_EQ(keyedSeconds(plane.y), keyedSeconds(plane.x));
+        EXPECT_EQ(timesOf(plane.x), inRange ? seconds({0, 2, 3, 5, 6, 9}) : seconds({0, 1, 2, 3, 5, 6, 9}));
+        EXPECT_EQ(timesOf(plane.y), timesOf(plane.x));
     }
 }
 
@@ -233,8 +228,8 @@ TEST(KFVectorChannels, SimplifyingLeavesBothComponentsWithTheSameKeypoints) {
         plane.y.setKeyframe(s(t), t % 4, false);
     }
     plane.simplify(s(0), s(6), s(1), 0.0, 0, 0, false); // none lies in this range of global time
-    EXPECT_EQ(keyedSeconds(plane.x), "0 2 3 6 ");
-    EXPECT_EQ(keyedSeconds(plane.y), "0 2 3 6 ");
+    EXPECT_EQ(timesOf(plane.x), seconds({0, 2, 3, 6}));
+    EXPECT_EQ(timesOf(plane.y), seconds({0, 2, 3, 6}));
 }
 
 TEST(KFVectorChannels, SwitchesReadBackAsTheyWereSet) {
