@@ -8,8 +8,6 @@
 #include "lumenkey/splines/KFSpline.h"
 #include "lumenkey/splines/KFSplineExtremes.h"
 
-#include <utility>
-
 namespace {
 
 using Time = Tempus const&;

@@ -4,8 +4,8 @@
 #include "lumenkey/Channels/KFCompoundChannel.h"
 #include "lumenkey/Channels/KFScalarChannels.h"
 #include "lumenkey/curves/KFCurve.h"
-#include "lumenkey/splines/KFCoreGlobals.h"
 #include "tests/Channels/AddingNode.h"
+#include "tests/Channels/Animating.h"
 #include "tests/Channels/RecordingRoot.h"
 
 #include <gtest/gtest.h>
@@ -18,11 +18,6 @@
 namespace {
 
 Tempus s(std::int64_t value, std::int32_t timescale = 1) { return TempusMake(value, timescale); }
-
-struct Animated {
-    Animated() { KFCoreGlobals::getInstance().animate = true; }
-    ~Animated() { KFCoreGlobals::getInstance().animate = false; }
-};
 
 using Announced = std::vector<std::pair<KFChannelBase*, unsigned>>;
 
@@ -121,7 +116,7 @@ TEST(KFChannelValue, IsKeyedWhileAnimatedAndAConstantOtherwise) {
     tree.root.addsKeypointAt0 = true;
     channel.setValue(s(6), 1.0, false);
     {
-        Animated const animated;
+        Animating const animating;
         channel.setValue(s(6), 9.0, false);
         channel.setValue(s(8));
     }

@@ -2,7 +2,7 @@
 
 #include "lumenkey/Channels/KFCompoundChannel.h"
 #include "lumenkey/Channels/KFScalarChannels.h"
-#include "lumenkey/splines/KFCoreGlobals.h"
+#include "tests/Channels/Animating.h"
 #include "tests/Channels/RecordingRoot.h"
 
 #include <gtest/gtest.h>
@@ -12,12 +12,6 @@
 namespace {
 
 Tempus s(std::int64_t value) { return TempusMake(value, 1); }
-
-/// While one exists, a value that is set is keyed, also on a curve without keypoints.
-struct Animating {
-    Animating() { KFCoreGlobals::getInstance().animate = true; }
-    ~Animating() { KFCoreGlobals::getInstance().animate = false; }
-};
 
 struct Point : KFCompoundChannel {
     explicit Point(KFChannelFolder* parent = nullptr, bool linked = false)

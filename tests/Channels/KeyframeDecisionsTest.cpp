@@ -4,10 +4,10 @@
 #include "lumenkey/Channels/KFChannelImpl.h"
 #include "lumenkey/Channels/KFVectorChannels.h"
 #include "lumenkey/curves/KFCurve.h"
-#include "lumenkey/splines/KFCoreGlobals.h"
 #include "lumenkey/splines/KFSplineState.h"
 #include "lumenkey/splines/KFVertex.h"
 #include "tests/Channels/AddingNode.h"
+#include "tests/Channels/Animating.h"
 #include "tests/Channels/Keypoints.h"
 #include "tests/Channels/RecordingRoot.h"
 
@@ -403,15 +403,13 @@ TEST(KeyframeDecisions, TheRecordTurnsLocalAndTheHostHearsAsTheTableSays) {
 }
 
 TEST(KeyframeDecisions, EditsAreForcedButWhenRecording) {
-    KFCoreGlobals& globals = KFCoreGlobals::getInstance();
     for (bool const animate : {false, true}) {
         for (Edit const& edit : kEdits) {
             SCOPED_TRACE(edit.name);
             Fixture f;
             KFChannelDouble empty("e", &f.root, 20, 0);
-            globals.animate = animate;
+            Animating const animating(animate);
             edit.run(f.subject(empty));
-            globals.animate = false;
             bool const recording = animate && std::string(edit.name).starts_with("setKeyframeIfRecording");
             EXPECT_EQ(empty.hasKeypoints(0), (edit.exceptions & kKeysTheEmpty) != 0 || recording);
         }

@@ -2,9 +2,9 @@
 
 #include "lumenkey/Channels/KFVectorChannels.h"
 #include "lumenkey/curves/KFCurve.h"
-#include "lumenkey/splines/KFCoreGlobals.h"
 #include "lumenkey/splines/KFInterpolation.h"
 #include "tests/Channels/AddingNode.h"
+#include "tests/Channels/Animating.h"
 #include "tests/Channels/Keypoints.h"
 #include "tests/Channels/RecordingRoot.h"
 
@@ -16,12 +16,6 @@
 namespace {
 
 Tempus s(std::int64_t value) { return TempusMake(value, 1); }
-
-/// While one exists, a value that is set is keyed, also on a curve without keypoints.
-struct Animating {
-    Animating() { KFCoreGlobals::getInstance().animate = true; }
-    ~Animating() { KFCoreGlobals::getInstance().animate = false; }
-};
 
 /// "name:id" of each child.
 std::string children(KFChannelFolder const& folder) {
