@@ -63,6 +63,8 @@ TEST_F(ChannelShape, KnowsTheSlidersEndAndTheRootsFrame) {
     channel.setCurveSegmentValue(s(1.5), 50.0, true);
     EXPECT_NEAR(channel.getCurveValue(s(1.5), false), 4.5,
                 1e-9); // the upper of the two is at the slider's end
+    channel.setCurveSegmentValue(s(1.5), 50.0, false);
+    EXPECT_NEAR(channel.getCurveValue(s(1.5), false), 50.0, 1e-9);
     root.frameDuration = TempusMake(1, 24);
     channel.setUseRetimingExtrapolation(true);
     EXPECT_EQ(curve().getFrameDuration(), root.frameDuration);
