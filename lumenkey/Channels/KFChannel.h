@@ -23,13 +23,15 @@ struct KFFadeBlock;
 /// first difference, and gives it up again when `resetToDefault` finds it back at the class's state. So a channel
 /// at its class's state is a few pointers, and owns no memory of its own but a long name.
 ///
-/// Times are global unless an operation says curve time: `globalToLocalTime` converts, down to the nearest time
-/// converter or object root. Where that rounds, the keypoint whose global time is asked for counts as standing there;
-/// a step to a neighbouring keypoint never ends where it began. Doubles are equal within 1e-7.
+/// Times are global unless an operation says curve time: `globalToLocalTime` converts, down to the nearest
+/// time converter or object root. Where that rounds, the keypoint whose global time is asked for counts as
+/// standing there; a step to a neighbouring keypoint never ends where it began. Doubles are equal within
+/// 1e-7.
 ///
-/// A locked channel (bit 2 of its own) ignores every form of setting, removing and moving values, `offsetChannel`,
-/// `scaleChannel`, the limits, the switches of the curve's shape, and the beginning of takes. It obeys `resetToDefault`,
-/// `setInitialValue`, `setDefaultValue`, the info setters, `copy` and `assign`.
+/// A locked channel (bit 2 of its own) ignores every form of setting, removing and moving values,
+/// `offsetChannel`, `scaleChannel`, the limits, the switches of the curve's shape, and the beginning of
+/// takes. It obeys `resetToDefault`, `setInitialValue`, `setDefaultValue`, the info setters, `copy` and
+/// `assign`.
 ///
 /// Threads: values may be read on any number of threads beside one that edits keypoints or the constant of a channel
 /// with a local record. Not beside reads of that channel may run: what exchanges the record, the curve or its root (the
@@ -55,15 +57,16 @@ public:
     char const* getFacadeWrapperName() override;
     void lock(bool on, bool passDown) override;
     void setDefaultToCurrentValue() override;
-    // A take: values are recorded into the curve while time runs, and become keypoints at the end (`KFRecordingNode`
-    // tells how, by `scope` and `mode`). In order: `beginPlayback`, `beginRecording`, any number of `setValue`,
-    // `updateCurrentRecordingTime` while a value is held, `endRecording`, `endPlayback`. A channel without keypoints
-    // takes part in none. The times of both playback operations are curve times.
+    // A take: values are recorded into the curve while time runs, and become keypoints at the end
+    // (`KFRecordingNode` tells how, by `scope` and `mode`). In order: `beginPlayback`, `beginRecording`, any
+    // number of `setValue`, `updateCurrentRecordingTime` while a value is held, `endRecording`,
+    // `endPlayback`. A channel without keypoints takes part in none. The times of both playback operations
+    // are curve times.
     //
-    // A locked channel doesn't begin a take, but ends one. `beginRecording` forgets all callbacks, `endRecording` needs
-    // no recording to tell the object root. The callbacks hear of every value that is set while recording, with this
-    // channel and global time; `wantsWrapper` asks for the channel's facade wrapper in its place where there is a
-    // facade.
+    // A locked channel doesn't begin a take, but ends one. `beginRecording` forgets all callbacks,
+    // `endRecording` needs no recording to tell the object root. The callbacks hear of every value that is
+    // set while recording, with this channel and global time; `wantsWrapper` asks for the channel's facade
+    // wrapper in its place where there is a facade.
     void beginPlayback(Tempus const& t, unsigned int scope, unsigned int mode,
                        Tempus const& resolution) override;
     void endPlayback(Tempus const& t) override;
@@ -130,9 +133,10 @@ public:
     /// Only where the object root says that selected behaviors affect the channel, else nothing and no announcement.
     /// The nodes stay: it is for the caller to take them out.
     void bake(BXTimeRange const& range, Tempus const& step) override;
-    /// `KFCurve::simplifyCurve` between two global times; `step` isn't converted. The tolerance is `percent` of what
-    /// the curve's values span, the fine delta where they span nothing, and with `clampToCoarse` at most the coarse
-    /// delta; the curve keeps a hundredth of that over the scale. `mode1` is the curve's mode, `mode2` its radius.
+    /// `KFCurve::simplifyCurve` between two global times; `step` isn't converted. The tolerance is `percent`
+    /// of what the curve's values span, the fine delta where they span nothing, and with `clampToCoarse` at
+    /// most the coarse delta; the curve keeps a hundredth of that over the scale. `mode1` is the curve's
+    /// mode, `mode2` its radius.
     void simplify(Tempus const& a, Tempus const& b, Tempus const& step, double percent, unsigned int mode1,
                   unsigned int mode2, bool clampToCoarse) override;
     /// `KFCurve::generateKeypoints`.
@@ -169,14 +173,15 @@ public:
     virtual double getSliderMax() const;
     /// Start and end of the range in local time, and the duration of a frame. Outputs may be null.
     virtual void getBakeParameters(BXTimeRange const& range, Tempus* start, Tempus* end, Tempus* frame) const;
-    /// The smallest and largest value between two curve times, overshoot and extrapolated stretches included, without
-    /// processing nodes, fades and the curve's limits. Nothing is sampled: each piece of the curve says what its
-    /// extremes are, as `KFChannelSegmentVisitor::visitSegments` tells the pieces, with what that leaves out. So where
-    /// there is no piece, as in a stretch whose end is before its start, the outputs are the largest and the lowest
-    /// finite double. An output may be null; false, with nothing done, if both are.
+    /// The smallest and largest value between two curve times, overshoot and extrapolated stretches included,
+    /// without processing nodes, fades and the curve's limits. Nothing is sampled: each piece of the curve
+    /// says what its extremes are, as `KFChannelSegmentVisitor::visitSegments` tells the pieces, with what
+    /// that leaves out. So where there is no piece, as in a stretch whose end is before its start, the
+    /// outputs are the largest and the lowest finite double. An output may be null; false, with nothing done,
+    /// if both are.
     ///
-    /// The time grows with the keypoints, but not with the number of cycles of a curve that repeats. The spline's lock
-    /// is held while whole segments are looked at; nobody may edit the curve meanwhile.
+    /// The time grows with the keypoints, but not with the number of cycles of a curve that repeats. The
+    /// spline's lock is held while whole segments are looked at; nobody may edit the curve meanwhile.
     virtual bool getCurrentMinAndMax(Tempus const& from, Tempus const& to, double* minimum, double* maximum);
     virtual unsigned int getNumberOfKeyframes() const;
     /// By handle, in curve time. False on a locked channel.
@@ -410,10 +415,10 @@ public:
     bool getKeyframesTimeAndValue(TempusRange range,
                                   std::vector<std::pair<Tempus, std::pair<double, unsigned>>>& out,
                                   Tempus* first, Tempus* last) const;
-    /// Appends to `times` the global times at which the curve has `value`, within `range` less a frame at its end: what
-    /// the curve's `getUForValue` finds, without extrapolation and processing nodes. The start of `range` is global. A
-    /// frame is that of the object root, and `fallbackFrameDuration` without one. With `flags` 1 the times descend.
-    /// False, and nothing is appended, if there are none.
+    /// Appends to `times` the global times at which the curve has `value`, within `range` less a frame at its
+    /// end: what the curve's `getUForValue` finds, without extrapolation and processing nodes. The start of
+    /// `range` is global. A frame is that of the object root, and `fallbackFrameDuration` without one. With
+    /// `flags` 1 the times descend. False, and nothing is appended, if there are none.
     bool getTimeForValue(double value, std::vector<Tempus>& times, BXTimeRange const& range,
                          Tempus const& fallbackFrameDuration, unsigned int flags) const;
     unsigned int getInterpolation() const;
@@ -431,9 +436,9 @@ public:
     double getKeyframeMaxValueInRange(Tempus const& from, Tempus const& to) const;
     /// Shifts the values of those keypoints alike, so that the curve would pass through `value` at global time `t`.
     void offsetKeyframesValuesInRange(Tempus const& from, Tempus const& to, Tempus const& t, double value);
-    /// Pastes records with their spacing, the first at curve time `t`, over whatever keypoints are there, with all that
-    /// they hold; a single one that stands as high as a neighbour has no handle on that side. Takes no account of
-    /// scales, and announces nothing.
+    /// Pastes records with their spacing, the first at curve time `t`, over whatever keypoints are there,
+    /// with all that they hold; a single one that stands as high as a neighbour has no handle on that side.
+    /// Takes no account of scales, and announces nothing.
     void setKeyframesWithInfo(Tempus const& t, std::vector<_KFKeyframeInfo> const& keyframes);
 
     // Fades -----------------------------------------------------------------------------------------------------
@@ -474,8 +479,8 @@ private:
     /// The checks and the announcement in front of an edit; false to stop.
     bool beginEdit();
     double spanOfValues() const;
-    /// What a keypoint at global time `t` has as its time: where converting rounds, that of the keypoint whose global
-    /// time is `t`, if there is one.
+    /// What a keypoint at global time `t` has as its time: where converting rounds, that of the keypoint
+    /// whose global time is `t`, if there is one.
     Tempus curveTimeAt(Tempus const& t) const;
     void* keypointAt(Tempus const& t) const;
     template <class Step> bool stepToKeypoint(Tempus* t, Step step) const;

@@ -139,9 +139,10 @@ public:
 
     // Of BXSerializer, with the digest of the state and the state blob.
     //
-    // A document is written by `markFactoriesForSerialization`, `KFFactories::saveFactories`, `writeHeader`, `writeBody`
-    // and the end of the element, in this order. Reading keeps what it finds: the flags of a class, children that
-    // the document doesn't mention, and what it can't read stays as it was. A locked node is read like any other.
+    // A document is written by `markFactoriesForSerialization`, `KFFactories::saveFactories`, `writeHeader`,
+    // `writeBody` and the end of the element, in this order. Reading keeps what it finds: the flags of a
+    // class, children that the document doesn't mention, and what it can't read stays as it was. A locked
+    // node is read like any other.
     void writeHeader(BXSerializerWriteStream& stream, bool full) override;
     void writeBody(BXSerializerWriteStream& stream, bool full, bool children, bool all) override;
     void markFactoriesForSerialization(BXSerializerWriteStream& stream, bool all) override;
@@ -150,8 +151,9 @@ public:
     bool parseElement(BXSerializerReadStream& stream, BXStreamElement& element) override;
     /// A digest of what is seen at `t`; names, IDs and keypoints don't enter.
     virtual void calcHashForState(BXSerializerWriteStream& stream, Tempus const& t);
-    /// Reads a document into this channel, which takes its ID; false where it is broken or holds no channel. What was
-    /// read until then stays. The numbers that an earlier document gave to factories on this thread are forgotten.
+    /// Reads a document into this channel, which takes its ID; false where it is broken or holds no channel.
+    /// What was read until then stays. The numbers that an earlier document gave to factories on this thread
+    /// are forgotten.
     virtual bool configureWithState(BXData const& state);
 
     /// Announces a change before it is made, to the nearest object root; nothing without one.
@@ -292,14 +294,14 @@ public:
 
     // State ---------------------------------------------------------------------------------------------------
 
-    /// The channel as a document of its own, in a blob; with `children` those of a folder, with `all` also those that
-    /// are at their defaults. Not beside changes of the tree.
+    /// The channel as a document of its own, in a blob; with `children` those of a folder, with `all` also
+    /// those that are at their defaults. Not beside changes of the tree.
     BXData createChannelState(bool children, bool all);
     /// Reads such a document from a file, as `configureWithState` does, but keeps the ID.
     bool configureWithURL(BXURL const& url);
-    /// A digest of the state of the channel and all that lies below it, names and IDs included: equal for equal state.
-    /// Flags that aren't state, defaults and children that stay out of documents don't enter, nor the value of a
-    /// channel with bit 7.
+    /// A digest of the state of the channel and all that lies below it, names and IDs included: equal for
+    /// equal state. Flags that aren't state, defaults and children that stay out of documents don't enter,
+    /// nor the value of a channel with bit 7.
     std::array<std::uint8_t, 16> getHash();
 
     // The ID generator. Any thread.

@@ -73,13 +73,14 @@ public:
                   unsigned int mode2, bool clampToCoarse) override;
     void setExtrapolation(unsigned int mode, unsigned int which) override;
     void generateKeys(unsigned int first, unsigned int second) override;
-    /// Children that stay out of documents (bit 3) aren't written, without `all` also those that are at their defaults.
+    /// Children that stay out of documents (bit 3) aren't written, without `all` also those that are at their
+    /// defaults.
     void writeBody(BXSerializerWriteStream& stream, bool full, bool children, bool all) override;
     void markFactoriesForSerialization(BXSerializerWriteStream& stream, bool all) override;
     bool parseBegin(BXSerializerReadStream& stream) override;
     bool parseEnd(BXSerializerReadStream& stream) override;
-    /// A child is the one of that ID, else a new one by its factory, which then belongs to whoever owns the others;
-    /// without either the element is passed over.
+    /// A child is the one of that ID, else a new one by its factory, which then belongs to whoever owns the
+    /// others; without either the element is passed over.
     bool parseElement(BXSerializerReadStream& stream, BXStreamElement& element) override;
     void calcHashForState(BXSerializerWriteStream& stream, Tempus const& t) override;
     void setIsSpline(bool on) override;

@@ -46,8 +46,9 @@ void pasteTangents(KFCurve& curve, Tempus const& t, double value, bool several, 
     }
 }
 
-/// What decides whether the other attributes of a keypoint may be written, and what ties its handles together, comes
-/// last: so each is as it was pasted. One that is locked and stays so keeps what the lock guards.
+/// What decides whether the other attributes of a keypoint may be written, and what ties its handles
+/// together, comes last: so each is as it was pasted. One that is locked and stays so keeps what the lock
+/// guards.
 template <class PasteOthers>
 void pasteFlagsAround(KFCurve& curve, void* handle, _KFKeyframeInfo const& info, PasteOthers pasteOthers) {
     bool wasLocked = false;

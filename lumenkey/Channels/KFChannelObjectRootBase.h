@@ -38,8 +38,8 @@ public:
     bool parseBegin(BXSerializerReadStream& stream) override;
     /// Locks a root that the document has locked, now that its children have been read.
     bool parseEnd(BXSerializerReadStream& stream) override;
-    /// Time and state are taken without an announcement of data. The flags above the low word end up clear, unless the
-    /// document stands alone.
+    /// Time and state are taken without an announcement of data. The flags above the low word end up clear,
+    /// unless the document stands alone.
     bool parseElement(BXSerializerReadStream& stream, BXStreamElement& element) override;
     /// Also multiplies the start and the duration of the extent.
     void adjustToFrameDuration(Tempus const& frameDuration) override;
@@ -89,7 +89,8 @@ public:
 
     /// What `writeBody` writes, without children; the two last arguments aren't used.
     void serializeSelfOnly(BXSerializerWriteStream& stream, bool full, bool all);
-    /// Marks what a reader can't make up by itself: the folders below whose children aren't fixed by their class.
+    /// Marks what a reader can't make up by itself: the folders below whose children aren't fixed by their
+    /// class.
     void markChannelFactoriesForSerialization(BXSerializerWriteStream& stream);
     /// The same below a folder; null does nothing. Roots below it are passed by.
     void markVaryingFolderFactoriesForSerialization(KFChannelFolder* folder, BXSerializerWriteStream& stream);

@@ -184,8 +184,8 @@ void KFSegmentWalk::walkRepeats(Side side, std::uint32_t mode, Tempus const& sta
     }
 }
 
-/// From the first valid keypoint to the last one. Of several at the end the curve takes the last one behind them, and
-/// the first one, whose value it has there, in front of them.
+/// From the first valid keypoint to the last one. Of several at the end the curve takes the last one behind
+/// them, and the first one, whose value it has there, in front of them.
 double KFSegmentWalk::riseOfCycle(Side side) {
     void* first = nullptr;
     void* last = nullptr;
@@ -236,9 +236,9 @@ bool KFSegmentWalk::cyclesOf(Side side, std::uint32_t mode, Tempus const& start,
     return true;
 }
 
-/// What comes between the first and the last of many whole cycles adds nothing to the extremes: a repeat and a
-/// ping-pong take the same values again, and a progressive repeat shifts each value further the same way. A spline that
-/// is closed or drawn as one function isn't extrapolated, so that its points don't repeat.
+/// What comes between the first and the last of many whole cycles adds nothing to the extremes: a repeat and
+/// a ping-pong take the same values again, and a progressive repeat shifts each value further the same way. A
+/// spline that is closed or drawn as one function isn't extrapolated, so that its points don't repeat.
 bool KFSegmentWalk::maySkipCycles() {
     return _extremes != nullptr && !_spline.isClosed() &&
            _spline.getInterpolator(_spline.getState()->interpolation)->useKeypoints();
@@ -269,8 +269,8 @@ void KFSegmentWalk::walkCycles(Side side, Cycles const& cycles, Tempus const& st
     }
 }
 
-/// The first vertex behind a source time, as seen on an ascending line, from a place not far away: going backwards a
-/// vertex exactly there still lies behind it.
+/// The first vertex behind a source time, as seen on an ascending line, from a place not far away: going
+/// backwards a vertex exactly there still lies behind it.
 KFVertexIterator KFSegmentWalk::placeBehind(KFVertexIterator place, Tempus const& source,
                                             bool forward) const noexcept {
     if (forward) {
@@ -283,7 +283,8 @@ KFVertexIterator KFSegmentWalk::placeBehind(KFVertexIterator place, Tempus const
     return place;
 }
 
-/// One cycle from `target` on; false when it came to `end`. The keypoint at the end of a cycle is left to the next one.
+/// One cycle from `target` on; false when it came to `end`. The keypoint at the end of a cycle is left to the
+/// next one.
 bool KFSegmentWalk::walkCycle(Cycles const& cycles, Cycle const& cycle, Tempus target, Tempus const& end) {
     Run const& run = cycle.run;
     bool const forward = run.isForward();

@@ -14,13 +14,14 @@ struct KFValueExtremes;
 
 /// The walk behind `KFChannelSegmentVisitor::visitSegments`, over a spline of two vertices or more.
 ///
-/// It goes by places in the order of vertices. Of a cycle outside the keypoints the target times are counted from the
-/// cycle's start, so that they don't drift, and a cycle always ends, whatever its times are rounded to.
+/// It goes by places in the order of vertices. Of a cycle outside the keypoints the target times are counted
+/// from the cycle's start, so that they don't drift, and a cycle always ends, whatever its times are rounded
+/// to.
 class KFSegmentWalk {
 public:
-    /// Whatever the root. `extremes` is null, or what the visitor keeps, which then is nothing but the lowest and the
-    /// highest value that it was shown: pieces that can't change them are left out. Where a repeat's times can't be
-    /// written exactly, that holds but for what their rounding makes of values.
+    /// Whatever the root. `extremes` is null, or what the visitor keeps, which then is nothing but the lowest
+    /// and the highest value that it was shown: pieces that can't change them are left out. Where a repeat's
+    /// times can't be written exactly, that holds but for what their rounding makes of values.
     static void overCurve(KFCurve& curve, Tempus const& start, Tempus const& end,
                           KFChannelSegmentVisitor& visitor, KFValueExtremes* extremes);
 
@@ -28,7 +29,8 @@ private:
     /// The numbers are those of `KFSpline::getExtrapolation`.
     enum class Side : std::uint32_t { After = 0, Before = 1 };
 
-    /// Source times that are run through, in either direction, while the target time goes on by the same length.
+    /// Source times that are run through, in either direction, while the target time goes on by the same
+    /// length.
     struct Run {
         Tempus from, to;
         bool isForward() const noexcept { return from < to; }

@@ -42,11 +42,12 @@ class LUMENKEY_API KFChannel2D : public KFCompoundChannel {
                 unsigned int id, unsigned int flags, unsigned int capacity = kNumberOfComponents,
                 KFChannelImpl* impl = nullptr, KFChannelInfo* info = nullptr);
 
-    /// Each component by itself, then the components are aligned: where one has a keypoint from curve time `a` to `b`
-    /// and the other has none, the other is keyed at its value. In the mode `KFCurve::kSimplifyToExtremes` what stays
-    /// instead are the keypoints in front of `a`, behind `b`, at both ends, and those where the path turns: where `y`
-    /// over `x` goes from rising to falling or back. The one behind a removed keypoint isn't looked at. Before that the
-    /// compound is keyed (`addKeypointAt`) where not all components have keypoints.
+    /// Each component by itself, then the components are aligned: where one has a keypoint from curve time
+    /// `a` to `b` and the other has none, the other is keyed at its value. In the mode
+    /// `KFCurve::kSimplifyToExtremes` what stays instead are the keypoints in front of `a`, behind `b`, at
+    /// both ends, and those where the path turns: where `y` over `x` goes from rising to falling or back. The
+    /// one behind a removed keypoint isn't looked at. Before that the compound is keyed (`addKeypointAt`)
+    /// where not all components have keypoints.
     void simplify(Tempus const& a, Tempus const& b, Tempus const& step, double percent, unsigned int mode1,
                   unsigned int mode2, bool clampToCoarse) override;
 

@@ -14,8 +14,9 @@ namespace {
 
 constexpr double kInfinity = std::numeric_limits<double>::infinity();
 
-/// Extremes, and the band within which a bound changes nothing, even though what it bounds is computed with roundings:
-/// the power form in which a cubic is evaluated has some dozen, each of a part of the largest control value.
+/// Extremes, and the band within which a bound changes nothing, even though what it bounds is computed with
+/// roundings: the power form in which a cubic is evaluated has some dozen, each of a part of the largest
+/// control value.
 class GrowingExtremes {
 public:
     explicit GrowingExtremes(KFValueExtremes& extremes) noexcept : _extremes(extremes) { settle(); }
@@ -216,8 +217,8 @@ bool KFSplineExtremes::includeSegment(Place place, KFStaticVertex& a, KFStaticVe
     }
 }
 
-/// Handles that point into the segment are at most shortened, where they would fold it, so that the curve stays within
-/// the control values that they have here; within its halves' where they aren't.
+/// Handles that point into the segment are at most shortened, where they would fold it, so that the curve
+/// stays within the control values that they have here; within its halves' where they aren't.
 void KFSplineExtremes::includeBezier(KFStaticVertex& a, KFStaticVertex& b) {
     double outU = 0.0;
     double outV = 0.0;

@@ -22,7 +22,8 @@ struct KFValueExtremes {
     }
 };
 
-/// The extremes of the segment between two vertices from `lowU` to `highU`, by what its interpolator knows of them.
+/// The extremes of the segment between two vertices from `lowU` to `highU`, by what its interpolator knows of
+/// them.
 template <class Interpolator>
 KFValueExtremes KFExtremesOfSegment(KFSpline& spline, void* vA, void* vB, Tempus const& lowU,
                                     Tempus const& highU) {
@@ -31,11 +32,12 @@ KFValueExtremes KFExtremesOfSegment(KFSpline& spline, void* vA, void* vB, Tempus
     return extremes;
 }
 
-/// Includes the values of the spline at all its vertices from `from` to `to`, and those of the whole segments between
-/// them, to the bit as they are found by `getVertexValue` and by `KFExtremesOfSegment` segment by segment. False where
-/// the vertices must be looked at one by one, as those of a foreign class; some of the values may be included then.
+/// Includes the values of the spline at all its vertices from `from` to `to`, and those of the whole segments
+/// between them, to the bit as they are found by `getVertexValue` and by `KFExtremesOfSegment` segment by
+/// segment. False where the vertices must be looked at one by one, as those of a foreign class; some of the
+/// values may be included then.
 ///
-/// Under one lock, which it takes. Most segments cost a look at their ends: a curve lies within its control values, and
-/// where these lie within the extremes found so far there is nothing to solve.
+/// Under one lock, which it takes. Most segments cost a look at their ends: a curve lies within its control
+/// values, and where these lie within the extremes found so far there is nothing to solve.
 bool KFIncludeWholeSegments(KFSpline& spline, Tempus const& from, Tempus const& to,
                             KFValueExtremes& extremes);

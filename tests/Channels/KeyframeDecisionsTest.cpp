@@ -1,5 +1,6 @@
-// What each operation on a channel's keyframes decides before it reaches the curve: in which time base its times are,
-// whether a linked compound takes it over, whether and when the host hears of it, and whether the record becomes local.
+// What each operation on a channel's keyframes decides before it reaches the curve: in which time base its
+// times are, whether a linked compound takes it over, whether and when the host hears of it, and whether the
+// record becomes local.
 
 #include "lumenkey/Channels/KFChannelImpl.h"
 #include "lumenkey/Channels/KFVectorChannels.h"
@@ -31,8 +32,8 @@ constexpr unsigned kStaysShared = 16; // the record, which else becomes local
 
 double const kSeven = 7.0;
 
-/// What an operation works on: a channel with keypoints 10, 20 and 40 at 1, 2 and 4 s, the handle of the second, a
-/// node of its curve, another channel, and times in the operation's base.
+/// What an operation works on: a channel with keypoints 10, 20 and 40 at 1, 2 and 4 s, the handle of the
+/// second, a node of its curve, another channel, and times in the operation's base.
 struct Subject {
     KFChannel& c;
     void* h;
@@ -280,7 +281,8 @@ KFCurve* keyedCurve() {
     return curve;
 }
 
-/// x of a compound, which is linked or not; the others have the same keypoints. Or, alone, on a shared record.
+/// x of a compound, which is linked or not; the others have the same keypoints. Or, alone, on a shared
+/// record.
 struct Fixture {
     NotingRoot root;
     KFChannelDouble other{"other", &root, 9, 0};

@@ -209,8 +209,8 @@ void expectKeyframes(KFChannel const& is, KFChannel const& was, Tempus const& la
         EXPECT_NEAR(now[i], then[i], 1e-12) << i;
 }
 
-/// Keypoints with attributes at random: the first, at 1 s, may be disabled (of the others only enabled ones are
-/// gathered); any may be locked, or have handles that its flags don't allow.
+/// Keypoints with attributes at random: the first, at 1 s, may be disabled (of the others only enabled ones
+/// are gathered); any may be locked, or have handles that its flags don't allow.
 void keyAtRandom(KFChannel& channel, std::mt19937_64& random) {
     std::uniform_real_distribution<double> number(-5.0, 5.0), some(0.0, 1.0);
     std::uint32_t const types[] = {0, 1, 4, 6, 7, 8, 13, 14, 15, 16, 17, 19, 20, 21};

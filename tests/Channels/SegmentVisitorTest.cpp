@@ -239,9 +239,9 @@ bool isInexact(std::string const& name) {
            name == "ages" || name == "negative times";
 }
 
-/// Whether the pieces are the curve. They aren't where a type has no visit, where a keypoint is disabled, where several
-/// at one end continue the curve otherwise than they end it, where a fold lies aside of time, where cubic segments are
-/// too short to be read as a whole, and where a spline is closed.
+/// Whether the pieces are the curve. They aren't where a type has no visit, where a keypoint is disabled,
+/// where several at one end continue the curve otherwise than they end it, where a fold lies aside of time,
+/// where cubic segments are too short to be read as a whole, and where a spline is closed.
 bool isWhollyVisited(Shown& curve, std::string const& name) {
     auto const vertices = museumVertices(*curve.spline);
     for (std::size_t i = 0; i < vertices.size(); ++i) {
@@ -326,7 +326,8 @@ TEST(KFChannelSegmentVisitorMuseum, FindsTheExtremesOfAHostAndOfTheSamples) {
     }
 }
 
-/// Long enough for most segments to lie within the extremes of those before, some by a hair. Some keypoints share a time.
+/// Long enough for most segments to lie within the extremes of those before, some by a hair. Some keypoints
+/// share a time.
 TEST(KFChannelSegmentVisitor, FindsTheSameExtremesOfWildCurves) {
     std::mt19937_64 random(1);
     auto const between = [&random](double low, double high) {

@@ -1,5 +1,5 @@
-// What simplifying and smoothing promise, over the whole museum: how far the curve may be moved, at its samples and
-// between them. Parametric curves have no such promise, nor has what is locked.
+// What simplifying and smoothing promise, over the whole museum: how far the curve may be moved, at its
+// samples and between them. Parametric curves have no such promise, nor has what is locked.
 
 #include "lumenkey/curves/KFTypedCurves.h"
 #include "lumenkey/splines/KFInterpolation.h"
