@@ -30,8 +30,8 @@ struct Contest {
     Measurement limit;
 };
 
-/// One benchmark and its row of the table. Subject and limit are measured in turns, and the ratio is the median of
-/// the turns' ratios, so that a machine that slows down or is disturbed for a while slows both.
+/// One benchmark and its row of the table. Subject and limit are measured in turns, and the ratio is the
+/// median of the turns' ratios, so that a machine that slows down or is disturbed for a while slows both.
 struct ContestEntry {
     std::string name;
     std::string against;
@@ -52,6 +52,6 @@ void registerContest(Bench& bench, ContestEntry entry);
 /// Nanoseconds for one of `items` that each call of `pass` works through; calls are repeated to fill a batch.
 Measurement timePerItem(Bench const& bench, std::size_t items, std::function<void()> pass);
 
-/// The program ends with a message when two of the contestants differ by more than `tolerance`: then they don't do the
-/// same, and comparing their times would say nothing.
+/// The program ends with a message when two of the contestants differ by more than `tolerance`: then they
+/// don't do the same, and comparing their times would say nothing.
 void requireAgreement(std::string const& what, double ours, double other, double tolerance);

@@ -32,7 +32,8 @@ struct Key {
     double seconds() const noexcept { return TempusGetSeconds(time()); }
 };
 
-/// The same keys at every call: segments of 7,500 to 12,500 ticks, handles that reach over 0.15 to 0.5 of them.
+/// The same keys at every call: segments of 7,500 to 12,500 ticks, handles that reach over 0.15 to 0.5 of
+/// them.
 std::vector<Key> makeKeys(std::size_t count);
 
 /// A spline with a state of its own, which derives tangents while keys are edited only if told.
@@ -63,6 +64,6 @@ struct Queries {
 /// `perSecond` positions a second between the first and the last key, beginning with the first after that.
 Queries evenly(std::vector<Key> const& keys, std::int32_t perSecond);
 Queries everyFrame(std::vector<Key> const& keys);
-/// Positions at random between the first and the last key: 10,000, which no branch prediction learns by heart, and for
-/// large curves 100,000.
+/// Positions at random between the first and the last key: 10,000, which no branch prediction learns by
+/// heart, and for large curves 100,000.
 Queries atRandom(std::vector<Key> const& keys);

@@ -1,5 +1,6 @@
-// Documents: reading beside expat with empty handlers, writing beside the formatting of the same numbers, digests
-// beside XXH3, what of it all grows with the size, and the memory beside the tree. JSON for comparison.
+// Documents: reading beside expat with empty handlers, writing beside the formatting of the same numbers,
+// digests beside XXH3, what of it all grows with the size, and the memory beside the tree. JSON for
+// comparison.
 
 #include "bench/Benchmarks.h"
 #include "bench/CountedMemory.h"
@@ -230,8 +231,8 @@ Contest digestContest(std::size_t size) {
             })};
 }
 
-/// How far the heap rises above what it ends with while `work` runs, seen by a second thread all the time and by the
-/// counters of `operator new`; in mebibytes.
+/// How far the heap rises above what it ends with while `work` runs, seen by a second thread all the time and
+/// by the counters of `operator new`; in mebibytes.
 template <class Work> double risenBy(Work work) {
     std::atomic<bool> isOver{false};
     std::size_t highest = CountedMemory::heapBytes();

@@ -8,9 +8,9 @@
 #include <cstdint>
 #include <vector>
 
-/// What can be had at best: the keys of a cubic curve in arrays of doubles, times in seconds. It keeps the current
-/// segment's polynomial, solves U by the same root finder as the library, and has neither lock, nor exact time, nor
-/// edits. Positions lie between the first and the last key.
+/// What can be had at best: the keys of a cubic curve in arrays of doubles, times in seconds. It keeps the
+/// current segment's polynomial, solves U by the same root finder as the library, and has neither lock, nor
+/// exact time, nor edits. Positions lie between the first and the last key.
 class CubicArrays {
 public:
     explicit CubicArrays(std::vector<Key> const& keys) {

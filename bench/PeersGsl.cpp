@@ -1,5 +1,5 @@
-// GSL's cubic spline with accelerator. It interpolates the keys' values smoothly and knows no handles: a curve without
-// anything to solve, so our unsolved types are held against it.
+// GSL's cubic spline with accelerator. It interpolates the keys' values smoothly and knows no handles: a
+// curve without anything to solve, so our unsolved types are held against it.
 
 #include "bench/Benchmarks.h"
 #include "bench/Subjects.h"

@@ -1,4 +1,5 @@
-// Takes: what a recorded point, and reading a take back, cost at a million points over what they cost at a thousand.
+// Takes: what a recorded point, and reading a take back, cost at a million points over what they cost at a
+// thousand.
 
 #include "bench/Benchmarks.h"
 #include "bench/Contest.h"
@@ -38,8 +39,8 @@ struct Take {
     }
 };
 
-/// The heap keeps what is freed while it lives: else only the large take would pay for pages that are new from the
-/// system.
+/// The heap keeps what is freed while it lives: else only the large take would pay for pages that are new
+/// from the system.
 class KeptHeap {
 public:
     KeptHeap() { mallopt(M_TRIM_THRESHOLD, std::numeric_limits<int>::max()); }

@@ -38,8 +38,8 @@ public:
 
     bool empty() const noexcept { return _rows.empty(); }
     void printTable(std::ostream& out) const;
-    /// A JSON array of objects with name, ratio and bound (null for none). A ratio that must be at least its bound
-    /// has " (at least)" behind its name. False when the file couldn't be written.
+    /// A JSON array of objects with name, ratio and bound (null for none). A ratio that must be at least its
+    /// bound has " (at least)" behind its name. False when the file couldn't be written.
     bool writeJson(std::string const& path) const;
 
 private:

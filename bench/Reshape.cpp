@@ -1,5 +1,5 @@
-// Simplifying a channel that has a keypoint for each sample, beside the curve fitter alone; and edits of linked
-// components beside those of one.
+// Simplifying a channel that has a keypoint for each sample, beside the curve fitter alone; and edits of
+// linked components beside those of one.
 
 #include "bench/Benchmarks.h"
 #include "bench/Subjects.h"
@@ -17,7 +17,7 @@ namespace {
 constexpr std::size_t kSmall = 1000;
 constexpr std::size_t kLarge = 100000;
 
-// Simplifying --------------------------------------------------------------------------------------------------
+// Simplifying ----------------------------------------------------------------------------------------------
 
 Tempus const kFrame = TempusMake(1, 120);
 /// Of values between about -2 and 2.
@@ -27,8 +27,8 @@ using Point = BXVector2<double>;
 
 using Row = std::vector<Point>;
 
-/// A limb that swings, as it is captured: two waves, and noise below the tolerance. In rows of `size` samples, whose x
-/// counts them, so that small rows aren't learnt by heart.
+/// A limb that swings, as it is captured: two waves, and noise below the tolerance. In rows of `size`
+/// samples, whose x counts them, so that small rows aren't learnt by heart.
 std::vector<Row> capturedMotion(std::size_t size) {
     std::mt19937_64 random(5);
     std::uniform_real_distribution<double> noise(-0.002, 0.002);
@@ -120,7 +120,7 @@ Contest simplifyingBesideFitting(std::size_t size) {
     return {simplifying(size), fitting(size)};
 }
 
-// Linked edits -------------------------------------------------------------------------------------------------
+// Linked edits ---------------------------------------------------------------------------------------------
 
 constexpr std::int64_t kEdits = 100;
 

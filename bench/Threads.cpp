@@ -19,7 +19,8 @@ using Passes = std::vector<std::function<void()>>;
 
 constexpr std::size_t kSize = 1000;
 
-/// Items in a microsecond that all threads together get done in a while, each repeating its own pass of `items`.
+/// Items in a microsecond that all threads together get done in a while, each repeating its own pass of
+/// `items`.
 double throughput(Passes const& passes, std::size_t items, std::chrono::nanoseconds duration) {
     std::atomic<std::size_t> ready{0};
     std::vector<double> rates(passes.size());

@@ -122,7 +122,7 @@ Measurement extremes(Bench const& bench, std::size_t size) {
     return timePerItem(bench, size - 1, [between, size] { benchmark::DoNotOptimize(between(0, size - 1)); });
 }
 
-// Memory -----------------------------------------------------------------------------------------------------
+// Memory ---------------------------------------------------------------------------------------------------
 
 template <class Channel> double bytesOfOne() {
     Channel const first("Opacity", nullptr, 1, 0); // the class's records are made once
@@ -141,7 +141,7 @@ template <class Channel> double blocksBeyondItself() {
     return static_cast<double>(CountedMemory::calls() - before) - 1.0;
 }
 
-// Trees ------------------------------------------------------------------------------------------------------
+// Trees ----------------------------------------------------------------------------------------------------
 
 struct Tree {
     std::unique_ptr<KFChannelFolder> top;
@@ -199,7 +199,7 @@ std::function<void()> lookUpPath(std::size_t siblings) {
     };
 }
 
-// The program ------------------------------------------------------------------------------------------------
+// The program ----------------------------------------------------------------------------------------------
 
 /// A motion of 96 channels and 524 frames, in a file that goes with it.
 class MotionOnDisk {

@@ -1,5 +1,5 @@
-// Simplifying and smoothing a whole motion, made by the project's own generator: how far its channels are moved, and
-// how many keypoints are left.
+// Simplifying and smoothing a whole motion, made by the project's own generator: how far its channels are
+// moved, and how many keypoints are left.
 
 #include "lumenkey/curves/KFCurve.h"
 #include "tests/tools/RunProgram.h"

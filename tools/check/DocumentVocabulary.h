@@ -25,7 +25,8 @@ struct DocumentWord {
 /// Null for an element that is unknown there. The parent of the outermost element has an empty name.
 DocumentWord const* documentWord(std::string_view parent, std::string_view name);
 
-/// Whether a text can be read as its kind; `countsFrames` is for documents below version 5, where times are numbers.
+/// Whether a text can be read as its kind; `countsFrames` is for documents below version 5, where times are
+/// numbers.
 bool canBeRead(std::string_view text, TextKind kind, bool countsFrames);
 /// What such a text should have been: `a number`, and so on.
 std::string_view nameOfTextKind(TextKind kind);

@@ -55,8 +55,8 @@ public:
     }
 
 private:
-    /// Makes values small beside a step. The fit measures along the curve, and so it measures time: where values weigh
-    /// more, handles between two samples come out too short or too long, and the curve swings.
+    /// Makes values small beside a step. The fit measures along the curve, and so it measures time: where
+    /// values weigh more, handles between two samples come out too short or too long, and the curve swings.
     static double scaleOfFit(KFCurve& curve, Tempus const& step) {
         constexpr double share = 0.01;
         double least = 0;

@@ -31,8 +31,8 @@ struct InputOptions {
 
 void addFrameRateOption(CLI::App& verb, std::string& rate);
 
-/// The file that a verb works on, opened as a tree of channels with a progress bar, and the channels that its user
-/// names.
+/// The file that a verb works on, opened as a tree of channels with a progress bar, and the channels that its
+/// user names.
 class ChannelInput {
 public:
     /// Throws `InputError`, and `UsageError` for a rate that is none or that the file has no use for.
@@ -41,13 +41,13 @@ public:
     ChannelFile const& file() const { return _file; }
     ChannelTree const& tree() const { return *_file.tree; }
 
-    /// A value channel. Throws `UsageError`, with the name that was perhaps meant. Says on standard error if the text
-    /// could name another one too.
+    /// A value channel. Throws `UsageError`, with the name that was perhaps meant. Says on standard error if
+    /// the text could name another one too.
     ChannelTree::Node channelNamed(std::string const& text) const;
     /// Likewise any node.
     ChannelTree::Node nodeNamed(std::string const& text) const;
-    /// Likewise, for each text in turn, all value channels at the node or below it; all of the file for no text. Throws
-    /// `UsageError` also where there are none.
+    /// Likewise, for each text in turn, all value channels at the node or below it; all of the file for no
+    /// text. Throws `UsageError` also where there are none.
     std::vector<ChannelTree::Node> channelsNamed(std::vector<std::string> const& texts) const;
 
 private:

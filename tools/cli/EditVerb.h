@@ -26,8 +26,8 @@ struct EditWords {
     std::string difference() const { return keepsShape ? "worst error" : "largest change"; }
 };
 
-/// A verb that changes the curves of some channels in a stretch of time and writes the file anew. What is its own is
-/// told here; all else stands once, in `declareEdit`.
+/// A verb that changes the curves of some channels in a stretch of time and writes the file anew. What is its
+/// own is told here; all else stands once, in `declareEdit`.
 class EditVerb {
 public:
     EditVerb() = default;
@@ -45,14 +45,15 @@ public:
     /// For a channel with keypoints; the span is that part of the stretch in which they lie.
     virtual void apply(KFChannel& channel, TimeSpan const& span) = 0;
 
-    /// The step at which it samples curves, to give them keypoints that draw them anew; nothing where it changes the
-    /// keypoints that there are.
+    /// The step at which it samples curves, to give them keypoints that draw them anew; nothing where it
+    /// changes the keypoints that there are.
     virtual std::optional<Tempus> sampleStep() const { return std::nullopt; }
     /// Where the stretch comes to.
     virtual TimeSpan arrivalOf(TimeSpan const& span) const { return span; }
 };
 
-/// In steps of this length before and after are compared: ten in a frame, or in a sample step where that is shorter.
+/// In steps of this length before and after are compared: ten in a frame, or in a sample step where that is
+/// shorter.
 Tempus comparedStep(ChannelFile const& file, TimeSpan const& span, std::optional<Tempus> const& sampleStep);
 
 Verb declareEdit(CLI::App& program, std::shared_ptr<EditVerb> const& verb);

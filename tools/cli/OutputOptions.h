@@ -18,8 +18,8 @@ struct OutputOptions {
 
     /// Declares `-o` and `--in-place`.
     void add(CLI::App& verb);
-    /// Before the file is read: the format that the names tell, or nothing. Throws `UsageError` where none is asked for,
-    /// or one that can't be written.
+    /// Before the file is read: the format that the names tell, or nothing. Throws `UsageError` where none is
+    /// asked for, or one that can't be written.
     std::optional<ChannelFormat> check(std::string const& file) const;
     /// Once the file is open, whose format is `input`. Throws `UsageError` where it can't be written.
     ChannelFormat formatFor(ChannelFormat input) const;
@@ -27,8 +27,8 @@ struct OutputOptions {
     std::string const& target(std::string const& file) const { return output.empty() ? file : output; }
 };
 
-/// What the name of an output asks for. Throws `UsageError` for what can't be written from this input; of an unknown
-/// input it says nothing.
+/// What the name of an output asks for. Throws `UsageError` for what can't be written from this input; of an
+/// unknown input it says nothing.
 ChannelFormat requireOutputFormat(std::string const& output, std::optional<ChannelFormat> input);
 
 } // namespace lumenkey::tools

@@ -21,8 +21,8 @@ namespace lumenkey::tools {
 
 namespace {
 
-/// Values and slopes are held in memory until they are written: eight bytes for each. CSV goes out in blocks of
-/// times, so there this many times are taken, whatever the number of channels.
+/// Values and slopes are held in memory until they are written: eight bytes for each. CSV goes out in blocks
+/// of times, so there this many times are taken, whatever the number of channels.
 constexpr std::uint64_t kMostValues = 10'000'000;
 constexpr std::size_t kValuesInBlock = 65'536;
 

@@ -47,8 +47,9 @@ public:
     }
     std::optional<Tempus> sampleStep() const override { return _step.step(); }
 
-    /// The fit keeps to the tolerance at its samples alone, and between two of them a curve may jump. So the curve is
-    /// looked at more closely than it was sampled, and fitted anew, to more samples and more strictly, while it is off.
+    /// The fit keeps to the tolerance at its samples alone, and between two of them a curve may jump. So the
+    /// curve is looked at more closely than it was sampled, and fitted anew, to more samples and more
+    /// strictly, while it is off.
     void apply(KFChannel& channel, TimeSpan const& span) override {
         KFCurve& curve = *channel.getCurveInterface();
         std::unique_ptr<KFCurveInterface> const copy(curve.cloneCurve());

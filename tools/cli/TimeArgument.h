@@ -19,8 +19,8 @@ public:
     /// Several, with commas between them.
     static std::vector<TimeArgument> parseList(std::string_view text);
 
-    /// Where it lies when a frame lasts `frameDuration`. Throws `UsageError`, also for a number of frames where
-    /// that is invalid.
+    /// Where it lies when a frame lasts `frameDuration`. Throws `UsageError`, also for a number of frames
+    /// where that is invalid.
     Tempus resolve(Tempus const& frameDuration) const;
 
 private:
@@ -29,8 +29,8 @@ private:
     bool _countsFrames = false;
 };
 
-/// The exact time between two samples at a rate: a whole number, a decimal taken as it stands, or `N/D`. Throws
-/// `UsageError`.
+/// The exact time between two samples at a rate: a whole number, a decimal taken as it stands, or `N/D`.
+/// Throws `UsageError`.
 Tempus stepOfRate(std::string_view text);
 
 } // namespace lumenkey::tools

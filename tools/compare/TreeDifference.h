@@ -23,11 +23,11 @@ struct NodeDifference {
     std::string unit;
 };
 
-/// Compares nodes that have the same dotted name; of several with one name the first with the first, and so on. The
-/// name of the top itself doesn't count, since that of a table or a motion is that of its file.
+/// Compares nodes that have the same dotted name; of several with one name the first with the first, and so
+/// on. The name of the top itself doesn't count, since that of a table or a motion is that of its file.
 ///
-/// Curves are compared from the first keypoint of both trees to the last, at every `step` (`changeBetween`). In the
-/// order of the second tree, with what it lacks behind.
+/// Curves are compared from the first keypoint of both trees to the last, at every `step` (`changeBetween`).
+/// In the order of the second tree, with what it lacks behind.
 std::vector<NodeDifference> differencesBetween(ChannelTree const& before, ChannelTree const& after,
                                                Tempus const& step);
 

@@ -19,8 +19,9 @@ struct TimeSpan {
 /// The handles of the keypoints within, in the order of time.
 std::vector<void*> keypointsWithin(KFCurve& curve, TimeSpan const& span);
 
-/// Where the library reshapes a stretch: samples stand at `start + step * i`, all of them before `end`, which lies one
-/// step behind the last. The library takes out the keypoints at `end` too; `OutsideKept` sees to it that they stay.
+/// Where the library reshapes a stretch: samples stand at `start + step * i`, all of them before `end`, which
+/// lies one step behind the last. The library takes out the keypoints at `end` too; `OutsideKept` sees to it
+/// that they stay.
 struct SampledStretch {
     SampledStretch(TimeSpan const& span, Tempus const& step);
 
@@ -47,12 +48,13 @@ private:
     std::vector<void*> _locked;
 };
 
-/// Turns linear keypoints within the span into Bezier ones with handles of no length, which draw the same lines.
+/// Turns linear keypoints within the span into Bezier ones with handles of no length, which draw the same
+/// lines.
 void makeLinesBezier(KFCurve& curve, TimeSpan const& span);
 
-/// Lets `edit` change the whole curve where the span holds all of its keypoints. Else it changes that of a copy with
-/// the keypoints within the span alone; they are then cut out of the channel and those of the copy are pasted over
-/// what lies where they come to. Nothing happens where the span holds none.
+/// Lets `edit` change the whole curve where the span holds all of its keypoints. Else it changes that of a
+/// copy with the keypoints within the span alone; they are then cut out of the channel and those of the copy
+/// are pasted over what lies where they come to. Nothing happens where the span holds none.
 void editKeypointsWithin(KFChannel& channel, TimeSpan const& span, std::function<void(KFCurve&)> const& edit);
 
 } // namespace lumenkey::tools

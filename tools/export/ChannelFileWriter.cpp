@@ -153,7 +153,8 @@ WrittenRows writeTable(FileToWrite const& wanted, OutputSink& out, ReadingProgre
     return {times.size(), times.empty() ? kTempusZero : times.front()};
 }
 
-/// Channels of unknown classes were passed over on reading; a document without them must not come in its place.
+/// Channels of unknown classes were passed over on reading; a document without them must not come in its
+/// place.
 void checkNothingIsLost(FileToWrite const& wanted) {
     for (DocumentFactory const& factory : wanted.file.document.factories) {
         if (!factory.isKnown()) {

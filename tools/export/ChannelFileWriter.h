@@ -40,16 +40,16 @@ struct WrittenRows {
     Tempus start{};
 };
 
-/// Replaces the target, as a whole or not at all, by the file as its tree is now. Throws `OutputError`, also where
-/// it would hold more than `kMostWrittenValues`.
+/// Replaces the target, as a whole or not at all, by the file as its tree is now. Throws `OutputError`, also
+/// where it would hold more than `kMostWrittenValues`.
 ///
-/// The frames of a motion last as long as they did. They reach from time zero, or from before the first keypoint of all
-/// channels where that lies before zero, to the last one.
+/// The frames of a motion last as long as they did. They reach from time zero, or from before the first
+/// keypoint of all channels where that lies before zero, to the last one.
 ///
-/// A table has times, seconds, and a column for each channel. A cell is empty where its channel has nothing to say: with
-/// the rows of the keypoints where it has no keypoint; with those of the input, for an edited channel, outside its
-/// keypoints. Of a document only channels with keypoints have a column, unless none has any, and a row stands at each
-/// keypoint.
+/// A table has times, seconds, and a column for each channel. A cell is empty where its channel has nothing
+/// to say: with the rows of the keypoints where it has no keypoint; with those of the input, for an edited
+/// channel, outside its keypoints. Of a document only channels with keypoints have a column, unless none has
+/// any, and a row stands at each keypoint.
 ///
 /// A document holds the tree; that of a motion, its skeleton too (`SkeletonChannels`).
 WrittenRows writeChannelFile(FileToWrite const& wanted, ReadingProgress const& progress = {});

@@ -10,7 +10,8 @@ namespace lumenkey::tools {
 
 namespace {
 
-/// Hands the library's text on. Nothing may be thrown through the library: it is kept until the library has returned.
+/// Hands the library's text on. Nothing may be thrown through the library: it is kept until the library has
+/// returned.
 class SinkStream : public BXStream {
 public:
     explicit SinkStream(OutputSink& sink) : _sink(sink) {}

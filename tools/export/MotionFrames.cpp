@@ -46,8 +46,8 @@ FrameSpan framesOver(ChannelFile const& file, std::vector<Node> const& columns) 
     return {begin, static_cast<std::uint64_t>(end - begin)};
 }
 
-/// The number of degrees that was read as this many radians: of those that give the same bits the one with the
-/// shortest text. The quotient alone may be a neighbour of it.
+/// The number of degrees that was read as this many radians: of those that give the same bits the one with
+/// the shortest text. The quotient alone may be a neighbour of it.
 double degreesOf(double radians) {
     constexpr std::size_t shortText = 12;
     double const nearest = radians / kRadiansOfDegree;

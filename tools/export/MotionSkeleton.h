@@ -37,8 +37,8 @@ struct DocumentSkeleton {
     std::string fault;
 };
 
-/// A folder is a joint; where it has no `Offset` it stands in its parent's origin. Value channels in it must have the
-/// names of a motion's: positions, and rotations in radians.
+/// A folder is a joint; where it has no `Offset` it stands in its parent's origin. Value channels in it must
+/// have the names of a motion's: positions, and rotations in radians.
 DocumentSkeleton skeletonOf(ChannelTree const& tree, Tempus const& frameDuration);
 
 } // namespace lumenkey::tools

@@ -9,8 +9,8 @@ namespace lumenkey::tools {
 
 namespace {
 
-/// Walks the joints, which stand in the order of their text, with the stack of open ones in its hand, so that no depth
-/// of nesting costs stack.
+/// Walks the joints, which stand in the order of their text, with the stack of open ones in its hand, so that
+/// no depth of nesting costs stack.
 class HierarchyWriter {
 public:
     HierarchyWriter(Motion const& motion, OutputSink& out)

@@ -32,8 +32,8 @@ struct ChannelFile {
     /// Of a document, those of its first and last keypoint. Both zero without rows or keypoints.
     Tempus firstTime{};
     Tempus lastTime{};
-    /// From the first time on: all frames of a motion, the last one to its end; of a table, to the last row; of a
-    /// document, to its last keypoint.
+    /// From the first time on: all frames of a motion, the last one to its end; of a table, to the last row;
+    /// of a document, to its last keypoint.
     Tempus duration{};
     std::unique_ptr<ChannelTree> tree;
     /// Of a motion, what its file says beside the frames, which are left out here.
@@ -49,12 +49,12 @@ struct ChannelFile {
 /// What the end of a name tells: `.csv`, `.bvh` or `.lumen`, in any case.
 std::optional<ChannelFormat> channelFormatNamed(std::string_view file);
 
-/// A name that ends in `.csv` is that of a table, one that ends in `.bvh` of a motion, one that ends in `.lumen` of a
-/// document. Otherwise the content tells: a document begins with `<`, a table has a comma in its first line. Throws
-/// `InputError`.
+/// A name that ends in `.csv` is that of a table, one that ends in `.bvh` of a motion, one that ends in
+/// `.lumen` of a document. Otherwise the content tells: a document begins with `<`, a table has a comma in
+/// its first line. Throws `InputError`.
 ///
-/// `frameDuration` is that of a document, which doesn't say it itself; without one that of its keypoints is taken, and
-/// in documents that count frames the default.
+/// `frameDuration` is that of a document, which doesn't say it itself; without one that of its keypoints is
+/// taken, and in documents that count frames the default.
 ChannelFile openChannelFile(std::string const& file, ReadingProgress const& progress = {},
                             std::optional<Tempus> const& frameDuration = std::nullopt);
 

@@ -21,16 +21,17 @@ struct CsvFile {
     std::vector<double> values;
 };
 
-/// Reads comma-separated values (RFC 4180): a row of names, then rows of numbers. Throws `InputError` for what is
-/// unsound anywhere.
+/// Reads comma-separated values (RFC 4180): a row of names, then rows of numbers. Throws `InputError` for
+/// what is unsound anywhere.
 ///
-/// The first column is the time in seconds, whatever its name: a decimal, taken as it stands where exact time can
-/// hold it and else rounded at the finest timescale, or `VALUE/TIMESCALE`, with a `~` behind it where that was
-/// rounded. If the first two columns are called `time` and `seconds`, the second repeats the first and is skipped.
+/// The first column is the time in seconds, whatever its name: a decimal, taken as it stands where exact time
+/// can hold it and else rounded at the finest timescale, or `VALUE/TIMESCALE`, with a `~` behind it where
+/// that was rounded. If the first two columns are called `time` and `seconds`, the second repeats the first
+/// and is skipped.
 ///
-/// Taken are a byte-order mark, both kinds of line ends, a last line without one, blank lines, blanks around cells
-/// without quotation marks, a plus sign before a number, and empty cells (no value at that time). Only commas
-/// part cells.
+/// Taken are a byte-order mark, both kinds of line ends, a last line without one, blank lines, blanks around
+/// cells without quotation marks, a plus sign before a number, and empty cells (no value at that time). Only
+/// commas part cells.
 CsvFile readCsvFile(std::string const& file, ReadingProgress const& progress = {});
 
 /// The same for the content of a file; `file` is only its name.

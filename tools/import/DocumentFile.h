@@ -37,10 +37,10 @@ struct DocumentFile {
 /// What frames last in documents that don't say so.
 inline Tempus defaultFrameDuration() { return TempusMake(1, 30); }
 
-/// Reads a channel document, block by block. Its top is made by its own factory; where the document says none, as in
-/// those that a host wrote for itself, it is an object root. Nodes that the library doesn't know are passed over, as
-/// the library does. Throws `InputError` for a file that can't be read or isn't well formed, for a top of an unknown
-/// class, and for anything but one channel.
+/// Reads a channel document, block by block. Its top is made by its own factory; where the document says
+/// none, as in those that a host wrote for itself, it is an object root. Nodes that the library doesn't know
+/// are passed over, as the library does. Throws `InputError` for a file that can't be read or isn't well
+/// formed, for a top of an unknown class, and for anything but one channel.
 ///
 /// Documents below version 5 count frames of `frameDuration`.
 DocumentFile readDocumentFile(std::string const& file, Tempus const& frameDuration,
@@ -53,8 +53,8 @@ DocumentFile readDocumentText(std::string_view text, std::string const& file, Te
 /// Whether a text begins as an XML document does, in any of the encodings that are read.
 bool looksLikeDocument(std::string_view text);
 
-/// The length of a frame in a document that doesn't say it: the longest step on whose multiples all keypoints stand, if
-/// that is one of 12 to 1000 frames a second; else the default.
+/// The length of a frame in a document that doesn't say it: the longest step on whose multiples all keypoints
+/// stand, if that is one of 12 to 1000 frames a second; else the default.
 Tempus frameDurationOfKeypoints(ChannelTree const& tree);
 
 } // namespace lumenkey::tools

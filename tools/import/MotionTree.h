@@ -19,7 +19,8 @@ struct MotionTree {
 };
 
 /// A folder for each joint, with its channels first and then its child joints, each in the order of the file.
-/// Positions are `KFChannelDouble`, rotations `KFChannelAngle` in radians, with a linear keypoint for each frame.
+/// Positions are `KFChannelDouble`, rotations `KFChannelAngle` in radians, with a linear keypoint for each
+/// frame.
 MotionTree treeOfMotion(Motion const& motion);
 
 } // namespace lumenkey::tools

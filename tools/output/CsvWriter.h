@@ -8,7 +8,8 @@
 namespace lumenkey::tools {
 
 /// Rows of comma-separated values as RFC 4180 has them, with plain line ends: a field that holds a comma, a
-/// quotation mark or a line end, or has a blank at either end, stands in quotation marks, with its own ones doubled.
+/// quotation mark or a line end, or has a blank at either end, stands in quotation marks, with its own ones
+/// doubled.
 class CsvWriter {
 public:
     explicit CsvWriter(OutputSink& out) : _out(out) {}

@@ -14,7 +14,8 @@ std::string classNameOf(KFFactory const& factory);
 /// The same for a channel: that of its factory, or of its own class where it has none.
 std::string classNameOf(KFChannelBase const& channel);
 
-/// A class's name as people write it: `Double` for `KFChannelDouble`, `ObjectRoot` for `KFChannelObjectRootBase`.
+/// A class's name as people write it: `Double` for `KFChannelDouble`, `ObjectRoot` for
+/// `KFChannelObjectRootBase`.
 std::string shortClassName(std::string_view className);
 
 /// The registered factory of a class by its short or long name, regardless of case; null for none.

@@ -20,8 +20,8 @@ enum class ValueType { Double, Angle };
 
 /// The channels of a file as a tree of the library, which it owns, and the names of its nodes.
 ///
-/// A node is told by its place in tree order: a folder, then all that lies below it. In a tree that is built here, IDs
-/// count from 1 among the children of each folder, in the order in which they are added.
+/// A node is told by its place in tree order: a folder, then all that lies below it. In a tree that is built
+/// here, IDs count from 1 among the children of each folder, in the order in which they are added.
 ///
 /// The dotted name of a node is the names from the top's children down to it, with dots between them:
 /// `Hips.LeftLeg.Xrotation`. Names may hold dots themselves. The top has no dotted name.
@@ -32,8 +32,9 @@ public:
 
     /// `frameDuration` is what the root answers for it; with an invalid one it answers the library's default.
     ChannelTree(std::string const& name, Tempus const& frameDuration);
-    /// A tree of any classes that is there already, such as that of a document; it stays as it is. All nodes but those
-    /// that a class makes for itself, such as the components of a compound, belong to the tree from now on.
+    /// A tree of any classes that is there already, such as that of a document; it stays as it is. All nodes
+    /// but those that a class makes for itself, such as the components of a compound, belong to the tree from
+    /// now on.
     explicit ChannelTree(std::unique_ptr<KFChannelBase> top);
     ~ChannelTree();
     ChannelTree(ChannelTree const&) = delete;
@@ -79,7 +80,8 @@ public:
     KFSpline* spline(Node node) const { return curve(node).getSpline(); }
     /// `rad` or `units`.
     std::string_view unit(Node node) const { return unitOf(base(node)); }
-    /// The time of the first keypoint of all, and of the last, as their curves count time; nothing without any.
+    /// The time of the first keypoint of all, and of the last, as their curves count time; nothing without
+    /// any.
     std::optional<BXTimeRange> keyedRange() const;
 
     // Names. Each costs as much as the name is long, or the node deep.
@@ -95,8 +97,8 @@ public:
         std::optional<Node> first;
         std::optional<Node> second;
     };
-    /// By a path of IDs; else by the whole dotted name; else by the end of a dotted name, from behind one of its dots
-    /// on. Case matters. Of several the first in tree order comes first.
+    /// By a path of IDs; else by the whole dotted name; else by the end of a dotted name, from behind one of
+    /// its dots on. Case matters. Of several the first in tree order comes first.
     Match find(std::string_view text) const;
 
 private:
