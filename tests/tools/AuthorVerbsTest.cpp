@@ -71,7 +71,7 @@ TEST_F(AuthorVerbsTest, MakesADocumentFromNothing) {
     EXPECT_EQ(keys[2]["value"], 2.0);
 
     done({"set", _file, "Height", "--at", "1", "--delete"});
-    done({"set", _file, "Height", "--at", "0", "--value", "4"});
+    done({"set", _file, "Height", "--at", "0", "--value", "4", "--in-place"});
     std::string const copy = _folder.file("copy.lumen");
     done({"remove", _file, "Place", "-o", copy});
     EXPECT_EQ(Json::parse(done({"tree", copy, "--json"}))["nodes"].size(), 4U);

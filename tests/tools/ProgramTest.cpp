@@ -302,6 +302,7 @@ TEST_F(ProgramTest, FailuresToWriteExitWithOne) {
     Outcome const full = runLumenkey({"info", _file}, "/dev/full");
     EXPECT_EQ(full.exit, 1);
     EXPECT_EQ(full.err, "lumenkey: standard output: No space left on device\n");
+    EXPECT_EQ(runLumenkey({"diff", _file, _folder.write("other.csv", "t,X\n")}, "/dev/full").exit, 2);
 
     std::string const nowhere = _folder.file("missing/p.svg");
     Outcome const plot = runLumenkey({"gallery", "-o", nowhere});
@@ -344,7 +345,7 @@ TEST_F(ProgramTest, ManualAndCompletionAreMadeOfTheSameTexts) {
         return runProgramFile("/bin/bash", {"-c", line}).out;
     };
     EXPECT_EQ(completionsOf("lumenkey sm", 1), "smooth\n");
-    EXPECT_EQ(completionsOf("lumenkey set f.lumen --in", 3), "--interpolation\n");
+    EXPECT_EQ(completionsOf("lumenkey set f.lumen --in", 3), "--interpolation --in-place\n");
     EXPECT_EQ(completionsOf("lumenkey info '" + _folder.file("sma") + "'", 2), _file + "\n");
 }
 

@@ -50,12 +50,6 @@ struct OpenElement {
     Tempus lastTime = kTempusInvalid;
 };
 
-/// A channel of a class, to ask it what the class is like; null for what makes none.
-std::unique_ptr<KFChannelBase> exampleOf(KFFactory* factory) {
-    auto* const maker = dynamic_cast<KFChannelFactory*>(factory);
-    return std::unique_ptr<KFChannelBase>(maker == nullptr ? nullptr : maker->createChannel("", 1));
-}
-
 /// The check of one document, as its parser calls it.
 class Checker {
 public:

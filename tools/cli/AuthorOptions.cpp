@@ -1,6 +1,5 @@
 #include "tools/cli/AuthorOptions.h"
 
-#include "tools/cli/OutputOptions.h"
 #include "tools/cli/Progress.h"
 #include "tools/cli/UsageError.h"
 #include "tools/export/ChannelFileWriter.h"
@@ -15,23 +14,23 @@ void AuthorOptions::add(CLI::App& verb) {
 }
 
 void AuthorOptions::addRest(CLI::App& verb) {
-    verb.add_option("-o,--output", output, "Leave FILE as it is and write OUT.lumen, .csv or .bvh")
-        ->option_text("OUT");
+    auto* const out =
+        verb.add_option("-o,--output", output.output, "Leave FILE as it is and write OUT.lumen, .csv or .bvh")
+            ->option_text("OUT");
+    verb.add_flag("--in-place", output.inPlace, "Change FILE, as is done without -o")->excludes(out);
     input.addFrameRate(verb);
 }
 
 void AuthorOptions::check() const {
-    if (!output.empty()) {
-        requireOutputFormat(output, channelFormatNamed(input.file));
+    if (!output.output.empty()) {
+        requireOutputFormat(output.output, channelFormatNamed(input.file));
     }
 }
 
 void AuthorOptions::write(ChannelInput const& opened) const {
-    ChannelFormat const own = opened.file().format;
-    ChannelFormat const format = output.empty() ? own : requireOutputFormat(output, own);
+    ChannelFormat const format = output.formatFor(opened.file().format);
     Progress bar("writing");
-    writeChannelFile({opened.file(), format, RowsOf::Keypoints, {}, output.empty() ? input.file : output},
-                     [&bar](double share) { bar.update(share); });
+    writeChannelFile({opened.file(), format, RowsOf::Keypoints, {}, output.target(input.file)}, bar.teller());
 }
 
 std::string limitsText(KFChannel const& channel, double value) {

@@ -1,6 +1,7 @@
 #pragma once
 
 #include "tools/cli/ChannelInput.h"
+#include "tools/cli/OutputOptions.h"
 
 #include <string>
 
@@ -9,12 +10,12 @@ namespace lumenkey::tools {
 /// What the verbs are told that change single channels of a file: it, and where to put it.
 struct AuthorOptions {
     InputOptions input;
-    /// Empty for the file itself.
-    std::string output;
+    /// Without one, the file itself.
+    OutputOptions output;
 
-    /// Declares FILE, and `-o`.
+    /// Declares FILE.
     void add(CLI::App& verb);
-    /// The rest, to be called behind the verb's own arguments.
+    /// Declares `-o`, `--in-place` and `--frame-rate`, to be called behind the verb's own arguments.
     void addRest(CLI::App& verb);
 
     /// Before the file is read. Throws `UsageError` for an output that can't be written.

@@ -24,8 +24,7 @@ ChannelFile openWithProgress(InputOptions const& options) {
         frameDuration = stepOfRate(options.frameRate);
     }
     Progress bar("reading");
-    ChannelFile opened = openChannelFile(
-        options.file, [&bar](double share) { bar.update(share); }, frameDuration);
+    ChannelFile opened = openChannelFile(options.file, bar.teller(), frameDuration);
     if (frameDuration && opened.format != ChannelFormat::Document) {
         throw UsageError{"--frame-rate is for documents: '" + options.file + "' has a rate of its own"};
     }

@@ -22,8 +22,7 @@ void runConvert(ConvertOptions const& options) {
     ChannelInput const input(options.input);
     ChannelFormat const format = requireOutputFormat(options.output, input.file().format);
     Progress bar("writing");
-    writeChannelFile({input.file(), format, RowsOf::Input, {}, options.output},
-                     [&bar](double share) { bar.update(share); });
+    writeChannelFile({input.file(), format, RowsOf::Input, {}, options.output}, bar.teller());
 }
 
 } // namespace

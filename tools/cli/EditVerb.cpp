@@ -138,7 +138,7 @@ private:
         Progress bar("writing");
         return writeChannelFile(
             {input.file(), _format, areKeypoints ? RowsOf::Keypoints : RowsOf::Input, channels, target()},
-            [&bar](double share) { bar.update(share); });
+            bar.teller());
     }
 
     /// The stretch and where it comes to; around a part of the file, some of what lies beside it.
@@ -203,8 +203,8 @@ std::string footerOf(EditWords const& words, bool draws) {
            "A time is VALUE/TIMESCALE (1001/24000), seconds (0.5) or frames of the file (12f).\n"
            "Locked channels stay as they are. Without CHANNEL all channels are edited; the others are "
            "written as they are.\n"
-           "A BVH has frames as long as those of FILE, from 0, or from the first keypoint before it, to the "
-           "last.\n"
+           "A BVH has frames as long as those of FILE, from 0, or from the first keypoint before it, to "
+           "the last.\n"
            "A document keeps all else that it holds. A CSV has " +
            (draws ? "the rows of the input" : "a row for each keypoint") +
            ", if --rows doesn't say otherwise.\n\nExample: " + words.example;

@@ -33,13 +33,9 @@ std::optional<std::uintmax_t> sizeOf(std::string const& file) {
     return error ? std::nullopt : std::optional(size);
 }
 
-std::string versionText(DocumentFile const& document) {
-    return std::to_string(document.major) + "." + std::to_string(document.minor);
-}
-
 void writeDocumentJson(DocumentFile const& document, JsonWriter& json) {
     json.key("version");
-    json.string(versionText(document));
+    json.string(document.versionText());
     json.key("factories");
     json.beginArray();
     for (DocumentFactory const& factory : document.factories) {
@@ -156,7 +152,7 @@ void writeSummary(ChannelInput const& input, std::vector<ChannelTree::Node> cons
     ChannelFile const& file = input.file();
     out.write("file       " + printableText(file.file) + "\n");
     if (isDocument(input)) {
-        out.write("format     document, version " + versionText(file.document) + "\n");
+        out.write("format     document, version " + file.document.versionText() + "\n");
         out.write("factories  " + printableText(factoriesText(file.document)) + "\n");
     } else {
         out.write(isMotion(input) ? "format     BVH (motion capture)\n"

@@ -104,7 +104,7 @@ void writeTable(KFSpline* spline, std::string_view unit, OutputSink& out) {
         {"in", Align::Right},   {"out", Align::Right},     {"enabled"},           {"flags", Align::Right}};
     table.rowCount = handles.size();
     Progress bar("writing", ProgressOf::Output);
-    table.progress = [&bar](double share) { bar.update(share); };
+    table.progress = bar.teller();
     table.cell = [&](std::size_t row, std::size_t column) {
         return cellOf(readKeypoint(*spline, handles[row]), column);
     };

@@ -3,6 +3,7 @@
 #include "tools/output/StandardOutput.h"
 
 #include <algorithm>
+#include <atomic>
 #include <unistd.h>
 #include <utility>
 
@@ -14,21 +15,38 @@ constexpr std::chrono::milliseconds kPatience{1'000};
 constexpr std::chrono::milliseconds kBetweenDrawings{100};
 constexpr int kBarWidth = 40;
 
+/// Whether a bar has the line.
+std::atomic<bool> isLineTaken = false;
+
+bool takesLine(ProgressOf kind) {
+    bool const isSeen = ::isatty(STDERR_FILENO) == 1;
+    return isSeen && (kind == ProgressOf::Work || ::isatty(STDOUT_FILENO) != 1) &&
+           !isLineTaken.exchange(true);
+}
+
 } // namespace
 
 Progress::Progress(std::string what, ProgressOf kind)
-    : _what(std::move(what)),
-      _isTerminal(::isatty(STDERR_FILENO) == 1 && (kind == ProgressOf::Work || ::isatty(STDOUT_FILENO) != 1)),
-      _nextDrawing(Clock::now() + kPatience) {}
+    : _what(std::move(what)), _hasLine(takesLine(kind)), _nextDrawing(Clock::now() + kPatience) {}
 
 Progress::~Progress() {
     if (_isShown) {
         writeFully(STDERR_FILENO, "\r\x1B[K");
     }
+    if (_hasLine) {
+        isLineTaken = false;
+    }
+}
+
+std::function<void(double)> Progress::teller() {
+    if (!_hasLine) {
+        return {};
+    }
+    return [this](double share) { update(share); };
 }
 
 void Progress::update(double share) {
-    if (!_isTerminal || Clock::now() < _nextDrawing) {
+    if (!_hasLine || Clock::now() < _nextDrawing) {
         return;
     }
     _nextDrawing = Clock::now() + kBetweenDrawings;

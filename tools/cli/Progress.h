@@ -1,6 +1,7 @@
 #pragma once
 
 #include <chrono>
+#include <functional>
 #include <string>
 
 namespace lumenkey::tools {
@@ -12,7 +13,8 @@ enum class ProgressOf {
 };
 
 /// A bar on standard error while work lasts over a second and a person sits at the terminal; nothing
-/// otherwise. It is wiped away at the end.
+/// otherwise, nor while another one lives: work that is a part of other work shows nothing of its own. It is
+/// wiped away at the end.
 class Progress {
 public:
     explicit Progress(std::string what, ProgressOf kind = ProgressOf::Work);
@@ -22,12 +24,14 @@ public:
 
     /// The share of the work done, 0 .. 1. Cheap enough to be called in a loop.
     void update(double share);
+    /// The same as a function, for as long as the bar lives; empty where nothing is ever drawn.
+    std::function<void(double)> teller();
 
 private:
     using Clock = std::chrono::steady_clock;
 
     std::string _what;
-    bool _isTerminal;
+    bool _hasLine;
     bool _isShown = false;
     Clock::time_point _nextDrawing;
 };

@@ -43,7 +43,8 @@ Verb declareRemove(CLI::App& program) {
         ->required();
     options->author.addRest(*verb);
     verb->footer("Example: lumenkey remove ball.lumen Shadow");
-    return {verb, "FILE CHANNEL [-o OUT] [--frame-rate R]", [options](OutputSink&) { runRemove(*options); }};
+    return {verb, "FILE CHANNEL [-o OUT | --in-place] [--frame-rate R]",
+            [options](OutputSink&) { runRemove(*options); }};
 }
 
 } // namespace lumenkey::tools

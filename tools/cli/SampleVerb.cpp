@@ -287,7 +287,7 @@ void writeTable(std::vector<Series> const& all, SampleTimes const& times, Output
     }
     table.rowCount = times.count();
     Progress bar("writing", ProgressOf::Output);
-    table.progress = [&bar](double share) { bar.update(share); };
+    table.progress = bar.teller();
     table.cell = [&](std::size_t row, std::size_t column) {
         switch (column) {
         case 0:

@@ -156,11 +156,11 @@ Verb declareSet(CLI::App& program) {
                  interpolationNames() +
                  ".\n\nExample: lumenkey set ball.lumen Height --at 1/2 --value 0 "
                  "--interpolation linear");
-    return {
-        verb,
-        "FILE CHANNEL [--at T] (--value V [--interpolation NAME] | --interpolation NAME | --delete) [-o OUT] "
-        "[--frame-rate R]",
-        [options](OutputSink& out) { SetRun(*options).run(out); }};
+    return {verb,
+            "FILE CHANNEL [--at T] (--value V [--interpolation NAME] | --interpolation NAME | --delete) [-o "
+            "OUT | --in-place] "
+            "[--frame-rate R]",
+            [options](OutputSink& out) { SetRun(*options).run(out); }};
 }
 
 } // namespace lumenkey::tools

@@ -102,7 +102,7 @@ void writeTable(ChannelInput const& input, std::vector<Node> const& nodes, Outpu
                      {"keypoints", Align::Right}};
     table.rowCount = nodes.size();
     Progress bar("writing", ProgressOf::Output);
-    table.progress = [&bar](double share) { bar.update(share); };
+    table.progress = bar.teller();
     table.cell = [&](std::size_t row, std::size_t column) { return cellOf(input, nodes[row], column); };
     table.write(out);
 }

@@ -33,8 +33,7 @@ TypeRow rowOf(KFFactory& factory) {
     if (KFFactory const* const super = factory.getSuperFactory()) {
         row.superClass = classNameOf(*super);
     }
-    auto* const maker = dynamic_cast<KFChannelFactory*>(&factory);
-    std::unique_ptr<KFChannelBase> const example(maker == nullptr ? nullptr : maker->createChannel("", 1));
+    std::unique_ptr<KFChannelBase> const example = exampleOf(&factory);
     row.canBeMade = example != nullptr;
     if (example != nullptr && example->isValueChannel()) {
         auto const& channel = static_cast<KFChannel const&>(*example);

@@ -2,6 +2,7 @@
 
 #include "tools/cli/ChannelInput.h"
 #include "tools/cli/OutputOptions.h"
+#include "tools/cli/Progress.h"
 #include "tools/cli/SeveralFiles.h"
 #include "tools/cli/UsageError.h"
 #include "tools/export/ChannelFileWriter.h"
@@ -18,7 +19,7 @@ namespace {
 struct UpgradeOptions {
     std::vector<std::string> files;
     std::string frameRate;
-    std::string output;
+    OutputOptions output;
 };
 
 int upgrade(std::string const& file, UpgradeOptions const& options, OutputSink& out) {
@@ -27,25 +28,26 @@ int upgrade(std::string const& file, UpgradeOptions const& options, OutputSink& 
         throw InputError{file, 1, 1, "this is no document"};
     }
     DocumentFile const& document = input.file().document;
-    std::string const version = std::to_string(document.major) + "." + std::to_string(document.minor);
+    std::string const version = document.versionText();
     std::string const current = std::to_string(kWrittenMajor) + "." + std::to_string(kWrittenMinor);
-    std::string const& target = options.output.empty() ? file : options.output;
-    if (version == current && options.output.empty()) {
+    std::string const& target = options.output.target(file);
+    if (version == current && options.output.output.empty()) {
         out.write(printableText(file) + ": version " + current + " already\n");
         return kExitDone;
     }
-    writeChannelFile({input.file(), ChannelFormat::Document, RowsOf::Keypoints, {}, target});
+    Progress bar("writing");
+    writeChannelFile({input.file(), ChannelFormat::Document, RowsOf::Keypoints, {}, target}, bar.teller());
     out.write(printableText(target) + ": from version " + version + " to " + current + "\n");
     return kExitDone;
 }
 
 int runUpgrade(UpgradeOptions const& options, OutputSink& out) {
-    if (!options.output.empty()) {
+    if (std::string const& output = options.output.output; !output.empty()) {
         if (options.files.size() != 1) {
             throw UsageError{"-o is for one FILE"};
         }
-        if (requireOutputFormat(options.output, ChannelFormat::Document) != ChannelFormat::Document) {
-            throw UsageError{"'" + options.output + "' must end in .lumen"};
+        if (requireOutputFormat(output, ChannelFormat::Document) != ChannelFormat::Document) {
+            throw UsageError{"'" + output + "' must end in .lumen"};
         }
     }
     return forSeveralFiles(options.files, out, [&options](std::string const& file, OutputSink& text) {
@@ -59,15 +61,18 @@ Verb declareUpgrade(CLI::App& program) {
     auto const options = std::make_shared<UpgradeOptions>();
     CLI::App* const verb = program.add_subcommand("upgrade", "Write old documents anew, in today's version");
     verb->add_option("FILE", options->files, "Documents of any version")->option_text("...")->required();
-    verb->add_option("-o,--output", options->output, "Leave FILE as it is and write OUT.lumen")
-        ->option_text("OUT");
+    auto* const output =
+        verb->add_option("-o,--output", options->output.output, "Leave FILE as it is and write OUT.lumen")
+            ->option_text("OUT");
+    verb->add_flag("--in-place", options->output.inPlace, "Replace FILE, as is done without -o")
+        ->excludes(output);
     verb->add_option(
             "--frame-rate", options->frameRate,
             "Frames a second of documents that count frames, those of version 4 and before (else 30)")
         ->option_text("R");
     verb->footer("Each is replaced as a whole or not at all; one of today's version stays as it is.\n\n"
                  "Example: lumenkey upgrade old.lumen --frame-rate 24");
-    Verb declared{verb, "FILE... [-o OUT] [--frame-rate R]", {}};
+    Verb declared{verb, "FILE... [-o OUT | --in-place] [--frame-rate R]", {}};
     declared.runForExit = [options](OutputSink& out) { return runUpgrade(*options, out); };
     return declared;
 }

@@ -165,18 +165,18 @@ void checkNothingIsLost(FileToWrite const& wanted) {
     }
 }
 
-WrittenRows writeWholeDocument(FileToWrite const& wanted, OutputSink& out) {
+WrittenRows writeWholeDocument(FileToWrite const& wanted, OutputSink& out, ReadingProgress const& progress) {
     checkNothingIsLost(wanted);
     ChannelTree& tree = *wanted.file.tree;
     std::optional<SkeletonChannels> skeleton;
     if (wanted.file.format == ChannelFormat::Motion) {
         skeleton.emplace(wanted.file.skeleton, tree);
     }
-    writeDocument(tree.base(ChannelTree::kTop), out);
     std::size_t keypoints = 0;
     for (Node const node : tree.channelsBelow(ChannelTree::kTop)) {
         keypoints += tree.curve(node).getNumberOfKeypoints();
     }
+    writeDocument(tree.base(ChannelTree::kTop), out, tree.count() + keypoints, progress);
     std::optional<BXTimeRange> const keyed = tree.keyedRange();
     return {keypoints, keyed ? keyed->start : kTempusZero};
 }
@@ -186,7 +186,7 @@ WrittenRows writeAs(FileToWrite const& wanted, OutputSink& out, ReadingProgress 
     case ChannelFormat::Motion:
         return writeMotionOf(wanted, out, progress);
     case ChannelFormat::Document:
-        return writeWholeDocument(wanted, out);
+        return writeWholeDocument(wanted, out, progress);
     default:
         return writeTable(wanted, out, progress);
     }

@@ -20,8 +20,6 @@ namespace lumenkey::tools {
 
 namespace {
 
-constexpr std::uint32_t kDescriptionElement = 93;
-
 /// Deletes what reading made where no tree came of it.
 struct DeleteTree {
     void operator()(KFChannelBase* top) const {
@@ -55,7 +53,7 @@ public:
         case kFactoryElement:
             readFactory(element);
             break;
-        case kDescriptionElement:
+        case kFactoryDescriptionElement:
             if (!_document.factories.empty() && element.getAsString(&text)) {
                 _document.factories.back().description = text.str();
             }

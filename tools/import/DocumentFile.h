@@ -30,6 +30,10 @@ struct DocumentFactory {
 struct DocumentFile {
     std::uint32_t major = 5;
     std::uint32_t minor = 13;
+
+    /// Such as `5.13`.
+    std::string versionText() const { return std::to_string(major) + "." + std::to_string(minor); }
+
     std::vector<DocumentFactory> factories;
     std::unique_ptr<ChannelTree> tree;
 };

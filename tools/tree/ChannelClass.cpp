@@ -62,6 +62,11 @@ KFFactory* factoryOfClass(std::string_view name) {
     return nullptr;
 }
 
+std::unique_ptr<KFChannelBase> exampleOf(KFFactory* factory) {
+    auto* const maker = dynamic_cast<KFChannelFactory*>(factory);
+    return std::unique_ptr<KFChannelBase>(maker == nullptr ? nullptr : maker->createChannel("", 1));
+}
+
 std::string_view unitOf(KFChannelBase const& channel) {
     KFFactory const* const factory = channel.getFactory();
     bool const isAngle =

@@ -2,6 +2,7 @@
 
 #include "lumenkey/Channels/KFChannelBase.h"
 
+#include <memory>
 #include <string>
 #include <string_view>
 
@@ -20,6 +21,9 @@ std::string shortClassName(std::string_view className);
 
 /// The registered factory of a class by its short or long name, regardless of case; null for none.
 KFFactory* factoryOfClass(std::string_view name);
+
+/// A new channel of a class, to ask it what the class is like; null for a class that makes none, and for null.
+std::unique_ptr<KFChannelBase> exampleOf(KFFactory* factory);
 
 /// `rad` for angles, else `units`.
 std::string_view unitOf(KFChannelBase const& channel);

@@ -1,6 +1,5 @@
 #include "tools/tree/ChannelTree.h"
 
-#include "lumenkey/Channels/KFFactory.h"
 #include "tools/tree/FileRoot.h"
 
 #include <algorithm>
@@ -12,9 +11,8 @@ namespace {
 
 /// How many children a folder's class makes for itself; an object of it tells.
 std::size_t componentCountOf(KFChannelFolder const& folder) {
-    auto* const factory = dynamic_cast<KFChannelFactory*>(folder.getFactory());
-    std::unique_ptr<KFChannelBase> const made(factory == nullptr ? nullptr : factory->createChannel("", 1));
-    auto const* const like = dynamic_cast<KFChannelFolder const*>(made.get());
+    std::unique_ptr<KFChannelBase> const example = exampleOf(folder.getFactory());
+    auto const* const like = dynamic_cast<KFChannelFolder const*>(example.get());
     return like == nullptr ? 0 : like->getNumberOfDescendants();
 }
 
