@@ -59,8 +59,8 @@ Verb declareCheck(CLI::App& program) {
     verb->add_option("FILE", options->files, kFileHelp)->option_text("...")->required();
     verb->footer(
         "A line for each finding, FILE:LINE:COLUMN: what it is; nothing is changed. Of documents: text that "
-        "is "
-        "no XML,\nelements and classes that are unknown and so passed over, values that can't be read or are "
+        "is no XML,\nelements and classes that are unknown and so passed over, values that can't be read or "
+        "are "
         "out of limits,\nkeypoints out of order. Exits 0 where there is nothing, else 1.\n\n"
         "Example: lumenkey check *.lumen");
     Verb declared{verb, "FILE...", {}};

@@ -2,6 +2,7 @@
 
 #include "tools/cli/ChannelInput.h"
 #include "tools/cli/EditVerb.h"
+#include "tools/cli/Progress.h"
 #include "tools/compare/TreeDifference.h"
 #include "tools/output/JsonWriter.h"
 #include "tools/output/TextForms.h"
@@ -86,7 +87,8 @@ int runDiff(DiffOptions const& options, OutputSink& out) {
                         TempusMaximum(before.file().lastTime, after.file().lastTime)};
     Tempus const step = TempusMinimum(comparedStep(before.file(), span, std::nullopt),
                                       comparedStep(after.file(), span, std::nullopt));
-    std::vector<NodeDifference> const all = differencesBetween(before.tree(), after.tree(), step);
+    std::vector<NodeDifference> const all =
+        differencesBetween(before.tree(), after.tree(), span, step, Progress("comparing").teller());
     if (options.json) {
         writeJson(all, out);
     } else {
@@ -111,8 +113,7 @@ Verb declareDiff(CLI::App& program) {
     verb->footer(
         "A line for each channel that was added, removed or changed; for a changed curve, how far it lies "
         "off at most,\nand where, looked at ten times in each frame. Exits 0 where the files hold the same, "
-        "1 "
-        "where they differ, and 2\nin trouble.\n\nExample: lumenkey diff walk.lumen edited.lumen");
+        "1 where they differ, and 2\nin trouble.\n\nExample: lumenkey diff walk.lumen edited.lumen");
     Verb declared{verb, "A B [--frame-rate R] [--json]", {}};
     declared.runForExit = [options](OutputSink& out) { return runDiff(*options, out); };
     declared.exitInTrouble = kExitWrongArguments;

@@ -87,13 +87,16 @@ public:
     }
 
 private:
-    static int runVerb(Verb const& verb, OutputSink& out) {
+    static int runVerb(Verb const& verb, StandardOutput& out) {
         try {
+            int exit = kExitDone;
             if (verb.runForExit) {
-                return verb.runForExit(out);
+                exit = verb.runForExit(out);
+            } else {
+                verb.run(out);
             }
-            verb.run(out);
-            return kExitDone;
+            out.flush();
+            return exit;
         } catch (InputError const& error) {
             complain(error.text());
         } catch (OutputError const& error) {

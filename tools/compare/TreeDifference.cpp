@@ -44,20 +44,10 @@ std::string fadesText(KFChannel const& channel) {
 /// One run.
 class Comparison {
 public:
-    Comparison(ChannelTree const& before, ChannelTree const& after, Tempus const& step)
-        : _before(before), _after(after), _step(step) {
-        for (ChannelTree const* const tree : {&before, &after}) {
-            if (std::optional<BXTimeRange> const keyed = tree->keyedRange()) {
-                Tempus const end = TempusRangeGetEnd(*keyed);
-                _span = _hasSpan
-                            ? TimeSpan{TempusMinimum(_span.from, keyed->start), TempusMaximum(_span.to, end)}
-                            : TimeSpan{keyed->start, end};
-                _hasSpan = true;
-            }
-        }
-    }
+    Comparison(ChannelTree const& before, ChannelTree const& after, TimeSpan const& span, Tempus const& step)
+        : _before(before), _after(after), _span(span), _step(step) {}
 
-    std::vector<NodeDifference> run() {
+    std::vector<NodeDifference> run(ReadingProgress const& progress) {
         std::map<Key, Node> const old = nodesByName(_before);
         std::map<Key, Node> const now = nodesByName(_after);
         std::vector<std::pair<Node, Key>> ordered;
@@ -66,6 +56,9 @@ public:
         }
         std::sort(ordered.begin(), ordered.end());
         for (auto const& [node, key] : ordered) {
+            if (progress) {
+                progress(static_cast<double>(node) / static_cast<double>(ordered.size()));
+            }
             auto const found = old.find(key);
             if (found == old.end()) {
                 _all.push_back({DifferenceKind::Added, key.first, {}, {}, {}});
@@ -155,9 +148,8 @@ private:
 
     ChannelTree const& _before;
     ChannelTree const& _after;
+    TimeSpan const& _span;
     Tempus const& _step;
-    TimeSpan _span{kTempusZero, kTempusZero};
-    bool _hasSpan = false;
     std::vector<std::string> _details;
     std::vector<NodeDifference> _all;
 };
@@ -165,8 +157,9 @@ private:
 } // namespace
 
 std::vector<NodeDifference> differencesBetween(ChannelTree const& before, ChannelTree const& after,
-                                               Tempus const& step) {
-    return Comparison(before, after, step).run();
+                                               TimeSpan const& span, Tempus const& step,
+                                               ReadingProgress const& progress) {
+    return Comparison(before, after, span, step).run(progress);
 }
 
 } // namespace lumenkey::tools

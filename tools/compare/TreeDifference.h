@@ -1,6 +1,7 @@
 #pragma once
 
 #include "tools/edit/CurveChange.h"
+#include "tools/import/InputText.h"
 #include "tools/tree/ChannelTree.h"
 
 #include <optional>
@@ -26,9 +27,10 @@ struct NodeDifference {
 /// Compares nodes that have the same dotted name; of several with one name the first with the first, and so
 /// on. The name of the top itself doesn't count, since that of a table or a motion is that of its file.
 ///
-/// Curves are compared from the first keypoint of both trees to the last, at every `step` (`changeBetween`).
-/// In the order of the second tree, with what it lacks behind.
+/// Curves are compared over the span, at every `step` (`changeBetween`). In the order of the second tree, with
+/// what it lacks behind.
 std::vector<NodeDifference> differencesBetween(ChannelTree const& before, ChannelTree const& after,
-                                               Tempus const& step);
+                                               TimeSpan const& span, Tempus const& step,
+                                               ReadingProgress const& progress);
 
 } // namespace lumenkey::tools
