@@ -1,15 +1,15 @@
 #pragma once
 
-#include <cstdint>
+#include "tools/check/DocumentScanner.h"
+
 #include <string>
 #include <vector>
 
 namespace lumenkey::tools {
 
-/// Something about a document that its author should know, and where it stands; counted as in `InputError`.
+/// Something about a document that its author should know, and where it stands.
 struct DocumentFinding {
-    std::uint64_t line = 1;
-    std::uint64_t column = 1;
+    TextPlace place;
     std::string what;
 };
 
@@ -20,6 +20,6 @@ struct DocumentFinding {
 ///
 /// The limits of a curve are those that the document gives, else those of the class. Throws `InputError` for
 /// a file that can't be read.
-std::vector<DocumentFinding> checkDocument(std::string const& file);
+std::vector<DocumentFinding> checkDocument(std::string const& file, ReadingProgress const& progress);
 
 } // namespace lumenkey::tools

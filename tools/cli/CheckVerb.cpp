@@ -2,6 +2,7 @@
 
 #include "tools/check/DocumentCheck.h"
 #include "tools/cli/ChannelInput.h"
+#include "tools/cli/Progress.h"
 #include "tools/cli/SeveralFiles.h"
 #include "tools/output/TextForms.h"
 
@@ -19,7 +20,7 @@ struct CheckOptions {
 /// What stops the reading of a file; nothing where it can be opened.
 std::optional<InputError> faultOf(std::string const& file, ChannelFormat* format) {
     try {
-        *format = openChannelFile(file).format;
+        *format = openChannelFile(file, Progress("reading").teller()).format;
         return std::nullopt;
     } catch (InputError const& error) {
         return error;
@@ -36,14 +37,14 @@ int check(std::string const& file, OutputSink& out) {
     std::optional<InputError> const fault = faultOf(file, &format);
     std::vector<DocumentFinding> findings;
     if (format == ChannelFormat::Document) {
-        findings = checkDocument(file);
+        findings = checkDocument(file, Progress("checking").teller());
     }
     // What stops the reading has mostly been found already, perhaps in other words.
     bool isTold = !fault || (!findings.empty() && isFoundToo(*fault));
     for (DocumentFinding const& finding : findings) {
         isTold = isTold || finding.what == fault->what;
-        out.write(printableText(file) + ":" + std::to_string(finding.line) + ":" +
-                  std::to_string(finding.column) + ": " + printableText(finding.what) + "\n");
+        out.write(printableText(file) + ":" + std::to_string(finding.place.line) + ":" +
+                  std::to_string(finding.place.column) + ": " + printableText(finding.what) + "\n");
     }
     if (!isTold) {
         out.write(fault->text() + "\n");

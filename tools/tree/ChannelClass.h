@@ -22,7 +22,8 @@ std::string shortClassName(std::string_view className);
 /// The registered factory of a class by its short or long name, regardless of case; null for none.
 KFFactory* factoryOfClass(std::string_view name);
 
-/// A new channel of a class, to ask it what the class is like; null for a class that makes none, and for null.
+/// A new channel of a class, to ask it what the class is like; null for a class that makes none, and for
+/// null.
 std::unique_ptr<KFChannelBase> exampleOf(KFFactory* factory);
 
 /// `rad` for angles, else `units`.

@@ -1,0 +1,129 @@
+#include "tools/check/DocumentScanner.h"
+
+#include "tools/import/InputError.h"
+#include "tools/output/TextForms.h"
+
+#include <cerrno>
+#include <cstdio>
+#include <exception>
+#include <expat.h>
+#include <filesystem>
+#include <memory>
+#include <new>
+
+namespace lumenkey::tools {
+
+/// One scan, as its parser calls it.
+class DocumentScanner::Run {
+public:
+    explicit Run(DocumentScanner& scanner)
+        : _scanner(scanner), _parser(XML_ParserCreate(nullptr), &XML_ParserFree) {
+        if (!_parser) {
+            throw std::bad_alloc();
+        }
+        XML_SetUserData(_parser.get(), this);
+        XML_SetElementHandler(
+            _parser.get(),
+            [](void* self, char const* name, char const** pairs) {
+                guard(self, [&](Run& run) { run.start(name, pairs); });
+            },
+            [](void* self, char const*) { guard(self, [](Run& run) { run._scanner.end(); }); });
+        XML_SetCharacterDataHandler(_parser.get(), [](void* self, char const* text, int size) {
+            guard(self, [&](Run& run) { run._scanner.text({text, static_cast<std::size_t>(size)}); });
+        });
+        XML_SetStartDoctypeDeclHandler(
+            _parser.get(), [](void* self, char const*, char const*, char const*, int) {
+                guard(self, [](Run& run) {
+                    run._scanner.fault(run.place(), "a document type declaration, which is refused");
+                    run.stop();
+                });
+            });
+    }
+
+    void run(std::string const& file, ReadingProgress const& progress) {
+        std::unique_ptr<std::FILE, int (*)(std::FILE*)> const stream(std::fopen(file.c_str(), "rbe"),
+                                                                     &std::fclose);
+        if (!stream) {
+            throw InputError{file, 1, 1, systemErrorText(errno)};
+        }
+        std::error_code unknown;
+        auto const size = static_cast<double>(std::filesystem::file_size(file, unknown));
+        double done = 0;
+        for (bool isLast = false; !isLast && !_isStopped;) {
+            std::size_t const got = feedBlock(*stream, file, &isLast);
+            done += static_cast<double>(got);
+            if (progress && !unknown) {
+                progress(done / size);
+            }
+        }
+        if (_thrown) {
+            std::rethrow_exception(_thrown);
+        }
+    }
+
+private:
+    /// Nothing may be thrown through the parser, which is written in C.
+    template <class Work> static void guard(void* self, Work const& work) {
+        auto& run = *static_cast<Run*>(self);
+        if (run._isStopped) {
+            return;
+        }
+        try {
+            work(run);
+        } catch (...) {
+            run._thrown = std::current_exception();
+            run.stop();
+        }
+    }
+
+    void stop() {
+        _isStopped = true;
+        XML_StopParser(_parser.get(), XML_FALSE);
+    }
+
+    TextPlace place() const {
+        return {XML_GetCurrentLineNumber(_parser.get()), XML_GetCurrentColumnNumber(_parser.get()) + 1};
+    }
+
+    void start(char const* name, char const** pairs) {
+        Attributes attributes;
+        for (char const** pair = pairs; *pair != nullptr; pair += 2) {
+            attributes.emplace(pair[0], pair[1]);
+        }
+        _scanner.start(place(), name, attributes);
+    }
+
+    std::size_t feedBlock(std::FILE& stream, std::string const& file, bool* isLast) {
+        constexpr int block = 65'536;
+        void* const room = XML_GetBuffer(_parser.get(), block);
+        if (room == nullptr) {
+            throw std::bad_alloc();
+        }
+        std::size_t const got = std::fread(room, 1, block, &stream);
+        if (std::ferror(&stream) != 0) {
+            throw InputError{file, 1, 1, systemErrorText(errno)};
+        }
+        *isLast = got < block;
+        if (XML_ParseBuffer(_parser.get(), static_cast<int>(got), *isLast) != XML_STATUS_OK && !_isStopped) {
+            _isStopped = true;
+            _scanner.fault(place(), XML_ErrorString(XML_GetErrorCode(_parser.get())));
+        }
+        return got;
+    }
+
+    DocumentScanner& _scanner;
+    std::unique_ptr<XML_ParserStruct, void (*)(XML_Parser)> _parser;
+    bool _isStopped = false;
+    std::exception_ptr _thrown;
+};
+
+void DocumentScanner::scan(std::string const& file, ReadingProgress const& progress) {
+    Run(*this).run(file, progress);
+}
+
+std::string_view attributeOf(Attributes const& attributes, std::string_view name) {
+    auto const found = attributes.find(name);
+    return found == attributes.end() ? std::string_view() : found->second;
+}
+
+} // namespace lumenkey::tools
