@@ -7,24 +7,15 @@
 #include "tools/tree/ChannelTree.h"
 
 #include <gtest/gtest.h>
-#include <nlohmann/json.hpp>
 
 namespace lumenkey::tools {
 namespace {
-
-using Json = nlohmann::json;
 
 class AuthorVerbsTest : public ::testing::Test {
 protected:
     TestFolder const _folder;
     std::string const _file = _folder.file("ball.lumen");
 
-    static std::string done(std::vector<std::string> const& arguments, int exit = 0) {
-        Outcome const outcome = runLumenkey(arguments);
-        EXPECT_EQ(outcome.exit, exit) << Json(arguments) << outcome.err;
-        EXPECT_EQ(outcome.err, "");
-        return outcome.out;
-    }
     void expectRefused(std::vector<std::string> arguments, std::string const& complaint, int exit = 2) const {
         std::string const before = contentOf(_file);
         arguments.insert(arguments.begin() + 1, _file);
@@ -34,21 +25,21 @@ protected:
         EXPECT_EQ(contentOf(_file), before);
     }
     void makeBall() const {
-        done({"new", _file});
-        EXPECT_EQ(done({"add", _file, "./", "Double", "Height", "--value", "1.5"}), "./1\n");
-        EXPECT_EQ(done({"add", _file, "./", "folder", "Body"}), "./2\n");
-        EXPECT_EQ(done({"add", _file, "Body", "KFChannel3D", "Place"}), "./2/1\n");
-        EXPECT_EQ(done({"add", _file, "./2", "Bool", "On", "--value", "1"}), "./2/2\n");
-        done({"set", _file, "Height", "--at", "1/2", "--value", "0", "--interpolation", "Catmull Rom"});
-        done({"set", _file, "Height", "--at", "0", "--value", "3", "--interpolation", "constant"});
-        done({"set", _file, "Height", "--at", "1", "--value", "2"});
-        done({"set", _file, "Place.Y", "--value", "-5"});
+        outputOf({"new", _file});
+        EXPECT_EQ(outputOf({"add", _file, "./", "Double", "Height", "--value", "1.5"}), "./1\n");
+        EXPECT_EQ(outputOf({"add", _file, "./", "folder", "Body"}), "./2\n");
+        EXPECT_EQ(outputOf({"add", _file, "Body", "KFChannel3D", "Place"}), "./2/1\n");
+        EXPECT_EQ(outputOf({"add", _file, "./2", "Bool", "On", "--value", "1"}), "./2/2\n");
+        outputOf({"set", _file, "Height", "--at", "1/2", "--value", "0", "--interpolation", "Catmull Rom"});
+        outputOf({"set", _file, "Height", "--at", "0", "--value", "3", "--interpolation", "constant"});
+        outputOf({"set", _file, "Height", "--at", "1", "--value", "2"});
+        outputOf({"set", _file, "Place.Y", "--value", "-5"});
     }
 };
 
 TEST_F(AuthorVerbsTest, MakesADocumentFromNothing) {
     makeBall();
-    Json const nodes = Json::parse(done({"tree", _file, "--json"}))["nodes"];
+    Json const nodes = jsonOf({"tree", _file})["nodes"];
     std::string all;
     for (Json const& node : nodes) {
         all += node["path"].get<std::string>() + " " + node["name"].get<std::string>() + " " +
@@ -63,20 +54,20 @@ TEST_F(AuthorVerbsTest, MakesADocumentFromNothing) {
                    "./2/1/2 Y KFChannelDouble -5\n"
                    "./2/1/3 Z KFChannelDouble 0\n"
                    "./2/2 On KFChannelBool 1\n");
-    Json const keys = Json::parse(done({"keys", _file, "Height", "--json"}))["keypoints"];
+    Json const keys = jsonOf({"keys", _file, "Height"})["keypoints"];
     ASSERT_EQ(keys.size(), 3U);
     EXPECT_EQ(keys[0]["interpolation"], 0);
     EXPECT_EQ(keys[1]["time"], "1/2");
     EXPECT_EQ(keys[1]["interpolation"], 6);
     EXPECT_EQ(keys[2]["value"], 2.0);
 
-    done({"set", _file, "Height", "--at", "1", "--delete"});
-    done({"set", _file, "Height", "--at", "0", "--value", "4", "--in-place"});
+    outputOf({"set", _file, "Height", "--at", "1", "--delete"});
+    outputOf({"set", _file, "Height", "--at", "0", "--value", "4", "--in-place"});
     std::string const copy = _folder.file("copy.lumen");
-    done({"remove", _file, "Place", "-o", copy});
-    EXPECT_EQ(Json::parse(done({"tree", copy, "--json"}))["nodes"].size(), 4U);
-    EXPECT_EQ(Json::parse(done({"tree", _file, "--json"}))["nodes"].size(), 8U);
-    Json const left = Json::parse(done({"keys", copy, "Height", "--json"}))["keypoints"];
+    outputOf({"remove", _file, "Place", "-o", copy});
+    EXPECT_EQ(jsonOf({"tree", copy})["nodes"].size(), 4U);
+    EXPECT_EQ(jsonOf({"tree", _file})["nodes"].size(), 8U);
+    Json const left = jsonOf({"keys", copy, "Height"})["keypoints"];
     ASSERT_EQ(left.size(), 2U);
     EXPECT_EQ(left[0]["value"], 4.0);
     EXPECT_EQ(left[0]["interpolation"], 0) << "a new value leaves the rest of its keypoint";
@@ -114,38 +105,38 @@ TEST_F(AuthorVerbsTest, HashIsThatOfTheLibrary) {
         root.removeDescendant(child);
         ChannelTree const owner{std::unique_ptr<KFChannelBase>(child)};
     }
-    EXPECT_EQ(done({"hash", _file}), expected + "\n");
-    std::string const early = done({"hash", _file, "Height", "--at", "0"});
-    EXPECT_EQ(done({"hash", _file, "Height", "--at", "1/4"}), early) << "the value is held";
-    EXPECT_NE(done({"hash", _file, "Height", "--at", "3/4"}), early);
-    std::string const body = done({"hash", _file, "Body"});
-    done({"set", _file, "Height", "--at", "1/4", "--value", "3"});
-    EXPECT_EQ(done({"hash", _file, "Body"}), body);
-    EXPECT_NE(done({"hash", _file}), expected + "\n");
+    EXPECT_EQ(outputOf({"hash", _file}), expected + "\n");
+    std::string const early = outputOf({"hash", _file, "Height", "--at", "0"});
+    EXPECT_EQ(outputOf({"hash", _file, "Height", "--at", "1/4"}), early) << "the value is held";
+    EXPECT_NE(outputOf({"hash", _file, "Height", "--at", "3/4"}), early);
+    std::string const body = outputOf({"hash", _file, "Body"});
+    outputOf({"set", _file, "Height", "--at", "1/4", "--value", "3"});
+    EXPECT_EQ(outputOf({"hash", _file, "Body"}), body);
+    EXPECT_NE(outputOf({"hash", _file}), expected + "\n");
 }
 
 TEST_F(AuthorVerbsTest, DiffTellsWhatDiffersAndByItsExitCode) {
     makeBall();
     std::string const other = _folder.file("other.lumen");
     std::filesystem::copy_file(_file, other);
-    EXPECT_EQ(done({"diff", _file, other}), "");
-    done({"set", other, "Height", "--at", "1/4", "--value", "9"});
-    done({"add", other, "Body", "Angle", "Turn"});
-    done({"remove", other, "On"});
-    done({"set", other, "Place.X", "--value", "0.25"});
-    EXPECT_EQ(done({"diff", _file, other}, 1),
+    EXPECT_EQ(outputOf({"diff", _file, other}), "");
+    outputOf({"set", other, "Height", "--at", "1/4", "--value", "9"});
+    outputOf({"add", other, "Body", "Angle", "Turn"});
+    outputOf({"remove", other, "On"});
+    outputOf({"set", other, "Place.X", "--value", "0.25"});
+    EXPECT_EQ(outputOf({"diff", _file, other}, 1),
               "changed Height: by up to 6.000000 units, at 1/4 s; number of keypoints 3 became 4\n"
               "changed Body.Place.X: by up to 0.250000 units, at 0/1 s\n"
               "added   Body.Turn\n"
               "removed Body.On\n");
-    Json const json = Json::parse(done({"diff", other, _file, "--json"}, 1))["differences"];
+    Json const json = jsonOf({"diff", other, _file}, 1)["differences"];
     ASSERT_EQ(json.size(), 4U);
     EXPECT_EQ(json[0]["worst"], 6.0);
     EXPECT_EQ(json[2]["kind"], "added");
     // What draws the same curve may still be another one.
     std::filesystem::copy_file(_file, other, std::filesystem::copy_options::overwrite_existing);
-    done({"set", other, "Height", "--at", "1", "--interpolation", "ease"});
-    EXPECT_EQ(done({"diff", _file, other}, 1),
+    outputOf({"set", other, "Height", "--at", "1", "--interpolation", "ease"});
+    EXPECT_EQ(outputOf({"diff", _file, other}, 1),
               "changed Height: keypoints or settings of a curve with the same values\n");
     EXPECT_EQ(runLumenkey({"diff", _file, _folder.file("none")}).exit, 2);
     EXPECT_EQ(runLumenkey({"diff", _file}).exit, 2);
@@ -159,16 +150,16 @@ TEST_F(AuthorVerbsTest, UpgradeWritesOldDocumentsInTodaysVersion) {
     }
     std::vector<std::string> arguments{"upgrade", "--frame-rate", "24"};
     arguments.insert(arguments.end(), files.begin(), files.end());
-    EXPECT_EQ(done(arguments), files[0] + ": from version 2.1 to 5.13\n" + files[1] +
-                                   ": from version 3.1 to 5.13\n" + files[2] +
-                                   ": from version 4.1 to 5.13\n");
+    EXPECT_EQ(outputOf(arguments), files[0] + ": from version 2.1 to 5.13\n" + files[1] +
+                                       ": from version 3.1 to 5.13\n" + files[2] +
+                                       ": from version 4.1 to 5.13\n");
     for (std::string const& file : files) {
         std::string const text = contentOf(file);
         EXPECT_NE(text.find("<timing in=\"10/24\" out=\"100/24\" offset=\"30/24\"/>"), std::string::npos)
             << text;
         EXPECT_NE(text.find("<time>30/24</time>"), std::string::npos) << text;
-        EXPECT_EQ(done({"diff", file, files[0]}), "");
-        EXPECT_EQ(done({"upgrade", file}), file + ": version 5.13 already\n");
+        EXPECT_EQ(outputOf({"diff", file, files[0]}), "");
+        EXPECT_EQ(outputOf({"upgrade", file}), file + ": version 5.13 already\n");
         EXPECT_EQ(contentOf(file), text);
     }
     arguments.push_back(_folder.file("none.lumen"));

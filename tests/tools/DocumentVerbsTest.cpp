@@ -6,13 +6,11 @@
 #include "tools/import/MotionFile.h"
 
 #include <gtest/gtest.h>
-#include <nlohmann/json.hpp>
 #include <sys/stat.h>
 
 namespace lumenkey::tools {
 namespace {
 
-using Json = nlohmann::json;
 using samples::kSmallMotion;
 
 constexpr char const* kOldDocument = LUMENKEY_TEST_SOURCE_DIR "/tests/persistence/data/version3.lumen";
@@ -23,63 +21,42 @@ protected:
     std::string const _motion = _folder.write("small.bvh", kSmallMotion);
     std::string const _document = _folder.file("small.lumen");
 
-    static void expectDone(std::vector<std::string> const& arguments) {
-        Outcome const outcome = runLumenkey(arguments);
-        EXPECT_EQ(outcome.exit, 0) << Json(arguments) << outcome.err;
-        EXPECT_EQ(outcome.err, "");
-    }
     static std::string complaintOf(std::vector<std::string> const& arguments, int exit = 1) {
         Outcome const outcome = runLumenkey(arguments);
         EXPECT_EQ(outcome.exit, exit) << Json(arguments);
         EXPECT_EQ(outcome.out, "");
         return outcome.err;
     }
-    static Json jsonOf(std::vector<std::string> arguments) {
-        arguments.push_back("--json");
-        Outcome const outcome = runLumenkey(arguments);
-        EXPECT_EQ(outcome.exit, 0) << outcome.err;
-        return Json::parse(outcome.out, nullptr, false);
-    }
 };
 
 TEST_F(DocumentVerbsTest, MotionsAndTablesComeBackFromDocuments) {
-    expectDone({"convert", _motion, _document});
+    outputOf({"convert", _motion, _document});
     std::string const back = _folder.file("back.bvh");
-    expectDone({"convert", _document, back});
-    Motion const before = readMotionFile(_motion);
-    Motion const after = readMotionFile(back);
-    EXPECT_EQ(after.values, before.values);
-    EXPECT_EQ(after.frameDuration, before.frameDuration);
-    ASSERT_EQ(after.joints.size(), before.joints.size());
-    for (std::size_t i = 0; i < before.joints.size(); ++i) {
-        EXPECT_EQ(after.joints[i].name, before.joints[i].name);
-        EXPECT_EQ(after.joints[i].offset, before.joints[i].offset);
-        EXPECT_EQ(after.joints[i].parent, before.joints[i].parent);
-    }
-    ASSERT_EQ(after.endSites.size(), before.endSites.size());
-    EXPECT_EQ(after.endSites[0].offset, before.endSites[0].offset);
+    outputOf({"convert", _document, back});
+    EXPECT_EQ(samples::described(readMotionFile(back)), samples::described(readMotionFile(_motion)));
 
     // The same keypoints as a table, whichever way; and a document is written as it was read.
     std::string const direct = _folder.file("direct.csv");
     std::string const around = _folder.file("around.csv");
-    expectDone({"convert", _motion, direct});
-    expectDone({"convert", _document, around});
+    outputOf({"convert", _motion, direct});
+    outputOf({"convert", _document, around});
     EXPECT_EQ(contentOf(around), contentOf(direct));
     std::string const table =
         _folder.write("t.csv", "time,seconds,A,B\n0/1,0,1,\n1/3,0.3333333333333333,,2\n");
-    expectDone({"convert", table, _folder.file("t.lumen")});
-    expectDone({"convert", _folder.file("t.lumen"), _folder.file("t2.lumen")});
-    expectDone({"convert", _folder.file("t2.lumen"), _folder.file("t3.lumen")});
+    outputOf({"convert", table, _folder.file("t.lumen")});
+    outputOf({"convert", _folder.file("t.lumen"), _folder.file("t2.lumen")});
+    outputOf({"convert", _folder.file("t2.lumen"), _folder.file("t3.lumen")});
     EXPECT_EQ(contentOf(_folder.file("t3.lumen")), contentOf(_folder.file("t2.lumen")));
-    expectDone({"convert", _folder.file("t3.lumen"), _folder.file("t2.csv")});
+    outputOf({"convert", _folder.file("t3.lumen"), _folder.file("t2.csv")});
     EXPECT_EQ(contentOf(_folder.file("t2.csv")), contentOf(table));
     EXPECT_NE(complaintOf({"convert", _folder.file("t.lumen"), back}).find("'A' stands in no joint"),
               std::string::npos);
-    EXPECT_EQ(readMotionFile(back).values, before.values) << "a failure has replaced the file";
+    EXPECT_EQ(readMotionFile(back).values, readMotionFile(_motion).values)
+        << "a failure has replaced the file";
 }
 
 TEST_F(DocumentVerbsTest, ReadingVerbsTakeDocuments) {
-    expectDone({"convert", _motion, _document});
+    outputOf({"convert", _motion, _document});
     Json const info = jsonOf({"info", _document});
     EXPECT_EQ(info["format"], "document");
     EXPECT_EQ(info["version"], "5.13");
@@ -109,8 +86,8 @@ TEST_F(DocumentVerbsTest, ReadingVerbsTakeDocuments) {
         }
         EXPECT_EQ(ofDocument, ofMotion) << Json(verb);
     }
-    EXPECT_EQ(jsonOf({"keys", _document, "Offset.X"})["keypoints"].size(), 0U);
-    expectDone({"plot", _document, "Hips.Offset", "Hips.Yposition", "-o", _folder.file("p.svg")});
+    EXPECT_EQ(jsonOf({"keys", _document, "./1/7/4/1"})["keypoints"].size(), 0U);
+    outputOf({"plot", _document, "Hips.Offset", "Hips.Yposition", "-o", _folder.file("p.svg")});
 
     // Told by its content; old ones count frames.
     std::string const nameless = _folder.write("nameless", "\xEF\xBB\xBF" + contentOf(kOldDocument));
@@ -147,28 +124,22 @@ TEST_F(DocumentVerbsTest, FaultyDocumentsAreToldWithTheirPlace) {
     }
 }
 
-TEST_F(DocumentVerbsTest, EditsInPlaceKeepPermissionsLinksAndTheOldFileUponFailure) {
-    expectDone({"convert", _motion, _document});
+TEST_F(DocumentVerbsTest, EditsInPlaceKeepPermissionsAndLinks) {
+    outputOf({"convert", _motion, _document});
     std::string const original = contentOf(_document);
     ::chmod(_document.c_str(), 0640);
     std::string const link = _folder.file("link.lumen");
     std::filesystem::create_symlink("small.lumen", link);
-    expectDone({"scale", link, "Hips.Yposition", "--factor", "2", "--in-place"});
+    outputOf({"scale", link, "Hips.Yposition", "--factor", "2", "--in-place"});
     EXPECT_TRUE(std::filesystem::is_symlink(link));
     EXPECT_EQ(jsonOf({"sample", _document, "Hips.Yposition", "--at", "0"})["series"][0]["points"][0]["value"],
               180.0);
     struct stat status {};
     ASSERT_EQ(::stat(_document.c_str(), &status), 0);
     EXPECT_EQ(status.st_mode & 07777, 0640U);
-    expectDone({"scale", link, "Hips.Yposition", "--factor", "0.5", "--in-place"});
+    outputOf({"scale", link, "Hips.Yposition", "--factor", "0.5", "--in-place"});
     EXPECT_EQ(contentOf(_document), original) << "halved again, it is the same document";
 
-    // A limit on the size of files stands for a full disk.
-    std::string const script = "trap '' XFSZ; ulimit -f 1; exec '" + programPath() + "' scale '" + _document +
-                               "' --factor 3 --in-place";
-    Outcome const full = runProgramFile("/bin/sh", {"-c", script});
-    EXPECT_EQ(full.exit, 1) << full.err;
-    EXPECT_EQ(contentOf(_document), original);
     EXPECT_EQ(_folder.entryCount(), 3U) << "a temporary was left behind";
     EXPECT_NE(complaintOf({"scale", _document, "--factor", "2"}, 2).find("-o OUT, or --in-place"),
               std::string::npos);

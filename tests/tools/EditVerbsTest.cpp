@@ -9,12 +9,10 @@
 #include <cmath>
 #include <gtest/gtest.h>
 #include <locale>
-#include <nlohmann/json.hpp>
 
 namespace lumenkey::tools {
 namespace {
 
-using Json = nlohmann::json;
 using samples::kSmallMotion;
 
 class EditVerbsTest : public ::testing::Test {
@@ -29,11 +27,8 @@ protected:
     }
 
     Json editToJson(std::string const& file, std::vector<std::string> arguments) const {
-        arguments.push_back("--json");
-        Outcome const outcome = edit(file, arguments);
-        EXPECT_EQ(outcome.exit, 0) << outcome.err;
-        EXPECT_EQ(outcome.err, "");
-        return Json::parse(outcome.out, nullptr, false);
+        arguments.insert(arguments.begin() + 1, {file, "-o", _out});
+        return jsonOf(arguments);
     }
 
     /// `time=values` for each row of the output, without what is empty.

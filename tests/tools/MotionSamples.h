@@ -4,6 +4,10 @@
 
 #include "tools/import/MotionFile.h"
 
+#include <cstddef>
+#include <ios>
+#include <locale>
+#include <sstream>
 #include <string>
 #include <string_view>
 
@@ -41,6 +45,32 @@ inline std::string replaced(std::string_view text, std::string_view what, std::s
         return "the sample doesn't hold what was to be replaced";
     }
     return changed.replace(place, what.size(), by);
+}
+
+/// Everything but the name of the file, numbers to the last bit.
+inline std::string described(Motion const& motion) {
+    std::ostringstream text;
+    text.imbue(std::locale::classic());
+    text << std::hexfloat << motion.frameDuration.value << "/" << motion.frameDuration.timescale << "\n";
+    for (MotionJoint const& joint : motion.joints) {
+        text << joint.name << " in " << static_cast<std::ptrdiff_t>(joint.parent) << " at";
+        for (double const coordinate : joint.offset) {
+            text << " " << coordinate;
+        }
+        for (std::size_t i = 0; i < joint.channelCount; ++i) {
+            text << " " << joint.firstChannel + i << "="
+                 << motionChannelKindName(motion.channels[joint.firstChannel + i].kind);
+        }
+        text << "\n";
+    }
+    for (MotionEndSite const& site : motion.endSites) {
+        text << "end of " << site.joint << " " << site.offset[0] << " " << site.offset[1] << " "
+             << site.offset[2] << "\n";
+    }
+    for (double const value : motion.values) {
+        text << value << " ";
+    }
+    return text.str() + std::to_string(motion.frameCount);
 }
 
 } // namespace lumenkey::tools::samples

@@ -6,14 +6,12 @@
 
 #include <algorithm>
 #include <gtest/gtest.h>
-#include <nlohmann/json.hpp>
 #include <numbers>
 #include <sys/stat.h>
 
 namespace lumenkey::tools {
 namespace {
 
-using Json = nlohmann::json;
 using samples::kSmallMotion;
 using samples::replaced;
 
@@ -21,13 +19,6 @@ class ProgramTest : public ::testing::Test {
 protected:
     TestFolder const _folder;
     std::string const _file = _folder.write("small.bvh", kSmallMotion);
-
-    static Json jsonOf(std::vector<std::string> const& arguments) {
-        Outcome const outcome = runLumenkey(arguments);
-        EXPECT_EQ(outcome.exit, 0) << outcome.err;
-        EXPECT_EQ(outcome.err, "");
-        return Json::parse(outcome.out, nullptr, false);
-    }
 
     /// Exit code 2, the complaint, the usage of the verb, and nothing on standard output.
     static void expectWrongArguments(std::vector<std::string> const& arguments,
@@ -41,7 +32,7 @@ protected:
 };
 
 TEST_F(ProgramTest, InfoTellsWhatAFileHolds) {
-    Json const info = jsonOf({"info", _file, "--json"});
+    Json const info = jsonOf({"info", _file});
     EXPECT_EQ(info["format"], "BVH");
     EXPECT_EQ(info["channels"], 9);
     EXPECT_EQ(info["keypoints"], 27);
@@ -67,7 +58,7 @@ TEST_F(ProgramTest, TreeListsNodes) {
         << table.out;
     EXPECT_EQ(std::count(table.out.begin(), table.out.end(), '\n'), 10);
 
-    Json const nodes = jsonOf({"tree", _file, "--json"})["nodes"];
+    Json const nodes = jsonOf({"tree", _file})["nodes"];
     ASSERT_EQ(nodes.size(), 12U);
     EXPECT_EQ(nodes[8],
               Json::parse(R"({"path": "./1/7", "depth": 2, "id": 7, "name": "LeftLeg", "type": "Folder",
@@ -82,7 +73,7 @@ TEST_F(ProgramTest, NamesThatFitTwiceAreToldOfAndFoldersStandForTheirChannels) {
     EXPECT_EQ(Json::parse(twice.out)["channel"], "Hips.Xrotation");
     EXPECT_EQ(twice.err, "lumenkey: warning: 'Xrotation' names ./1/5, which is taken, and also ./1/7/2\n");
     auto const channelsOf = [this](std::vector<std::string> const& named) {
-        std::vector<std::string> arguments{"sample", _file, "--at", "0", "--json"};
+        std::vector<std::string> arguments{"sample", _file, "--at", "0"};
         arguments.insert(arguments.begin() + 2, named.begin(), named.end());
         Json const sampled = jsonOf(arguments);
         std::string all;
@@ -105,7 +96,7 @@ TEST_F(ProgramTest, ReadsTheTablesThatItWrites) {
     Outcome const written = runLumenkey({"sample", _file, "--rate", "23.976", "--to", "10", "--csv"});
     ASSERT_EQ(written.exit, 0) << written.err;
     std::string const table = _folder.write("table.csv", written.out);
-    Json const info = jsonOf({"info", table, "--json"});
+    Json const info = jsonOf({"info", table});
     EXPECT_EQ(info["format"], "CSV");
     EXPECT_EQ(info["frameDuration"], "125/2997");
     EXPECT_EQ(info["rows"], 240);
@@ -116,10 +107,10 @@ TEST_F(ProgramTest, ReadsTheTablesThatItWrites) {
 
     // Told by its content where its name doesn't tell.
     std::string const gaps = _folder.write("gaps", "t,X,Y\n0.25,1,\n0.5,2,5\n1.5,,6\n");
-    Json const points = jsonOf({"sample", gaps, "X", "--count", "3", "--json"})["series"][0]["points"];
+    Json const points = jsonOf({"sample", gaps, "X", "--count", "3"})["series"][0]["points"];
     EXPECT_EQ(points[2]["time"], "3/2");
     EXPECT_EQ(points[2]["value"], 2.0);
-    EXPECT_EQ(jsonOf({"info", gaps, "--json"}).contains("frameDuration"), false);
+    EXPECT_EQ(jsonOf({"info", gaps}).contains("frameDuration"), false);
     EXPECT_EQ(runLumenkey({"plot", gaps, "-o", _folder.file("gaps.svg")}).exit, 0);
     expectWrongArguments({"sample", gaps, "--at", "1f"}, "aren't frames of one duration");
     Outcome const faulty = runLumenkey({"tree", _folder.write("faulty.csv", "t,X\n0,high\n")});
@@ -128,7 +119,7 @@ TEST_F(ProgramTest, ReadsTheTablesThatItWrites) {
 }
 
 TEST_F(ProgramTest, KeysListsKeypoints) {
-    Json const keys = jsonOf({"keys", _file, "LeftLeg.Xrotation", "--json"});
+    Json const keys = jsonOf({"keys", _file, "LeftLeg.Xrotation"});
     EXPECT_EQ(keys["channel"], "Hips.LeftLeg.Xrotation");
     ASSERT_EQ(keys["keypoints"].size(), 3U);
     Json const& key = keys["keypoints"][1];
@@ -144,8 +135,8 @@ TEST_F(ProgramTest, KeysListsKeypoints) {
 }
 
 TEST_F(ProgramTest, SampleReadsAtExactTimes) {
-    Json const at = jsonOf({"sample", _file, "Hips.Xposition", "LeftLeg.Zrotation", "--at", "1/240,0.0125,2f",
-                            "--slope", "--json"});
+    Json const at = jsonOf(
+        {"sample", _file, "Hips.Xposition", "LeftLeg.Zrotation", "--at", "1/240,0.0125,2f", "--slope"});
     ASSERT_EQ(at["series"].size(), 2U);
     EXPECT_EQ(at["series"][1]["channel"], "Hips.LeftLeg.Zrotation");
     Json const& points = at["series"][0]["points"];
@@ -159,7 +150,7 @@ TEST_F(ProgramTest, SampleReadsAtExactTimes) {
     EXPECT_NEAR(points[1]["slope"].get<double>(), 360, 1e-6);
 
     auto const timesOf = [this](std::vector<std::string> arguments) {
-        arguments.insert(arguments.begin(), {"sample", _file, "Hips.Xposition", "--json"});
+        arguments.insert(arguments.begin(), {"sample", _file, "Hips.Xposition"});
         std::string all;
         Json const sampled = jsonOf(arguments);
         for (Json const& point : sampled["series"][0]["points"]) {
@@ -175,10 +166,9 @@ TEST_F(ProgramTest, SampleReadsAtExactTimes) {
 TEST_F(ProgramTest, SampleWritesTheSameNumbersInEveryForm) {
     std::string const quoted = _folder.write("quoted.bvh", replaced(kSmallMotion, "Hips", "Hips, \"big\""));
     std::vector<std::string> arguments{
-        "sample",  quoted,  "Hips, \"big\".Yposition", "LeftLeg.Yrotation", "--step", "1/600",
-        "--slope", "--json"};
+        "sample", quoted, "Hips, \"big\".Yposition", "LeftLeg.Yrotation", "--step", "1/600", "--slope"};
     Json const json = jsonOf(arguments);
-    arguments.back() = "--csv";
+    arguments.push_back("--csv");
     Outcome const csv = runLumenkey(arguments);
     ASSERT_EQ(csv.exit, 0) << csv.err;
     std::istringstream lines(csv.out);
@@ -234,7 +224,7 @@ TEST_F(ProgramTest, PlotDrawsAnySoundFile) {
         std::string const file = _folder.write("odd\xFF.bvh", each.text);
         Outcome const plot = runLumenkey({"plot", file, "Hips.Yposition", "-o", picture});
         EXPECT_EQ(plot.exit, 0) << plot.err;
-        Json const json = jsonOf({"sample", file, "Hips.Yposition", "--count", "7", "--json"});
+        Json const json = jsonOf({"sample", file, "Hips.Yposition", "--count", "7"});
         EXPECT_EQ(json["series"][0]["points"].size(), 7U);
     }
 }
@@ -350,7 +340,7 @@ TEST_F(ProgramTest, ManualAndCompletionAreMadeOfTheSameTexts) {
 }
 
 TEST_F(ProgramTest, TypesListsAllClasses) {
-    Json const types = jsonOf({"types", "--json"})["types"];
+    Json const types = jsonOf({"types"})["types"];
     auto const found =
         std::find_if(types.begin(), types.end(), [](Json const& type) { return type["name"] == "Percent"; });
     ASSERT_NE(found, types.end());
@@ -367,14 +357,14 @@ TEST_F(ProgramTest, WorksOnMotionThatItsGeneratorMakes) {
         ASSERT_EQ(made.exit, 0) << made.err;
     }
     EXPECT_EQ(contentOf(first), contentOf(second));
-    Json const info = jsonOf({"info", first, "--json"});
+    Json const info = jsonOf({"info", first});
     EXPECT_EQ(info["frameDuration"], "1/120");
     EXPECT_EQ(info["channels"], 54);
     std::string const large = _folder.file("large.bvh");
     Outcome const made =
         runProgramFile(LUMENKEY_MAKE_MOTION, {large, "--frames", "30", "--joints", "200", "--rate", "25"});
     ASSERT_EQ(made.exit, 0) << made.err;
-    EXPECT_EQ(jsonOf({"info", large, "--json"})["channels"], 603);
+    EXPECT_EQ(jsonOf({"info", large})["channels"], 603);
     // However many keypoints there are, a picture has only so many pixels.
     std::string const dense = _folder.file("dense.bvh");
     runProgramFile(LUMENKEY_MAKE_MOTION, {dense, "--frames", "30000", "--joints", "1"});

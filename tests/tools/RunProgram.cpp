@@ -4,6 +4,7 @@
 
 #include <cstdlib>
 #include <fcntl.h>
+#include <gtest/gtest.h>
 #include <spawn.h>
 #include <sys/wait.h>
 #include <unistd.h>
@@ -75,6 +76,18 @@ Outcome runProgramFile(std::string const& program, std::vector<std::string> cons
 
 Outcome runLumenkey(std::vector<std::string> const& arguments, std::string const& outTarget) {
     return runProgramFile(programPath(), arguments, outTarget);
+}
+
+std::string outputOf(std::vector<std::string> const& arguments, int exit) {
+    Outcome const outcome = runLumenkey(arguments);
+    EXPECT_EQ(outcome.exit, exit) << Json(arguments) << outcome.err;
+    EXPECT_EQ(outcome.err, "");
+    return outcome.out;
+}
+
+Json jsonOf(std::vector<std::string> arguments, int exit) {
+    arguments.push_back("--json");
+    return Json::parse(outputOf(arguments, exit), nullptr, false);
 }
 
 } // namespace lumenkey::tools

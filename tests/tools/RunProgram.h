@@ -1,9 +1,12 @@
 #pragma once
 
+#include <nlohmann/json.hpp>
 #include <string>
 #include <vector>
 
 namespace lumenkey::tools {
+
+using Json = nlohmann::json;
 
 /// How a program ended, and what it said.
 struct Outcome {
@@ -21,5 +24,10 @@ std::string programPath();
 Outcome runProgramFile(std::string const& program, std::vector<std::string> const& arguments,
                        std::string const& outTarget = "");
 Outcome runLumenkey(std::vector<std::string> const& arguments, std::string const& outTarget = "");
+
+/// What the program says where it exits so, without a complaint.
+std::string outputOf(std::vector<std::string> const& arguments, int exit = 0);
+/// The same for a verb with `--json`.
+Json jsonOf(std::vector<std::string> arguments, int exit = 0);
 
 } // namespace lumenkey::tools
