@@ -5,10 +5,6 @@
 
 namespace {
 
-/// The bits that say which class a node is of: the walks of the tree cast by them, so they never leave their
-/// object.
-constexpr KFChannelFlags kClassFlags = kChannelFlagIsFolder | kChannelFlagIsObjectRoot;
-
 KFChannelObjectRootBase* asRoot(KFChannelBase const* node) noexcept {
     return static_cast<KFChannelObjectRootBase*>(const_cast<KFChannelBase*>(node));
 }
@@ -35,7 +31,7 @@ KFChannelBase::KFChannelBase(KFChannelBase const& other) : KFChannelBase(other, 
 
 KFChannelBase::KFChannelBase(KFChannelBase const& other, KFChannelFolder* parent)
     : KFFactoryBase(other), BXSerializer(other), _id(other._id), _name(other._name),
-      _flags(other._flags & ~kClassFlags), // whose classes set them in their own constructors
+      _flags(other._flags & ~kChannelClassFlags), // whose classes set them in their own constructors
       _defaultFlags(other._defaultFlags), _timeConverter(other._timeConverter) {
     copyNames(other);
     enterParent(parent);
@@ -70,7 +66,7 @@ void KFChannelBase::copy(KFChannelBase const* other, bool) {
         return;
     }
     setID(other->_id);
-    _flags = (other->_flags & ~kClassFlags) | (_flags & kClassFlags) | kChannelFlagNameUnset;
+    _flags = (other->_flags & ~kChannelClassFlags) | (_flags & kChannelClassFlags) | kChannelFlagNameUnset;
     _defaultFlags = other->_defaultFlags;
     _name = other->_name;
     copyNames(*other);
@@ -87,7 +83,7 @@ void KFChannelBase::assign(KFChannelBase const* other) {
     if (other == nullptr) {
         return;
     }
-    constexpr KFChannelFlags kept = kClassFlags | kChannelFlagNameUnset;
+    constexpr KFChannelFlags kept = kChannelClassFlags | kChannelFlagNameUnset;
     _flags = (other->_flags & ~kept) | (_flags & kept);
     copyControllerNames(*other);
 }

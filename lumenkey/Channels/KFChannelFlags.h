@@ -23,6 +23,8 @@ inline constexpr KFChannelFlags kChannelFlagIsFolder =
     0x1000; ///< Set by the folder's constructors only. Not state.
 inline constexpr KFChannelFlags kChannelFlagIsObjectRoot =
     0x2000; ///< Set by the root's constructors only. Not state.
+/// What a channel is. Walks of the tree cast by these bits, so neither copying nor reading changes them.
+inline constexpr KFChannelFlags kChannelClassFlags = kChannelFlagIsFolder | kChannelFlagIsObjectRoot;
 inline constexpr KFChannelFlags kChannelFlagDisabled = 0x8000;
 inline constexpr KFChannelFlags kChannelFlagTimeIndependent = 0x10000; ///< Not state.
 inline constexpr KFChannelFlags kChannelFlagNotRetimed = 0x20000;      ///< Not state.

@@ -5,6 +5,7 @@
 #include "lumenkey/splines/KFSpline.h"
 #include "lumenkey/splines/KFSplineAccess.h"
 #include "lumenkey/splines/KFSplineState.h"
+#include "lumenkey/splines/KFTangent.h"
 #include "lumenkey/splines/KFVertex.h"
 
 namespace {
@@ -79,6 +80,8 @@ KFSpline* KFCurve::rootSpline() const { return isSpline() ? getSpline() : nullpt
 KFSpline* KFCurve::rootSplineToEdit(void* handle, bool force) const {
     return isSpline() ? splineToEdit(handle, force) : nullptr;
 }
+
+static_assert(KFCurve::kHandleScale == kKFHandlesPerTangent);
 
 double KFCurve::handleScale() const { return settings().parametric ? 1.0 : kHandleScale; }
 

@@ -11,8 +11,6 @@ KFChannelFlags writtenFlags(KFChannelFlags flags, BXSerializerWriteStream const&
     return flags & ~(stream.isHashStream() ? kChannelNonStateFlags : kChannelFlagNameUnset);
 }
 
-constexpr KFChannelFlags kClassFlags = kChannelFlagIsFolder | kChannelFlagIsObjectRoot;
-
 } // namespace
 
 void KFChannelBase::writeFlags(BXSerializerWriteStream& stream, WriteFlagType type) const {
@@ -73,7 +71,7 @@ bool KFChannelBase::parseElement(BXSerializerReadStream& stream, BXStreamElement
         return true;
     if ((flags & ~kChannelNonStateFlags) != 0)
         willBeModified(kModifyState);
-    KFChannelFlags own = kClassFlags;
+    KFChannelFlags own = kChannelClassFlags;
     if (testFlag(kChannelFlagIsObjectRoot)) {
         flags &= ~std::uint64_t{kChannelFlagLocked};
         own |= kChannelFlagNameUnset;

@@ -12,7 +12,6 @@ constexpr KFChannelFlags kFlagsLeftOut = kChannelFlagLocked | kChannelFlagNotSav
                                          kChannelFlagNameUnset;
 /// What the flags of a document don't change.
 constexpr KFChannelFlags kFlagsKept = kChannelFlagDisabled | kChannelFlagLocked | kChannelFlagNameUnset;
-constexpr KFChannelFlags kClassFlags = kChannelFlagIsFolder | kChannelFlagIsObjectRoot;
 constexpr KFChannelFlags kLowWord = 0xFFFFFFFF;
 constexpr KFChannelFlags kSelfDigestFlags = kChannelFlagDisabled | kChannelFlagSolo;
 constexpr std::uint32_t kSelfDigestFoldFlagsLeftOut = 0x7200F;
@@ -116,7 +115,7 @@ bool KFChannelObjectRootBase::parseElement(BXSerializerReadStream& stream, BXStr
     case kBaseFlagsElement:
         // Only the low word of a document counts.
         if (element.getAsUInt64(&flags))
-            setFlags((flags & kLowWord & ~kFlagsKept) | (getFlags() & kFlagsKept) | kClassFlags);
+            setFlags((flags & kLowWord & ~kFlagsKept) | (getFlags() & kFlagsKept) | kChannelClassFlags);
         break;
     case kEnabledElement:
         if (element.getAsBool(&on))

@@ -16,6 +16,7 @@
 #include "lumenkey/splines/KFSplineInterpolator.h"
 #include "lumenkey/splines/KFSplineOwner.h"
 #include "lumenkey/splines/KFStaticVertex.h"
+#include "lumenkey/splines/KFTangent.h"
 #include "lumenkey/splines/KFThreadSegments.h"
 #include "lumenkey/splines/KFVertexStore.h"
 
@@ -387,11 +388,10 @@ void takeCubic(double const* polygonU, double const* polygonV, KFSegmentCache& c
 /// The same steps as `KFBezierInterpolator::getControlPoints`, without a virtual call. Segments too short for their
 /// fraction to be a ratio of positions are left to the walk.
 [[gnu::always_inline]] inline bool KFSpline::prepareBezier(KFSegmentCache& cache) {
-    constexpr double handlesPerTangent = 12.0;
     double const span = cache.width / cache.scale.stepsPerSecond;
     if (!(span > KFShape::kShortestCurve))
         return false;
-    double const factor = cache.parametric ? 1.0 : handlesPerTangent;
+    double const factor = cache.parametric ? 1 : kKFHandlesPerTangent;
     double outU = 0.0;
     double outV = 0.0;
     double inU = 0.0;

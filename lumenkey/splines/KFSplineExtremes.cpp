@@ -5,6 +5,7 @@
 #include "lumenkey/splines/KFSplineAccess.h"
 #include "lumenkey/splines/KFSplineIndex.h"
 #include "lumenkey/splines/KFStaticVertex.h"
+#include "lumenkey/splines/KFTangent.h"
 #include "lumenkey/splines/KFVertexStore.h"
 
 #include <algorithm>
@@ -91,7 +92,7 @@ class KFSplineExtremes {
 public:
     KFSplineExtremes(KFSpline& spline, KFValueExtremes& extremes)
         : _spline(spline), _store(*spline._store), _extremes(extremes),
-          _handlesPerTangent(spline.getState()->parametric ? 1.0 : 12.0) {
+          _handlesPerTangent(spline.getState()->parametric ? 1 : kKFHandlesPerTangent) {
         if (spline.getState()->retimingExtrapolation && !_store.empty())
             _outsideFrom = _store.tickAt(_store.last());
     }

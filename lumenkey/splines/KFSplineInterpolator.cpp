@@ -5,6 +5,7 @@
 #include "lumenkey/splines/KFBezierUtil.h"
 #include "lumenkey/splines/KFCubic.h"
 #include "lumenkey/splines/KFShapes.h"
+#include "lumenkey/splines/KFTangent.h"
 #include "lumenkey/splines/KFWholeCurve.h"
 
 #include <algorithm>
@@ -12,7 +13,6 @@
 namespace {
 
 constexpr double kThird = 0.3333333333333333;
-constexpr double kHandlesPerTangent = 12.0;
 /// How far, as a parameter or a fraction of the segment, a position may miss an end and still count as there.
 constexpr double kEndTolerance = 1e-7;
 
@@ -20,7 +20,7 @@ KFVertex& vertexOf(void* handle) { return *static_cast<KFVertex*>(handle); }
 
 bool isParametric(KFSpline& spline) { return spline.getState()->parametric; }
 
-double handleFactor(KFSpline& spline) { return isParametric(spline) ? kThird : kHandlesPerTangent; }
+double handleFactor(KFSpline& spline) { return isParametric(spline) ? kThird : kKFHandlesPerTangent; }
 
 /// What `getControlPoints` of a strategy says of a segment.
 struct ControlPolygon {

@@ -4,6 +4,7 @@
 #include "lumenkey/splines/KFSpline.h"
 #include "lumenkey/splines/KFSplineAccess.h"
 #include "lumenkey/splines/KFSplineIndex.h"
+#include "lumenkey/splines/KFTangent.h"
 #include "lumenkey/splines/KFVertex.h"
 #include "lumenkey/splines/KFVertexStore.h"
 
@@ -362,9 +363,6 @@ double KFSpline::extremeV(double start, Tempus const& t, Tempus* atU, Offers off
 
 namespace {
 
-/// From a tangent to the end of its handle.
-constexpr double kHandleFactor = 12.0;
-
 constexpr double kHighest = std::numeric_limits<double>::max();
 
 auto const kAbove = [](double candidate, double best) { return candidate > best; };
@@ -374,9 +372,9 @@ auto const kValue = [](KFVertex const&, double value, auto offer) { offer(value)
 auto const kHandleEnds = [](KFVertex const& vertex, double value, auto offer) {
     double v = 0.0;
     vertex.getInputTangents(nullptr, &v, kTempusZero);
-    offer(value + kHandleFactor * v);
+    offer(value + kKFHandlesPerTangent * v);
     vertex.getOutputTangents(nullptr, &v, kTempusZero);
-    offer(value + kHandleFactor * v);
+    offer(value + kKFHandlesPerTangent * v);
 };
 
 } // namespace

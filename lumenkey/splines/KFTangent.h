@@ -23,9 +23,13 @@ struct KFTangent {
 /// none.
 inline constexpr double kKFTangentTolerance = 1e-7;
 
-/// The U part of a derived tangent, as a fraction of the distance to the neighbour: the handle, 12 times as
-/// long, reaches a third of the way.
-inline constexpr double kKFDerivedTangentFraction = 1.0 / 36.0;
+/// A handle, which callers see and which makes the control points, is this many times the tangent that a vertex
+/// stores; on a parametric spline it is a third of it.
+inline constexpr int kKFHandlesPerTangent = 12;
+
+/// The U part of a derived tangent, as a fraction of the distance to the neighbour: its handle reaches a third of
+/// the way.
+inline constexpr double kKFDerivedTangentFraction = 1.0 / (3 * kKFHandlesPerTangent);
 
 inline KFTangent KFTangentRead(KFVertex const& vertex, KFTangentSide side, Tempus const& t) {
     KFTangent tangent;
@@ -52,8 +56,8 @@ inline void KFTangentScale(KFVertex& vertex, KFTangentSide side, double factor, 
 /// The output tangent of `p` that draws a straight line to the later `q`: a third of the way as a handle. The
 /// input tangent of `q` is its opposite.
 inline KFTangent KFTangentAlongLine(KFVertex const& p, KFVertex const& q) {
-    double const distance = TempusGetSeconds((q.getValueU() - p.getValueU()) / 12);
-    double const rise = (q.getValueV(kTempusZero) - p.getValueV(kTempusZero)) / 12.0;
+    double const distance = TempusGetSeconds((q.getValueU() - p.getValueU()) / kKFHandlesPerTangent);
+    double const rise = (q.getValueV(kTempusZero) - p.getValueV(kTempusZero)) / kKFHandlesPerTangent;
     return {distance / 3.0, rise / 3.0};
 }
 
