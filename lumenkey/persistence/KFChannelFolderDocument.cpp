@@ -34,7 +34,7 @@ void KFChannelFolder::writeBody(BXSerializerWriteStream& stream, bool full, bool
         KFWriteElement(stream, kFoldFlagsElement, flags);
     if (children && !testFoldFlag(kFoldFlagChildrenNotSaved)) {
         forEachChild([&](KFChannelBase& child) {
-            if (!isWritten(child, all, stream.isHashStream()))
+            if (!isWritten(child, all, stream.isHashStream()) || !stream.allowsNode())
                 return;
             child.writeHeader(stream, full);
             child.writeBody(stream, full, true, all);

@@ -112,6 +112,21 @@ TEST(Document, StandsInsideAnother) {
 )");
 }
 
+TEST(Document, IsNoDeeperThanDocumentsAreRead) {
+    for (int const depth : {988, 989}) {
+        OwnedTree const top(new KFChannelFolder("Top", nullptr, 9, 0, 0));
+        KFChannelFolder* last = top.get();
+        for (int i = 0; i < depth; ++i)
+            last = new KFChannelFolder("Deep", last, 9, 0, 0);
+        OwnedTree const read(new KFChannelFolder("Top", nullptr, 9, 0, 0));
+        EXPECT_TRUE(readDocument(*read, documentOf(*top)));
+        int found = 0;
+        for (auto const* folder = read.get(); folder->getNumberOfDescendants() != 0; ++found)
+            folder = static_cast<KFChannelFolder const*>((*folder->getDescendants())[0]);
+        EXPECT_EQ(found, 988);
+    }
+}
+
 TEST(Document, WritesOfAChannelWhatIsNotAsUsual) {
     struct Case {
         std::string expected;
