@@ -11,6 +11,7 @@
 #include <gtest/gtest.h>
 
 #include <functional>
+#include <limits>
 #include <regex>
 
 namespace {
@@ -207,6 +208,33 @@ TEST(Document, WritesOfAChannelWhatIsNotAsUsual) {
          [&](auto&, KFCurve& curve) {
              curve.setKeypointOutputNormalizedTangents(key(curve, 4), 0, 0.5, true);
              curve.setCurveDeriveTangents(false);
+         }},
+        // The value isn't what the limits let be seen of it, which may have crossed.
+        {" default=\"0\" value=\"500\"/>\n",
+         [](auto&, KFCurve& curve) {
+             curve.setCurveInitialValue(500);
+             curve.setAbsoluteMaxValueV(100);
+         }},
+        {R"(>
+    <curve type="1" default="0" value="inf">
+      <numberOfKeypoints>1</numberOfKeypoints>
+      <min>5</min>
+      <max>3</max>
+      <keypoint interpolation="18" flags="128">
+        <time>600/600</time>
+        <value>2</value>
+        <outputTangentTime>0</outputTangentTime>
+        <outputTangentValue>6</outputTangentValue>
+      </keypoint>
+    </curve>
+  </parameter>
+)",
+         [&](auto&, KFCurve& curve) {
+             curve.setKeypointOutputNormalizedTangents(key(curve, 18), 0, 0.5, true);
+             curve.setCurveDeriveTangents(false);
+             curve.setCurveInitialValue(std::numeric_limits<double>::infinity());
+             curve.setAbsoluteMinValueV(5);
+             curve.setAbsoluteMaxValueV(3);
          }},
     };
     for (Case const& c : cases) {
