@@ -1,9 +1,12 @@
 // What documents look like, to the letter.
 
+#include "lumenkey/Channels/KFChannelFactoryTable.h"
 #include "lumenkey/Channels/KFChannelImpl.h"
+#include "lumenkey/Channels/KFFactory.h"
 #include "lumenkey/Channels/KFScalarChannels.h"
 #include "lumenkey/Channels/KFVectorChannels.h"
 #include "lumenkey/curves/KFCurve.h"
+#include "lumenkey/foundation/BXHashWriteStream.h"
 #include "lumenkey/foundation/BXStream.h"
 #include "lumenkey/foundation/BXXMLWriteStream.h"
 #include "tests/persistence/RandomTree.h"
@@ -13,6 +16,7 @@
 #include <functional>
 #include <limits>
 #include <regex>
+#include <thread>
 
 namespace {
 
@@ -271,4 +275,69 @@ TEST(Document, LeavesOutWhatNobodyChanged) {
     std::string const alone = inHostsDocument(folder, false, true, true);
     EXPECT_EQ(alone.find("Plain"), std::string::npos);
     EXPECT_NE(alone.find("<foldFlags>16777216</foldFlags>"), std::string::npos);
+}
+
+TEST(Document, TellsOfARootItself) {
+    KFChannelObjectRootBase root("Root", nullptr, 1, 0, 0);
+    KFChannelDouble value(0.0, "Value", &root, 1, 0);
+    root.setTimeExtent({s(1), s(2)}, true);
+    root.setTimeOffset(s(3), true);
+    root.setFoldFlags(0x11);
+    root.setFlags(root.getFlags() | kChannelFlagHidden | kChannelFlagSaveWhenAtDefault | kChannelFlagSolo);
+    root.lock(true, false);
+    auto const write = [&](BXSerializerWriteStream& stream) { root.serializeSelfOnly(stream, true, true); };
+    auto const text = [&] {
+        BXBufferWriteStream buffer(1024, 1024);
+        BXXMLWriteStream stream(buffer, 5, 13);
+        write(stream);
+        EXPECT_TRUE(stream.close());
+        BXData const data = buffer.copyData();
+        return std::string(data.begin(), data.end());
+    };
+    auto const digest = [&] {
+        BXHashWriteStream stream;
+        write(stream);
+        return stream.getHash();
+    };
+    auto const before = digest();
+    EXPECT_NE(text().find("  <timing in=\"600/600\" out=\"1780/600\" offset=\"1800/600\"/>\n"
+                          "  <foldFlags>17</foldFlags>\n"
+                          "  <baseFlags>262162</baseFlags>\n"
+                          "  <locked>1</locked>\n"),
+              std::string::npos)
+        << text();
+    root.setWritesTimeRange(false);
+    EXPECT_NE(text().find("  <timing offset=\"1800/600\"/>\n"), std::string::npos) << text();
+    EXPECT_NE(documentOf(root).find("    <timing offset=\"1800/600\"/>\n    <baseFlags>"), std::string::npos);
+    root.setWritesTimeRange(true);
+    root.resetFlag(kChannelFlagHidden, true);
+    EXPECT_EQ(digest(), before) << "of the flags only the soloed one";
+    root.resetFlag(kChannelFlagSolo, true);
+    EXPECT_NE(digest(), before);
+}
+
+TEST(Document, MarksWhatAReaderCanNotMakeUp) {
+    // In a thread of its own, which nothing has been marked in.
+    std::thread([] {
+        struct VaryingFactory : KFChannelFactory {
+            VaryingFactory() : KFChannelFactory(KFChannelFactoryUUID("KFChannelVaryingFolder"), {}, 1) {}
+        } varying;
+        KFChannelObjectRootBase root("Root", nullptr, 1, 0, 0);
+        KFChannelFolder plain("Plain", &root, 1, 0, 0);
+        KFChannelBool on(false, "On", &plain, 1, 0);
+        KFChannelFolder list(&varying, "List", &plain, 2, 0, 0);
+        KFChannelDouble value(0.0, "Value", &list, 1, 0);
+        KFChannelObjectRootBase inner("Inner", &root, 2, 0, 0);
+        KFChannelFolder other(&varying, "Other", &inner, 1, 0, 0);
+        KFChannelAngle angle(0.0, "Angle", &other, 1, 0);
+        BXHashWriteStream stream;
+        root.markChannelFactoriesForSerialization(stream);
+        for (auto const& [channel, is] : {std::pair<KFChannelBase*, bool>{&root, false},
+                                          {&plain, false},
+                                          {&on, false},
+                                          {&list, true},
+                                          {&value, true},
+                                          {&angle, false}})
+            EXPECT_EQ(channel->getFactory()->needsSaving(), is) << channel->getName().str();
+    }).join();
 }
