@@ -215,6 +215,24 @@ TEST_F(Reading, LocksARootBehindItsChildren) {
     EXPECT_EQ(read.getTimeOffset(), TempusMake(3, 1));
 }
 
+TEST_F(Reading, FindsTheVersionBehindSpaces) {
+    struct {
+        char const* text;
+        std::uint32_t major;
+        std::uint32_t minor;
+    } const rows[] = {{"4.2", 4, 2},   {" 4.0", 4, 0},  {"4.&#9;7b", 4, 7}, {"+4.+1", 4, 1}, {"4", 4, 13},
+                      {"4 .2", 4, 13}, {"x4.2", 5, 13}, {".2", 5, 13},      {"", 5, 13}};
+    for (auto const& row : rows) {
+        std::string const text = "<kfml version='" + std::string(row.text) + "'/>";
+        BXData const document(text.begin(), text.end());
+        BXXMLReadStream stream(document);
+        ChannelParser parser(&folder());
+        stream.pushHandler(&parser);
+        EXPECT_TRUE(stream.parse());
+        EXPECT_EQ(std::pair(stream.major, stream.minor), std::pair(row.major, row.minor)) << row.text;
+    }
+}
+
 TEST_F(Reading, GivesFailureForWhatIsNoDocumentOfAChannel) {
     EXPECT_FALSE(readDocument(folder(), "<kfml version=\"5.13\"/>"));
     EXPECT_FALSE(readDocument(folder(), ""));
