@@ -487,7 +487,6 @@ TEST(BXHashWriteStream, TellsNeighboursApart) {
         hashOf(0.0),
         hashOf(-0.0),
         hashOf(kNan),
-        hashOf(-kNan),
         hashOf(TempusMake(1, 2)),
         hashOf(TempusMake(2, 4)),
         hashOf(BXUUID{{1, 0, 0, 0}}),
@@ -511,6 +510,7 @@ TEST(BXHashWriteStream, TellsNeighboursApart) {
     for (std::size_t i = 0; i < hashes.size(); ++i) {
         EXPECT_EQ(std::count(hashes.begin(), hashes.end(), hashes[i]), 1) << i;
     }
+    EXPECT_EQ(hashOf(kNan), hashOf(-kNan)) << "as in a text";
 }
 
 TEST(BXHashWriteStream, TakesEndsWithoutStarts) {

@@ -9,6 +9,7 @@
 
 #include <gtest/gtest.h>
 
+#include <bit>
 #include <functional>
 #include <set>
 
@@ -98,6 +99,30 @@ TEST(Digest, TellsEachChangeOfState) {
         changes[i](again);
         EXPECT_EQ(again.root.getHash(), changed.root.getHash()) << "change " << i;
     }
+}
+
+TEST(Digest, TellsEachBitOfState) {
+    // Not the class's, nor what leaves a channel out.
+    constexpr KFChannelFlags kLeft = kChannelClassFlags | kChannelFlagExcludedFromHash | kChannelFlagNotSaved;
+    std::set<Digest> digests{Subject().root.getHash()};
+    for (KFChannelFlags bit = 1; bit != 0; bit <<= 1) {
+        Subject changed;
+        changed.plain.setFlags(changed.plain.getFlags() ^ (bit & ~kLeft));
+        EXPECT_EQ(digests.insert(changed.root.getHash()).second, (bit & ~kLeft & ~kChannelNonStateFlags) != 0)
+            << std::hex << bit;
+    }
+}
+
+TEST(Digest, KnowsOnlyOneThatIsNoNumber) {
+    std::set<Digest> digests;
+    constexpr std::uint64_t kBits[] = {0x7FF8000000000000, 0xFFF8000000000000, 0x7FF8000000000123};
+    for (std::uint64_t const bits : kBits) {
+        Subject changed;
+        changed.plain.setInitialValue(std::bit_cast<double>(bits), true);
+        changed.curve->setCurveInitialValue(std::bit_cast<double>(bits));
+        digests.insert(changed.root.getHash());
+    }
+    EXPECT_EQ(digests.size(), 1U);
 }
 
 TEST(Digest, IsBlindForWhatIsNotState) {
