@@ -110,8 +110,10 @@ void KFChannelFolder::parseChild(BXSerializerReadStream& stream, BXStreamElement
     if (channel != nullptr && element.getAttributeAsDouble(kDefaultAttribute, &number))
         channel->setDefaultValue(number);
     KFFactory const* const factory = child->getFactory();
-    if (factory != nullptr && factory->isKindOfClass(kBlindData))
-        return; // its value is no number
+    if (factory != nullptr && factory->isKindOfClass(kBlindData)) {
+        stream.skipElement(); // its value is no number, and what stands inside isn't for the folder
+        return;
+    }
     if (channel != nullptr && element.getAttributeAsDouble(kValueAttribute, &number))
         channel->setInitialValue(number, false);
     stream.pushHandler(child);

@@ -198,6 +198,22 @@ TEST(ReadingOfHosts, MakesTheirClassesAndTellsThem) {
     EXPECT_EQ(static_cast<HostRoot&>(*top).announced, "Root data, Host data, Host data, Host data, ");
 }
 
+TEST_F(Reading, KeepsWhatStandsInDataOutOfTheFolder) {
+    // A class of data without numbers that is not the library's own.
+    struct DataFactory : KFChannelFactory {
+        DataFactory() : KFChannelFactory(KFChannelFactoryUUID("KFChannelBlindData"), {}, 1) {}
+    } factory;
+    auto* const data = new HostChannel(&factory, "Data", 1, nullptr, nullptr);
+    folder().push_back(data);
+    KFChannelFlags const flags = folder().getFlags();
+    ASSERT_TRUE(readDocument(folder(), documentWith("<parameter id='1' value='5'><flags>2</flags>"
+                                                    "<foldFlags>16</foldFlags>"
+                                                    "<parameter id='2' factoryID='2'/></parameter>")));
+    EXPECT_EQ(folder().getFlags(), flags);
+    EXPECT_EQ(folder().getNumberOfDescendants(), 1U);
+    EXPECT_EQ(data->getInitialValue(), 0);
+}
+
 TEST_F(Reading, LocksARootBehindItsChildren) {
     OwnedTree const root(new KFChannelObjectRootBase("Root", nullptr, 1, 0, 0));
     ASSERT_TRUE(readDocument(
