@@ -11,7 +11,6 @@
 #include <map>
 #include <memory>
 #include <optional>
-#include <set>
 #include <utility>
 
 namespace lumenkey::tools {
@@ -24,9 +23,9 @@ struct OpenElement {
     DocumentWord const* word = nullptr;
     TextPlace place;
     std::string text;
-    /// Of a channel: its class, or null; and the IDs of its children so far.
+    /// Of a channel: its class, or null; and those of its children so far, by ID.
     KFFactory* factory = nullptr;
-    std::set<std::uint64_t> ids;
+    std::map<std::uint64_t, KFFactory*> children;
     /// Of a curve.
     CurveLimits limits;
     Tempus lastTime = kTempusInvalid;
@@ -128,9 +127,11 @@ private:
         OpenElement& above = _open.back();
         std::string const name = "the channel '" + std::string(attributeOf(attributes, "name")) + "'";
         std::uint64_t const id = readWhole(attributeOf(attributes, "id")).value_or(0);
-        if (!above.ids.insert(id).second) {
+        if (auto const before = above.children.find(id); before != above.children.end()) {
             find(element.place,
                  name + " has the ID " + std::to_string(id) + " of one before it: it is read into that one");
+            element.factory = before->second;
+            return true;
         }
         std::optional<std::uint64_t> const number = readWhole(attributeOf(attributes, "factoryID"));
         if (KFFactory* const component = componentOf(above.factory, id)) {
@@ -151,6 +152,7 @@ private:
         } else {
             element.factory = &KFChannelObjectRootBase_Factory::getInstance();
         }
+        above.children[id] = element.factory;
         return true;
     }
 
