@@ -260,6 +260,7 @@ TEST(Document, LeavesOutWhatNobodyChanged) {
     kept.setFlag(kChannelFlagSaveWhenAtDefault, true);
     kept.saveStateAsDefault();
     notSaved.setInitialValue(5, true);
+    notSaved.setFlag(kChannelFlagSaveWhenAtDefault, true); // counts in a digest only
     disabled.enable(false, true);
     std::string const text = inHostsDocument(folder, false, true, false);
     for (auto const& [name, is] : {std::pair{"Plain", false},

@@ -113,6 +113,21 @@ TEST_F(Reading, TakesKeypointsAsTheyStand) {
                                                           keypointElement("4/1", "7")))));
     EXPECT_EQ(child(1).getNumberOfKeyframes(), 1U);
     EXPECT_TRUE(child(1).hasKeypointAt(TempusMake(4, 1), 0));
+
+    // Where tangents don't count, only one type takes handles.
+    KFCurve& plain = *child(1).getCurveInterface();
+    plain.setCurveDeriveTangents(false);
+    ASSERT_TRUE(readDocument(
+        folder(), documentWith(curve("<numberOfKeypoints>2</numberOfKeypoints>" +
+                                     keypointElement("1/1", "5", handle("12", "24"), "interpolation='18'") +
+                                     keypointElement("2/1", "5", handle("12", "24"))))));
+    handles.clear();
+    plain.getKeypointHandleList(handles);
+    ASSERT_EQ(handles.size(), 2U);
+    plain.getKeypointOutputNormalizedTangents(handles[0], &x, &y);
+    EXPECT_EQ(std::pair(x, y), std::pair(1.0, 2.0));
+    plain.getKeypointOutputNormalizedTangents(handles[1], &x, &y);
+    EXPECT_EQ(std::pair(x, y), std::pair(0.0, 0.0));
 }
 
 TEST_F(Reading, TakesAConstantAsItIs) {
