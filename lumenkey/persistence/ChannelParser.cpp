@@ -4,33 +4,11 @@
 #include "lumenkey/Channels/KFFactories.h"
 #include "lumenkey/Channels/KFFactoryScope.h"
 #include "lumenkey/persistence/KFDocumentScopes.h"
+#include "lumenkey/persistence/KFDocumentVersion.h"
 
-#include <algorithm>
-#include <charconv>
 #include <memory>
 
 namespace {
-
-/// Takes a number off the front, behind spaces and a plus sign. False, and both as they were, without one.
-bool takeNumber(std::string_view& text, std::uint32_t& number) {
-    std::size_t start = std::min(text.find_first_not_of(" \t\r\n\v\f"), text.size());
-    if (start < text.size() && text[start] == '+')
-        ++start;
-    char const* const end = text.data() + text.size();
-    auto const [behind, error] = std::from_chars(text.data() + start, end, number);
-    if (error != std::errc())
-        return false;
-    text.remove_prefix(static_cast<std::size_t>(behind - text.data()));
-    return true;
-}
-
-/// Two numbers, each behind any spaces, with a dot between them; what isn't there stays.
-void readVersion(std::string_view text, BXSerializerReadStream& stream) {
-    if (takeNumber(text, stream.major) && text.starts_with('.')) {
-        text.remove_prefix(1);
-        takeNumber(text, stream.minor);
-    }
-}
 
 void readFactory(BXStreamElement const& element) {
     std::uint32_t fileID = 0;
@@ -64,7 +42,7 @@ bool ChannelParser::parseElement(BXSerializerReadStream& stream, BXStreamElement
     case kOldDocumentElement:
     case kDocumentElement:
         if (element.getAttributeAsString(kVersionAttribute, &version))
-            readVersion(version.view(), stream);
+            KFReadVersion(version.view(), stream.major, stream.minor);
         break;
     case kFactoryElement:
         readFactory(element);

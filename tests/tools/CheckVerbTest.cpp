@@ -87,6 +87,10 @@ TEST_F(CheckVerbTest, FindsWhatIsOddWithItsPlace) {
     }
     EXPECT_NE(findingsIn(deep + "</kfml>").find("more than 990 elements deep"), std::string::npos);
     EXPECT_EQ(findingsIn(contentOf(LUMENKEY_TEST_SOURCE_DIR "/tests/persistence/data/version2.lumen")), "");
+    // Old also where spaces stand in front of the version.
+    std::string const old = contentOf(LUMENKEY_TEST_SOURCE_DIR "/tests/persistence/data/version4.lumen");
+    EXPECT_EQ(findingsIn(samples::replaced(old, "\"4.1\"", "\" 4.1\"")), "");
+    EXPECT_EQ(jsonOf({"info", _folder.file("f.lumen")})["version"], "4.1");
 }
 
 TEST_F(CheckVerbTest, ChecksManyFilesInTheirOrder) {

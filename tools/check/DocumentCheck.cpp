@@ -3,6 +3,7 @@
 #include "lumenkey/Channels/KFChannelFactories.h"
 #include "lumenkey/Channels/KFChannelFolder.h"
 #include "lumenkey/Channels/KFFactories.h"
+#include "lumenkey/persistence/KFDocumentVersion.h"
 #include "tools/check/CurveCheck.h"
 #include "tools/check/DocumentVocabulary.h"
 #include "tools/tree/ChannelClass.h"
@@ -92,10 +93,11 @@ private:
 
     bool isSound(OpenElement& element, Attributes const& attributes) {
         if (element.name == "kfml" || element.name == "kfdoc") {
-            std::string_view const version = attributeOf(attributes, "version");
-            std::optional<std::uint64_t> const major = readWhole(version.substr(0, version.find('.')));
-            constexpr std::uint64_t firstWithTimes = 5;
-            _countsFrames = major && *major < firstWithTimes;
+            constexpr std::uint32_t firstWithTimes = 5;
+            std::uint32_t major = firstWithTimes;
+            std::uint32_t minor = 0;
+            KFReadVersion(attributeOf(attributes, "version"), major, minor);
+            _countsFrames = major < firstWithTimes;
         } else if (element.name == "factory") {
             checkFactory(element, attributes);
         } else if (element.name == "parameter") {
