@@ -1,3 +1,3 @@
 #include "lumenkey/splines/KFThreadSegments.h"
 
-constinit thread_local KFSegmentPlace KFThreadSegments::_places[KFThreadSegments::kPlaces];
+constinit thread_local KFThreadSegments::ZeroedPlace KFThreadSegments::_places[KFThreadSegments::kPlaces]{};

@@ -6,6 +6,8 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <new>
+#include <type_traits>
 
 /// A place for one spline in the table of a thread: all segments of a spline with few vertices, that of the last read
 /// of another.
@@ -121,23 +123,31 @@ private:
 /// A spline that an owner's custom lock guards is read under that lock always, since the lock may hold several splines
 /// still together. Vertices that aren't static ones have no segments.
 ///
-/// A thread's places are a fixed table of 70 KiB, memory that nothing constructs or destroys. A spline's version tells
-/// its place. Of two splines that have the same one, the later gets it by missing it twice in a row, so
-/// that many splines read in turn leave it alone and use what each spline keeps under its own lock.
+/// A thread's places are a fixed table of 70 KiB that nothing constructs or destroys: zeroed memory, whose pages a
+/// thread that reads no spline never touches. A spline's version tells its place. Of two splines that have the same
+/// one, the later gets it by missing it twice in a row, so that many splines read in turn leave it alone and use what
+/// each spline keeps under its own lock.
 class KFThreadSegments {
 public:
     /// The calling thread's place for the spline with that version. It is the thread's own.
     static KFSegmentPlace& placeOf(std::uint64_t version) noexcept {
-        KFSegmentPlace* place = &_places[KFStoreVersion::runOf(version) % kPlaces];
+        ZeroedPlace* place = &_places[KFStoreVersion::runOf(version) % kPlaces];
 #if defined(__GNUC__)
         // Else the compiler asks for the thread's address again at each use.
         asm("" : "+r"(place));
 #endif
-        return *place;
+        return *std::launder(reinterpret_cast<KFSegmentPlace*>(place->bytes));
     }
 
 private:
+    /// All zeros are a place of nobody's that keeps nothing. Initialized in the language's way, the table would be an
+    /// image in the library that is copied for each thread.
+    struct ZeroedPlace {
+        alignas(KFSegmentPlace) std::byte bytes[sizeof(KFSegmentPlace)];
+    };
+    static_assert(std::is_trivially_copyable_v<KFSegmentPlace>);
+
     static constexpr std::uint64_t kPlaces = 16;
 
-    static constinit thread_local KFSegmentPlace _places[kPlaces];
+    static constinit thread_local ZeroedPlace _places[kPlaces];
 };
