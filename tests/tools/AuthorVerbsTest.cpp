@@ -2,6 +2,7 @@
 
 #include "lumenkey/Channels/KFChannelObjectRootBase.h"
 #include "lumenkey/foundation/BXURL.h"
+#include "tests/tools/MotionSamples.h"
 #include "tests/tools/RunProgram.h"
 #include "tests/tools/TestFolder.h"
 #include "tools/tree/ChannelTree.h"
@@ -73,6 +74,21 @@ TEST_F(AuthorVerbsTest, MakesADocumentFromNothing) {
     EXPECT_EQ(left[0]["interpolation"], 0) << "a new value leaves the rest of its keypoint";
 }
 
+TEST_F(AuthorVerbsTest, OtherFormatsGetWhatWasAddedAndNotWhatWasRemoved) {
+    makeBall();
+    std::string const table = _folder.file("t.csv");
+    outputOf({"set", _file, "Place.X", "--at", "0", "--value", "7"});
+    outputOf({"remove", _file, "Body", "-o", table});
+    EXPECT_TRUE(contentOf(table).starts_with("time,seconds,Height\n")) << contentOf(table);
+    std::string const motion = _folder.write("m.bvh", samples::kSmallMotion);
+    outputOf({"convert", motion, _file});
+    EXPECT_EQ(outputOf({"add", _file, "LeftLeg", "Double", "Yposition", "--value", "2.5", "-o", motion}),
+              "./1/7/6\n");
+    EXPECT_NE(contentOf(motion).find("CHANNELS 4 Zrotation Xrotation Yrotation Yposition\n"),
+              std::string::npos);
+    EXPECT_NE(contentOf(motion).find(" 90 2.5\n"), std::string::npos) << contentOf(motion);
+}
+
 TEST_F(AuthorVerbsTest, RefusesWhatChannelsDoNotTake) {
     makeBall();
     expectRefused({"add", "./", "Dubble", "X"}, "did you mean 'Double'?");
@@ -81,6 +97,7 @@ TEST_F(AuthorVerbsTest, RefusesWhatChannelsDoNotTake) {
     expectRefused({"add", "Body", "Double", "On"}, "has a channel 'On' already");
     expectRefused({"add", "Body", "3D", "P", "--value", "1"}, "none or several");
     expectRefused({"add", "Body", "Percent", "P", "--value", "50"}, "values from 0 to 1");
+    expectRefused({"add", "Body", "Progress", "P"}, "documents leave out");
     expectRefused({"set", "Height", "--value", "1"}, "say which with --at");
     expectRefused({"set", "Height", "--at", "1/3", "--delete"}, "has no keypoint at 1/3 s");
     expectRefused({"set", "Height", "--at", "0", "--value", "1", "--interpolation", "wavy"},

@@ -26,8 +26,7 @@ void runRemove(RemoveOptions const& options) {
     if (input.tree().isComponent(node)) {
         throw UsageError{"'" + options.channel + "' is a part of its compound, which can only go as a whole"};
     }
-    KFChannelBase& removed = input.tree().base(node);
-    removed.getParent()->removeDescendant(&removed);
+    input.file().tree->erase(node);
     options.author.write(input);
 }
 
