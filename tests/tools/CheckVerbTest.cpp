@@ -83,6 +83,23 @@ TEST_F(CheckVerbTest, FindsWhatIsOddWithItsPlace) {
     EXPECT_EQ(findingsIn(contentOf(LUMENKEY_TEST_SOURCE_DIR "/tests/persistence/data/version2.lumen")), "");
 }
 
+TEST_F(CheckVerbTest, ReadsAPipeOnce) {
+    std::string const odd = _folder.write(
+        "odd.lumen", std::string(kHead) + "<parameter id=\"1\" factoryID=\"1\">\n<odd/></parameter></kfml>");
+    struct {
+        char const* script;
+        std::string name;
+    } const cases[] = {
+        {"cat \"$2\" | timeout 20 \"$0\" check /dev/stdin", "/dev/stdin"},
+        {"mkfifo \"$1\"; cat \"$2\" >\"$1\" & exec timeout 20 \"$0\" check \"$1\"", _folder.file("p.lumen")},
+    };
+    for (auto const& each : cases) {
+        Outcome const outcome = runProgramFile("/bin/sh", {"-c", each.script, programPath(), each.name, odd});
+        EXPECT_EQ(outcome.exit, 1) << outcome.err;
+        EXPECT_EQ(outcome.out, each.name + ":5:1: the element 'odd' is unknown here: it is passed over\n");
+    }
+}
+
 TEST_F(CheckVerbTest, ChecksManyFilesInTheirOrder) {
     std::vector<std::string> arguments{"check"};
     std::string expected;

@@ -47,6 +47,26 @@ TEST_F(ProgramTest, InfoTellsWhatAFileHolds) {
         << table.out;
 }
 
+TEST_F(ProgramTest, InfoTellsOfSeveralFilesInTheirOrder) {
+    std::string const one = outputOf({"info", _file});
+    EXPECT_EQ(outputOf({"info", _file, _file, _file}), one + "\n" + one + "\n" + one);
+    Outcome const several = runLumenkey({"info", "none.bvh", _file, _file, "--json"});
+    EXPECT_EQ(several.exit, 1);
+    Json expected = jsonOf({"info", _file});
+    expected["file"] = _file;
+    EXPECT_EQ(Json::parse(several.out, nullptr, false), Json({expected, expected}));
+}
+
+TEST_F(ProgramTest, AWrongArgumentForOneOfSeveralFilesLeavesTheOthers) {
+    std::string const old = _folder.write(
+        "old.lumen", contentOf(LUMENKEY_TEST_SOURCE_DIR "/tests/persistence/data/version3.lumen"));
+    Outcome const outcome = runLumenkey({"upgrade", _file, old, "--frame-rate", "24"});
+    EXPECT_EQ(outcome.exit, 2);
+    EXPECT_EQ(outcome.out, old + ": from version 3.1 to 5.13\n");
+    EXPECT_EQ(outcome.err,
+              "lumenkey: --frame-rate is for documents: '" + _file + "' has a rate of its own\n");
+}
+
 TEST_F(ProgramTest, TreeListsNodes) {
     Outcome const table = runLumenkey({"tree", _file, "--depth", "2"});
     EXPECT_EQ(table.exit, 0);
@@ -261,6 +281,7 @@ TEST_F(ProgramTest, WrongArgumentsExitWithTwoAndTheUsage) {
     expectWrongArguments({"info", _file, "--loud"}, "--loud");
     expectWrongArguments({"keys", _file, "hips.xposition"}, "there is no channel 'hips.xposition' in " +
                                                                 _file + "; did you mean 'Hips.Xposition'?");
+    expectWrongArguments({"tree", _file, "--depth", "-1"}, "must be a whole number from 0 on: '-1'");
     expectWrongArguments({"gallery"}, "--output is required");
     struct {
         std::vector<std::string> arguments;
@@ -276,6 +297,7 @@ TEST_F(ProgramTest, WrongArgumentsExitWithTwoAndTheUsage) {
         {{"sample", "--step", "1/1000000000"}, "more than 10000000 values"},
         {{"sample", "--to", "9000000000000000000", "--step", "1/1000000000"}, "more than 10000000 values"},
         {{"sample", "--count", "18446744073709551615"}, "more than 10000000 values"},
+        {{"sample", "--count", "0"}, "--count: must be a whole number from 1 on: '0'"},
         {{"sample", "--count", "2", "--csv", "--json"}, "--csv"},
         {{"plot", "-o", "p.bmp"}, "must end in .svg, .png or .pdf"},
         {{"plot", "-o", "p.svg", "--width", "1"}, "--width"},
@@ -303,6 +325,22 @@ TEST_F(ProgramTest, FailuresToWriteExitWithOne) {
     Outcome const closed =
         runProgramFile("/bin/sh", {"-c", "(sleep 0.2; " + script + "; echo \"exit $?\" >&2) | true"});
     EXPECT_EQ(closed.err, "lumenkey: standard output: Broken pipe\nexit 1\n");
+}
+
+TEST_F(ProgramTest, TellsWhereMemoryIsOut) {
+    std::string const large = _folder.write("large.csv", "t,X\n");
+    std::filesystem::resize_file(large, 1'500'000'000);
+    auto const limited = [](std::vector<std::string> arguments) {
+        arguments.insert(arguments.begin(), {"-c", "ulimit -v 1000000; exec \"$0\" \"$@\"", programPath()});
+        return runProgramFile("/bin/sh", arguments);
+    };
+    if (limited({"--version"}).exit != 0) {
+        GTEST_SKIP() << "the program needs more address space by itself, as with a sanitizer";
+    }
+    Outcome const diff = limited({"diff", _file, large});
+    EXPECT_EQ(diff.exit, 2) << "1 says that they differ";
+    EXPECT_EQ(diff.err, "lumenkey: out of memory\n");
+    EXPECT_EQ(limited({"info", _file, large}).err, "lumenkey: " + large + ": out of memory\n");
 }
 
 TEST_F(ProgramTest, EveryVerbHelpsWithAnExample) {

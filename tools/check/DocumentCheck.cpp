@@ -37,7 +37,10 @@ class Checker : public DocumentScanner {
 public:
     Checker() : _open(1) {}
 
-    std::vector<DocumentFinding> takeFindings() { return std::move(_findings); }
+    std::vector<DocumentFinding> takeFindings() {
+        sortByPlace(_findings);
+        return std::move(_findings);
+    }
 
 private:
     // --- Findings ---
@@ -235,12 +238,20 @@ private:
 std::vector<DocumentFinding> checkDocument(std::string const& file, ReadingProgress const& progress) {
     Checker checker;
     checker.scan(file, progress);
-    std::vector<DocumentFinding> findings = checker.takeFindings();
+    return checker.takeFindings();
+}
+
+std::vector<DocumentFinding> checkDocumentText(std::string_view text, ReadingProgress const& progress) {
+    Checker checker;
+    checker.scanText(text, progress);
+    return checker.takeFindings();
+}
+
+void sortByPlace(std::vector<DocumentFinding>& findings) {
     std::stable_sort(
         findings.begin(), findings.end(), [](DocumentFinding const& a, DocumentFinding const& b) {
             return std::pair(a.place.line, a.place.column) < std::pair(b.place.line, b.place.column);
         });
-    return findings;
 }
 
 } // namespace lumenkey::tools

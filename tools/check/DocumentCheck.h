@@ -3,6 +3,7 @@
 #include "tools/check/DocumentScanner.h"
 
 #include <string>
+#include <string_view>
 #include <vector>
 
 namespace lumenkey::tools {
@@ -21,5 +22,10 @@ struct DocumentFinding {
 /// The limits of a curve are those that the document gives, else those of the class. Throws `InputError` for
 /// a file that can't be read.
 std::vector<DocumentFinding> checkDocument(std::string const& file, ReadingProgress const& progress);
+/// The same for the content of a file.
+std::vector<DocumentFinding> checkDocumentText(std::string_view text, ReadingProgress const& progress);
+
+/// Puts findings in the order of the text.
+void sortByPlace(std::vector<DocumentFinding>& findings);
 
 } // namespace lumenkey::tools

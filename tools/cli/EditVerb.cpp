@@ -8,6 +8,7 @@
 #include "tools/cli/UsageError.h"
 #include "tools/edit/CurveChange.h"
 #include "tools/export/ChannelFileWriter.h"
+#include "tools/output/SafeOutputFile.h"
 #include "tools/plot/PlotChart.h"
 
 #include <CLI/CLI.hpp>
@@ -47,15 +48,22 @@ public:
         readOptions();
         ChannelInput const input(_options.input);
         _format = _options.output.formatFor(input.file().format);
+        checkRows(_format);
         std::vector<Node> const channels = channelsOf(input);
         _span = spanOf(input.file());
         _verb.prepare(input.file(), _span);
         editAll(input, channels);
 
         EditReport report{_verb.words(), target(), _format, _span, {}, std::move(_edited)};
-        report.written = writeFile(input, channels);
+        // So that a picture which can't be written leaves FILE as it is.
+        std::optional<SafeOutputFile> picture;
         if (_picture) {
-            savePicture(report);
+            picture.emplace(_options.plot);
+            drawPicture(report).writeTo(*picture);
+        }
+        report.written = writeFile(input, channels);
+        if (picture) {
+            picture->close();
         }
         _options.json ? report.writeJson(out) : report.writeTable(out);
     }
@@ -63,11 +71,14 @@ public:
 private:
     std::string const& target() const { return _options.output.target(_options.input.file); }
 
-    void readOptions() {
-        std::optional<ChannelFormat> const format = _options.output.check(_options.input.file);
-        if (format && *format != ChannelFormat::Csv && !_options.rows.empty()) {
-            throw UsageError{"--rows is for a table: '" + target() + "' must end in .csv then"};
+    void checkRows(std::optional<ChannelFormat> const& written) const {
+        if (written && *written != ChannelFormat::Csv && !_options.rows.empty()) {
+            throw UsageError{"--rows is for a table, and '" + target() + "' is none: -o OUT.csv makes one"};
         }
+    }
+
+    void readOptions() {
+        checkRows(_options.output.check(_options.input.file));
         if (!_options.plot.empty()) {
             _picture = requirePlotFormat(_options.plot);
         }
@@ -161,13 +172,13 @@ private:
         panelOfUnit(_chart, edited.unit).curves.push_back({edited.channel, std::move(now), std::move(old)});
     }
 
-    void savePicture(EditReport const& report) {
+    PlotCanvas drawPicture(EditReport const& report) {
         _chart.title =
             _verb.words().name + " " + std::filesystem::path(_options.input.file).filename().string();
         _chart.subtitle = report.summary();
         PlotCanvas canvas(*_picture, kPictureWidth, kPictureHeight);
         _chart.draw(canvas);
-        canvas.save(_options.plot);
+        return canvas;
     }
 
     EditVerb& _verb;

@@ -9,6 +9,7 @@
 #include "tools/output/TextForms.h"
 
 #include <CLI/CLI.hpp>
+#include <exception>
 #include <map>
 #include <new>
 #include <unistd.h>
@@ -101,6 +102,10 @@ private:
             complain(error.text());
         } catch (OutputError const& error) {
             complain(printableText(error.target) + ": " + error.what);
+        } catch (std::bad_alloc const&) {
+            complain("out of memory");
+        } catch (std::exception const& error) {
+            complain(printableText(error.what()));
         }
         return verb.exitInTrouble;
     }

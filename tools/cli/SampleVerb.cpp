@@ -5,6 +5,7 @@
 #include "tools/cli/Stretches.h"
 #include "tools/cli/TimeArgument.h"
 #include "tools/cli/UsageError.h"
+#include "tools/cli/WholeNumber.h"
 #include "tools/curve/SampleTimes.h"
 #include "tools/output/CsvWriter.h"
 #include "tools/output/JsonWriter.h"
@@ -339,7 +340,7 @@ Verb declareSample(CLI::App& program) {
         verb->add_option("--rate", options->rate, "Likewise, so many times a second: 24, 23.976, 24000/1001")
             ->option_text("R");
     auto* const count = verb->add_option("--count", options->count, "Read so many times, evenly spread")
-                            ->check(CLI::PositiveNumber)
+                            ->check(wholeNumberFrom(1))
                             ->option_text("N");
     for (CLI::Option* const other : {from, to, step, rate, count}) {
         at->excludes(other);

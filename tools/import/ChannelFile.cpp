@@ -63,17 +63,6 @@ ChannelFile openDocument(DocumentFile document, std::string const& file,
     return opened;
 }
 
-ChannelFormat formatOf(std::string_view text, std::string_view file) {
-    if (std::optional<ChannelFormat> const named = channelFormatNamed(file)) {
-        return *named;
-    }
-    if (looksLikeDocument(text)) {
-        return ChannelFormat::Document;
-    }
-    bool const hasComma = text.substr(0, text.find('\n')).find(',') != std::string_view::npos;
-    return hasComma ? ChannelFormat::Csv : ChannelFormat::Motion;
-}
-
 } // namespace
 
 std::string_view channelFormatName(ChannelFormat format) {
@@ -99,14 +88,30 @@ std::optional<ChannelFormat> channelFormatNamed(std::string_view file) {
     return std::nullopt;
 }
 
+ChannelFormat channelFormatOf(std::string_view text, std::string_view file) {
+    if (std::optional<ChannelFormat> const named = channelFormatNamed(file)) {
+        return *named;
+    }
+    if (looksLikeDocument(text)) {
+        return ChannelFormat::Document;
+    }
+    bool const hasComma = text.substr(0, text.find('\n')).find(',') != std::string_view::npos;
+    return hasComma ? ChannelFormat::Csv : ChannelFormat::Motion;
+}
+
 ChannelFile openChannelFile(std::string const& file, ReadingProgress const& progress,
                             std::optional<Tempus> const& frameDuration) {
-    Tempus const counted = frameDuration.value_or(defaultFrameDuration());
     if (channelFormatNamed(file) == ChannelFormat::Document) {
+        Tempus const counted = frameDuration.value_or(defaultFrameDuration());
         return openDocument(readDocumentFile(file, counted, progress), file, frameDuration);
     }
-    std::string const text = readInputText(file);
-    switch (formatOf(text, file)) {
+    return openChannelText(readInputText(file), file, progress, frameDuration);
+}
+
+ChannelFile openChannelText(std::string_view text, std::string const& file, ReadingProgress const& progress,
+                            std::optional<Tempus> const& frameDuration) {
+    Tempus const counted = frameDuration.value_or(defaultFrameDuration());
+    switch (channelFormatOf(text, file)) {
     case ChannelFormat::Csv:
         return openCsv(text, file, progress);
     case ChannelFormat::Document:
