@@ -35,6 +35,8 @@ struct DocumentFile {
     std::string versionText() const { return std::to_string(major) + "." + std::to_string(minor); }
 
     std::vector<DocumentFactory> factories;
+    /// Its text, where the file can be read only once, as from a pipe.
+    std::optional<std::string> text;
     std::unique_ptr<ChannelTree> tree;
 };
 
