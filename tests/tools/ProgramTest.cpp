@@ -343,6 +343,35 @@ TEST_F(ProgramTest, TellsWhereMemoryIsOut) {
     EXPECT_EQ(limited({"info", _file, large}).err, "lumenkey: " + large + ": out of memory\n");
 }
 
+TEST_F(ProgramTest, EmptyTextsAreWrongArguments) {
+    std::string const document = _folder.file("small.lumen");
+    outputOf({"convert", _file, document});
+    std::string const before = contentOf(document);
+    for (std::vector<std::string> const& arguments :
+         std::vector<std::vector<std::string>>{{"scale", document, "--in-place", "--factor", ""},
+                                               {"scale", document, "--in-place", "--factor="},
+                                               {"bake", document, "--in-place", "--tolerance", ""},
+                                               {"bake", document, "--in-place", "--from", ""},
+                                               {"offset", document, "--value", "1", "-o", ""},
+                                               {"set", document, "Offset.X", "--value", ""},
+                                               {"set", document, "Offset.X", "--value", "1", "-o", ""},
+                                               {"set", document, "Offset.X", "--value", "1", "--at", ""},
+                                               {"upgrade", document, "-o", ""},
+                                               {"add", document, "./", "Double", "", "--value", "1"},
+                                               {"new", _folder.file("new.lumen"), "--name", ""},
+                                               {"hash", document, "Hips", "--at", ""},
+                                               {"hash", document, ""},
+                                               {"sample", document, "--count", ""},
+                                               {"tree", document, "--depth", ""},
+                                               {"info", document, "--frame-rate", ""}}) {
+        Outcome const outcome = runLumenkey(arguments);
+        EXPECT_EQ(outcome.exit, 2) << Json(arguments);
+        EXPECT_EQ(contentOf(document), before) << Json(arguments);
+    }
+    expectWrongArguments({"scale", document, "--in-place", "--factor", ""}, "--factor: it is empty");
+    EXPECT_FALSE(std::filesystem::exists(_folder.file("new.lumen")));
+}
+
 TEST_F(ProgramTest, EveryVerbHelpsWithAnExample) {
     for (char const* const verb :
          {"info",    "tree",   "keys",  "sample",  "plot",    "gallery",    "simplify", "bake", "smooth",

@@ -41,6 +41,15 @@ private:
 
 void complain(std::string const& text) { writeFully(STDERR_FILENO, "lumenkey: " + text + "\n"); }
 
+/// An empty text would count as 0, or as if the option weren't there.
+void refuseEmptyTexts(CLI::App& verb) {
+    CLI::Validator const isSaid([](std::string& text) { return text.empty() ? "it is empty" : ""; }, "");
+    for (CLI::Option* const option :
+         verb.get_options([](CLI::Option* each) { return each->get_items_expected_max() > 0; })) {
+        option->check(isSaid);
+    }
+}
+
 class Program {
 public:
     Program() {
@@ -63,6 +72,7 @@ public:
         for (Verb const& verb : _verbs) {
             _usages[verb.arguments->get_name()] = verb.usage;
             verb.arguments->formatter(std::make_shared<HelpFormatter>(_usages));
+            refuseEmptyTexts(*verb.arguments);
         }
         _app.formatter(std::make_shared<HelpFormatter>(_usages));
     }
