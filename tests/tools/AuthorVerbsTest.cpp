@@ -109,6 +109,49 @@ TEST_F(AuthorVerbsTest, RefusesWhatChannelsDoNotTake) {
     expectRefused({"new"}, "it is there already", 1);
 }
 
+TEST_F(AuthorVerbsTest, SetRefusesWhatTheFileCanNotHold) {
+    makeBall();
+    outputOf({"convert", _folder.write("m.bvh", samples::kSmallMotion), _folder.file("m.lumen")});
+    _folder.write("t.csv", "t,X,Y\n0,1,\n1,2,\n");
+    std::string const key = "<keypoint flags=\"2\"><time>0/1</time><value>1</value></keypoint>";
+    _folder.write("k.lumen", "<kfml version=\"5.13\"><factory id=\"1\" uuid=\"FDC1944B-2291-11D7-B1C3-"
+                             "00039389B702\"/><parameter id=\"1\"><parameter name=\"X\" id=\"1\" "
+                             "factoryID=\"1\"><curve type=\"1\">" +
+                                 key + "</curve></parameter></parameter></kfml>");
+    std::string const convert = "make a document of it with lumenkey convert";
+    struct {
+        std::string file;
+        std::vector<std::string> arguments;
+        std::string complaint; // empty for none
+    } const cases[] = {
+        {"m.bvh", {"Hips.Xposition", "--at", "1/240", "--value", "1"}, "which are 1/120 s apart; " + convert},
+        {"m.bvh", {"Hips.Xposition", "--at", "0", "--delete"}, "a value in every frame; " + convert},
+        {"m.bvh", {"Hips.Xposition", "--at", "0", "--interpolation", "ease"}, "holds no interpolations"},
+        {"m.bvh", {"Hips.Xposition", "--at", "2f", "--value", "1", "-o", _folder.file("o.bvh")}, ""},
+        {"m.bvh", {"Hips.Xposition", "--at", "0.1f", "--value", "1", "-o", _folder.file("o.lumen")}, ""},
+        {"m.lumen",
+         {"Hips.Xposition", "--at", "0.1f", "--value", "1", "-o", _folder.file("o.bvh")},
+         "apart; write a document"},
+        {"t.csv", {"X", "--at", "0", "--interpolation", "ease"}, "a CSV holds no interpolations; " + convert},
+        {"t.csv", {"Y", "--value", "3"}, "a CSV holds no values without a time; " + convert},
+        {"t.csv", {"Y", "--at", "1/3", "--value", "3", "-o", _folder.file("o.csv")}, ""},
+        {"t.csv", {"X", "--at", "0", "--delete", "-o", _folder.file("o.csv")}, ""},
+        {"k.lumen", {"X", "--at", "0", "--delete"}, "the keypoint at 0/1 s is locked"},
+        {"k.lumen", {"X", "--at", "0", "--value", "2"}, "the keypoint at 0/1 s is locked"},
+        {"k.lumen", {"X", "--at", "1", "--value", "2", "-o", _folder.file("o.lumen")}, ""},
+    };
+    for (auto const& each : cases) {
+        std::string const file = _folder.file(each.file);
+        std::string const before = contentOf(file);
+        std::vector<std::string> arguments{"set", file};
+        arguments.insert(arguments.end(), each.arguments.begin(), each.arguments.end());
+        Outcome const outcome = runLumenkey(arguments);
+        EXPECT_EQ(outcome.exit, each.complaint.empty() ? 0 : 2) << Json(arguments) << outcome.err;
+        EXPECT_NE(outcome.err.find(each.complaint), std::string::npos) << outcome.err;
+        EXPECT_EQ(contentOf(file), before);
+    }
+}
+
 TEST_F(AuthorVerbsTest, HashIsThatOfTheLibrary) {
     makeBall();
     KFChannelObjectRootBase root("ball", nullptr, 1, 0, 0);
@@ -157,6 +200,35 @@ TEST_F(AuthorVerbsTest, DiffTellsWhatDiffersAndByItsExitCode) {
               "changed Height: keypoints or settings of a curve with the same values\n");
     EXPECT_EQ(runLumenkey({"diff", _file, _folder.file("none")}).exit, 2);
     EXPECT_EQ(runLumenkey({"diff", _file}).exit, 2);
+}
+
+TEST_F(AuthorVerbsTest, DiffSeesPeaksOfAMomentOrderAndNames) {
+    std::string const table = "t,X\n0,0\n0.50101,0\n0.50102,0\n0.50103,0\n1,0\n";
+    std::string const flat = _folder.write("flat.csv", table);
+    std::string const peak = _folder.write("peak.csv", samples::replaced(table, "0.50102,0", "0.50102,1000"));
+    EXPECT_EQ(outputOf({"diff", flat, peak}, 1), "changed X: by up to 1000.000000 units, at 25051/50000 s\n");
+    std::string const linear = _folder.file("peak.lumen");
+    std::string const steps = _folder.file("steps.lumen");
+    outputOf({"convert", peak, linear});
+    outputOf({"set", linear, "X", "--at", "0.50101", "--interpolation", "constant", "-o", steps});
+    EXPECT_TRUE(
+        outputOf({"diff", linear, steps}, 1).starts_with("changed X: by up to 999.000000 units, at "));
+
+    auto const documentOf = [](std::string const& top, std::string const& children) {
+        return "<kfml version=\"5.13\"><factory id=\"1\" uuid=\"FDC1944B-2291-11D7-B1C3-00039389B702\"/>"
+               "<parameter name=\"" +
+               top + "\" id=\"1\">" + children + "</parameter></kfml>";
+    };
+    auto const child = [](std::string const& name, std::string const& id) {
+        return "<parameter name=\"" + name + "\" id=\"" + id + "\" factoryID=\"1\"/>";
+    };
+    std::string const before = _folder.write("1.lumen", documentOf("A", child("X", "1") + child("Y", "2")));
+    std::string const after =
+        _folder.write("2.lumen", documentOf("B", child("New", "3") + child("Y", "2") + child("X", "1")));
+    EXPECT_EQ(outputOf({"diff", before, after}, 1), "changed ./: name A became B\n"
+                                                    "added   New\n"
+                                                    "changed Y: place among its siblings 2 became 1\n"
+                                                    "changed X: place among its siblings 1 became 2\n");
 }
 
 TEST_F(AuthorVerbsTest, UpgradeWritesOldDocumentsInTodaysVersion) {
