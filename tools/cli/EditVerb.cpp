@@ -6,6 +6,7 @@
 #include "tools/cli/PlotOptions.h"
 #include "tools/cli/Progress.h"
 #include "tools/cli/UsageError.h"
+#include "tools/curve/Keypoint.h"
 #include "tools/edit/CurveChange.h"
 #include "tools/export/ChannelFileWriter.h"
 #include "tools/output/SafeOutputFile.h"
@@ -118,12 +119,11 @@ private:
         }
     }
 
-    TimeSpan keyedSpan(KFChannel& channel) const {
-        TimeSpan keyed;
-        KFCurve& curve = *channel.getCurveInterface();
-        curve.getFirstKeypoint(&keyed.from, nullptr);
-        curve.getLastKeypoint(&keyed.to, nullptr);
-        return {TempusMaximum(_span.from, keyed.from), TempusMinimum(_span.to, keyed.to)};
+    /// That part of the stretch in which keypoints lie.
+    TimeSpan keyedSpan(KFSpline const* spline) const {
+        std::optional<KeypointEnds> const ends = keypointEnds(spline);
+        return ends ? TimeSpan{TempusMaximum(_span.from, ends->first), TempusMinimum(_span.to, ends->last)}
+                    : _span;
     }
 
     EditedChannel edit(ChannelTree const& tree, Node node, Tempus const& step) {
@@ -132,7 +132,7 @@ private:
                              channel.getNumberOfKeyframes()};
         std::unique_ptr<KFCurveInterface> const copy(tree.curve(node).cloneCurve());
         auto& before = static_cast<KFCurve&>(*copy);
-        TimeSpan const keyed = keyedSpan(channel);
+        TimeSpan const keyed = keyedSpan(tree.spline(node));
         if (edited.keypointsBefore > 0 && !(keyed.to < keyed.from) && !channel.isLocked(true)) {
             _verb.apply(channel, keyed);
         }

@@ -1,5 +1,6 @@
 #include "tools/tree/ChannelTree.h"
 
+#include "tools/curve/Keypoint.h"
 #include "tools/tree/FileRoot.h"
 
 #include <algorithm>
@@ -161,12 +162,12 @@ std::optional<BXTimeRange> ChannelTree::keyedRange() const {
     std::optional<BXTimeRange> range;
     Tempus last{};
     for (Node const node : channelsBelow(kTop)) {
-        Tempus from{};
-        Tempus to{};
-        if (curve(node).getNumberOfKeypoints() > 0 && curve(node).getFirstKeypoint(&from, nullptr) &&
-            curve(node).getLastKeypoint(&to, nullptr)) {
-            last = range ? TempusMaximum(last, to) : to;
-            Tempus const first = range ? TempusMinimum(range->start, from) : from;
+        if (curve(node).getNumberOfKeypoints() == 0) {
+            continue;
+        }
+        if (std::optional<KeypointEnds> const ends = keypointEnds(spline(node))) {
+            last = range ? TempusMaximum(last, ends->last) : ends->last;
+            Tempus const first = range ? TempusMinimum(range->start, ends->first) : ends->first;
             range = BXTimeRange{first, last - first};
         }
     }
