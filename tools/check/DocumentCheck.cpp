@@ -45,10 +45,18 @@ public:
 private:
     // --- Findings ---
 
-    /// Nothing where there is nothing to tell.
-    void find(TextPlace const& place, std::string what) {
-        if (!what.empty()) {
-            _findings.push_back({place, std::move(what)});
+    // Nothing where there is nothing to tell.
+
+    void find(TextPlace const& place, std::string what) { tell({place, std::move(what)}); }
+    /// What a reader takes as it is.
+    void findKept(TextPlace const& place, std::string what) { tell({place, std::move(what), false}); }
+    /// Of a number that a reader takes as it is, if it can be read.
+    void checkNumber(TextPlace const& place, std::string_view text, CurveLimits const& limits) {
+        tell({place, faultOfNumber(text, limits), !readNumber(text)});
+    }
+    void tell(DocumentFinding finding) {
+        if (!finding.what.empty()) {
+            _findings.push_back(std::move(finding));
         }
     }
 
@@ -107,7 +115,7 @@ private:
         } else if (element.name == "curve") {
             checkCurve(element, attributes);
         } else if (element.name == "keypoint") {
-            find(element.place, faultOfInterpolation(attributes));
+            findKept(element.place, faultOfInterpolation(attributes));
         }
         return true;
     }
@@ -217,9 +225,9 @@ private:
         } else if (element.word->parent == "keypoint") {
             OpenElement& curve = _open[_open.size() - 2];
             if (element.name == "value") {
-                find(element.place, faultOfNumber(element.text, curve.limits));
+                checkNumber(element.place, element.text, curve.limits);
             } else if (element.name == "time") {
-                find(element.place, faultOfOrder(element.text, _countsFrames, curve.lastTime));
+                findKept(element.place, faultOfOrder(element.text, _countsFrames, curve.lastTime));
             }
         }
     }

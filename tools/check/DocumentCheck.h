@@ -12,6 +12,8 @@ namespace lumenkey::tools {
 struct DocumentFinding {
     TextPlace place;
     std::string what;
+    /// Whether a document that is written anew would be without it.
+    bool isLoss = true;
 };
 
 /// Looks a document through without reading it into channels: text that is no XML, elements and classes that

@@ -105,7 +105,7 @@ Verb declareAdd(CLI::App& program) {
     verb->footer(
         "It comes behind the others; its path of IDs is printed. lumenkey types lists the classes.\n\n"
         "Example: lumenkey add ball.lumen ./ Double Height --value 1.5");
-    return {verb, "FILE PARENT TYPE NAME [--value V] [-o OUT | --in-place] [--frame-rate R]",
+    return {verb, "FILE PARENT TYPE NAME [--value V] [-o OUT | --in-place] [--force] [--frame-rate R]",
             [options](OutputSink& out) { runAdd(*options, out); }};
 }
 

@@ -147,9 +147,9 @@ private:
     WrittenRows writeFile(ChannelInput const& input, std::vector<Node> const& channels) const {
         bool const areKeypoints = _options.rows.empty() ? !_verb.sampleStep() : _options.rows == "keypoints";
         Progress bar("writing");
-        return writeChannelFile(
-            {input.file(), _format, areKeypoints ? RowsOf::Keypoints : RowsOf::Input, channels, target()},
-            bar.teller());
+        return writeChannelFile({input.file(), _format, areKeypoints ? RowsOf::Keypoints : RowsOf::Input,
+                                 channels, target(), _options.output.force},
+                                bar.teller());
     }
 
     /// The stretch and where it comes to; around a part of the file, some of what lies beside it.
@@ -242,7 +242,7 @@ Verb declareEdit(CLI::App& program, std::shared_ptr<EditVerb> const& verb) {
     arguments->footer(footerOf(words, verb->sampleStep().has_value()));
     return {arguments,
             "FILE [CHANNEL...] " + words.usage + (words.usage.empty() ? "" : " ") +
-                "(-o OUT.lumen|csv|bvh | --in-place) [--from T] [--to T] [--rows input|keypoints] "
+                "(-o OUT.lumen|csv|bvh | --in-place) [--force] [--from T] [--to T] [--rows input|keypoints] "
                 "[--plot PICTURE.svg|png|pdf] [--frame-rate R] [--json]",
             [verb, options](OutputSink& out) { EditRun(*verb, *options).run(out); }};
 }

@@ -42,7 +42,7 @@ Verb declareRemove(CLI::App& program) {
         ->required();
     options->author.addRest(*verb);
     verb->footer("Example: lumenkey remove ball.lumen Shadow");
-    return {verb, "FILE CHANNEL [-o OUT | --in-place] [--frame-rate R]",
+    return {verb, "FILE CHANNEL [-o OUT | --in-place] [--force] [--frame-rate R]",
             [options](OutputSink&) { runRemove(*options); }};
 }
 

@@ -36,7 +36,9 @@ int upgrade(std::string const& file, UpgradeOptions const& options, OutputSink& 
         return kExitDone;
     }
     Progress bar("writing");
-    writeChannelFile({input.file(), ChannelFormat::Document, RowsOf::Keypoints, {}, target}, bar.teller());
+    writeChannelFile(
+        {input.file(), ChannelFormat::Document, RowsOf::Keypoints, {}, target, options.output.force},
+        bar.teller());
     out.write(printableText(target) + ": from version " + version + " to " + current + "\n");
     return kExitDone;
 }
@@ -66,13 +68,14 @@ Verb declareUpgrade(CLI::App& program) {
             ->option_text("OUT");
     verb->add_flag("--in-place", options->output.inPlace, "Replace FILE, as is done without -o")
         ->excludes(output);
+    addForceOption(*verb, options->output.force);
     verb->add_option(
             "--frame-rate", options->frameRate,
             "Frames a second of documents that count frames, those of version 4 and before (else 30)")
         ->option_text("R");
     verb->footer("Each is replaced as a whole or not at all; one of today's version stays as it is.\n\n"
                  "Example: lumenkey upgrade old.lumen --frame-rate 24");
-    Verb declared{verb, "FILE... [-o OUT | --in-place] [--frame-rate R]", {}};
+    Verb declared{verb, "FILE... [-o OUT | --in-place] [--force] [--frame-rate R]", {}};
     declared.runForExit = [options](OutputSink& out) { return runUpgrade(*options, out); };
     return declared;
 }

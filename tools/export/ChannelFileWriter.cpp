@@ -1,5 +1,7 @@
 #include "tools/export/ChannelFileWriter.h"
 
+#include "lumenkey/Channels/KFChannelFlags.h"
+#include "tools/check/DocumentCheck.h"
 #include "tools/curve/Keypoint.h"
 #include "tools/export/DocumentWriter.h"
 #include "tools/export/MotionFrames.h"
@@ -153,15 +155,36 @@ WrittenRows writeTable(FileToWrite const& wanted, OutputSink& out, ReadingProgre
     return {times.size(), times.empty() ? kTempusZero : times.front()};
 }
 
-/// Channels of unknown classes were passed over on reading; a document without them must not come in its
-/// place.
-void checkNothingIsLost(FileToWrite const& wanted) {
-    for (DocumentFactory const& factory : wanted.file.document.factories) {
-        if (!factory.isKnown()) {
-            throw OutputError{wanted.target, "not written: " + printableText(wanted.file.file) +
-                                                 " names a class that is unknown, " + factory.uuid.text() +
-                                                 ", whose channels would be lost; see lumenkey check"};
+/// What a reader passes over, and what a writer leaves out; empty for nothing.
+std::string firstLossIn(ChannelFile const& document) {
+    std::string const name = printableText(document.file);
+    for (DocumentFinding const& finding : document.document.text
+                                              ? checkDocumentText(*document.document.text, {})
+                                              : checkDocument(document.file, {})) {
+        if (finding.isLoss) {
+            return name + ":" + std::to_string(finding.place.line) + ":" +
+                   std::to_string(finding.place.column) + ": " + printableText(finding.what);
         }
+    }
+    ChannelTree const& tree = *document.tree;
+    for (Node node = ChannelTree::kTop + 1; node < tree.count(); ++node) {
+        bool const isLeftOut = tree.base(node).testFlag(kChannelFlagNotSaved) ||
+                               tree.asFolder(tree.parent(node))->testFoldFlag(kFoldFlagChildrenNotSaved);
+        if (isLeftOut && !tree.isComponent(node)) {
+            return name + ": documents leave out the channel '" + printableText(tree.dottedName(node)) + "'";
+        }
+    }
+    return {};
+}
+
+void checkNothingIsLost(FileToWrite const& wanted) {
+    if (wanted.file.format != ChannelFormat::Document || wanted.acceptsLoss) {
+        return;
+    }
+    std::string const loss = firstLossIn(wanted.file);
+    if (!loss.empty()) {
+        throw OutputError{wanted.target, "not written, since something would be lost: " + loss +
+                                             "; --force writes it without"};
     }
 }
 
