@@ -98,11 +98,7 @@ void writeRows(std::vector<std::vector<double>> const& columns, std::vector<Temp
         csv.field(timeText(times[row]));
         csv.number(TempusGetSeconds(times[row]));
         for (std::vector<double> const& column : columns) {
-            if (std::isnan(column[row])) {
-                csv.field("");
-            } else {
-                csv.number(column[row]);
-            }
+            csv.number(column[row]); // an empty cell where there is none
         }
         csv.endRow();
         if (progress) {
@@ -131,7 +127,7 @@ WrittenRows writeTable(FileToWrite const& wanted, OutputSink& out, ReadingProgre
     csv.field("seconds");
     for (Node const channel : channels) {
         keypoints.push_back(keypointsOf(tree.spline(channel)));
-        csv.field(tree.dottedName(channel));
+        csv.name(tree.dottedName(channel));
     }
     csv.endRow();
     bool const isByKeypoints =
