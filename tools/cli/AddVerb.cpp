@@ -44,6 +44,9 @@ KFChannelFolder& requireParent(ChannelInput const& input, AddOptions const& opti
     if (parent == nullptr || parent->isCompoundChannel()) {
         throw UsageError{"'" + options.parent + "' is no folder"};
     }
+    if (parent->isLocked(true)) {
+        throw UsageError{"'" + options.parent + "' is locked"};
+    }
     if (parent->getDescendants() != nullptr) {
         for (KFChannelBase const* const child : *parent->getDescendants()) {
             if (child->getName().view() == options.name) {

@@ -30,6 +30,10 @@ struct DocumentFactory {
 struct DocumentFile {
     std::uint32_t major = 5;
     std::uint32_t minor = 13;
+    /// As it stands in the document; empty where it says none.
+    std::string writtenVersion;
+    /// Whether that can be read; if not, the one above is what the document is read as.
+    bool isVersionSound = false;
 
     /// Such as `5.13`.
     std::string versionText() const { return std::to_string(major) + "." + std::to_string(minor); }
