@@ -26,11 +26,11 @@ struct UpgradeOptions {
 /// With what the document says, where it is read as something else.
 std::string versionOf(DocumentFile const& document) {
     std::string const version = document.versionText();
-    if (document.isVersionSound) {
+    std::string const written = printableText(document.writtenVersion.view());
+    if (written == version) {
         return version;
     }
-    return (document.writtenVersion.empty() ? "none" : "'" + printableText(document.writtenVersion) + "'") +
-           ", read as " + version + ",";
+    return (written.empty() ? "none" : "'" + written + "'") + ", read as " + version + ",";
 }
 
 int upgrade(std::string const& file, UpgradeOptions const& options, OutputSink& out) {

@@ -46,6 +46,7 @@ public:
         switch (element.tag()) {
         case kOldDocumentElement:
         case kDocumentElement:
+            element.getAttributeAsString(kVersionAttribute, &_document.writtenVersion);
             if (element.getAttributeAsString(kVersionAttribute, &text)) {
                 readVersion(text.view(), stream);
             }
@@ -73,11 +74,9 @@ public:
 private:
     void readVersion(std::string_view text, BXSerializerReadStream& stream) {
         char const* const end = text.data() + text.size();
-        _document.writtenVersion = text;
         auto const major = std::from_chars(text.data(), end, stream.major);
         if (major.ec == std::errc() && major.ptr != end && *major.ptr == '.') {
-            auto const minor = std::from_chars(major.ptr + 1, end, stream.minor);
-            _document.isVersionSound = minor.ec == std::errc() && minor.ptr == end;
+            std::from_chars(major.ptr + 1, end, stream.minor);
         }
         _document.major = stream.major;
         _document.minor = stream.minor;

@@ -1,5 +1,6 @@
 #pragma once
 
+#include "lumenkey/foundation/BXString.h"
 #include "lumenkey/foundation/BXUUID.h"
 #include "tools/import/InputError.h"
 #include "tools/import/InputText.h"
@@ -31,11 +32,9 @@ struct DocumentFile {
     std::uint32_t major = 5;
     std::uint32_t minor = 13;
     /// As it stands in the document; empty where it says none.
-    std::string writtenVersion;
-    /// Whether that can be read; if not, the one above is what the document is read as.
-    bool isVersionSound = false;
+    BXString writtenVersion;
 
-    /// Such as `5.13`.
+    /// Such as `5.13`: what the document is read as, whatever it says.
     std::string versionText() const { return std::to_string(major) + "." + std::to_string(minor); }
 
     std::vector<DocumentFactory> factories;
