@@ -231,6 +231,18 @@ TEST_F(AuthorVerbsTest, DiffSeesPeaksOfAMomentOrderAndNames) {
                                                     "changed X: place among its siblings 1 became 2\n");
 }
 
+TEST_F(AuthorVerbsTest, LockedChannelsStayAsTheyAre) {
+    _folder.write("ball.lumen",
+                  "<kfml version=\"5.13\"><factory id=\"1\" uuid=\"E7BF3809-2290-11D7-98E5-00039389B702\"/>"
+                  "<factory id=\"2\" uuid=\"FDC1944B-2291-11D7-B1C3-00039389B702\"/><parameter id=\"1\" "
+                  "factoryID=\"1\"><parameter name=\"Body\" id=\"2\" factoryID=\"1\"><flags>4</flags>"
+                  "<parameter name=\"X\" id=\"3\" factoryID=\"2\"/></parameter></parameter></kfml>");
+    expectRefused({"set", "X", "--value", "1"}, "'X' is locked");
+    expectRefused({"add", "Body", "Double", "Y"}, "'Body' is locked");
+    expectRefused({"remove", "X"}, "'X' is locked");
+    expectRefused({"remove", "Body"}, "'Body' is locked");
+}
+
 TEST_F(AuthorVerbsTest, UpgradeWritesOldDocumentsInTodaysVersion) {
     std::vector<std::string> files;
     std::string const data = LUMENKEY_TEST_SOURCE_DIR "/tests/persistence/data/";
@@ -253,6 +265,26 @@ TEST_F(AuthorVerbsTest, UpgradeWritesOldDocumentsInTodaysVersion) {
     }
     arguments.push_back(_folder.file("none.lumen"));
     EXPECT_EQ(runLumenkey(arguments).exit, 1);
+
+    struct {
+        char const* version;
+        char const* said;
+        int exit;
+    } const versions[] = {
+        {" version=\"abc\"", "F: from version 'abc', read as 5.13, to 5.13\n", 0},
+        {" version=\"4\"", "F: from version '4', read as 4.13, to 5.13\n", 0},
+        {"", "F: from version none, read as 5.13, to 5.13\n", 0},
+        {" version=\"99.1\"",
+         "lumenkey: F:1:1: version 99.1 is newer than 5.13, the newest that is written here\n", 1},
+    };
+    for (auto const& each : versions) {
+        std::string const file =
+            _folder.write("v.lumen", "<kfml" + std::string(each.version) + "><parameter id=\"1\"/></kfml>");
+        Outcome const outcome = runLumenkey({"upgrade", file});
+        EXPECT_EQ(outcome.exit, each.exit);
+        std::string said = outcome.out + outcome.err;
+        EXPECT_EQ(said.replace(said.find(file), file.size(), "F"), each.said);
+    }
 
     // A document that would lose channels stays.
     std::string const unknown = _folder.write(

@@ -95,6 +95,23 @@ TEST_F(DocumentVerbsTest, MotionsOfAnyFrameTimeComeBackFromDocuments) {
     EXPECT_EQ(jsonOf({"info", _document})["frameDuration"], "1/2");
 }
 
+TEST_F(DocumentVerbsTest, AnyDocumentMakesATableThatCanBeRead) {
+    std::string const odd = _folder.write(
+        "odd.lumen",
+        "<kfml version=\"5.13\"><factory id=\"1\" uuid=\"E7BF3809-2290-11D7-98E5-00039389B702\"/>"
+        "<factory id=\"2\" uuid=\"FDC1944B-2291-11D7-B1C3-00039389B702\"/><parameter id=\"1\" "
+        "factoryID=\"1\"><parameter id=\"2\" factoryID=\"2\"><curve type=\"1\"><keypoint interpolation=\"1\">"
+        "<time>0/1</time><value>2</value></keypoint><keypoint><time>1/1</time><value>inf</value></keypoint>"
+        "</curve></parameter></parameter></kfml>");
+    std::string const table = _folder.file("odd.csv");
+    outputOf({"convert", odd, table});
+    EXPECT_EQ(contentOf(table), "time,seconds,\"\"\n0/1,0,2\n1/1,1,\n");
+    EXPECT_EQ(jsonOf({"info", table})["channelNames"], Json({""}));
+    std::string const sampled = outputOf({"sample", odd, "--at", "0,1", "--csv"});
+    EXPECT_EQ(outputOf({"sample", _folder.write("sampled.csv", sampled), "--at", "0", "--csv"}),
+              "time,seconds,\"\"\n0/1,0,2\n");
+}
+
 TEST_F(DocumentVerbsTest, ReadingVerbsTakeDocuments) {
     outputOf({"convert", _motion, _document});
     Json const info = jsonOf({"info", _document});

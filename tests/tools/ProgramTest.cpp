@@ -373,15 +373,36 @@ TEST_F(ProgramTest, EmptyTextsAreWrongArguments) {
 }
 
 TEST_F(ProgramTest, EveryVerbHelpsWithAnExample) {
-    for (char const* const verb :
+    // What the examples speak of.
+    runProgramFile(LUMENKEY_MAKE_MOTION, {_folder.file("walk.bvh"), "--frames", "300"});
+    _folder.write("old.lumen", contentOf(LUMENKEY_TEST_SOURCE_DIR "/tests/persistence/data/version3.lumen"));
+    outputOf({"convert", _folder.file("walk.bvh"), _folder.file("walk.lumen")});
+    outputOf({"convert", _folder.file("walk.bvh"), _folder.file("edited.lumen")});
+    // In this order one makes what another takes: `add` makes the height that `set` keys.
+    for (std::string const verb :
          {"info",    "tree",   "keys",  "sample",  "plot",    "gallery",    "simplify", "bake", "smooth",
-          "reverse", "offset", "scale", "retime",  "convert", "new",        "add",      "set",  "remove",
-          "hash",    "diff",   "check", "upgrade", "types",   "completion", "manual"}) {
+          "reverse", "offset", "scale", "retime",  "convert", "new",        "add",      "set",  "hash",
+          "remove",  "diff",   "check", "upgrade", "types",   "completion", "manual"}) {
         Outcome const help = runLumenkey({verb, "--help"});
         EXPECT_EQ(help.exit, 0);
-        EXPECT_NE(help.out.find("Usage: lumenkey " + std::string(verb)), std::string::npos) << help.out;
-        EXPECT_NE(help.out.find("Example: lumenkey " + std::string(verb)), std::string::npos) << help.out;
+        EXPECT_NE(help.out.find("Usage: lumenkey " + verb), std::string::npos) << help.out;
         EXPECT_EQ(help.err, "");
+        std::string const mark = "Example: lumenkey ";
+        std::size_t const example = help.out.find(mark + verb);
+        ASSERT_NE(example, std::string::npos) << help.out;
+        std::string const command =
+            help.out.substr(example + mark.size(), help.out.find('\n', example) - example - mark.size());
+        Outcome const run = runProgramFile(
+            "/bin/sh", {"-c",
+                        "cd \"$1\"; export HOME=\"$1\"; mkdir -p .local/share/bash-completion/completions; "
+                        "man() { cat; }; \"$0\" " +
+                            command,
+                        programPath(), _folder.path().string()});
+        EXPECT_EQ(run.exit, 0) << command << "\n" << run.err;
+        if (verb == "new") {
+            outputOf({"add", _folder.file("ball.lumen"), "./", "Folder", "Body"});
+            outputOf({"add", _folder.file("ball.lumen"), "./", "Folder", "Shadow"});
+        }
     }
     EXPECT_NE(runLumenkey({"--help"}).out.find("sample"), std::string::npos);
     EXPECT_TRUE(runLumenkey({"--version"}).out.starts_with("lumenkey "));

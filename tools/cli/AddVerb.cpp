@@ -45,6 +45,9 @@ ChannelTree::Node requireParent(ChannelInput const& input, AddOptions const& opt
     if (parent == nullptr || parent->isCompoundChannel()) {
         throw UsageError{"'" + options.parent + "' is no folder"};
     }
+    if (parent->isLocked(true)) {
+        throw UsageError{"'" + options.parent + "' is locked"};
+    }
     if (parent->getDescendants() != nullptr) {
         for (KFChannelBase const* const child : *parent->getDescendants()) {
             if (child->getName().view() == options.name) {

@@ -90,9 +90,9 @@ Verb declareCheck(CLI::App& program) {
     verb->add_option("FILE", options->files, kFileHelp)->option_text("...")->required();
     verb->footer(
         "A line for each finding, FILE:LINE:COLUMN: what it is; nothing is changed. Of documents: text that "
-        "is no XML,\nelements and classes that are unknown and so passed over, values that can't be read or "
-        "are "
-        "out of limits,\nkeypoints out of order. Exits 0 where there is nothing, else 1.\n\n"
+        "is no XML,\nelements and classes that are unknown and so passed over, values and attributes that "
+        "can't be read or are out of\nlimits, keypoints out of order or without a time or a value, a version "
+        "that is unknown. Exits 0 where there is\nnothing, else 1.\n\n"
         "Example: lumenkey check *.lumen");
     Verb declared{verb, "FILE...", {}};
     declared.runForExit = [options](OutputSink& out) { return forSeveralFiles(options->files, out, check); };

@@ -23,6 +23,9 @@ void runRemove(RemoveOptions const& options) {
     if (node == ChannelTree::kTop) {
         throw UsageError{"the top of a document stays"};
     }
+    if (input.tree().base(node).isLocked(true)) {
+        throw UsageError{"'" + options.channel + "' is locked"};
+    }
     if (input.tree().isComponent(node)) {
         throw UsageError{"'" + options.channel + "' is a part of its compound, which can only go as a whole"};
     }

@@ -196,7 +196,7 @@ void writeCsvTitles(CsvWriter& csv, ChannelTree const& tree, std::vector<Channel
     csv.field("seconds");
     for (ChannelTree::Node const channel : channels) {
         std::string const name = tree.dottedName(channel);
-        csv.field(name);
+        csv.name(name);
         if (slope) {
             csv.field(name + " slope");
         }
@@ -351,10 +351,12 @@ Verb declareSample(CLI::App& program) {
     verb->add_flag("--slope", options->slope, "Tell the slope too, by the second");
     auto* const json = verb->add_flag("--json", options->json, "For programs: every number in full");
     verb->add_flag("--csv", options->csv, "A row for each time, a column for each channel")->excludes(json);
-    verb->footer("A time is VALUE/TIMESCALE (1001/24000), seconds (0.5) or frames of the file (12f).\n"
-                 "Without CHANNEL all channels are read: at most 10000000 values, as CSV so many times.\n"
-                 "What --csv writes of ascending times can be read as a FILE.\n\n"
-                 "Example: lumenkey sample walk.bvh Hips.Yposition --rate 24 --csv");
+    verb->footer(
+        "A time is VALUE/TIMESCALE (1001/24000), seconds (0.5) or frames of the file (12f).\n"
+        "Without CHANNEL all channels are read: at most 10000000 values, as CSV so many times.\n"
+        "What --csv writes of ascending times can be read as a FILE; a value that isn't finite is an "
+        "empty cell.\n\n"
+        "Example: lumenkey sample walk.bvh Hips.Yposition --rate 24 --csv");
     return {
         verb,
         "FILE [CHANNEL...] (--at T[,T...] | [--from T] [--to T] (--step T | --rate R | --count N)) [--slope] "

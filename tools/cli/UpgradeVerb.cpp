@@ -11,6 +11,7 @@
 
 #include <CLI/CLI.hpp>
 #include <memory>
+#include <utility>
 
 namespace lumenkey::tools {
 
@@ -22,14 +23,29 @@ struct UpgradeOptions {
     OutputOptions output;
 };
 
+/// With what the document says, where it is read as something else.
+std::string versionOf(DocumentFile const& document) {
+    std::string const version = document.versionText();
+    std::string const written = printableText(document.writtenVersion.view());
+    if (written == version) {
+        return version;
+    }
+    return (written.empty() ? "none" : "'" + written + "'") + ", read as " + version + ",";
+}
+
 int upgrade(std::string const& file, UpgradeOptions const& options, OutputSink& out) {
     ChannelInput const input(InputOptions{file, options.frameRate});
     if (input.file().format != ChannelFormat::Document) {
         throw InputError{file, 1, 1, "this is no document"};
     }
     DocumentFile const& document = input.file().document;
-    std::string const version = document.versionText();
     std::string const current = std::to_string(kWrittenMajor) + "." + std::to_string(kWrittenMinor);
+    if (std::pair(document.major, document.minor) > std::pair(kWrittenMajor, kWrittenMinor)) {
+        throw InputError{file, 1, 1,
+                         "version " + document.versionText() + " is newer than " + current +
+                             ", the newest that is written here"};
+    }
+    std::string const version = versionOf(document);
     std::string const& target = options.output.target(file);
     if (version == current && options.output.output.empty()) {
         out.write(printableText(file) + ": version " + current + " already\n");

@@ -15,6 +15,7 @@
 #include <iterator>
 #include <limits>
 #include <optional>
+#include <utility>
 
 namespace lumenkey::tools {
 
@@ -100,11 +101,7 @@ void writeRows(std::vector<std::vector<double>> const& columns, std::vector<Temp
         csv.field(timeText(times[row]));
         csv.number(TempusGetSeconds(times[row]));
         for (std::vector<double> const& column : columns) {
-            if (std::isnan(column[row])) {
-                csv.field("");
-            } else {
-                csv.number(column[row]);
-            }
+            csv.number(column[row]); // an empty cell where there is none
         }
         csv.endRow();
         if (progress) {
@@ -133,7 +130,7 @@ WrittenRows writeTable(FileToWrite const& wanted, OutputSink& out, ReadingProgre
     csv.field("seconds");
     for (Node const channel : channels) {
         keypoints.push_back(keypointsOf(tree.spline(channel)));
-        csv.field(tree.dottedName(channel));
+        csv.name(tree.dottedName(channel));
     }
     csv.endRow();
     bool const isByKeypoints =
@@ -158,6 +155,9 @@ WrittenRows writeTable(FileToWrite const& wanted, OutputSink& out, ReadingProgre
 /// What a reader passes over, and what a writer leaves out; empty for nothing.
 std::string firstLossIn(ChannelFile const& document) {
     std::string const name = printableText(document.file);
+    if (std::pair(document.document.major, document.document.minor) > std::pair(kWrittenMajor, kWrittenMinor)) {
+        return name + ": version " + document.document.versionText() + " is newer than what is written";
+    }
     for (DocumentFinding const& finding : document.document.text
                                               ? checkDocumentText(*document.document.text, {})
                                               : checkDocument(document.file, {})) {

@@ -47,6 +47,7 @@ public:
         switch (element.tag()) {
         case kOldDocumentElement:
         case kDocumentElement:
+            element.getAttributeAsString(kVersionAttribute, &_document.writtenVersion);
             if (element.getAttributeAsString(kVersionAttribute, &text)) {
                 readVersion(text.view(), stream);
             }
