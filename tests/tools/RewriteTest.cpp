@@ -96,7 +96,8 @@ TEST_F(RewriteTest, LosesNothingUnlessForced) {
     EXPECT_NE(contentOf(_file).find("interpolation=\"99\""), std::string::npos);
 
     write(two + "</parameter>", "6.0");
-    EXPECT_NE(runLumenkey({"set", _file, "X", "--value", "1"}).err.find("version 6.0 is newer"), std::string::npos);
+    EXPECT_NE(runLumenkey({"set", _file, "X", "--value", "1"}).err.find("version 6.0 is newer"),
+              std::string::npos);
 
     // From a pipe, which can be read only once.
     std::string const script = "cat '" + _folder.write("odd", documentOf(two + "<shiny/></parameter>")) +

@@ -155,7 +155,8 @@ WrittenRows writeTable(FileToWrite const& wanted, OutputSink& out, ReadingProgre
 /// What a reader passes over, and what a writer leaves out; empty for nothing.
 std::string firstLossIn(ChannelFile const& document) {
     std::string const name = printableText(document.file);
-    if (std::pair(document.document.major, document.document.minor) > std::pair(kWrittenMajor, kWrittenMinor)) {
+    if (std::pair(document.document.major, document.document.minor) >
+        std::pair(kWrittenMajor, kWrittenMinor)) {
         return name + ": version " + document.document.versionText() + " is newer than what is written";
     }
     for (DocumentFinding const& finding : document.document.text
