@@ -52,6 +52,14 @@ TEST_F(DocsTest, TheProgramSaysWhatItsPageShows) {
     }
 }
 
+TEST_F(DocsTest, TheProgramSaysWhatTheFirstPageShows) {
+    runProgramFile(LUMENKEY_MAKE_MOTION, {_folder.file("walk.bvh")});
+    std::vector<std::string> const sessions = blocksOf(pageNamed("README.md"), "```console");
+    ASSERT_EQ(sessions.size(), 1U);
+    EXPECT_EQ(sessionAgain(sessions[0]), sessions[0]);
+    EXPECT_TRUE(std::filesystem::exists(_folder.file("plot.svg")));
+}
+
 TEST_F(DocsTest, TheExampleOfADocumentIsOne) {
     std::vector<std::string> const examples = blocksOf(pageNamed("docs/format.md"), "```xml");
     ASSERT_EQ(examples.size(), 1U);
