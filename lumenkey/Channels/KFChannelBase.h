@@ -295,7 +295,8 @@ public:
     // State ---------------------------------------------------------------------------------------------------
 
     /// The channel as a document of its own, in a blob; with `children` those of a folder, with `all` also
-    /// those that are at their defaults. Not beside changes of the tree.
+    /// those that are at their defaults. What lies deeper than documents are read (`BXXMLWriteStream`) isn't
+    /// in it. Not beside changes of the tree.
     BXData createChannelState(bool children, bool all);
     /// Reads such a document from a file, as `configureWithState` does, but keeps the ID.
     bool configureWithURL(BXURL const& url);

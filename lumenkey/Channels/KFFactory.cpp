@@ -88,7 +88,7 @@ KFFactory* KFFactory::getSuperFactory() const {
     if (KFFactory* const known = _superFactory.load(std::memory_order_acquire)) {
         return known;
     }
-    std::lock_guard const guard(_superFactoryMutex);
+    BXLockSentry const guard(_superFactoryMutex);
     KFFactory* found = _superFactory.load(std::memory_order_relaxed);
     if (found == nullptr) {
         found = KFFactories::getInstance().findFactory(_superUUID);

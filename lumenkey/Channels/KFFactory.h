@@ -1,12 +1,12 @@
 #pragma once
 
 #include "lumenkey/foundation/BXExport.h"
+#include "lumenkey/foundation/BXLocks.h"
 #include "lumenkey/foundation/BXString.h"
 #include "lumenkey/foundation/BXUUID.h"
 
 #include <atomic>
 #include <cstdint>
-#include <mutex>
 
 class KFChannelBase;
 class KFFactoryBase;
@@ -73,7 +73,7 @@ private:
     BXUUID const _superUUID;
     std::uint32_t const _kind;
     mutable std::atomic<KFFactory*> _superFactory{nullptr};
-    mutable std::mutex _superFactoryMutex;
+    mutable BXMutex _superFactoryMutex;
 };
 
 /// A factory of channels.

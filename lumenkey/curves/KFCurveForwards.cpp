@@ -9,8 +9,9 @@
 
 namespace {
 
-/// A document says how many keypoints follow; room is made for at most so many before they are seen.
-constexpr std::uint32_t kMostKeypointsReserved = 1u << 20;
+/// A document says how many keypoints follow, in each of its curves; room is made for at most so many before
+/// they are seen, some 256 bytes.
+constexpr std::uint32_t kMostKeypointsReserved = 1u << 12;
 
 } // namespace
 

@@ -102,6 +102,7 @@ bool KFCurve::offsetKeypointInTime(void* handle, Tempus const& t, bool force) {
     KFSpline* const spline = splineToEdit(handle, force);
     if (spline == nullptr)
         return false;
+    KFSplineAccess const access(*spline);
     spline->offsetVertexInTime(handle, t, kTempusZero);
     return true;
 }
@@ -222,8 +223,11 @@ bool KFCurve::setKeypointFlags(void* handle, std::uint32_t flags, bool force) {
 
 bool KFCurve::enableKeypoint(void* handle, bool enable, bool force) {
     KFSpline* const spline = splineToEdit(handle, force);
-    return spline != nullptr &&
-           (enable ? spline->enableVertex(handle, kTempusZero) : spline->disableVertex(handle, kTempusZero));
+    if (spline == nullptr)
+        return false;
+    // Others walk the list of valid vertices.
+    KFSplineAccess const access(*spline);
+    return enable ? spline->enableVertex(handle, kTempusZero) : spline->disableVertex(handle, kTempusZero);
 }
 
 bool KFCurve::isEnabledKeypoint(void* handle, bool* out) {

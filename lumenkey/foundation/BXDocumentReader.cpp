@@ -1,5 +1,6 @@
 #include "lumenkey/foundation/BXDocumentReader.h"
 
+#include "lumenkey/foundation/BXDocumentDepth.h"
 #include "lumenkey/foundation/BXSerializer.h"
 
 #include <algorithm>
@@ -26,7 +27,7 @@ void BXDocumentReader::pushHandler(BXSerializer* handler) {
 
 bool BXDocumentReader::allowsNode() {
     if (_depth > kGreatestDepthOfNodes) {
-        fail("nodes lie more than " + std::to_string(kGreatestDepthOfNodes) + " elements deep in each other");
+        fail(BXNodeTooDeepText());
     }
     return _problem.empty();
 }
@@ -70,7 +71,7 @@ void BXDocumentReader::start(char const* name, char const* const* attributes) {
         handOver(false);
     }
     if (_depth == kGreatestDepth) {
-        fail("elements lie more than " + std::to_string(kGreatestDepth) + " deep in each other");
+        fail(BXTooDeepText());
         return;
     }
     ++_depth;

@@ -19,10 +19,6 @@ class BXSerializer;
 /// buffers are reused, so that nothing is allocated for an element once they have grown.
 class BXDocumentReader final : public BXStreamElement {
 public:
-    static constexpr std::uint32_t kGreatestDepth = 1000;
-    /// Of an element that something is made for. What that will write inside of such an element, which may be
-    /// more than it has read, must not be too deep to be read again.
-    static constexpr std::uint32_t kGreatestDepthOfNodes = kGreatestDepth - 10;
     static constexpr std::size_t kLongestText = std::size_t{64} << 20;
 
     /// Handlers get the stream, which isn't owned.

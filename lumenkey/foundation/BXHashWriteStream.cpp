@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <bit>
+#include <cmath>
 #include <cstring>
 #include <new>
 #include <string_view>
@@ -119,7 +120,10 @@ private:
     void putValue(bool value) { put(static_cast<std::uint8_t>(value)); }
     void putValue(std::uint32_t value) { put(value); }
     void putValue(std::uint64_t value) { put(value); }
-    void putValue(double value) { put(std::bit_cast<std::uint64_t>(value)); }
+    void putValue(double value) {
+        constexpr std::uint64_t kAnyNaN = 0x7FF8000000000000;
+        put(std::isnan(value) ? kAnyNaN : std::bit_cast<std::uint64_t>(value));
+    }
     void putValue(BXUUID const& value) {
         for (std::uint32_t const word : value.words) {
             put(word);

@@ -12,7 +12,8 @@
 /// states apart; it isn't proof against forgery.
 ///
 /// Calls that differ in a tag, in the type or in a bit of a value give another input: "ab" and "c" aren't "a"
-/// and "bc", a 32-bit 1 isn't a 64-bit one, 0.0 isn't -0.0. What lies inside what is told by how many scopes
+/// and "bc", a 32-bit 1 isn't a 64-bit one, 0.0 isn't -0.0. Only what is no number is the same whatever its
+/// bits, as in a text. What lies inside what is told by how many scopes
 /// are in force when an element starts, since everything that writes children pushes its scope around them.
 /// So the end of an element gives nothing, and one that never started leaves no trace. Names and line ends
 /// don't enter.

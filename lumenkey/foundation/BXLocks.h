@@ -1,9 +1,10 @@
 #pragma once
 
+#include "lumenkey/foundation/BXExport.h"
+
 #include <atomic>
 #include <cstdint>
-
-#include "lumenkey/foundation/BXExport.h"
+#include <mutex>
 
 /// Mutual exclusion for stretches of some ten nanoseconds, in four bytes. Not recursive: taking it twice on one
 /// thread waits for ever. Not fair: under contention the owner may take it many times in a row, which is what
@@ -38,6 +39,9 @@ private:
 
     std::atomic<uint32_t> _taken{0};
 };
+
+/// Mutual exclusion where a thread may have to wait for long, or for a stretch that may block. Not recursive.
+using BXMutex = std::mutex;
 
 /// Holds a lock for a scope. A null lock means that there is nothing to hold.
 template <class Lock> class [[nodiscard]] BXLockSentry {

@@ -15,6 +15,7 @@ BXSerializerReadStream::~BXSerializerReadStream() = default;
 BXStreamElement::~BXStreamElement() = default;
 
 bool BXSerializerWriteStream::isHashStream() const { return false; }
+bool BXSerializerWriteStream::allowsNode() { return true; }
 bool BXSerializerReadStream::allowsNode() { return true; }
 
 void BXSerializerWriteStream::writeElement(std::uint32_t tag, double value) {

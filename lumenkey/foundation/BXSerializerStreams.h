@@ -56,6 +56,9 @@ public:
     virtual void writeElement(std::uint32_t tag, Tempus const& value);
     /// Whether what is written goes into a digest; here false.
     virtual bool isHashStream() const;
+    /// Whether a node, such as a child of a folder, may be written into the element that is open; writers ask
+    /// before they start it. If nobody could read it there, the writing has failed. Here true.
+    virtual bool allowsNode();
 };
 
 /// An element that is being read: its tag, its attributes and, where it holds no element, its text.

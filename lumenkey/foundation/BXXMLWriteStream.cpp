@@ -1,6 +1,7 @@
 #include "lumenkey/foundation/BXXMLWriteStream.h"
 
 #include "lumenkey/foundation/BXBlockWriter.h"
+#include "lumenkey/foundation/BXDocumentDepth.h"
 #include "lumenkey/foundation/BXTextForms.h"
 
 #include <algorithm>
@@ -28,7 +29,9 @@ public:
     template <typename Value> void attribute(std::uint32_t tag, Value const& value);
     template <typename Value> void content(Value const& value);
     template <typename Value> void element(std::uint32_t tag, Value const& value);
+    bool allowsNode();
     bool close();
+    std::string const& failure();
 
     std::vector<BXScope const*> scopes;
 
@@ -48,6 +51,7 @@ private:
     void endStartTag();
     void newLine();
     bool isNewAttribute(std::string_view name);
+    void fail(std::string_view why);
 
     template <typename Value> void put(Value const& value, BXText::Place) {
         char* const room = _out.room(BXText::kLongest);
@@ -70,7 +74,7 @@ private:
     bool _isStartTagOpen = false;
     /// Open elements that are left out, the innermost ones.
     std::size_t _leftOutDepth = 0;
-    bool _isWhole = true;
+    std::string _failure;
     bool _isClosed = false;
 };
 
@@ -110,8 +114,9 @@ std::string_view BXXMLWriteStream::Writer::nameOf(std::uint64_t word) noexcept {
 
 void BXXMLWriteStream::Writer::start(std::uint32_t tag) {
     std::string_view const name = _leftOutDepth == 0 && !_isClosed ? nameOf(tag) : std::string_view();
-    if (name.data() == nullptr) {
-        _isWhole = false;
+    bool const isTooDeep = _open.size() >= kGreatestDepth;
+    if (name.data() == nullptr || isTooDeep) {
+        fail(isTooDeep ? BXTooDeepText() : "an element has no name or no place");
         _leftOutDepth += _isClosed ? 0 : 1;
         return;
     }
@@ -223,7 +228,7 @@ template <typename Value> void BXXMLWriteStream::Writer::attribute(std::uint32_t
     std::string_view const name =
         hasPlace ? nameOf(_open.back().tag | std::uint64_t{tag} << 32) : std::string_view();
     if (name.data() == nullptr || !isNewAttribute(name)) {
-        _isWhole = false;
+        fail("an attribute has no name or no place");
         return;
     }
     _out.append(" ");
@@ -238,7 +243,7 @@ template <typename Value> void BXXMLWriteStream::Writer::content(Value const& va
         return;
     }
     if (_open.size() <= 1 || _open.back().holds == Holds::Elements) {
-        _isWhole = false;
+        fail("a value has no place");
         return;
     }
     if constexpr (std::is_same_v<Value, BXString>) {
@@ -297,7 +302,28 @@ bool BXXMLWriteStream::Writer::close() {
         _out.flush();
         _isClosed = true;
     }
-    return _isWhole && _out.isGood();
+    return failure().empty();
+}
+
+bool BXXMLWriteStream::Writer::allowsNode() {
+    bool const isAllowed = _open.size() < kGreatestDepthOfNodes;
+    if (!isAllowed) {
+        fail(BXNodeTooDeepText());
+    }
+    return isAllowed;
+}
+
+void BXXMLWriteStream::Writer::fail(std::string_view why) {
+    if (_failure.empty()) {
+        _failure = why;
+    }
+}
+
+std::string const& BXXMLWriteStream::Writer::failure() {
+    if (!_out.isGood()) {
+        fail("the text was refused where it was to go");
+    }
+    return _failure;
 }
 
 BXXMLWriteStream::BXXMLWriteStream(BXStream& sink, unsigned int major, unsigned int minor)
@@ -305,6 +331,7 @@ BXXMLWriteStream::BXXMLWriteStream(BXStream& sink, unsigned int major, unsigned 
 BXXMLWriteStream::~BXXMLWriteStream() = default;
 
 bool BXXMLWriteStream::close() { return _writer->close(); }
+std::string const& BXXMLWriteStream::failure() const { return _writer->failure(); }
 
 void BXXMLWriteStream::pushScope(BXScope const* scope) {
     static constexpr BXScope kEmpty[] = {BXScope::end()};
@@ -344,6 +371,7 @@ void BXXMLWriteStream::writeAttribute(std::uint32_t tag, Tempus const& value) {
     _writer->attribute(tag, value);
 }
 void BXXMLWriteStream::endLine() {}
+bool BXXMLWriteStream::allowsNode() { return _writer->allowsNode(); }
 
 void BXXMLWriteStream::writeElement(std::uint32_t tag, double value) { _writer->element(tag, value); }
 void BXXMLWriteStream::writeElement(std::uint32_t tag, Tempus const& value) { _writer->element(tag, value); }

@@ -5,6 +5,7 @@
 #include "lumenkey/foundation/BXStream.h"
 
 #include <memory>
+#include <string>
 
 /// Writes a document as XML text in UTF-8:
 ///
@@ -31,7 +32,8 @@
 /// scopes in force, with all inside it; an attribute without a name, behind content, or that its element has
 /// already; a value outside any element or behind a child; anything behind `close`. An `endElement` too many
 /// does nothing. An element holds either children or a value: readers give nobody the value in front of a
-/// child.
+/// child. Elements that `BXXMLReadStream` would refuse for their depth, and nodes (`allowsNode`), are left out
+/// too.
 ///
 /// One object belongs to one thread at a time.
 class LUMENKEY_API BXXMLWriteStream final : public BXSerializerWriteStream {
@@ -47,6 +49,10 @@ public:
     /// Ends the elements that are open and the root. True if the sink took everything and nothing was left
     /// out. Further calls only answer.
     bool close();
+
+    /// Why `close` isn't true, as far as is known by now: the first that was left out, or that the sink has
+    /// refused. Empty while all is well. Lives as long as the stream.
+    std::string const& failure() const;
 
     void pushScope(BXScope const* scope) override;
     void popScope() override;
@@ -68,6 +74,7 @@ public:
     void writeAttribute(std::uint32_t tag, Tempus const& value) override;
     /// Every element stands on a line of its own anyway.
     void endLine() override;
+    bool allowsNode() override;
     void writeElement(std::uint32_t tag, double value) override;
     void writeElement(std::uint32_t tag, Tempus const& value) override;
 

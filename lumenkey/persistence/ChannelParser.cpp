@@ -4,19 +4,11 @@
 #include "lumenkey/Channels/KFFactories.h"
 #include "lumenkey/Channels/KFFactoryScope.h"
 #include "lumenkey/persistence/KFDocumentScopes.h"
+#include "lumenkey/persistence/KFDocumentVersion.h"
 
-#include <charconv>
 #include <memory>
 
 namespace {
-
-/// Two numbers with a dot between them; what isn't there stays.
-void readVersion(std::string_view text, BXSerializerReadStream& stream) {
-    char const* const end = text.data() + text.size();
-    auto const major = std::from_chars(text.data(), end, stream.major);
-    if (major.ec == std::errc() && major.ptr != end && *major.ptr == '.')
-        std::from_chars(major.ptr + 1, end, stream.minor);
-}
 
 void readFactory(BXStreamElement const& element) {
     std::uint32_t fileID = 0;
@@ -50,7 +42,7 @@ bool ChannelParser::parseElement(BXSerializerReadStream& stream, BXStreamElement
     case kOldDocumentElement:
     case kDocumentElement:
         if (element.getAttributeAsString(kVersionAttribute, &version))
-            readVersion(version.view(), stream);
+            KFReadVersion(version.view(), stream.major, stream.minor);
         break;
     case kFactoryElement:
         readFactory(element);

@@ -52,7 +52,7 @@ void KFChannel::writeHeader(BXSerializerWriteStream& stream, bool full) {
     writeFlags(stream, kWriteFlagsAsAttribute);
     if (!stream.isHashStream())
         stream.writeAttribute(kDefaultAttribute, getDefaultValue());
-    stream.writeAttribute(kValueAttribute, getInitialValue());
+    stream.writeAttribute(kValueAttribute, curve().getRootNode()->getInitialValue());
     stream.popScope();
 }
 

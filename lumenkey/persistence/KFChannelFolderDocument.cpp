@@ -34,7 +34,7 @@ void KFChannelFolder::writeBody(BXSerializerWriteStream& stream, bool full, bool
         KFWriteElement(stream, kFoldFlagsElement, flags);
     if (children && !testFoldFlag(kFoldFlagChildrenNotSaved)) {
         forEachChild([&](KFChannelBase& child) {
-            if (!isWritten(child, all, stream.isHashStream()))
+            if (!isWritten(child, all, stream.isHashStream()) || !stream.allowsNode())
                 return;
             child.writeHeader(stream, full);
             child.writeBody(stream, full, true, all);
@@ -110,8 +110,10 @@ void KFChannelFolder::parseChild(BXSerializerReadStream& stream, BXStreamElement
     if (channel != nullptr && element.getAttributeAsDouble(kDefaultAttribute, &number))
         channel->setDefaultValue(number);
     KFFactory const* const factory = child->getFactory();
-    if (factory != nullptr && factory->isKindOfClass(kBlindData))
-        return; // its value is no number
+    if (factory != nullptr && factory->isKindOfClass(kBlindData)) {
+        stream.skipElement(); // its value is no number, and what stands inside isn't for the folder
+        return;
+    }
     if (channel != nullptr && element.getAttributeAsDouble(kValueAttribute, &number))
         channel->setInitialValue(number, false);
     stream.pushHandler(child);

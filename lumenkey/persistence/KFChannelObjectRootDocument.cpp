@@ -18,6 +18,10 @@ constexpr std::uint32_t kSelfDigestFoldFlagsLeftOut = 0x7200F;
 
 constexpr BXUUID kVaryingFolder = KFClassUUID("46C844A8-13D3-11D8-A438-000A95AF9F7E");
 
+KFChannelFlags writtenFlags(KFChannelFlags flags, BXSerializerWriteStream const& stream) {
+    return flags & (stream.isHashStream() ? kChannelFlagSolo : ~kFlagsLeftOut);
+}
+
 } // namespace
 
 void KFChannelObjectRootBase::writeTiming(BXSerializerWriteStream& stream) const {
@@ -41,9 +45,7 @@ void KFChannelObjectRootBase::writeState(BXSerializerWriteStream& stream) const 
 void KFChannelObjectRootBase::writeBody(BXSerializerWriteStream& stream, bool full, bool children, bool all) {
     stream.pushScope(KFChannelObjectRootBaseScope);
     writeTiming(stream);
-    KFChannelFlags const flags =
-        stream.isHashStream() ? getFlags() & kChannelFlagSolo : getFlags() & ~kFlagsLeftOut;
-    KFWriteElement(stream, kBaseFlagsElement, std::uint64_t{flags});
+    KFWriteElement(stream, kBaseFlagsElement, std::uint64_t{writtenFlags(getFlags(), stream)});
     writeState(stream);
     stream.popScope();
     KFChannelFolder::writeBody(stream, full, children, all);
@@ -53,7 +55,7 @@ void KFChannelObjectRootBase::serializeSelfOnly(BXSerializerWriteStream& stream,
     stream.pushScope(KFChannelObjectRootBaseScope);
     writeTiming(stream);
     KFWriteElement(stream, kRootFoldFlagsElement, getFoldFlags());
-    KFWriteElement(stream, kBaseFlagsElement, static_cast<std::uint32_t>(getFlags() & ~kFlagsLeftOut));
+    KFWriteElement(stream, kBaseFlagsElement, static_cast<std::uint32_t>(writtenFlags(getFlags(), stream)));
     writeState(stream);
     stream.popScope();
 }

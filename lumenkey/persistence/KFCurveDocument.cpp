@@ -152,10 +152,8 @@ void KFCurve::writeSettings(BXSerializerWriteStream& stream) {
         getCurveDefaultValue(&number);
         stream.writeAttribute(kCurveDefaultAttribute, number);
     }
-    number = _constantNode.value();
-    if (type != 0)
-        getCurveInitialValue(&number);
-    stream.writeAttribute(kCurveValueAttribute, number);
+    // As it is stored, not as the limits let it be seen: they are read behind it.
+    stream.writeAttribute(kCurveValueAttribute, getRootNode()->getInitialValue());
     if (isCurveParametric())
         stream.writeAttribute(kCurveParametricAttribute, true);
     if (!isRoundingInUSpace())

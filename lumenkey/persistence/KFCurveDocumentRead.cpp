@@ -187,8 +187,8 @@ void KFCurve::parseHandle(BXSerializerReadStream const& stream, BXStreamElement 
     KFSpline* const spline = getSpline();
     if (record.handle == nullptr || spline == nullptr)
         return;
+    KFSplineAccess const access(*spline);
     if (settings().deriveTangents || record.interpolation == kKFInterpolationLinearToo) {
-        KFSplineAccess const access(*spline);
         isInput ? spline->setVertexInputHandles(record.handle, tangent[0], tangent[1], kTempusZero, false)
                 : spline->setVertexOutputHandles(record.handle, tangent[0], tangent[1], kTempusZero, false);
     }

@@ -44,10 +44,12 @@ struct KFSegmentPlace;
 /// Threads. Any number of threads may evaluate while one edits. The guard is one spin lock, not recursive: the
 /// owner's `_customLock` when there is one, else the spline's own. Each block of operations below says whether its
 /// operations take the lock; an argument named `lock` says whether to take it. Operations that don't take it are for
-/// callers that hold it, or that know that no other thread edits. `preSplineAccess` and `postSplineAccess` hold it
-/// around several calls. `getVertexValue` asked to take the lock may do without: a thread that reads on in one segment
-/// keeps what it computed about it, and goes on with that as long as nothing has changed that the value depends on. It
-/// sees every edit that was over before, and never half of one.
+/// callers that hold it, or that know that no other thread edits; `findVertex` and reads of types BSpline and XSpline,
+/// which keep tables, for callers that know that no other thread uses the spline. `preSplineAccess` and
+/// `postSplineAccess` hold the lock around several calls. `getVertexValue` asked to take it may do without: a thread
+/// keeps what it computed about the segments that it reads, and goes on with that as long as nothing has changed that
+/// the value depends on. It sees every edit that was over before, and never half of one. Under an owner's `_customLock`
+/// it takes the lock each time.
 ///
 /// Cost. Vertices stand in blocks with their positions beside them as 64-bit ticks of a common timescale, so finding,
 /// adding and removing one costs O(log n), evaluation at ascending positions O(1) and allocates nothing.
@@ -85,7 +87,7 @@ public:
                                      Tempus* times, double* values, Tempus const& t, bool lock);
     virtual bool sampleSplineSegments(Tempus const& start, Tempus const& end, Tempus const& step,
                                       std::vector<Tempus>* times, std::vector<double>* values);
-    virtual bool enableVertex(void* handle, Tempus const& t); // enabling and disabling take the lock
+    virtual bool enableVertex(void* handle, Tempus const& t);
     virtual bool disableVertex(void* handle, Tempus const& t);
     virtual bool isEnabledVertex(void* handle, Tempus const& t);
     virtual bool setVertexInputHandles(void* handle, double u, double v, Tempus const& t, bool convert);
@@ -257,7 +259,7 @@ public:
 
     /// Sets or clears `kKFVertexFlagLocked` on all vertices: an editing lock, no thread lock.
     void lockSpline(bool lock);
-    /// Moves a vertex to `u`, but not in the order. Takes the lock; null is ignored.
+    /// Moves a vertex to `u`, but not in the order. No lock; null is ignored.
     void offsetVertexInTime(void* handle, Tempus const& u, Tempus const& t);
     /// Takes the lock.
     void setAllVerticesValues(double value, Tempus const& t);
@@ -345,8 +347,8 @@ public:
 
     // --- Sampling. All take the lock, but `sampleSplineSegment` only when told, `createSegment` not while it adds. ---
     //
-    // Sample i stands at `start + step * i`. A null target is skipped. A parametric spline of type BSpline or XSpline
-    // stretches its `count` samples over the whole curve, whatever `start` and `step` say.
+    // Sample i stands at `start + step * i`. A null target is skipped. On a parametric spline of type BSpline or
+    // XSpline `sampleSpline` stretches its `count` samples over the whole curve, whatever `start` and `step` say.
     //
     // `adaptive` spends samples only where the curve bends: it walks from vertex to vertex, gives a straight segment
     // its two ends and a curved one a sample each step, and writes back how many there are. The array form walks until
@@ -382,8 +384,9 @@ public:
     void forceWarpSplineLinear(Tempus const& scale, Tempus const& offset);
     /// Takes the lock, in two stretches, between which others see the spline without the vertices concerned. Mirrors
     /// the stretch between two handles in time, the curve with it: a tangent changes its side and the sign of its U
-    /// part. The handles are gone afterwards, and the new vertices are marked as edited by hand. Nothing happens when a
-    /// vertex of the stretch is locked, for null, or when `last` is before `first`. A closed spline stays closed.
+    /// part. The handles are gone afterwards, and the new vertices, but for a single one, are marked as edited by hand.
+    /// Nothing happens when a vertex of the stretch is locked, for null, or when `last` is before `first`. A closed
+    /// spline stays closed.
     void reverseVertices(void* first, void* last);
     /// Takes the lock. Turns a time curve into a parametric one: U counts vertices, tangents follow, and values begin
     /// at 0. Two vertices at one U divide by zero: `purge` first.

@@ -51,11 +51,19 @@ void KFSpline::interpolate(Tempus const& t, void* vA, void* vB, Tempus const& u,
     // One position after another in one segment is what happens most: the thread has all that it needs.
     std::uint64_t const version = _store->acquiredVersion();
     KFSegmentPlace& place = KFThreadSegments::placeOf(version);
-    KFSegmentCache const& segment = place.segment;
+    KFSegmentCache const& segment = place.current();
     std::int64_t position = 0;
-    if (segment.scale.stepsOf(u, &position) && segment.holds(position) &&
-        segmentStandsWithoutLock(segment, version)) [[likely]] {
-        return segment.valueAt(position);
+    if (segment.scale.stepsOf(u, &position)) [[likely]] {
+        if (segment.holds(position)) {
+            if (segmentStandsWithoutLock(segment, version)) [[likely]]
+                return segment.valueAt(position);
+        } else if (place.keepsSeveral()) {
+            KFSegmentCache const& other = place.around(u, position, version);
+            if (other.scale.stepsOf(u, &position) && other.holds(position) &&
+                segmentStandsWithoutLock(other, version)) {
+                return other.valueAt(position);
+            }
+        }
     }
     return lock ? readUnderLock(u, t, place) : readWithoutLock(u, t, place);
 }
@@ -82,16 +90,21 @@ void KFSpline::interpolate(Tempus const& t, void* vA, void* vB, Tempus const& u,
     return drawsWholeCurve() ? valueOfWholeCurve(u, t, false) : evaluateByWalk(u, t);
 }
 
-/// Evaluates with the segment that the thread keeps for this spline, or with `instead` while it has no place for one.
+/// Evaluates with a segment that the thread keeps for this spline, or with `instead` while it has no place for one.
 [[gnu::always_inline]] inline bool KFSpline::evaluateAndKeep(Tempus const& u, KFSegmentPlace& place,
                                                              KFSegmentCache& instead, double* out) {
-    KFSegmentCache* const kept = place.claim(_store->version());
+    KFVertexStore const& store = *_store;
+    std::uint64_t const version = store.version();
+    bool const keepsAll = KFSegmentPlace::keepsAll(store.size());
+    KFSegmentCache* const kept = keepsAll ? place.claimFor(u, version) : place.claim(version);
     if (kept == nullptr)
         return evaluateIndexed(u, instead, out);
     bool const done = evaluateIndexed(u, *kept, out);
     // One of an earlier version names vertices that may be gone.
-    if (kept->version == _store->version())
+    if (kept->version == version)
         kept->watch();
+    if (keepsAll)
+        place.keep(*kept, u);
     return done;
 }
 
@@ -251,13 +264,13 @@ bool KFSpline::evaluateIndexed(Tempus const& u, KFSegmentCache& cache, double* o
     auto const end = placeAtOrAfter(position, cache);
     if (end == store.end())
         return false;
+    auto const start = store.validBefore(end);
     std::int64_t high = 0;
     if (__builtin_mul_overflow(store.tickAt(end), cache.scale.perTick, &high))
         return false;
     if (high == position)
         return valueAtVertex(end, out);
 
-    auto const start = store.validBefore(end);
     std::int64_t low = 0;
     if (start == store.end() || __builtin_mul_overflow(store.tickAt(start), cache.scale.perTick, &low))
         return false;

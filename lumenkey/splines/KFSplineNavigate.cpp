@@ -346,10 +346,7 @@ Tempus KFSpline::getRangeU(Tempus const& t) {
 template <class Offers, class Better>
 double KFSpline::extremeV(double start, Tempus const& t, Tempus* atU, Offers offers, Better better) {
     double best = start;
-    void* handle = nullptr;
-    for (bool found = getFirstValidVertex(&handle, kTempusZero); found;
-         found = getNextValidVertex(handle, &handle, kTempusZero)) {
-        auto const& vertex = *static_cast<KFVertex*>(handle);
+    auto const consider = [&](KFVertex const& vertex) {
         offers(vertex, vertex.getValueV(t), [&](double candidate) {
             if (!better(candidate, best))
                 return;
@@ -357,6 +354,20 @@ double KFSpline::extremeV(double start, Tempus const& t, Tempus* atU, Offers off
             if (atU != nullptr)
                 *atU = vertex.getValueU();
         });
+    };
+    KFVertexStore const& store = *_store;
+    if (_useValidList) {
+        // By place: of many vertices at one position a handle would have to be looked for among them all.
+        for (Place place = store.validFrom(store.begin()); place != store.end();
+             place = store.validFrom(store.next(place))) {
+            consider(*store.at(place));
+        }
+        return best;
+    }
+    void* handle = nullptr;
+    for (bool found = getFirstValidVertex(&handle, kTempusZero); found;
+         found = getNextValidVertex(handle, &handle, kTempusZero)) {
+        consider(*static_cast<KFVertex*>(handle));
     }
     return best;
 }

@@ -193,6 +193,7 @@ void KFSpline::reverseVertices(void* first, void* last) {
     std::vector<KFVertex*> stretch;
     std::deque<std::unique_ptr<KFVertex>> mirrored;
     bool wasClosed = false;
+    std::size_t sharersInFront = 0;
     {
         KFSplineAccess access(*this);
         stretch = changeableStretch(store(), static_cast<KFVertex*>(first), static_cast<KFVertex*>(last));
@@ -202,6 +203,10 @@ void KFSpline::reverseVertices(void* first, void* last) {
         wasClosed = _closed;
         Tempus const firstU = stretch.front()->getValueU();
         Tempus const lastU = stretch.back()->getValueU();
+        for (auto place = store().lowerBound(firstU); place != store().end() && store().at(place) != first;
+             place = store().next(place)) {
+            sharersInFront += 1;
+        }
         // A type belongs to the segment behind its vertex, so it goes to the vertex that the segment now starts at.
         std::uint32_t type = stretch.back()->getInterpolation();
         // A tangent that is mirrored in time changes its side and the sign of its U part; its end stays at its value.
@@ -231,8 +236,13 @@ void KFSpline::reverseVertices(void* first, void* last) {
 
     KFSplineAccess access(*this);
     KFVertexStore& vertices = store();
-    // Behind a vertex in front of the stretch that shares its first position.
-    auto place = vertices.upperBound(mirrored.front()->getValueU());
+    // Where the stretch stood: behind those at its first position that stood in front of it.
+    Tempus const lowU = mirrored.front()->getValueU();
+    auto place = vertices.lowerBound(lowU);
+    for (std::size_t i = 0;
+         i < sharersInFront && place != vertices.end() && vertices.at(place)->getValueU() == lowU; ++i) {
+        place = vertices.next(place);
+    }
     for (auto& vertex : mirrored) {
         place = vertices.next(vertices.insert(place, vertex.release(), suppressesRefresh()));
     }

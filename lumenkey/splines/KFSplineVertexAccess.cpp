@@ -215,18 +215,16 @@ bool KFSpline::getVertexFlags(void* handle, std::uint32_t* flags) {
     return true;
 }
 
-/// The change of a vertex's enabled state and the list that follows from it belong together under the lock: other
-/// threads walk that list.
 bool KFSpline::setVertexEnabled(void* handle, bool enabled, Tempus const& t) {
     if (handle == nullptr)
         return false;
-    KFSplineAccess const access(*this);
     vertexOf(handle)->setEnabled(enabled, t);
-    auto const place = _store->find(vertexOf(handle));
     if (suppressesRefresh()) {
         _store->postponeValidity();
-    } else if (place != _store->end() && _useValidList) {
-        _store->updateValidity(place);
+    } else if (_useValidList) {
+        auto const place = _store->find(vertexOf(handle));
+        if (place != _store->end())
+            _store->updateValidity(place);
     }
     markEdited();
     return true;
@@ -243,7 +241,6 @@ bool KFSpline::isEnabledVertex(void* handle, Tempus const& t) {
 void KFSpline::offsetVertexInTime(void* handle, Tempus const& u, Tempus const&) {
     if (handle == nullptr)
         return;
-    KFSplineAccess const access(*this);
     auto const place = _store->find(vertexOf(handle));
     vertexOf(handle)->setValueU(u);
     if (place != _store->end())

@@ -105,11 +105,11 @@ private:
     BXRelaxed<bool> _enabled;
     Revision _revision;
     BXRelaxed<double> _valueV;
-    BXRelaxed<double> _bias;
     BXRelaxed<double> _inputTangentU;
-    BXRelaxed<double> _outputTangentU;
     BXRelaxed<double> _inputTangentV;
+    BXRelaxed<double> _outputTangentU;
     BXRelaxed<double> _outputTangentV;
+    BXRelaxed<double> _bias;
 };
 
 inline void KFStaticVertex::getInputTangents(double* u, double* v, Tempus const&) const {

@@ -3,8 +3,8 @@
 #include "lumenkey/splines/KFInterpolation.h"
 
 KFVertex::KFVertex(Tempus const& u) noexcept
-    : _flags(0), _interpolation(kKFInterpolationLinear), _valueUValue(u.value), _valueUTimescale(u.timescale),
-      _valueUFlags(u.flags), _valueUEpoch(u.epoch), _normal(0.0) {}
+    : _valueUValue(u.value), _valueUTimescale(u.timescale), _valueUFlags(u.flags), _valueUEpoch(u.epoch),
+      _normal(0.0), _flags(0), _interpolation(kKFInterpolationLinear) {}
 
 KFVertex::KFVertex(KFVertex const& other) noexcept = default;
 KFVertex& KFVertex::operator=(KFVertex const& other) noexcept = default;

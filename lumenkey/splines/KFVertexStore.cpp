@@ -156,6 +156,9 @@ KFVertexStore::Place KFVertexStore::boundByComparison(Tempus const& u, bool stri
 }
 
 KFVertexStore::Place KFVertexStore::find(KFVertex const* vertex) const noexcept {
+    // Who appends one after another also looks for the last, which may share its position with many.
+    if (!empty() && back() == vertex)
+        return last();
     Tempus const u = vertex->getValueU();
     for (Place place = lowerBound(u); place != end() && TempusCompare(at(place)->getValueU(), u) == 0;
          place = next(place)) {

@@ -8,10 +8,8 @@
 #include "tools/import/CsvTree.h"
 #include "tools/import/MotionTree.h"
 
-#include <cmath>
 #include <cstdio>
 #include <cstdlib>
-#include <limits>
 
 using namespace lumenkey::tools;
 
@@ -49,22 +47,6 @@ void readEverything(KFChannelFolder& folder) {
     });
 }
 
-/// Where a minimum is above its maximum, a value below both is clamped to the one, and that to the other, and
-/// so each writing gives another. Infinite limits are none to a reader, and may come to lie so.
-void uncrossLimits(KFChannelFolder& folder) {
-    forEachValue(folder, [](KFChannel& channel) {
-        KFCurve& curve = *channel.getCurveInterface();
-        double least = 0.0;
-        double most = 0.0;
-        curve.getAbsoluteMinValueV(&least);
-        curve.getAbsoluteMaxValueV(&most);
-        if (least > most || std::isinf(least) || std::isinf(most)) {
-            curve.setAbsoluteMinValueV(-std::numeric_limits<double>::max());
-            curve.setAbsoluteMaxValueV(std::numeric_limits<double>::max());
-        }
-    });
-}
-
 /// Most inputs are refused.
 template <class Read> void orRefused(Read const& read) {
     try {
@@ -80,7 +62,6 @@ void fuzzDocument(FuzzBytes bytes) {
     OwnedTree const tree(new KFChannelObjectRootBase("Root", nullptr, 1, 0, 0));
     tree->configureWithState(dataOf(bytes));
     readEverything(*tree);
-    uncrossLimits(*tree);
     OwnedTree const second(new KFChannelObjectRootBase("Root", nullptr, 1, 0, 0));
     require(second->configureWithState(tree->createChannelState(true, true)),
             "a tree can't read what it wrote");

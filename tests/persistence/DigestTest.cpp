@@ -9,6 +9,7 @@
 
 #include <gtest/gtest.h>
 
+#include <bit>
 #include <functional>
 #include <set>
 
@@ -57,6 +58,7 @@ TEST(Digest, TellsEachChangeOfState) {
         },
         [](Subject& x) { x.root.enable(false, true); },
         [](Subject& x) { x.root.lock(true, false); },
+        [](Subject& x) { x.root.setFlag(kChannelFlagSolo, true); },
         [](Subject& x) { x.folder.setFoldFlag(kFoldFlagLinked); },
         [](Subject& x) { x.folder.setFlag(kChannelFlagHidden, true); },
         [](Subject& x) { x.channel.setFlag(kChannelFlagLocked, true); },
@@ -68,6 +70,7 @@ TEST(Digest, TellsEachChangeOfState) {
         [](Subject& x) { x.channel.setFadeOutCurve(1); },
         [](Subject& x) { x.plain.setInitialValue(1, true); },
         [](Subject& x) { x.curve->setCurveInitialValue(1); },
+        [](Subject& x) { x.curve->setCurveType(0); },
         [](Subject& x) { x.curve->setCurveParametric(true); },
         [](Subject& x) { x.curve->setRoundingInUSpace(false); },
         [](Subject& x) { x.curve->setRetimingExtrapolation(true); },
@@ -98,6 +101,30 @@ TEST(Digest, TellsEachChangeOfState) {
         changes[i](again);
         EXPECT_EQ(again.root.getHash(), changed.root.getHash()) << "change " << i;
     }
+}
+
+TEST(Digest, TellsEachBitOfState) {
+    // Not the class's, nor what leaves a channel out.
+    constexpr KFChannelFlags kLeft = kChannelClassFlags | kChannelFlagExcludedFromHash | kChannelFlagNotSaved;
+    std::set<Digest> digests{Subject().root.getHash()};
+    for (KFChannelFlags bit = 1; bit != 0; bit <<= 1) {
+        Subject changed;
+        changed.plain.setFlags(changed.plain.getFlags() ^ (bit & ~kLeft));
+        EXPECT_EQ(digests.insert(changed.root.getHash()).second, (bit & ~kLeft & ~kChannelNonStateFlags) != 0)
+            << std::hex << bit;
+    }
+}
+
+TEST(Digest, KnowsOnlyOneThatIsNoNumber) {
+    std::set<Digest> digests;
+    constexpr std::uint64_t kBits[] = {0x7FF8000000000000, 0xFFF8000000000000, 0x7FF8000000000123};
+    for (std::uint64_t const bits : kBits) {
+        Subject changed;
+        changed.plain.setInitialValue(std::bit_cast<double>(bits), true);
+        changed.curve->setCurveInitialValue(std::bit_cast<double>(bits));
+        digests.insert(changed.root.getHash());
+    }
+    EXPECT_EQ(digests.size(), 1U);
 }
 
 TEST(Digest, IsBlindForWhatIsNotState) {

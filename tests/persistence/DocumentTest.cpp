@@ -1,9 +1,12 @@
 // What documents look like, to the letter.
 
+#include "lumenkey/Channels/KFChannelFactoryTable.h"
 #include "lumenkey/Channels/KFChannelImpl.h"
+#include "lumenkey/Channels/KFFactory.h"
 #include "lumenkey/Channels/KFScalarChannels.h"
 #include "lumenkey/Channels/KFVectorChannels.h"
 #include "lumenkey/curves/KFCurve.h"
+#include "lumenkey/foundation/BXHashWriteStream.h"
 #include "lumenkey/foundation/BXStream.h"
 #include "lumenkey/foundation/BXXMLWriteStream.h"
 #include "tests/persistence/RandomTree.h"
@@ -11,7 +14,9 @@
 #include <gtest/gtest.h>
 
 #include <functional>
+#include <limits>
 #include <regex>
+#include <thread>
 
 namespace {
 
@@ -112,6 +117,21 @@ TEST(Document, StandsInsideAnother) {
 )");
 }
 
+TEST(Document, IsNoDeeperThanDocumentsAreRead) {
+    for (int const depth : {988, 989}) {
+        OwnedTree const top(new KFChannelFolder("Top", nullptr, 9, 0, 0));
+        KFChannelFolder* last = top.get();
+        for (int i = 0; i < depth; ++i)
+            last = new KFChannelFolder("Deep", last, 9, 0, 0);
+        OwnedTree const read(new KFChannelFolder("Top", nullptr, 9, 0, 0));
+        EXPECT_TRUE(readDocument(*read, documentOf(*top)));
+        int found = 0;
+        for (auto const* folder = read.get(); folder->getNumberOfDescendants() != 0; ++found)
+            folder = static_cast<KFChannelFolder const*>((*folder->getDescendants())[0]);
+        EXPECT_EQ(found, 988);
+    }
+}
+
 TEST(Document, WritesOfAChannelWhatIsNotAsUsual) {
     struct Case {
         std::string expected;
@@ -193,6 +213,33 @@ TEST(Document, WritesOfAChannelWhatIsNotAsUsual) {
              curve.setKeypointOutputNormalizedTangents(key(curve, 4), 0, 0.5, true);
              curve.setCurveDeriveTangents(false);
          }},
+        // The value isn't what the limits let be seen of it, which may have crossed.
+        {" default=\"0\" value=\"500\"/>\n",
+         [](auto&, KFCurve& curve) {
+             curve.setCurveInitialValue(500);
+             curve.setAbsoluteMaxValueV(100);
+         }},
+        {R"(>
+    <curve type="1" default="0" value="inf">
+      <numberOfKeypoints>1</numberOfKeypoints>
+      <min>5</min>
+      <max>3</max>
+      <keypoint interpolation="18" flags="128">
+        <time>600/600</time>
+        <value>2</value>
+        <outputTangentTime>0</outputTangentTime>
+        <outputTangentValue>6</outputTangentValue>
+      </keypoint>
+    </curve>
+  </parameter>
+)",
+         [&](auto&, KFCurve& curve) {
+             curve.setKeypointOutputNormalizedTangents(key(curve, 18), 0, 0.5, true);
+             curve.setCurveDeriveTangents(false);
+             curve.setCurveInitialValue(std::numeric_limits<double>::infinity());
+             curve.setAbsoluteMinValueV(5);
+             curve.setAbsoluteMaxValueV(3);
+         }},
     };
     for (Case const& c : cases) {
         KFChannelDouble channel(0.0, "V", nullptr, 1, 0);
@@ -213,6 +260,7 @@ TEST(Document, LeavesOutWhatNobodyChanged) {
     kept.setFlag(kChannelFlagSaveWhenAtDefault, true);
     kept.saveStateAsDefault();
     notSaved.setInitialValue(5, true);
+    notSaved.setFlag(kChannelFlagSaveWhenAtDefault, true); // counts in a digest only
     disabled.enable(false, true);
     std::string const text = inHostsDocument(folder, false, true, false);
     for (auto const& [name, is] : {std::pair{"Plain", false},
@@ -228,4 +276,69 @@ TEST(Document, LeavesOutWhatNobodyChanged) {
     std::string const alone = inHostsDocument(folder, false, true, true);
     EXPECT_EQ(alone.find("Plain"), std::string::npos);
     EXPECT_NE(alone.find("<foldFlags>16777216</foldFlags>"), std::string::npos);
+}
+
+TEST(Document, TellsOfARootItself) {
+    KFChannelObjectRootBase root("Root", nullptr, 1, 0, 0);
+    KFChannelDouble value(0.0, "Value", &root, 1, 0);
+    root.setTimeExtent({s(1), s(2)}, true);
+    root.setTimeOffset(s(3), true);
+    root.setFoldFlags(0x11);
+    root.setFlags(root.getFlags() | kChannelFlagHidden | kChannelFlagSaveWhenAtDefault | kChannelFlagSolo);
+    root.lock(true, false);
+    auto const write = [&](BXSerializerWriteStream& stream) { root.serializeSelfOnly(stream, true, true); };
+    auto const text = [&] {
+        BXBufferWriteStream buffer(1024, 1024);
+        BXXMLWriteStream stream(buffer, 5, 13);
+        write(stream);
+        EXPECT_TRUE(stream.close());
+        BXData const data = buffer.copyData();
+        return std::string(data.begin(), data.end());
+    };
+    auto const digest = [&] {
+        BXHashWriteStream stream;
+        write(stream);
+        return stream.getHash();
+    };
+    auto const before = digest();
+    EXPECT_NE(text().find("  <timing in=\"600/600\" out=\"1780/600\" offset=\"1800/600\"/>\n"
+                          "  <foldFlags>17</foldFlags>\n"
+                          "  <baseFlags>262162</baseFlags>\n"
+                          "  <locked>1</locked>\n"),
+              std::string::npos)
+        << text();
+    root.setWritesTimeRange(false);
+    EXPECT_NE(text().find("  <timing offset=\"1800/600\"/>\n"), std::string::npos) << text();
+    EXPECT_NE(documentOf(root).find("    <timing offset=\"1800/600\"/>\n    <baseFlags>"), std::string::npos);
+    root.setWritesTimeRange(true);
+    root.resetFlag(kChannelFlagHidden, true);
+    EXPECT_EQ(digest(), before) << "of the flags only the soloed one";
+    root.resetFlag(kChannelFlagSolo, true);
+    EXPECT_NE(digest(), before);
+}
+
+TEST(Document, MarksWhatAReaderCanNotMakeUp) {
+    // In a thread of its own, which nothing has been marked in.
+    std::thread([] {
+        struct VaryingFactory : KFChannelFactory {
+            VaryingFactory() : KFChannelFactory(KFChannelFactoryUUID("KFChannelVaryingFolder"), {}, 1) {}
+        } varying;
+        KFChannelObjectRootBase root("Root", nullptr, 1, 0, 0);
+        KFChannelFolder plain("Plain", &root, 1, 0, 0);
+        KFChannelBool on(false, "On", &plain, 1, 0);
+        KFChannelFolder list(&varying, "List", &plain, 2, 0, 0);
+        KFChannelDouble value(0.0, "Value", &list, 1, 0);
+        KFChannelObjectRootBase inner("Inner", &root, 2, 0, 0);
+        KFChannelFolder other(&varying, "Other", &inner, 1, 0, 0);
+        KFChannelAngle angle(0.0, "Angle", &other, 1, 0);
+        BXHashWriteStream stream;
+        root.markChannelFactoriesForSerialization(stream);
+        for (auto const& [channel, is] : {std::pair<KFChannelBase*, bool>{&root, false},
+                                          {&plain, false},
+                                          {&on, false},
+                                          {&list, true},
+                                          {&value, true},
+                                          {&angle, false}})
+            EXPECT_EQ(channel->getFactory()->needsSaving(), is) << channel->getName().str();
+    }).join();
 }

@@ -12,6 +12,7 @@
 #include <algorithm>
 #include <bit>
 #include <cmath>
+#include <limits>
 
 namespace {
 
@@ -60,6 +61,23 @@ void addKeypoints(Random& random, KFChannel& channel) {
         curve.closeCurve();
 }
 
+/// They may have crossed, also infinitely far. Where a class has none they may be infinite too; that others are
+/// taken off, no document tells.
+void setLimits(Random& random, KFCurve& curve) {
+    constexpr double kNone = std::numeric_limits<double>::max();
+    double classMin = 0.0;
+    double classMax = 0.0;
+    curve.getAbsoluteMinValueV(&classMin);
+    curve.getAbsoluteMaxValueV(&classMax);
+    double const sign = oneIn(random, 4) ? -1 : 1;
+    double const low = oneIn(random, 4) ? HUGE_VAL : 1e6 * handlePart(random);
+    double const high = oneIn(random, 4) ? HUGE_VAL : 1e6 * handlePart(random);
+    if (sign < 0 || std::isfinite(low) || classMin == -kNone)
+        curve.setAbsoluteMinValueV(-sign * low);
+    if (sign < 0 || std::isfinite(high) || classMax == kNone)
+        curve.setAbsoluteMaxValueV(sign * high);
+}
+
 void fillChannel(Random& random, KFChannel& channel) {
     KFCurve& curve = *channel.createLocalChannelImplementation()->getCurve();
     curve.setCurveDefaultValue(randomNumber(random));
@@ -71,10 +89,8 @@ void fillChannel(Random& random, KFChannel& channel) {
     curve.setRetimingExtrapolation(oneIn(random, 3));
     curve.setCurveExtrapolation(static_cast<std::uint32_t>(below(random, 7)), 0);
     curve.setCurveExtrapolation(static_cast<std::uint32_t>(below(random, 7)), 1);
-    if (!curve.isCurveBoolean() && oneIn(random, 3)) {
-        curve.setAbsoluteMinValueV(-1e6 * handlePart(random));
-        curve.setAbsoluteMaxValueV(1e6 * handlePart(random));
-    }
+    if (!curve.isCurveBoolean() && oneIn(random, 3))
+        setLimits(random, curve);
     if (oneIn(random, 3)) {
         channel.setFadeInOffset(TempusAbsoluteValue(randomTime(random)), false);
         channel.setFadeOutCurve(static_cast<unsigned>(below(random, 4)));
@@ -160,7 +176,7 @@ double randomNumber(Random& random) {
         break;
     }
     double const any = std::bit_cast<double>(random());
-    return std::isfinite(any) ? any : -0.0;
+    return std::isnan(any) ? -0.0 : oneIn(random, 10) ? std::copysign(HUGE_VAL, any) : any;
 }
 
 Tempus randomTime(Random& random) {

@@ -41,7 +41,7 @@ TEST(RoundTrip, GivesTheSameBytesInAFreshTree) {
 }
 
 TEST(RoundTrip, GivesTheSameBytesInPlace) {
-    // Into the tree itself, where the keyed channels have been given other keypoints and another constant.
+    // Into the tree itself, where channels have been given other constants, and the keyed ones other keypoints.
     for (std::uint64_t seed = 1; seed <= numberOfSeeds(); ++seed) {
         OwnedTree const tree = randomTree(seed);
         std::string const document = documentOf(*tree);
@@ -49,10 +49,12 @@ TEST(RoundTrip, GivesTheSameBytesInPlace) {
         tree->getAllDescendantsFlattened(channels, 0, false);
         for (KFChannelBase* const node : channels) {
             auto& channel = static_cast<KFChannel&>(*node);
-            if (channel.getNumberOfKeyframes() == 0)
-                continue;
-            channel.getCurveInterface()->setKeypoint(TempusMake(7, 1), 3.0, true);
-            channel.setInitialValue(channel.getInitialValue() / 2 + 1, true);
+            KFCurve& curve = *channel.getCurveInterface();
+            if (channel.getNumberOfKeyframes() != 0)
+                curve.setKeypoint(TempusMake(7, 1), 3.0, true);
+            curve.setCurveInitialValue(channel.getInitialValue() / 2 + 1);
+            curve.setCurveDefaultValue(channel.getDefaultValue() / 2 + 1);
+            channel.setFadeInOffset(TempusMake(3, 7), false);
         }
         ASSERT_TRUE(readDocument(*tree, document));
         std::string const again = documentOf(*tree);

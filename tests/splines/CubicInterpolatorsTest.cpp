@@ -1,5 +1,6 @@
 // What Bezier segments do besides drawing: they are split, and asked for their extremes and their values.
 
+#include "lumenkey/splines/KFBezierUtil.h"
 #include "lumenkey/splines/KFSplineInterpolator.h"
 #include "lumenkey/splines/KFStaticVertex.h"
 #include "tests/splines/museum.h"
@@ -70,6 +71,58 @@ TEST(KFBezierInterpolator, GivesTheExtremesBetweenTwoPositions) {
         EXPECT_NEAR(min, lowest, 1e-3);
         EXPECT_NEAR(max, highest, 1e-3);
     }
+}
+
+// No type stands for these two; hosts derive from them.
+TEST(KFHermiteInterpolator, TakesAThirdOfADerivativeAsHandle) {
+    Overshoot curve;
+    double const at = 0.375;
+    for (bool const parametric : {false, true}) {
+        curve.state->parametric = parametric;
+        double const part = (parametric ? 1.0 : 12.0) / 3.0;
+        double outV = 0.0, inV = 0.0;
+        curve.a->getOutputTangents(nullptr, &outV, kTempusZero);
+        curve.b->getInputTangents(nullptr, &inV, kTempusZero);
+        double const v[4] = {2.0, 2.0 + part * outV, 3.0 + part * inV, 3.0};
+        KFHermiteInterpolator hermite;
+        EXPECT_TRUE(hermite.useTangents());
+        EXPECT_NEAR(hermite.eval(*curve, kTempusZero, curve.a, curve.b, at), KFBezierEval(v, at), 1e-14);
+    }
+}
+
+TEST(KFCardinalInterpolator, TakesItsTangentsFromTheNeighboursLessTheTension) {
+    Overshoot curve;
+    auto* const before = curve->addVertexNoTangents(s(-1), 7.0, kTempusZero, false);
+    auto* const after = curve->addVertexNoTangents(s(8), -4.0, kTempusZero, false);
+    KFCardinalInterpolator cardinal(0.5);
+    double const k = 0.25;
+    struct {
+        void *from, *to;
+        double tangents[4];
+    } const cases[] = {
+        {curve.a, curve.b, {k * 5.0, k * (3.0 - 7.0), k * -7.0, k * (2.0 - -4.0)}},
+        {before, curve.a, {k * 4.0, 0.0, k * -5.0, k * (7.0 - 3.0)}},
+        {curve.b, after, {k * 7.0, k * (-4.0 - 2.0), k * -8.0, 0.0}},
+    };
+    for (auto const& each : cases) {
+        double tangents[4] = {};
+        cardinal.computeTangents(*curve, each.from, each.to, kTempusZero, &tangents[0], &tangents[1],
+                                 &tangents[2], &tangents[3]);
+        for (int i = 0; i < 4; ++i)
+            EXPECT_NEAR(tangents[i], each.tangents[i], 1e-14) << &each - cases << " " << i;
+    }
+    Tempus from, to;
+    double u[4];
+    double v[4];
+    cardinal.getControlPoints(*curve, curve.a, curve.b, kTempusZero, from, to, u, v);
+    EXPECT_NEAR(u[1], k * 5.0 / 9.0, 1e-14);
+    EXPECT_NEAR(v[1], 2.0 - 1.0 / 3.0, 1e-14);
+    EXPECT_NEAR(v[2], 3.0 + 0.5, 1e-14);
+    EXPECT_FALSE(cardinal.useTangents());
+    double handle = 2.0;
+    cardinal.convertTangentsToHandles(*curve, &handle, nullptr);
+    cardinal.convertHandlesToTangents(*curve, nullptr, &handle);
+    EXPECT_EQ(handle, 2.0) << "such handles follow from the neighbours";
 }
 
 // An end whose time the timescale of answers can't express is met all the same, and not passed.

@@ -1,11 +1,14 @@
 // Properties of evaluation over the whole museum.
 
 #include "tests/splines/museum.h"
+#include "lumenkey/splines/KFBezierUtil.h"
+#include "lumenkey/splines/KFSplineInterpolator.h"
 #include "tests/splines/SlowCurve.h"
 
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <cmath>
 #include <numeric>
 #include <random>
 
@@ -77,6 +80,82 @@ TEST(Museum, DrawsCubicSegmentsAsTheConstructionDoes) {
                 ASSERT_TRUE(low <= value && value <= high)
                     << museumText(*u) << ": " << testing::PrintToString(value) << " outside "
                     << testing::PrintToString(low) << ".." << testing::PrintToString(high);
+            }
+        }
+    });
+}
+
+TEST(Museum, DrawsOtherSegmentsByTheirFormulas) {
+    std::size_t compared = 0;
+    overMuseum([&](MuseumSpline& curve) {
+        auto const positions = museumPositions(*curve);
+        for (auto const& [a, b] : segmentsOf(*curve)) {
+            std::uint32_t const type = a->getInterpolation();
+            bool const rises = type < 15 || type > 17 || std::fabs(a->getBias(kTempusZero) - 1.0) <= 1.0;
+            if (isCubicType(type) || isWholeCurveType(type) || drawsAsOneCurve(curve) || !rises) {
+                continue;
+            }
+            double const tolerance = longShapeTolerance(*a, *b);
+            auto const begin = std::upper_bound(positions.begin(), positions.end(), a->getValueU());
+            auto const end = std::lower_bound(positions.begin(), positions.end(), b->getValueU());
+            for (auto u = begin; u < end; ++u) {
+                long double const fraction =
+                    distanceInSeconds(a->getValueU(), *u) / distanceInSeconds(a->getValueU(), b->getValueU());
+                ASSERT_NEAR(curve.at(*u), static_cast<double>(longShape(*a, *b, fraction)), tolerance)
+                    << museumText(*u) << ", type " << type;
+                ++compared;
+            }
+        }
+    });
+    EXPECT_GT(compared, 1000u);
+}
+
+// Whatever is drawn between two vertices begins at the one and ends at the other.
+TEST(Museum, SegmentsMeetTheirVertices) {
+    overMuseum([](MuseumSpline& curve) {
+        double greatest = 0.0;
+        for (KFVertex const* const vertex : museumVertices(*curve))
+            greatest = std::max(greatest, std::fabs(vertex->getValueV(kTempusZero)));
+        for (auto const& [a, b] : segmentsOf(*curve)) {
+            std::uint32_t const type = a->getInterpolation();
+            // A cubic of less than 1e-5 s is drawn as if it had that, and handles may be as large as the others' values.
+            bool const isShort = TempusSecondsBetween(a->getValueU(), b->getValueU()) <= 1e-5;
+            if (isWholeCurveType(type) || (isCubicType(type) && isShort)) {
+                continue;
+            }
+            double const tolerance = isCubicType(type) ? 1e-14 * greatest : longShapeTolerance(*a, *b);
+            KFInterpolator& strategy = *curve->getInterpolator(type);
+            for (KFVertex* const end : {a, b}) {
+                double const value = strategy.interpolate(*curve, kTempusZero, a, b, end->getValueU(),
+                                                          curve.state->parametric, false);
+                double const expected = (type == 0 ? a : end)->getValueV(kTempusZero);
+                ASSERT_NEAR(value, expected, tolerance) << museumText(end->getValueU()) << ", type " << type;
+            }
+        }
+    });
+}
+
+TEST(Museum, SolvesForTheParameterAsTheRootsDo) {
+    overMuseum([](MuseumSpline& curve) {
+        auto const positions = museumPositions(*curve);
+        for (auto const& [a, b] : segmentsOf(*curve)) {
+            if (!isCubicType(a->getInterpolation()) || curve.state->parametric) {
+                continue;
+            }
+            auto& strategy =
+                dynamic_cast<KFBezierInterpolator&>(*curve->getInterpolator(a->getInterpolation()));
+            Tempus from, to;
+            double polygonU[4];
+            double polygonV[4];
+            strategy.getControlPoints(*curve, a, b, kTempusZero, from, to, polygonU, polygonV);
+            double size = 0.0;
+            for (double const v : polygonV)
+                size = std::max(size, std::fabs(v));
+            auto const begin = std::upper_bound(positions.begin(), positions.end(), from);
+            auto const end = std::lower_bound(positions.begin(), positions.end(), to);
+            for (auto u = begin; u < end && TempusSecondsBetween(from, to) > 1e-5; ++u) {
+                double const parameter = KFBezierFindParameter(polygonU, TempusFraction(*u, from, to));
+                ASSERT_NEAR(curve.at(*u), KFBezierEval(polygonV, parameter), 1e-11 * size) << museumText(*u);
             }
         }
     });

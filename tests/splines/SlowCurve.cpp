@@ -132,6 +132,74 @@ std::vector<Segment> segmentsOf(KFSpline& spline) {
     return segments;
 }
 
+long double distanceInSeconds(Tempus const& a, Tempus const& b) {
+    TempusDetail::Wide const left = TempusDetail::Wide{a.value} * b.timescale;
+    TempusDetail::Wide const right = TempusDetail::Wide{b.value} * a.timescale;
+    return static_cast<long double>(right - left) /
+           (static_cast<long double>(a.timescale) * static_cast<long double>(b.timescale));
+}
+
+// --- Segments of simple shapes ---
+
+namespace {
+
+/// The way after the fraction `p` of a motion that gets to its speed within `in` and stops within `out`, evenly.
+long double easedFraction(long double p, long double in, long double out) {
+    long double const speed = 2.0L / (2.0L - in - out);
+    if (p < in)
+        return speed * p * p / (2.0L * in);
+    if (p > 1.0L - out)
+        return 1.0L - speed * (1.0L - p) * (1.0L - p) / (2.0L * out);
+    return speed * (p - in / 2.0L);
+}
+
+} // namespace
+
+long double longShape(KFVertex const& vertexA, KFVertex const& vertexB, long double p) {
+    long double const pi = std::acos(-1.0L);
+    long double const a = vertexA.getValueV(kTempusZero);
+    long double const b = vertexB.getValueV(kTempusZero);
+    long double const d = b - a;
+    long double const ramp = 2.0L - vertexA.getBias(kTempusZero);
+    long double const decades = std::log(10000.0L);
+    long double const growth = std::log(std::fabs(d)) + decades;
+    switch (vertexA.getInterpolation()) {
+    case 0:
+        return a;
+    case 7:
+        return a + d * (1.0L - std::cos(pi * p / 2.0L));
+    case 8:
+        return a + d * std::sin(pi * p / 2.0L);
+    case 13:
+        return d == 0.0L        ? a
+               : growth == 0.0L ? a + d * p
+                                : a + d * (std::expm1(growth * p) / std::expm1(growth));
+    case 14:
+        return a + d * std::log(999.0L * p + 1.0L) / std::log(1000.0L);
+    case 15:
+        return a + d * easedFraction(p, ramp / 4.0L, ramp / 4.0L);
+    case 16:
+        return a + d * easedFraction(p, ramp / 2.0L, 0.0L);
+    case 17:
+        return a + d * easedFraction(p, 0.0L, ramp / 2.0L);
+    case 19:
+        return a + d * (a >= b ? 1.0L - std::cos(pi * p / 2.0L) : std::sin(pi * p / 2.0L));
+    case 20:
+        return a + d * (a >= b ? std::sin(pi * p / 2.0L) : 1.0L - std::cos(pi * p / 2.0L));
+    case 21:
+        return a + d * (1.0L - std::cos(pi * p)) / 2.0L;
+    default:
+        return a + d * p;
+    }
+}
+
+double longShapeTolerance(KFVertex const& a, KFVertex const& b) {
+    double const size = std::fabs(a.getValueV(kTempusZero)) + std::fabs(b.getValueV(kTempusZero));
+    // Three have sines of single precision.
+    bool const single = a.getInterpolation() >= 19 && a.getInterpolation() <= 21;
+    return size * (single ? 5e-7 : 2e-14);
+}
+
 // --- Cubic segments ---
 
 namespace {
@@ -140,14 +208,6 @@ namespace {
 constexpr long double kRoundings = 16.0L * std::numeric_limits<double>::epsilon();
 
 long double valueOf(KFVertex const* vertex) { return vertex->getValueV(kTempusZero); }
-
-/// b - a in seconds, from whole numbers.
-long double distance(Tempus const& a, Tempus const& b) {
-    TempusDetail::Wide const left = TempusDetail::Wide{a.value} * b.timescale;
-    TempusDetail::Wide const right = TempusDetail::Wide{b.value} * a.timescale;
-    return static_cast<long double>(right - left) /
-           (static_cast<long double>(a.timescale) * static_cast<long double>(b.timescale));
-}
 
 long double casteljau(double const* p, long double t) {
     long double level[4] = {p[0], p[1], p[2], p[3]};
@@ -176,22 +236,22 @@ Handles handlesFromTangents(KFSpline& spline, Segment const& segment) {
 /// goes on a small step away at the other end.
 Handles handlesFromNeighbours(KFSpline& spline, Segment const& segment) {
     long double const sixth = 0.3333333333333333 * 0.5L;
-    long double const span = distance(segment.a->getValueU(), segment.b->getValueU());
-    long double const step = distance(kTempusZero, spline.getSmallDeltaU());
+    long double const span = distanceInSeconds(segment.a->getValueU(), segment.b->getValueU());
+    long double const step = distanceInSeconds(kTempusZero, spline.getSmallDeltaU());
     auto const valid = enabledOf(museumVertices(spline));
     auto const a = std::find(valid.begin(), valid.end(), segment.a);
     auto const b = std::find(valid.begin(), valid.end(), segment.b);
     long double out[2] = {2.0L * span, 0.0L};
     long double in[2] = {2.0L * span, 0.0L};
     if (a != valid.begin()) {
-        out[0] = distance((*(a - 1))->getValueU(), segment.b->getValueU());
+        out[0] = distanceInSeconds((*(a - 1))->getValueU(), segment.b->getValueU());
         out[1] = valueOf(segment.b) - valueOf(*(a - 1));
     } else if (spline.isClosed()) {
         out[0] = span + step;
         out[1] = valueOf(segment.b) - valueOf(valid.back());
     }
     if (b + 1 != valid.end()) {
-        in[0] = distance(segment.a->getValueU(), (*(b + 1))->getValueU());
+        in[0] = distanceInSeconds(segment.a->getValueU(), (*(b + 1))->getValueU());
         in[1] = valueOf(*(b + 1)) - valueOf(segment.a);
     } else if (spline.isClosed()) {
         in[0] = span + step;
@@ -204,7 +264,7 @@ Handles handlesFromNeighbours(KFSpline& spline, Segment const& segment) {
 
 LongCubic::LongCubic(KFSpline& spline, Segment const& segment)
     : _parametric(spline.getState()->parametric), _start(segment.a->getValueU()),
-      _span(distance(_start, segment.b->getValueU())) {
+      _span(distanceInSeconds(_start, segment.b->getValueU())) {
     Handles const handles = segment.a->getInterpolation() == 6 ? handlesFromNeighbours(spline, segment)
                                                                : handlesFromTangents(spline, segment);
     double const v[4] = {
@@ -241,7 +301,8 @@ long double LongCubic::curveU(long double t) const {
 
 LongCubic::Bounds LongCubic::at(Tempus const& u) const {
     long double const shortest = 9.999999747378752e-06L;
-    long double const fraction = distance(_start, u) / std::max(_span, _parametric ? 0.0L : shortest);
+    long double const fraction =
+        distanceInSeconds(_start, u) / std::max(_span, _parametric ? 0.0L : shortest);
     long double const slack = kRoundings * (2.0L + 9.0L * (std::fabs(_u[1]) + std::fabs(_u[2])));
     long double from = fraction - kRoundings;
     long double to = fraction + kRoundings;

@@ -12,6 +12,13 @@ inline bool isWholeCurveType(std::uint32_t type) { return type == 10 || type == 
 /// Every number without a shape of its own draws as Bezier.
 bool isCubicType(std::uint32_t type);
 
+/// b - a, from whole numbers.
+long double distanceInSeconds(Tempus const& a, Tempus const& b);
+
+/// A segment of any other type that draws segments, in long double, at a fraction of it; how far the value may be off.
+long double longShape(KFVertex const& a, KFVertex const& b, long double fraction);
+double longShapeTolerance(KFVertex const& a, KFVertex const& b);
+
 /// Neighbours of the valid vertices, the second strictly after the first.
 struct Segment {
     KFVertex* a;

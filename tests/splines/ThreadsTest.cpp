@@ -8,6 +8,7 @@
 
 #include <atomic>
 #include <barrier>
+#include <chrono>
 #include <cmath>
 #include <cstdlib>
 #include <functional>
@@ -204,8 +205,10 @@ void KFSplineThreads::edit(std::mt19937& random) {
         [&] { curve->deleteVertex(vertex, false, kTempusZero); },
         [&] { curve->moveVertex(vertex, u, kTempusZero, random() % 4 == 0, random() % 2 == 0, false); },
         [&] {
+            curve->preSplineAccess(true);
             curve->disableVertex(vertex, kTempusZero);
             curve->enableVertex(random() % 2 == 0 ? vertex : curve->getNextVertex(u), kTempusZero);
+            curve->postSplineAccess(true);
         },
         [&] { curve->setClosed(random() % 4 == 0, nullptr); },
         [&] { curve->setExtrapolation(modes[random() % 3], random() % 2); },
@@ -367,11 +370,16 @@ TEST_F(KFSplineThreads, WholeCurvesAreReadByManyAtOnce) {
     }
 }
 
+namespace {
+
+struct Owner : KFSplineOwner {
+    double getInitialValue() const override { return 0.0; }
+    Tempus getFrameDuration() const override { return s(1, 25); }
+};
+
+} // namespace
+
 TEST_F(KFSplineThreads, TwoSplinesShareOneLock) {
-    struct Owner : KFSplineOwner {
-        double getInitialValue() const override { return 0.0; }
-        Tempus getFrameDuration() const override { return s(1, 25); }
-    };
     BXSpinLock shared;
     Owner owners[2];
     MuseumSpline curves[2];
@@ -408,6 +416,34 @@ TEST_F(KFSplineThreads, TwoSplinesShareOneLock) {
         }
     }
     EXPECT_EQ(differences, 0);
+}
+
+// Who holds a lock that several splines share holds them all still, also where a thread has kept all that it needs.
+TEST_F(KFSplineThreads, ACustomLockIsWaitedForByEveryRead) {
+    Owner owner;
+    BXSpinLock shared;
+    owner._customLock = &shared;
+    curve->setNode(&owner);
+    Tempus const u = s(103, 600);
+    std::barrier held(2);
+    std::atomic<bool> done{false};
+    std::thread reader([&] {
+        for (int i = 0; i < 3; ++i)
+            curve.at(u);
+        held.arrive_and_wait();
+        held.arrive_and_wait();
+        curve.at(u);
+        done = true;
+    });
+    held.arrive_and_wait();
+    curve->preSplineAccess(true);
+    held.arrive_and_wait();
+    std::this_thread::sleep_for(std::chrono::milliseconds(20));
+    EXPECT_FALSE(done);
+    curve->postSplineAccess(true);
+    reader.join();
+    owner._customLock = nullptr;
+    curve->setNode(nullptr);
 }
 
 // Each test is a process of its own when the suite runs, so that here the strategies are made.

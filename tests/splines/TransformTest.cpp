@@ -185,6 +185,18 @@ TEST(KFSplineReverseVertices, KeepsWhatItMayNotTouch) {
     curve.expect({0, 2, 3}, {5.0, 2.0, 1.0});
 }
 
+TEST(KFSplineReverseVertices, KeepsTheOrderAtOnePosition) {
+    Curve curve{{0, 1.0}, {0, 2.0}, {0, 3.0}, {1, 5.0}};
+    curve->reverseVertices(curve.key(1), curve.key(1));
+    curve.expect({0, 0, 0, 1}, {1.0, 2.0, 3.0, 5.0});
+    curve->reverseVertices(curve.key(0), curve.key(0));
+    curve.expect({0, 0, 0, 1}, {1.0, 2.0, 3.0, 5.0});
+    curve->reverseVertices(curve.key(1), curve.key(2));
+    curve.expect({0, 0, 0, 1}, {1.0, 3.0, 2.0, 5.0});
+    curve->reverseVertices(curve.key(2), curve.key(3));
+    curve.expect({0, 0, 0, 1}, {1.0, 3.0, 5.0, 2.0});
+}
+
 TEST(KFSplineTransform, CountsVerticesAsParameter) {
     // A time curve becomes a path from value 0, tangents in fractions of a segment.
     Curve curve{{0, 5.0}, {2, 7.0}, {6, 4.0}};

@@ -152,6 +152,21 @@ TEST_F(AuthorVerbsTest, SetRefusesWhatTheFileCanNotHold) {
     }
 }
 
+TEST_F(AuthorVerbsTest, WritesNothingThatItCouldNotRead) {
+    KFChannelObjectRootBase top("Top", nullptr, 0, 0, 0);
+    std::vector<std::unique_ptr<KFChannelFolder>> folders;
+    KFChannelFolder* last = &top;
+    std::string path = ".";
+    for (int i = 0; i < 988; ++i) {
+        last = folders.emplace_back(new KFChannelFolder("F", last, 9, 0, 0)).get();
+        path += "/9";
+    }
+    BXData const deepest = top.createChannelState(true, true);
+    _folder.write("ball.lumen", std::string(deepest.begin(), deepest.end()));
+    expectRefused({"add", path, "Folder", "g", "--in-place"}, "more than 990 elements deep", 1);
+    outputOf({"add", _file, path.substr(0, path.size() - 2), "Folder", "g", "--in-place"});
+}
+
 TEST_F(AuthorVerbsTest, HashIsThatOfTheLibrary) {
     makeBall();
     KFChannelObjectRootBase root("ball", nullptr, 1, 0, 0);

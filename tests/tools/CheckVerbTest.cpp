@@ -50,8 +50,14 @@ TEST_F(CheckVerbTest, FindsWhatIsOddWithItsPlace) {
          "id=\"5\"/>\n"
          "<parameter name=\"Q\" id=\"4\" factoryID=\"2\"/></parameter>",
          "5:1: the channel '' is of factory 9, which isn't listed: it is passed over\n"
-         "6:1: the channel '' names no class: it is passed over\n"
-         "7:1: the channel 'Q' has the ID 4 of one before it: it is read into that one\n"},
+         "6:1: the channel '' names no class: it is passed over\n"},
+        // Whatever class another one of the same ID names, or none.
+        {"<parameter id=\"1\" factoryID=\"1\">\n<parameter id=\"4\" factoryID=\"2\"/>\n<parameter "
+         "name=\"Q\" id=\"4\" factoryID=\"1\">\n<foldFlags>1</foldFlags></parameter>\n"
+         "<parameter id=\"4\"/></parameter>",
+         "6:1: the channel 'Q' has the ID 4 of one before it: it is read into that one\n"
+         "7:1: the element 'foldFlags' is none of a channel of the class Percent: it is passed over\n"
+         "8:1: the channel '' has the ID 4 of one before it: it is read into that one\n"},
         {"<parameter id=\"1\" "
          "factoryID=\"2\">\n<foldFlags>1</foldFlags>\n<fadeInCurve>4</fadeInCurve>\n<curve "
          "type=\"1\" value=\"2\">\n<preExtrapolation>-1</preExtrapolation>\n<keypoint interpolation=\"99\">\n"
@@ -112,6 +118,10 @@ TEST_F(CheckVerbTest, FindsWhatIsOddWithItsPlace) {
     EXPECT_LT(found.find("more than 990 elements deep"), found.find("mismatched tag"))
         << "not in the order of the text";
     EXPECT_EQ(findingsIn(contentOf(LUMENKEY_TEST_SOURCE_DIR "/tests/persistence/data/version2.lumen")), "");
+    // Old also where spaces stand in front of the version.
+    std::string const old = contentOf(LUMENKEY_TEST_SOURCE_DIR "/tests/persistence/data/version4.lumen");
+    EXPECT_EQ(findingsIn(samples::replaced(old, "\"4.1\"", "\" 4.1\"")), "");
+    EXPECT_EQ(jsonOf({"info", _folder.file("f.lumen")})["version"], "4.1");
 }
 
 TEST_F(CheckVerbTest, ReadsAPipeOnce) {

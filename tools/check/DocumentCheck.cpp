@@ -3,6 +3,7 @@
 #include "lumenkey/Channels/KFChannelFactories.h"
 #include "lumenkey/Channels/KFChannelFolder.h"
 #include "lumenkey/Channels/KFFactories.h"
+#include "lumenkey/persistence/KFDocumentVersion.h"
 #include "tools/check/AttributeCheck.h"
 #include "tools/check/CurveCheck.h"
 #include "tools/check/DocumentVocabulary.h"
@@ -14,7 +15,6 @@
 #include <map>
 #include <memory>
 #include <optional>
-#include <set>
 #include <utility>
 
 namespace lumenkey::tools {
@@ -27,9 +27,9 @@ struct OpenElement {
     DocumentWord const* word = nullptr;
     TextPlace place;
     std::string text;
-    /// Of a channel: its class, or null; and the IDs of its children so far.
+    /// Of a channel: its class, or null; and those of its children so far, by ID.
     KFFactory* factory = nullptr;
-    std::set<std::uint64_t> ids;
+    std::map<std::uint64_t, KFFactory*> children;
     /// Of a curve.
     CurveLimits limits;
     Tempus lastTime = kTempusInvalid;
@@ -113,10 +113,11 @@ private:
 
     bool isSound(OpenElement& element, Attributes const& attributes) {
         if (element.name == "kfml" || element.name == "kfdoc") {
-            std::string_view const version = attributeOf(attributes, "version");
-            std::optional<std::uint64_t> const major = readWhole(version.substr(0, version.find('.')));
-            constexpr std::uint64_t firstWithTimes = 5;
-            _countsFrames = major && *major < firstWithTimes;
+            constexpr std::uint32_t firstWithTimes = 5;
+            std::uint32_t major = firstWithTimes;
+            std::uint32_t minor = 0;
+            KFReadVersion(attributeOf(attributes, "version"), major, minor);
+            _countsFrames = major < firstWithTimes;
         } else if (element.name == "factory") {
             checkFactory(element, attributes);
         } else if (element.name == "parameter") {
@@ -163,9 +164,11 @@ private:
         OpenElement& above = _open.back();
         std::string const name = "the channel '" + std::string(attributeOf(attributes, "name")) + "'";
         std::uint64_t const id = readWhole(attributeOf(attributes, "id")).value_or(0);
-        if (!above.ids.insert(id).second) {
+        if (auto const before = above.children.find(id); before != above.children.end()) {
             find(element.place,
                  name + " has the ID " + std::to_string(id) + " of one before it: it is read into that one");
+            element.factory = before->second;
+            return true;
         }
         std::optional<std::uint64_t> const number = readWhole(attributeOf(attributes, "factoryID"));
         if (KFFactory* const component = componentOf(above.factory, id)) {
@@ -186,6 +189,7 @@ private:
         } else {
             element.factory = &KFChannelObjectRootBase_Factory::getInstance();
         }
+        above.children[id] = element.factory;
         return true;
     }
 

@@ -75,7 +75,7 @@ void writeDocument(KFChannelBase& top, OutputSink& out, std::size_t count, Readi
     bool const isWhole = stream.close();
     sink.rethrow();
     if (!isWhole) {
-        throw OutputError{"the document", "something in it has no form as text"};
+        throw OutputError{"the document", stream.failure()};
     }
 }
 

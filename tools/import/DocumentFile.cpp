@@ -7,11 +7,11 @@
 #include "lumenkey/foundation/BXURL.h"
 #include "lumenkey/foundation/BXXMLReadStream.h"
 #include "lumenkey/persistence/KFDocumentScopes.h"
+#include "lumenkey/persistence/KFDocumentVersion.h"
 #include "tools/curve/Keypoint.h"
 #include "tools/tree/FileRoot.h"
 
 #include <algorithm>
-#include <charconv>
 #include <filesystem>
 #include <limits>
 #include <numeric>
@@ -49,7 +49,9 @@ public:
         case kDocumentElement:
             element.getAttributeAsString(kVersionAttribute, &_document.writtenVersion);
             if (element.getAttributeAsString(kVersionAttribute, &text)) {
-                readVersion(text.view(), stream);
+                KFReadVersion(text.view(), stream.major, stream.minor);
+                _document.major = stream.major;
+                _document.minor = stream.minor;
             }
             break;
         case kFactoryElement:
@@ -73,16 +75,6 @@ public:
     std::unique_ptr<KFChannelBase, DeleteTree> takeTop() { return std::move(_top); }
 
 private:
-    void readVersion(std::string_view text, BXSerializerReadStream& stream) {
-        char const* const end = text.data() + text.size();
-        auto const major = std::from_chars(text.data(), end, stream.major);
-        if (major.ec == std::errc() && major.ptr != end && *major.ptr == '.') {
-            std::from_chars(major.ptr + 1, end, stream.minor);
-        }
-        _document.major = stream.major;
-        _document.minor = stream.minor;
-    }
-
     void readFactory(BXStreamElement const& element) {
         DocumentFactory entry;
         element.getAttributeAsUInt32(kFactoryIDAttribute, &entry.number);
