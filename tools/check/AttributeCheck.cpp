@@ -46,18 +46,20 @@ std::string faultOfVersion(std::string_view text) {
 
 } // namespace
 
-std::vector<std::string> faultsOfAttributes(std::string_view element, Attributes const& attributes,
-                                            CurveLimits const& limits, bool countsFrames) {
-    std::vector<std::string> faults;
+std::vector<AttributeFault> faultsOfAttributes(std::string_view element, Attributes const& attributes,
+                                               CurveLimits const& limits, bool countsFrames) {
+    std::vector<AttributeFault> faults;
     for (DocumentAttribute const& attribute : documentAttributes()) {
         if (auto const found = attributes.find(attribute.name);
             attribute.element == element && found != attributes.end()) {
-            faults.push_back(faultOfText(attribute, found->second, limits, countsFrames));
+            // A default may lie out of the limits; a value is brought within them.
+            bool const isKept = attribute.name == "default" && readNumber(found->second);
+            faults.push_back({faultOfText(attribute, found->second, limits, countsFrames), isKept});
         }
     }
     if (auto const version = attributes.find("version");
         (element == "kfml" || element == "kfdoc") && version != attributes.end()) {
-        faults.push_back(faultOfVersion(version->second));
+        faults.push_back({faultOfVersion(version->second), true});
     }
     return faults;
 }

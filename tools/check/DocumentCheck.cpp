@@ -133,10 +133,8 @@ private:
     void checkAttributes(OpenElement const& element, Attributes const& attributes) {
         CurveLimits const limits =
             element.name == "parameter" ? limitsOf(keptExampleOf(element.factory)) : element.limits;
-        for (std::string& fault : faultsOfAttributes(element.name, attributes, limits, _countsFrames)) {
-            // Without its version a document is written all the same.
-            element.word->parent.empty() ? findKept(element.place, std::move(fault))
-                                         : find(element.place, std::move(fault));
+        for (AttributeFault& fault : faultsOfAttributes(element.name, attributes, limits, _countsFrames)) {
+            tell({element.place, std::move(fault.what), !fault.isKept});
         }
     }
 
