@@ -5,8 +5,9 @@
 #include <exception>
 
 int main(int argc, char** argv) {
-    // A closed pipe is told like any other failure to write.
+    // A closed pipe and a limit on the size of files are told like any other failure to write.
     std::signal(SIGPIPE, SIG_IGN);
+    std::signal(SIGXFSZ, SIG_IGN);
     try {
         return lumenkey::tools::runProgram(argc, argv);
     } catch (std::exception const& error) {

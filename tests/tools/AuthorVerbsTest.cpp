@@ -2,6 +2,7 @@
 
 #include "lumenkey/Channels/KFChannelObjectRootBase.h"
 #include "lumenkey/foundation/BXURL.h"
+#include "tests/tools/MotionSamples.h"
 #include "tests/tools/RunProgram.h"
 #include "tests/tools/TestFolder.h"
 #include "tools/tree/ChannelTree.h"
@@ -73,6 +74,21 @@ TEST_F(AuthorVerbsTest, MakesADocumentFromNothing) {
     EXPECT_EQ(left[0]["interpolation"], 0) << "a new value leaves the rest of its keypoint";
 }
 
+TEST_F(AuthorVerbsTest, OtherFormatsGetWhatWasAddedAndNotWhatWasRemoved) {
+    makeBall();
+    std::string const table = _folder.file("t.csv");
+    outputOf({"set", _file, "Place.X", "--at", "0", "--value", "7"});
+    outputOf({"remove", _file, "Body", "-o", table});
+    EXPECT_TRUE(contentOf(table).starts_with("time,seconds,Height\n")) << contentOf(table);
+    std::string const motion = _folder.write("m.bvh", samples::kSmallMotion);
+    outputOf({"convert", motion, _file});
+    EXPECT_EQ(outputOf({"add", _file, "LeftLeg", "Double", "Yposition", "--value", "2.5", "-o", motion}),
+              "./1/7/6\n");
+    EXPECT_NE(contentOf(motion).find("CHANNELS 4 Zrotation Xrotation Yrotation Yposition\n"),
+              std::string::npos);
+    EXPECT_NE(contentOf(motion).find(" 90 2.5\n"), std::string::npos) << contentOf(motion);
+}
+
 TEST_F(AuthorVerbsTest, RefusesWhatChannelsDoNotTake) {
     makeBall();
     expectRefused({"add", "./", "Dubble", "X"}, "did you mean 'Double'?");
@@ -81,6 +97,7 @@ TEST_F(AuthorVerbsTest, RefusesWhatChannelsDoNotTake) {
     expectRefused({"add", "Body", "Double", "On"}, "has a channel 'On' already");
     expectRefused({"add", "Body", "3D", "P", "--value", "1"}, "none or several");
     expectRefused({"add", "Body", "Percent", "P", "--value", "50"}, "values from 0 to 1");
+    expectRefused({"add", "Body", "Progress", "P"}, "documents leave out");
     expectRefused({"set", "Height", "--value", "1"}, "say which with --at");
     expectRefused({"set", "Height", "--at", "1/3", "--delete"}, "has no keypoint at 1/3 s");
     expectRefused({"set", "Height", "--at", "0", "--value", "1", "--interpolation", "wavy"},
@@ -90,6 +107,49 @@ TEST_F(AuthorVerbsTest, RefusesWhatChannelsDoNotTake) {
     expectRefused({"remove", "./"}, "the top");
     expectRefused({"remove", "Place.X"}, "only go as a whole");
     expectRefused({"new"}, "it is there already", 1);
+}
+
+TEST_F(AuthorVerbsTest, SetRefusesWhatTheFileCanNotHold) {
+    makeBall();
+    outputOf({"convert", _folder.write("m.bvh", samples::kSmallMotion), _folder.file("m.lumen")});
+    _folder.write("t.csv", "t,X,Y\n0,1,\n1,2,\n");
+    std::string const key = "<keypoint flags=\"2\"><time>0/1</time><value>1</value></keypoint>";
+    _folder.write("k.lumen", "<kfml version=\"5.13\"><factory id=\"1\" uuid=\"FDC1944B-2291-11D7-B1C3-"
+                             "00039389B702\"/><parameter id=\"1\"><parameter name=\"X\" id=\"1\" "
+                             "factoryID=\"1\"><curve type=\"1\">" +
+                                 key + "</curve></parameter></parameter></kfml>");
+    std::string const convert = "make a document of it with lumenkey convert";
+    struct {
+        std::string file;
+        std::vector<std::string> arguments;
+        std::string complaint; // empty for none
+    } const cases[] = {
+        {"m.bvh", {"Hips.Xposition", "--at", "1/240", "--value", "1"}, "which are 1/120 s apart; " + convert},
+        {"m.bvh", {"Hips.Xposition", "--at", "0", "--delete"}, "a value in every frame; " + convert},
+        {"m.bvh", {"Hips.Xposition", "--at", "0", "--interpolation", "ease"}, "holds no interpolations"},
+        {"m.bvh", {"Hips.Xposition", "--at", "2f", "--value", "1", "-o", _folder.file("o.bvh")}, ""},
+        {"m.bvh", {"Hips.Xposition", "--at", "0.1f", "--value", "1", "-o", _folder.file("o.lumen")}, ""},
+        {"m.lumen",
+         {"Hips.Xposition", "--at", "0.1f", "--value", "1", "-o", _folder.file("o.bvh")},
+         "apart; write a document"},
+        {"t.csv", {"X", "--at", "0", "--interpolation", "ease"}, "a CSV holds no interpolations; " + convert},
+        {"t.csv", {"Y", "--value", "3"}, "a CSV holds no values without a time; " + convert},
+        {"t.csv", {"Y", "--at", "1/3", "--value", "3", "-o", _folder.file("o.csv")}, ""},
+        {"t.csv", {"X", "--at", "0", "--delete", "-o", _folder.file("o.csv")}, ""},
+        {"k.lumen", {"X", "--at", "0", "--delete"}, "the keypoint at 0/1 s is locked"},
+        {"k.lumen", {"X", "--at", "0", "--value", "2"}, "the keypoint at 0/1 s is locked"},
+        {"k.lumen", {"X", "--at", "1", "--value", "2", "-o", _folder.file("o.lumen")}, ""},
+    };
+    for (auto const& each : cases) {
+        std::string const file = _folder.file(each.file);
+        std::string const before = contentOf(file);
+        std::vector<std::string> arguments{"set", file};
+        arguments.insert(arguments.end(), each.arguments.begin(), each.arguments.end());
+        Outcome const outcome = runLumenkey(arguments);
+        EXPECT_EQ(outcome.exit, each.complaint.empty() ? 0 : 2) << Json(arguments) << outcome.err;
+        EXPECT_NE(outcome.err.find(each.complaint), std::string::npos) << outcome.err;
+        EXPECT_EQ(contentOf(file), before);
+    }
 }
 
 TEST_F(AuthorVerbsTest, WritesNothingThatItCouldNotRead) {
@@ -157,6 +217,47 @@ TEST_F(AuthorVerbsTest, DiffTellsWhatDiffersAndByItsExitCode) {
     EXPECT_EQ(runLumenkey({"diff", _file}).exit, 2);
 }
 
+TEST_F(AuthorVerbsTest, DiffSeesPeaksOfAMomentOrderAndNames) {
+    std::string const table = "t,X\n0,0\n0.50101,0\n0.50102,0\n0.50103,0\n1,0\n";
+    std::string const flat = _folder.write("flat.csv", table);
+    std::string const peak = _folder.write("peak.csv", samples::replaced(table, "0.50102,0", "0.50102,1000"));
+    EXPECT_EQ(outputOf({"diff", flat, peak}, 1), "changed X: by up to 1000.000000 units, at 25051/50000 s\n");
+    std::string const linear = _folder.file("peak.lumen");
+    std::string const steps = _folder.file("steps.lumen");
+    outputOf({"convert", peak, linear});
+    outputOf({"set", linear, "X", "--at", "0.50101", "--interpolation", "constant", "-o", steps});
+    EXPECT_TRUE(
+        outputOf({"diff", linear, steps}, 1).starts_with("changed X: by up to 999.000000 units, at "));
+
+    auto const documentOf = [](std::string const& top, std::string const& children) {
+        return "<kfml version=\"5.13\"><factory id=\"1\" uuid=\"FDC1944B-2291-11D7-B1C3-00039389B702\"/>"
+               "<parameter name=\"" +
+               top + "\" id=\"1\">" + children + "</parameter></kfml>";
+    };
+    auto const child = [](std::string const& name, std::string const& id) {
+        return "<parameter name=\"" + name + "\" id=\"" + id + "\" factoryID=\"1\"/>";
+    };
+    std::string const before = _folder.write("1.lumen", documentOf("A", child("X", "1") + child("Y", "2")));
+    std::string const after =
+        _folder.write("2.lumen", documentOf("B", child("New", "3") + child("Y", "2") + child("X", "1")));
+    EXPECT_EQ(outputOf({"diff", before, after}, 1), "changed ./: name A became B\n"
+                                                    "added   New\n"
+                                                    "changed Y: place among its siblings 2 became 1\n"
+                                                    "changed X: place among its siblings 1 became 2\n");
+}
+
+TEST_F(AuthorVerbsTest, LockedChannelsStayAsTheyAre) {
+    _folder.write("ball.lumen",
+                  "<kfml version=\"5.13\"><factory id=\"1\" uuid=\"E7BF3809-2290-11D7-98E5-00039389B702\"/>"
+                  "<factory id=\"2\" uuid=\"FDC1944B-2291-11D7-B1C3-00039389B702\"/><parameter id=\"1\" "
+                  "factoryID=\"1\"><parameter name=\"Body\" id=\"2\" factoryID=\"1\"><flags>4</flags>"
+                  "<parameter name=\"X\" id=\"3\" factoryID=\"2\"/></parameter></parameter></kfml>");
+    expectRefused({"set", "X", "--value", "1"}, "'X' is locked");
+    expectRefused({"add", "Body", "Double", "Y"}, "'Body' is locked");
+    expectRefused({"remove", "X"}, "'X' is locked");
+    expectRefused({"remove", "Body"}, "'Body' is locked");
+}
+
 TEST_F(AuthorVerbsTest, UpgradeWritesOldDocumentsInTodaysVersion) {
     std::vector<std::string> files;
     std::string const data = LUMENKEY_TEST_SOURCE_DIR "/tests/persistence/data/";
@@ -179,6 +280,26 @@ TEST_F(AuthorVerbsTest, UpgradeWritesOldDocumentsInTodaysVersion) {
     }
     arguments.push_back(_folder.file("none.lumen"));
     EXPECT_EQ(runLumenkey(arguments).exit, 1);
+
+    struct {
+        char const* version;
+        char const* said;
+        int exit;
+    } const versions[] = {
+        {" version=\"abc\"", "F: from version 'abc', read as 5.13, to 5.13\n", 0},
+        {" version=\"4\"", "F: from version '4', read as 4.13, to 5.13\n", 0},
+        {"", "F: from version none, read as 5.13, to 5.13\n", 0},
+        {" version=\"99.1\"",
+         "lumenkey: F:1:1: version 99.1 is newer than 5.13, the newest that is written here\n", 1},
+    };
+    for (auto const& each : versions) {
+        std::string const file =
+            _folder.write("v.lumen", "<kfml" + std::string(each.version) + "><parameter id=\"1\"/></kfml>");
+        Outcome const outcome = runLumenkey({"upgrade", file});
+        EXPECT_EQ(outcome.exit, each.exit);
+        std::string said = outcome.out + outcome.err;
+        EXPECT_EQ(said.replace(said.find(file), file.size(), "F"), each.said);
+    }
 
     // A document that would lose channels stays.
     std::string const unknown = _folder.write(

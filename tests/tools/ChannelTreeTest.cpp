@@ -1,4 +1,5 @@
 #include "tools/tree/ChannelTree.h"
+#include "lumenkey/Channels/KFVectorChannels.h"
 #include "tests/tools/MotionSamples.h"
 #include "tools/curve/SampleTimes.h"
 #include "tools/import/MotionTree.h"
@@ -93,6 +94,30 @@ TEST(ChannelTree, FindsNodesByNameAndPath) {
     EXPECT_EQ(tree->trailingName(*tree->find("./1/3/2/1").first, 3, 100), "Right.Toe.Xrotation");
     EXPECT_EQ(tree->trailingName(*tree->find("./1/3/2/1").first, 3, 10), "");
     EXPECT_EQ(tree->base(0).getName().str(), "odd.name");
+}
+
+TEST(ChannelTree, KeepsItsOrderWhereNodesComeAndGo) {
+    std::unique_ptr<ChannelTree> const tree =
+        treeOfJoints("A" + kJoint + "JOINT B" + kJoint + "}}\nROOT C" + kJoint + "}\n");
+    ChannelTree::Node const added =
+        tree->append(1, std::make_unique<KFChannel3D>("P", nullptr, 3, 0)); // with three components
+    EXPECT_EQ(tree->path(added), "./1/3");
+    std::string const all = "./ odd.name ObjectRoot\n./1 A Folder\n./1/1 Xrotation Angle\n./1/2 B Folder\n"
+                            "./1/2/1 Xrotation Angle\n./1/3 P 3D\n./1/3/1 X Double\n./1/3/2 Y Double\n"
+                            "./1/3/3 Z Double\n./2 C Folder\n./2/1 Xrotation Angle\n";
+    EXPECT_EQ(listing(*tree), all);
+    auto const ends = [&] {
+        std::string text;
+        for (ChannelTree::Node node = 0; node < tree->count(); ++node) {
+            text += std::to_string(tree->parent(node)) + "-" + std::to_string(tree->end(node)) + " ";
+        }
+        return text;
+    };
+    EXPECT_EQ(ends(), "0-11 0-9 1-3 1-5 3-5 1-9 5-7 5-8 5-9 0-11 9-11 ");
+    tree->erase(*tree->find("B").first);
+    EXPECT_EQ(ends(), "0-9 0-7 1-3 1-7 3-5 3-6 3-7 0-9 7-9 ");
+    EXPECT_EQ(tree->dottedName(*tree->find("./2/1").first), "C.Xrotation");
+    EXPECT_EQ(tree->dottedName(*tree->find("Z").first), "A.P.Z");
 }
 
 /// Linear interpolation between frames in long doubles, held at both ends.

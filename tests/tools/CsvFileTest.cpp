@@ -46,7 +46,11 @@ TEST(CsvFile, ReadsTablesOfValuesOverTime) {
         {"time,s\n1/3,1\n0.5,2\n", "1 s: 1/3=1 1/2=2\n"},
         {"Time,seconds\n0,1\n", "1 seconds: 0/1=1\n"},
         {"time,X\n1/3~,1\n0.66666666666666667,2\n", "1 X: 1/3~=1 1431655765/2147483647~=2\n"},
+        {"t,X\r0,1\r\r1,2", "1 X: 0/1=1 1/1=2\n"},
+        {"t,\"\"\n0,1\n", "1 : 0/1=1\n"},
         // The place of every fault.
+        {"t,X\r0,high\r", "f.csv:2:3: 'high' is not a number"},
+        {"t,X\rY\n0,1\n", "f.csv:1:4: a carriage return inside a line; lines end in another way here"},
         {"", "f.csv:1:1: the file is empty"},
         {"t;X\n0;1\n",
          "f.csv:1:1: a table has a column of times and at least one of values, with commas between them"},

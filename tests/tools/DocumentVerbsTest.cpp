@@ -55,6 +55,63 @@ TEST_F(DocumentVerbsTest, MotionsAndTablesComeBackFromDocuments) {
         << "a failure has replaced the file";
 }
 
+TEST_F(DocumentVerbsTest, MotionsOfAnyFrameTimeComeBackFromDocuments) {
+    struct {
+        char const* frameTime;
+        std::size_t frames;
+        char const* written;
+    } const cases[] = {
+        {".0083333", 3, "0.00833333"},
+        {"0.008", 3, "0.00833333"},
+        {"0.0333333", 2, "0.03333333"},
+        {"0.041708", 3, "0.0417083"},
+        {"0.1", 3, "0.10"},
+        {"0.0005", 3, "0.0005"},
+        {"2.5", 2, "2.50"},
+        {"0.03300", 1, "0.0330"},
+        {"0.0123456789123", 3, "0.0123456791"},
+        {"0.02", 1, "0.02"},
+    };
+    std::string const back = _folder.file("back.bvh");
+    for (auto const& each : cases) {
+        SCOPED_TRACE(each.frameTime);
+        std::string text = samples::replaced(kSmallMotion, ".0083333", each.frameTime);
+        text = samples::replaced(text, "Frames: 3", "Frames: " + std::to_string(each.frames));
+        for (std::size_t lines = 3; lines > each.frames; --lines) {
+            text.erase(text.rfind('\n', text.size() - 2) + 1);
+        }
+        std::string const motion = _folder.write("any.bvh", text);
+        outputOf({"convert", motion, _document});
+        outputOf({"convert", _document, back});
+        EXPECT_EQ(samples::described(readMotionFile(back)), samples::described(readMotionFile(motion)));
+        EXPECT_NE(contentOf(back).find("Frame Time: " + std::string(each.written) + "\n"), std::string::npos)
+            << contentOf(back);
+    }
+    // Frames last as long when few keypoints are left, and as long as a user says.
+    outputOf({"convert", _motion, _document});
+    outputOf({"simplify", _document, "--tolerance", "1000", "--in-place"});
+    EXPECT_EQ(jsonOf({"info", _document})["frameDuration"], "1/120");
+    outputOf({"set", _document, "Frame Time", "--value", "0.5"});
+    EXPECT_EQ(jsonOf({"info", _document})["frameDuration"], "1/2");
+}
+
+TEST_F(DocumentVerbsTest, AnyDocumentMakesATableThatCanBeRead) {
+    std::string const odd = _folder.write(
+        "odd.lumen",
+        "<kfml version=\"5.13\"><factory id=\"1\" uuid=\"E7BF3809-2290-11D7-98E5-00039389B702\"/>"
+        "<factory id=\"2\" uuid=\"FDC1944B-2291-11D7-B1C3-00039389B702\"/><parameter id=\"1\" "
+        "factoryID=\"1\"><parameter id=\"2\" factoryID=\"2\"><curve type=\"1\"><keypoint interpolation=\"1\">"
+        "<time>0/1</time><value>2</value></keypoint><keypoint><time>1/1</time><value>inf</value></keypoint>"
+        "</curve></parameter></parameter></kfml>");
+    std::string const table = _folder.file("odd.csv");
+    outputOf({"convert", odd, table});
+    EXPECT_EQ(contentOf(table), "time,seconds,\"\"\n0/1,0,2\n1/1,1,\n");
+    EXPECT_EQ(jsonOf({"info", table})["channelNames"], Json({""}));
+    std::string const sampled = outputOf({"sample", odd, "--at", "0,1", "--csv"});
+    EXPECT_EQ(outputOf({"sample", _folder.write("sampled.csv", sampled), "--at", "0", "--csv"}),
+              "time,seconds,\"\"\n0/1,0,2\n");
+}
+
 TEST_F(DocumentVerbsTest, ReadingVerbsTakeDocuments) {
     outputOf({"convert", _motion, _document});
     Json const info = jsonOf({"info", _document});
@@ -72,7 +129,7 @@ TEST_F(DocumentVerbsTest, ReadingVerbsTakeDocuments) {
                                                  {"keys", "./1/2"},
                                                  {"sample", "--rate", "500"},
                                                  {"sample", "Hips", "--at", "1f,0.0125", "--slope"}}) {
-        // Offsets come last in a document.
+        // Offsets come last in a document, and then its frame time.
         std::vector<std::string> arguments{verb[0], _motion};
         arguments.insert(arguments.end(), verb.begin() + 1, verb.end());
         Json const ofMotion = jsonOf(arguments);
@@ -81,7 +138,8 @@ TEST_F(DocumentVerbsTest, ReadingVerbsTakeDocuments) {
         if (verb[0] == "sample") {
             Json& series = ofDocument["series"];
             std::erase_if(series.get_ref<Json::array_t&>(), [](Json const& one) {
-                return one["channel"].get<std::string>().find("Offset") != std::string::npos;
+                std::string const channel = one["channel"];
+                return channel == "Frame Time" || channel.find("Offset") != std::string::npos;
             });
         }
         EXPECT_EQ(ofDocument, ofMotion) << Json(verb);

@@ -231,6 +231,12 @@ TEST_F(EditVerbsTest, TheOutputIsReplacedAsAWholeOrNotAtAll) {
     EXPECT_EQ(nowhere.exit, 1);
     EXPECT_EQ(nowhere.err, "lumenkey: " + _folder.file("missing/out.bvh") + ": No such file or directory\n");
 
+    std::string const noPicture = _folder.file("missing/p.svg");
+    Outcome const undrawn = runLumenkey({"reverse", file, "--in-place", "--plot", noPicture});
+    EXPECT_EQ(undrawn.exit, 1);
+    EXPECT_EQ(undrawn.err, "lumenkey: " + noPicture + ": No such file or directory\n");
+    EXPECT_EQ(contentOf(file), kSmallMotion);
+
     // In its own place, there and back.
     ASSERT_EQ(edit(file, {"reverse"}, file).exit, 0);
     EXPECT_NE(readMotionFile(file).values, readMotionText(kSmallMotion, "f").values);
@@ -290,6 +296,12 @@ TEST_F(EditVerbsTest, WrongArgumentsAreToldBeforeAnythingIsWritten) {
         EXPECT_NE(outcome.err.find("\nusage: lumenkey " + each.arguments[0] + " FILE"), std::string::npos);
     }
     EXPECT_EQ(_folder.entryCount(), 2U);
+    // Where only the content tells that it is no table.
+    std::string const nameless = _folder.write("motion", kSmallMotion);
+    Outcome const rows = runLumenkey({"reverse", nameless, "--in-place", "--rows", "input"});
+    EXPECT_EQ(rows.exit, 2);
+    EXPECT_NE(rows.err.find("--rows is for a table, and '" + nameless + "' is none"), std::string::npos)
+        << rows.err;
 }
 
 TEST_F(EditVerbsTest, TheCommandsOfTheGuideDrawItsPictures) {

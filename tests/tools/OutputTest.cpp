@@ -133,6 +133,12 @@ TEST_F(SafeOutputFileTest, KeepsPermissionsAndLinks) {
     EXPECT_EQ(static_cast<unsigned>(fs::status(_folder.file("fresh.txt")).permissions()), 0640U);
 }
 
+TEST_F(SafeOutputFileTest, WritesTheLongestName) {
+    std::string const longest = _folder.file(std::string(255, 'n'));
+    EXPECT_EQ(faultOfWriting(longest), "");
+    EXPECT_EQ(contentOf(longest), "new");
+}
+
 TEST_F(SafeOutputFileTest, RefusesTargetsThatCannotBeWritten) {
     EXPECT_EQ(faultOfWriting(_folder.file("missing/out.txt")), "No such file or directory");
     EXPECT_EQ(faultOfWriting(_folder.path().string()), "Is a directory");

@@ -47,6 +47,26 @@ TEST_F(ProgramTest, InfoTellsWhatAFileHolds) {
         << table.out;
 }
 
+TEST_F(ProgramTest, InfoTellsOfSeveralFilesInTheirOrder) {
+    std::string const one = outputOf({"info", _file});
+    EXPECT_EQ(outputOf({"info", _file, _file, _file}), one + "\n" + one + "\n" + one);
+    Outcome const several = runLumenkey({"info", "none.bvh", _file, _file, "--json"});
+    EXPECT_EQ(several.exit, 1);
+    Json expected = jsonOf({"info", _file});
+    expected["file"] = _file;
+    EXPECT_EQ(Json::parse(several.out, nullptr, false), Json({expected, expected}));
+}
+
+TEST_F(ProgramTest, AWrongArgumentForOneOfSeveralFilesLeavesTheOthers) {
+    std::string const old = _folder.write(
+        "old.lumen", contentOf(LUMENKEY_TEST_SOURCE_DIR "/tests/persistence/data/version3.lumen"));
+    Outcome const outcome = runLumenkey({"upgrade", _file, old, "--frame-rate", "24"});
+    EXPECT_EQ(outcome.exit, 2);
+    EXPECT_EQ(outcome.out, old + ": from version 3.1 to 5.13\n");
+    EXPECT_EQ(outcome.err,
+              "lumenkey: --frame-rate is for documents: '" + _file + "' has a rate of its own\n");
+}
+
 TEST_F(ProgramTest, TreeListsNodes) {
     Outcome const table = runLumenkey({"tree", _file, "--depth", "2"});
     EXPECT_EQ(table.exit, 0);
@@ -261,6 +281,7 @@ TEST_F(ProgramTest, WrongArgumentsExitWithTwoAndTheUsage) {
     expectWrongArguments({"info", _file, "--loud"}, "--loud");
     expectWrongArguments({"keys", _file, "hips.xposition"}, "there is no channel 'hips.xposition' in " +
                                                                 _file + "; did you mean 'Hips.Xposition'?");
+    expectWrongArguments({"tree", _file, "--depth", "-1"}, "must be a whole number from 0 on: '-1'");
     expectWrongArguments({"gallery"}, "--output is required");
     struct {
         std::vector<std::string> arguments;
@@ -276,6 +297,7 @@ TEST_F(ProgramTest, WrongArgumentsExitWithTwoAndTheUsage) {
         {{"sample", "--step", "1/1000000000"}, "more than 10000000 values"},
         {{"sample", "--to", "9000000000000000000", "--step", "1/1000000000"}, "more than 10000000 values"},
         {{"sample", "--count", "18446744073709551615"}, "more than 10000000 values"},
+        {{"sample", "--count", "0"}, "--count: must be a whole number from 1 on: '0'"},
         {{"sample", "--count", "2", "--csv", "--json"}, "--csv"},
         {{"plot", "-o", "p.bmp"}, "must end in .svg, .png or .pdf"},
         {{"plot", "-o", "p.svg", "--width", "1"}, "--width"},
@@ -305,16 +327,82 @@ TEST_F(ProgramTest, FailuresToWriteExitWithOne) {
     EXPECT_EQ(closed.err, "lumenkey: standard output: Broken pipe\nexit 1\n");
 }
 
+TEST_F(ProgramTest, TellsWhereMemoryIsOut) {
+    std::string const large = _folder.write("large.csv", "t,X\n");
+    std::filesystem::resize_file(large, 1'500'000'000);
+    auto const limited = [](std::vector<std::string> arguments) {
+        arguments.insert(arguments.begin(), {"-c", "ulimit -v 1000000; exec \"$0\" \"$@\"", programPath()});
+        return runProgramFile("/bin/sh", arguments);
+    };
+    if (limited({"--version"}).exit != 0) {
+        GTEST_SKIP() << "the program needs more address space by itself, as with a sanitizer";
+    }
+    Outcome const diff = limited({"diff", _file, large});
+    EXPECT_EQ(diff.exit, 2) << "1 says that they differ";
+    EXPECT_EQ(diff.err, "lumenkey: out of memory\n");
+    EXPECT_EQ(limited({"info", _file, large}).err, "lumenkey: " + large + ": out of memory\n");
+}
+
+TEST_F(ProgramTest, EmptyTextsAreWrongArguments) {
+    std::string const document = _folder.file("small.lumen");
+    outputOf({"convert", _file, document});
+    std::string const before = contentOf(document);
+    for (std::vector<std::string> const& arguments :
+         std::vector<std::vector<std::string>>{{"scale", document, "--in-place", "--factor", ""},
+                                               {"scale", document, "--in-place", "--factor="},
+                                               {"bake", document, "--in-place", "--tolerance", ""},
+                                               {"bake", document, "--in-place", "--from", ""},
+                                               {"offset", document, "--value", "1", "-o", ""},
+                                               {"set", document, "Offset.X", "--value", ""},
+                                               {"set", document, "Offset.X", "--value", "1", "-o", ""},
+                                               {"set", document, "Offset.X", "--value", "1", "--at", ""},
+                                               {"upgrade", document, "-o", ""},
+                                               {"add", document, "./", "Double", "", "--value", "1"},
+                                               {"new", _folder.file("new.lumen"), "--name", ""},
+                                               {"hash", document, "Hips", "--at", ""},
+                                               {"hash", document, ""},
+                                               {"sample", document, "--count", ""},
+                                               {"tree", document, "--depth", ""},
+                                               {"info", document, "--frame-rate", ""}}) {
+        Outcome const outcome = runLumenkey(arguments);
+        EXPECT_EQ(outcome.exit, 2) << Json(arguments);
+        EXPECT_EQ(contentOf(document), before) << Json(arguments);
+    }
+    expectWrongArguments({"scale", document, "--in-place", "--factor", ""}, "--factor: it is empty");
+    EXPECT_FALSE(std::filesystem::exists(_folder.file("new.lumen")));
+}
+
 TEST_F(ProgramTest, EveryVerbHelpsWithAnExample) {
-    for (char const* const verb :
+    // What the examples speak of.
+    runProgramFile(LUMENKEY_MAKE_MOTION, {_folder.file("walk.bvh"), "--frames", "300"});
+    _folder.write("old.lumen", contentOf(LUMENKEY_TEST_SOURCE_DIR "/tests/persistence/data/version3.lumen"));
+    outputOf({"convert", _folder.file("walk.bvh"), _folder.file("walk.lumen")});
+    outputOf({"convert", _folder.file("walk.bvh"), _folder.file("edited.lumen")});
+    // In this order one makes what another takes: `add` makes the height that `set` keys.
+    for (std::string const verb :
          {"info",    "tree",   "keys",  "sample",  "plot",    "gallery",    "simplify", "bake", "smooth",
-          "reverse", "offset", "scale", "retime",  "convert", "new",        "add",      "set",  "remove",
-          "hash",    "diff",   "check", "upgrade", "types",   "completion", "manual"}) {
+          "reverse", "offset", "scale", "retime",  "convert", "new",        "add",      "set",  "hash",
+          "remove",  "diff",   "check", "upgrade", "types",   "completion", "manual"}) {
         Outcome const help = runLumenkey({verb, "--help"});
         EXPECT_EQ(help.exit, 0);
-        EXPECT_NE(help.out.find("Usage: lumenkey " + std::string(verb)), std::string::npos) << help.out;
-        EXPECT_NE(help.out.find("Example: lumenkey " + std::string(verb)), std::string::npos) << help.out;
+        EXPECT_NE(help.out.find("Usage: lumenkey " + verb), std::string::npos) << help.out;
         EXPECT_EQ(help.err, "");
+        std::string const mark = "Example: lumenkey ";
+        std::size_t const example = help.out.find(mark + verb);
+        ASSERT_NE(example, std::string::npos) << help.out;
+        std::string const command =
+            help.out.substr(example + mark.size(), help.out.find('\n', example) - example - mark.size());
+        Outcome const run = runProgramFile(
+            "/bin/sh", {"-c",
+                        "cd \"$1\"; export HOME=\"$1\"; mkdir -p .local/share/bash-completion/completions; "
+                        "man() { cat; }; \"$0\" " +
+                            command,
+                        programPath(), _folder.path().string()});
+        EXPECT_EQ(run.exit, 0) << command << "\n" << run.err;
+        if (verb == "new") {
+            outputOf({"add", _folder.file("ball.lumen"), "./", "Folder", "Body"});
+            outputOf({"add", _folder.file("ball.lumen"), "./", "Folder", "Shadow"});
+        }
     }
     EXPECT_NE(runLumenkey({"--help"}).out.find("sample"), std::string::npos);
     EXPECT_TRUE(runLumenkey({"--version"}).out.starts_with("lumenkey "));

@@ -33,6 +33,13 @@ std::string faultOfNumber(std::string_view text, CurveLimits const& limits) {
     return {};
 }
 
+std::string faultOfParts(bool hasTime, bool hasValue) {
+    if (!hasValue) {
+        return "the keypoint has no value: it is passed over";
+    }
+    return hasTime ? "" : "the keypoint has no time: it counts as 0";
+}
+
 std::string faultOfInterpolation(Attributes const& attributes) {
     auto const found = attributes.find("interpolation");
     if (found == attributes.end()) {

@@ -6,6 +6,7 @@
 #include <limits>
 #include <string>
 #include <string_view>
+#include <vector>
 
 namespace lumenkey::tools {
 
@@ -21,6 +22,8 @@ CurveLimits limitsOf(KFChannelBase* channel);
 // What is at fault; empty where nothing is.
 
 std::string faultOfNumber(std::string_view text, CurveLimits const& limits);
+/// Of a keypoint with or without its parts.
+std::string faultOfParts(bool hasTime, bool hasValue);
 /// Of the attributes of a keypoint.
 std::string faultOfInterpolation(Attributes const& attributes);
 /// Of the time of a keypoint, in frames where `countsFrames`; `lastTime` is that of the one before it, and

@@ -4,11 +4,14 @@
 #include "lumenkey/Channels/KFChannelFolder.h"
 #include "lumenkey/Channels/KFFactories.h"
 #include "lumenkey/persistence/KFDocumentVersion.h"
+#include "tools/check/AttributeCheck.h"
 #include "tools/check/CurveCheck.h"
 #include "tools/check/DocumentVocabulary.h"
+#include "tools/output/TextForms.h"
 #include "tools/tree/ChannelClass.h"
 
 #include <algorithm>
+#include <limits>
 #include <map>
 #include <memory>
 #include <optional>
@@ -30,6 +33,11 @@ struct OpenElement {
     /// Of a curve.
     CurveLimits limits;
     Tempus lastTime = kTempusInvalid;
+    /// Where the last of the limits stands.
+    TextPlace limitPlace;
+    /// Of a keypoint.
+    bool hasTime = false;
+    bool hasValue = false;
 };
 
 /// The check of one document.
@@ -37,15 +45,26 @@ class Checker : public DocumentScanner {
 public:
     Checker() : _open(1) {}
 
-    std::vector<DocumentFinding> takeFindings() { return std::move(_findings); }
+    std::vector<DocumentFinding> takeFindings() {
+        sortByPlace(_findings);
+        return std::move(_findings);
+    }
 
 private:
     // --- Findings ---
 
-    /// Nothing where there is nothing to tell.
-    void find(TextPlace const& place, std::string what) {
-        if (!what.empty()) {
-            _findings.push_back({place, std::move(what)});
+    // Nothing where there is nothing to tell.
+
+    void find(TextPlace const& place, std::string what) { tell({place, std::move(what)}); }
+    /// What a reader takes as it is.
+    void findKept(TextPlace const& place, std::string what) { tell({place, std::move(what), false}); }
+    /// Of a number that a reader takes as it is, if it can be read.
+    void checkNumber(TextPlace const& place, std::string_view text, CurveLimits const& limits) {
+        tell({place, faultOfNumber(text, limits), !readNumber(text)});
+    }
+    void tell(DocumentFinding finding) {
+        if (!finding.what.empty()) {
+            _findings.push_back(std::move(finding));
         }
     }
 
@@ -66,6 +85,7 @@ private:
             _skipped = 1;
             return;
         }
+        checkAttributes(element, attributes);
         _open.push_back(std::move(element));
     }
 
@@ -103,23 +123,36 @@ private:
         } else if (element.name == "parameter") {
             return isSoundChannel(element, attributes);
         } else if (element.name == "curve") {
-            checkCurve(element, attributes);
+            element.limits = limitsOf(keptExampleOf(_open.back().factory));
         } else if (element.name == "keypoint") {
-            find(element.place, faultOfInterpolation(attributes));
+            findKept(element.place, faultOfInterpolation(attributes));
         }
         return true;
+    }
+
+    void checkAttributes(OpenElement const& element, Attributes const& attributes) {
+        CurveLimits const limits =
+            element.name == "parameter" ? limitsOf(keptExampleOf(element.factory)) : element.limits;
+        for (AttributeFault& fault : faultsOfAttributes(element.name, attributes, limits, _countsFrames)) {
+            tell({element.place, std::move(fault.what), !fault.isKept});
+        }
     }
 
     void checkFactory(OpenElement const& element, Attributes const& attributes) {
         std::optional<std::uint64_t> const number = readWhole(attributeOf(attributes, "id"));
         std::string const uuidText(attributeOf(attributes, "uuid"));
         BXUUID uuid;
-        if (!number || !BXUUID::fromText(uuidText, &uuid)) {
+        if (!number || *number > std::numeric_limits<std::uint32_t>::max() ||
+            !BXUUID::fromText(uuidText, &uuid)) {
             find(element.place, "a factory needs an 'id', which is a whole number, and a 'uuid'");
             return;
         }
         KFFactory* const factory = KFFactories::getInstance().findFactory(uuid);
-        _factories[*number] = factory;
+        if (auto const [before, isNew] = _factories.try_emplace(*number, factory); !isNew) {
+            find(element.place, "the factory has the id " + std::to_string(*number) + " of one before it" +
+                                    (factory == nullptr ? "" : ", whose place it takes"));
+            before->second = factory == nullptr ? before->second : factory;
+        }
         if (factory == nullptr) {
             find(element.place, "the class " + uuidText + " is unknown: its channels are passed over");
         }
@@ -174,15 +207,6 @@ private:
         return place->second.get();
     }
 
-    void checkCurve(OpenElement& element, Attributes const& attributes) {
-        element.limits = limitsOf(keptExampleOf(_open.back().factory));
-        for (std::string_view const name : {"value", "default"}) {
-            if (attributes.contains(name)) {
-                find(element.place, faultOfNumber(attributeOf(attributes, name), element.limits));
-            }
-        }
-    }
-
     // --- Texts ---
 
     void text(std::string_view more) override {
@@ -198,6 +222,8 @@ private:
         }
         OpenElement const element = std::move(_open.back());
         _open.pop_back();
+        _open.back().hasTime |= element.name == "time";
+        _open.back().hasValue |= element.name == "value";
         if (!canBeRead(element.text, element.word->text, _countsFrames)) {
             find(element.place,
                  "'" + element.text + "' is " + std::string(nameOfTextKind(element.word->text)));
@@ -209,18 +235,35 @@ private:
             find(element.place, "the number " + element.text + " is out of the limits of '" + element.name +
                                     "', 0 to " + std::to_string(element.word->greatest));
         } else if (element.word->parent == "curve") {
-            CurveLimits& limits = _open.back().limits;
-            if (element.name == "min") {
-                limits.low = *readNumber(element.text);
-            } else if (element.name == "max") {
-                limits.high = *readNumber(element.text);
-            }
+            endPartOfCurve(element);
         } else if (element.word->parent == "keypoint") {
-            OpenElement& curve = _open[_open.size() - 2];
-            if (element.name == "value") {
-                find(element.place, faultOfNumber(element.text, curve.limits));
-            } else if (element.name == "time") {
-                find(element.place, faultOfOrder(element.text, _countsFrames, curve.lastTime));
+            endPartOfKeypoint(element);
+        } else if (element.name == "curve" && element.limits.low > element.limits.high) {
+            find(element.limitPlace, "the least value, " + shortestText(element.limits.low) +
+                                         ", is above the greatest, " + shortestText(element.limits.high));
+        }
+    }
+
+    void endPartOfCurve(OpenElement const& element) {
+        OpenElement& curve = _open.back();
+        if (element.name == "min" || element.name == "max") {
+            (element.name == "min" ? curve.limits.low : curve.limits.high) = *readNumber(element.text);
+            curve.limitPlace = element.place;
+        } else if (element.name == "keypoint") {
+            find(element.place, faultOfParts(element.hasTime, element.hasValue));
+        }
+    }
+
+    void endPartOfKeypoint(OpenElement const& element) {
+        OpenElement& keypoint = _open.back();
+        OpenElement& curve = _open[_open.size() - 2];
+        if (element.name == "value") {
+            checkNumber(element.place, element.text, curve.limits);
+        } else if (element.name == "time") {
+            if (keypoint.hasValue) {
+                find(element.place, "the time stands behind the value, where it comes too late");
+            } else {
+                findKept(element.place, faultOfOrder(element.text, _countsFrames, curve.lastTime));
             }
         }
     }
@@ -239,12 +282,20 @@ private:
 std::vector<DocumentFinding> checkDocument(std::string const& file, ReadingProgress const& progress) {
     Checker checker;
     checker.scan(file, progress);
-    std::vector<DocumentFinding> findings = checker.takeFindings();
+    return checker.takeFindings();
+}
+
+std::vector<DocumentFinding> checkDocumentText(std::string_view text, ReadingProgress const& progress) {
+    Checker checker;
+    checker.scanText(text, progress);
+    return checker.takeFindings();
+}
+
+void sortByPlace(std::vector<DocumentFinding>& findings) {
     std::stable_sort(
         findings.begin(), findings.end(), [](DocumentFinding const& a, DocumentFinding const& b) {
             return std::pair(a.place.line, a.place.column) < std::pair(b.place.line, b.place.column);
         });
-    return findings;
 }
 
 } // namespace lumenkey::tools

@@ -3,6 +3,7 @@
 #include "tools/check/DocumentScanner.h"
 
 #include <string>
+#include <string_view>
 #include <vector>
 
 namespace lumenkey::tools {
@@ -11,15 +12,23 @@ namespace lumenkey::tools {
 struct DocumentFinding {
     TextPlace place;
     std::string what;
+    /// Whether a document that is written anew would be without it.
+    bool isLoss = true;
 };
 
 /// Looks a document through without reading it into channels: text that is no XML, elements and classes that
 /// the library doesn't know and so passes over, channels without a class or with an ID that a neighbour has,
-/// values that can't be read or lie beyond the limits of their curve, and keypoints that don't stand in the
-/// order of time. In the order of the text. Nothing follows text that is no XML.
+/// factories of one number, values and attributes that can't be read or lie beyond their limits, limits that
+/// cross, keypoints without a time or a value or out of the order of time, and a version that is unknown. In
+/// the order of the text. Nothing follows text that is no XML.
 ///
 /// The limits of a curve are those that the document gives, else those of the class. Throws `InputError` for
 /// a file that can't be read.
 std::vector<DocumentFinding> checkDocument(std::string const& file, ReadingProgress const& progress);
+/// The same for the content of a file.
+std::vector<DocumentFinding> checkDocumentText(std::string_view text, ReadingProgress const& progress);
+
+/// Puts findings in the order of the text.
+void sortByPlace(std::vector<DocumentFinding>& findings);
 
 } // namespace lumenkey::tools

@@ -56,12 +56,38 @@ public:
                 progress(done / size);
             }
         }
+        rethrow();
+    }
+
+    void runText(std::string_view text, ReadingProgress const& progress) {
+        constexpr std::size_t block = 65'536;
+        auto const size = static_cast<double>(text.size());
+        for (bool isLast = false; !isLast && !_isStopped;) {
+            std::string_view const part = text.substr(0, block);
+            text.remove_prefix(part.size());
+            isLast = text.empty();
+            endBlock(XML_Parse(_parser.get(), part.data(), static_cast<int>(part.size()), isLast));
+            if (progress) {
+                progress(1 - static_cast<double>(text.size()) / size);
+            }
+        }
+        rethrow();
+    }
+
+private:
+    void rethrow() const {
         if (_thrown) {
             std::rethrow_exception(_thrown);
         }
     }
 
-private:
+    void endBlock(XML_Status status) {
+        if (status != XML_STATUS_OK && !_isStopped) {
+            _isStopped = true;
+            _scanner.fault(place(), XML_ErrorString(XML_GetErrorCode(_parser.get())));
+        }
+    }
+
     /// Nothing may be thrown through the parser, which is written in C.
     template <class Work> static void guard(void* self, Work const& work) {
         auto& run = *static_cast<Run*>(self);
@@ -104,10 +130,7 @@ private:
             throw InputError{file, 1, 1, systemErrorText(errno)};
         }
         *isLast = got < block;
-        if (XML_ParseBuffer(_parser.get(), static_cast<int>(got), *isLast) != XML_STATUS_OK && !_isStopped) {
-            _isStopped = true;
-            _scanner.fault(place(), XML_ErrorString(XML_GetErrorCode(_parser.get())));
-        }
+        endBlock(XML_ParseBuffer(_parser.get(), static_cast<int>(got), *isLast));
         return got;
     }
 
@@ -119,6 +142,10 @@ private:
 
 void DocumentScanner::scan(std::string const& file, ReadingProgress const& progress) {
     Run(*this).run(file, progress);
+}
+
+void DocumentScanner::scanText(std::string_view text, ReadingProgress const& progress) {
+    Run(*this).runText(text, progress);
 }
 
 std::string_view attributeOf(Attributes const& attributes, std::string_view name) {

@@ -29,6 +29,8 @@ public:
 
     /// Throws `InputError` for a file that can't be read, and whatever the operations below throw.
     void scan(std::string const& file, ReadingProgress const& progress);
+    /// The same for the content of a file.
+    void scanText(std::string_view text, ReadingProgress const& progress);
 
 protected:
     DocumentScanner() = default;

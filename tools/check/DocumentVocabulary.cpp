@@ -3,6 +3,7 @@
 #include "tools/time/TimeFraction.h"
 
 #include <charconv>
+#include <cmath>
 #include <limits>
 
 namespace lumenkey::tools {
@@ -13,6 +14,7 @@ constexpr std::uint64_t kMost32 = std::numeric_limits<std::uint32_t>::max();
 constexpr std::uint64_t kMost64 = std::numeric_limits<std::uint64_t>::max();
 constexpr std::uint64_t kLastFadeCurve = 3;
 constexpr std::uint64_t kLastExtrapolation = 4;
+constexpr std::uint64_t kLastCurveType = 1;
 
 constexpr DocumentWord kWords[] = {
     {"", "kfml"},
@@ -34,7 +36,7 @@ constexpr DocumentWord kWords[] = {
     {"parameter", "fadeOutOffset", TextKind::Time, kMost64, kOfValues},
     {"parameter", "fadeInCurve", TextKind::Whole32, kLastFadeCurve, kOfValues},
     {"parameter", "fadeOutCurve", TextKind::Whole32, kLastFadeCurve, kOfValues},
-    {"curve", "numberOfKeypoints", TextKind::Whole32},
+    {"curve", "numberOfKeypoints", TextKind::Whole32, kMost32},
     {"curve", "min", TextKind::Number},
     {"curve", "max", TextKind::Number},
     {"curve", "preExtrapolation", TextKind::Whole32, kLastExtrapolation},
@@ -49,6 +51,25 @@ constexpr DocumentWord kWords[] = {
     {"keypoint", "inputTangentValue", TextKind::Number},
     {"keypoint", "outputTangentTime", TextKind::Number},
     {"keypoint", "outputTangentValue", TextKind::Number},
+};
+
+constexpr DocumentAttribute kAttributes[] = {
+    {"parameter", "id", TextKind::Whole32, kMost32},
+    {"parameter", "factoryID", TextKind::Whole32, kMost32},
+    {"parameter", "flags", TextKind::Whole64},
+    {"parameter", "default", TextKind::Number},
+    {"parameter", "value", TextKind::Number},
+    {"timing", "in", TextKind::Time},
+    {"timing", "out", TextKind::Time},
+    {"timing", "offset", TextKind::Time},
+    {"curve", "type", TextKind::Whole32, kLastCurveType},
+    {"curve", "value", TextKind::Number},
+    {"curve", "default", TextKind::Number},
+    {"curve", "parametric", TextKind::Bool},
+    {"curve", "round", TextKind::Bool},
+    {"curve", "retimingExtrapolation", TextKind::Bool},
+    {"keypoint", "enabled", TextKind::Bool},
+    {"keypoint", "flags", TextKind::Whole32, kMost32},
 };
 
 template <class Number> std::optional<Number> readAs(std::string_view text) {
@@ -89,7 +110,12 @@ DocumentWord const* documentWord(std::string_view parent, std::string_view name)
     return nullptr;
 }
 
-std::optional<double> readNumber(std::string_view text) { return readAs<double>(text); }
+std::span<DocumentAttribute const> documentAttributes() { return kAttributes; }
+
+std::optional<double> readNumber(std::string_view text) {
+    std::optional<double> const number = readAs<double>(text);
+    return number && std::isnan(*number) ? std::nullopt : number;
+}
 std::optional<std::uint64_t> readWhole(std::string_view text) { return readAs<std::uint64_t>(text); }
 
 bool canBeRead(std::string_view text, TextKind kind, bool countsFrames) {

@@ -2,6 +2,7 @@
 
 #include <cstdint>
 #include <optional>
+#include <span>
 #include <string_view>
 
 namespace lumenkey::tools {
@@ -25,12 +26,25 @@ struct DocumentWord {
 /// Null for an element that is unknown there. The parent of the outermost element has an empty name.
 DocumentWord const* documentWord(std::string_view parent, std::string_view name);
 
+/// An attribute that the library reads.
+struct DocumentAttribute {
+    std::string_view element;
+    std::string_view name;
+    TextKind text = TextKind::None;
+    /// Of a whole number.
+    std::uint64_t greatest = UINT64_MAX;
+};
+
+/// Those of all elements.
+std::span<DocumentAttribute const> documentAttributes();
+
 /// Whether a text can be read as its kind; `countsFrames` is for documents below version 5, where times are
 /// numbers.
 bool canBeRead(std::string_view text, TextKind kind, bool countsFrames);
 /// What such a text should have been: `a number`, and so on.
 std::string_view nameOfTextKind(TextKind kind);
 
+/// Nothing for `nan` either, which no curve can use.
 std::optional<double> readNumber(std::string_view text);
 std::optional<std::uint64_t> readWhole(std::string_view text);
 

@@ -1,6 +1,6 @@
 #include "tools/cli/Verbs.h"
 
-#include "lumenkey/Channels/KFChannelRef.h"
+#include "lumenkey/Channels/KFChannelFlags.h"
 #include "lumenkey/Channels/KFFactories.h"
 #include "lumenkey/Channels/KFFactory.h"
 #include "tools/cli/AuthorOptions.h"
@@ -10,6 +10,7 @@
 
 #include <CLI/CLI.hpp>
 #include <memory>
+#include <utility>
 
 namespace lumenkey::tools {
 
@@ -38,11 +39,14 @@ KFChannelFactory& requireMaker(std::string const& type) {
                                            : "; did you mean '" + match.best() + "'?")};
 }
 
-KFChannelFolder& requireParent(ChannelInput const& input, AddOptions const& options) {
+ChannelTree::Node requireParent(ChannelInput const& input, AddOptions const& options) {
     ChannelTree::Node const node = input.nodeNamed(options.parent);
     KFChannelFolder* const parent = input.tree().asFolder(node);
     if (parent == nullptr || parent->isCompoundChannel()) {
         throw UsageError{"'" + options.parent + "' is no folder"};
+    }
+    if (parent->isLocked(true)) {
+        throw UsageError{"'" + options.parent + "' is locked"};
     }
     if (parent->getDescendants() != nullptr) {
         for (KFChannelBase const* const child : *parent->getDescendants()) {
@@ -51,7 +55,10 @@ KFChannelFolder& requireParent(ChannelInput const& input, AddOptions const& opti
             }
         }
     }
-    return *parent;
+    if (parent->testFoldFlag(kFoldFlagChildrenNotSaved)) {
+        throw UsageError{"'" + options.parent + "' is a folder whose children documents leave out"};
+    }
+    return node;
 }
 
 void runAdd(AddOptions const& options, OutputSink& out) {
@@ -59,10 +66,15 @@ void runAdd(AddOptions const& options, OutputSink& out) {
     KFChannelFactory& maker = requireMaker(options.type);
     ChannelInput const input(options.author.input);
     requireDocument(input);
-    KFChannelFolder& parent = requireParent(input, options);
-    std::unique_ptr<KFChannelBase> const added(maker.createChannel(options.name, freeIDBelow(parent)));
+    ChannelTree::Node const parent = requireParent(input, options);
+    std::unique_ptr<KFChannelBase> added(
+        maker.createChannel(options.name, freeIDBelow(*input.tree().asFolder(parent))));
     if (added == nullptr) {
         throw UsageError{"'" + options.type + "' is a class without channels of its own"};
+    }
+    if (added->testFlag(kChannelFlagNotSaved)) {
+        throw UsageError{"'" + options.type +
+                         "' is a class that documents leave out: nothing would be stored"};
     }
     if (!options.valueOption->empty()) {
         if (!added->isValueChannel()) {
@@ -70,12 +82,10 @@ void runAdd(AddOptions const& options, OutputSink& out) {
         }
         setConstant(static_cast<KFChannel&>(*added), options.value, options.name);
     }
-    parent.push_back(added.get());
-    added->finishInitializing();
+    ChannelTree::Node const node = input.file().tree->append(parent, std::move(added));
+    input.tree().base(node).finishInitializing();
     options.author.write(input);
-    std::string const path = KFChannelRef(added.get(), &input.tree().base(ChannelTree::kTop)).str();
-    parent.removeDescendant(added.get());
-    out.write(path + "\n");
+    out.write(input.tree().path(node) + "\n");
 }
 
 } // namespace
@@ -98,7 +108,7 @@ Verb declareAdd(CLI::App& program) {
     verb->footer(
         "It comes behind the others; its path of IDs is printed. lumenkey types lists the classes.\n\n"
         "Example: lumenkey add ball.lumen ./ Double Height --value 1.5");
-    return {verb, "FILE PARENT TYPE NAME [--value V] [-o OUT | --in-place] [--frame-rate R]",
+    return {verb, "FILE PARENT TYPE NAME [--value V] [-o OUT | --in-place] [--force] [--frame-rate R]",
             [options](OutputSink& out) { runAdd(*options, out); }};
 }
 

@@ -18,6 +18,7 @@ void AuthorOptions::addRest(CLI::App& verb) {
         verb.add_option("-o,--output", output.output, "Leave FILE as it is and write OUT.lumen, .csv or .bvh")
             ->option_text("OUT");
     verb.add_flag("--in-place", output.inPlace, "Change FILE, as is done without -o")->excludes(out);
+    addForceOption(verb, output.force);
     input.addFrameRate(verb);
 }
 
@@ -30,7 +31,8 @@ void AuthorOptions::check() const {
 void AuthorOptions::write(ChannelInput const& opened) const {
     ChannelFormat const format = output.formatFor(opened.file().format);
     Progress bar("writing");
-    writeChannelFile({opened.file(), format, RowsOf::Keypoints, {}, output.target(input.file)}, bar.teller());
+    writeChannelFile({opened.file(), format, RowsOf::Keypoints, {}, output.target(input.file), output.force},
+                     bar.teller());
 }
 
 std::string limitsText(KFChannel const& channel, double value) {

@@ -41,9 +41,10 @@ void InputOptions::add(CLI::App& verb) {
 void InputOptions::addFrameRate(CLI::App& verb) { addFrameRateOption(verb, frameRate); }
 
 void addFrameRateOption(CLI::App& verb, std::string& rate) {
-    verb.add_option("--frame-rate", rate,
-                    "Of a document: frames a second, where times are given in frames (else as its keypoints "
-                    "stand), or where it is an old one that counts frames (else 30)")
+    verb.add_option(
+            "--frame-rate", rate,
+            "Of a document: frames a second, where times are given in frames (else as it says "
+            "itself, or as its keypoints stand), or where it is an old one that counts frames (else 30)")
         ->option_text("R");
 }
 

@@ -15,6 +15,7 @@ namespace {
 struct ConvertOptions {
     InputOptions input;
     std::string output;
+    bool force = false;
 };
 
 void runConvert(ConvertOptions const& options) {
@@ -22,7 +23,7 @@ void runConvert(ConvertOptions const& options) {
     ChannelInput const input(options.input);
     ChannelFormat const format = requireOutputFormat(options.output, input.file().format);
     Progress bar("writing");
-    writeChannelFile({input.file(), format, RowsOf::Input, {}, options.output}, bar.teller());
+    writeChannelFile({input.file(), format, RowsOf::Input, {}, options.output, options.force}, bar.teller());
 }
 
 } // namespace
@@ -35,12 +36,13 @@ Verb declareConvert(CLI::App& program) {
         ->option_text(" ")
         ->required();
     options->input.addFrameRate(*verb);
+    addForceOption(*verb, options->force);
     verb->footer(
         "A document holds everything, the skeleton of a BVH too, which comes back from it with the same "
         "numbers.\nA CSV has the keypoints; a document has a BVH in it where its folders are joints and "
         "its channels positions and rotations.\n\n"
         "Example: lumenkey convert walk.bvh walk.lumen");
-    return {verb, "IN OUT [--frame-rate R]", [options](OutputSink&) { runConvert(*options); }};
+    return {verb, "IN OUT [--frame-rate R] [--force]", [options](OutputSink&) { runConvert(*options); }};
 }
 
 } // namespace lumenkey::tools

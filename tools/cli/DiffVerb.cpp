@@ -87,8 +87,10 @@ int runDiff(DiffOptions const& options, OutputSink& out) {
                         TempusMaximum(before.file().lastTime, after.file().lastTime)};
     Tempus const step = TempusMinimum(comparedStep(before.file(), span, std::nullopt),
                                       comparedStep(after.file(), span, std::nullopt));
-    std::vector<NodeDifference> const all =
-        differencesBetween(before.tree(), after.tree(), span, step, Progress("comparing").teller());
+    bool const areDocuments =
+        before.file().format == ChannelFormat::Document && after.file().format == ChannelFormat::Document;
+    std::vector<NodeDifference> const all = differencesBetween(before.tree(), after.tree(), areDocuments,
+                                                               span, step, Progress("comparing").teller());
     if (options.json) {
         writeJson(all, out);
     } else {
@@ -112,8 +114,10 @@ Verb declareDiff(CLI::App& program) {
     verb->add_flag("--json", options->json, "For programs: every number in full");
     verb->footer(
         "A line for each channel that was added, removed or changed; for a changed curve, how far it lies "
-        "off at most,\nand where, looked at ten times in each frame. Exits 0 where the files hold the same, "
-        "1 where they differ, and 2\nin trouble.\n\nExample: lumenkey diff walk.lumen edited.lumen");
+        "off at most,\nand where, looked at ten times in each frame, at the keypoints and beside them. Exits "
+        "0 "
+        "where the files hold\nthe same, 1 where they differ, and 2 in trouble.\n\nExample: lumenkey diff "
+        "walk.lumen edited.lumen");
     Verb declared{verb, "A B [--frame-rate R] [--json]", {}};
     declared.runForExit = [options](OutputSink& out) { return runDiff(*options, out); };
     declared.exitInTrouble = kExitWrongArguments;

@@ -6,8 +6,10 @@
 #include "tools/cli/PlotOptions.h"
 #include "tools/cli/Progress.h"
 #include "tools/cli/UsageError.h"
+#include "tools/curve/Keypoint.h"
 #include "tools/edit/CurveChange.h"
 #include "tools/export/ChannelFileWriter.h"
+#include "tools/output/SafeOutputFile.h"
 #include "tools/plot/PlotChart.h"
 
 #include <CLI/CLI.hpp>
@@ -47,15 +49,22 @@ public:
         readOptions();
         ChannelInput const input(_options.input);
         _format = _options.output.formatFor(input.file().format);
+        checkRows(_format);
         std::vector<Node> const channels = channelsOf(input);
         _span = spanOf(input.file());
         _verb.prepare(input.file(), _span);
         editAll(input, channels);
 
         EditReport report{_verb.words(), target(), _format, _span, {}, std::move(_edited)};
-        report.written = writeFile(input, channels);
+        // So that a picture which can't be written leaves FILE as it is.
+        std::optional<SafeOutputFile> picture;
         if (_picture) {
-            savePicture(report);
+            picture.emplace(_options.plot);
+            drawPicture(report).writeTo(*picture);
+        }
+        report.written = writeFile(input, channels);
+        if (picture) {
+            picture->close();
         }
         _options.json ? report.writeJson(out) : report.writeTable(out);
     }
@@ -63,11 +72,14 @@ public:
 private:
     std::string const& target() const { return _options.output.target(_options.input.file); }
 
-    void readOptions() {
-        std::optional<ChannelFormat> const format = _options.output.check(_options.input.file);
-        if (format && *format != ChannelFormat::Csv && !_options.rows.empty()) {
-            throw UsageError{"--rows is for a table: '" + target() + "' must end in .csv then"};
+    void checkRows(std::optional<ChannelFormat> const& written) const {
+        if (written && *written != ChannelFormat::Csv && !_options.rows.empty()) {
+            throw UsageError{"--rows is for a table, and '" + target() + "' is none: -o OUT.csv makes one"};
         }
+    }
+
+    void readOptions() {
+        checkRows(_options.output.check(_options.input.file));
         if (!_options.plot.empty()) {
             _picture = requirePlotFormat(_options.plot);
         }
@@ -107,12 +119,11 @@ private:
         }
     }
 
-    TimeSpan keyedSpan(KFChannel& channel) const {
-        TimeSpan keyed;
-        KFCurve& curve = *channel.getCurveInterface();
-        curve.getFirstKeypoint(&keyed.from, nullptr);
-        curve.getLastKeypoint(&keyed.to, nullptr);
-        return {TempusMaximum(_span.from, keyed.from), TempusMinimum(_span.to, keyed.to)};
+    /// That part of the stretch in which keypoints lie.
+    TimeSpan keyedSpan(KFSpline const* spline) const {
+        std::optional<KeypointEnds> const ends = keypointEnds(spline);
+        return ends ? TimeSpan{TempusMaximum(_span.from, ends->first), TempusMinimum(_span.to, ends->last)}
+                    : _span;
     }
 
     EditedChannel edit(ChannelTree const& tree, Node node, Tempus const& step) {
@@ -121,7 +132,7 @@ private:
                              channel.getNumberOfKeyframes()};
         std::unique_ptr<KFCurveInterface> const copy(tree.curve(node).cloneCurve());
         auto& before = static_cast<KFCurve&>(*copy);
-        TimeSpan const keyed = keyedSpan(channel);
+        TimeSpan const keyed = keyedSpan(tree.spline(node));
         if (edited.keypointsBefore > 0 && !(keyed.to < keyed.from) && !channel.isLocked(true)) {
             _verb.apply(channel, keyed);
         }
@@ -136,9 +147,9 @@ private:
     WrittenRows writeFile(ChannelInput const& input, std::vector<Node> const& channels) const {
         bool const areKeypoints = _options.rows.empty() ? !_verb.sampleStep() : _options.rows == "keypoints";
         Progress bar("writing");
-        return writeChannelFile(
-            {input.file(), _format, areKeypoints ? RowsOf::Keypoints : RowsOf::Input, channels, target()},
-            bar.teller());
+        return writeChannelFile({input.file(), _format, areKeypoints ? RowsOf::Keypoints : RowsOf::Input,
+                                 channels, target(), _options.output.force},
+                                bar.teller());
     }
 
     /// The stretch and where it comes to; around a part of the file, some of what lies beside it.
@@ -161,13 +172,13 @@ private:
         panelOfUnit(_chart, edited.unit).curves.push_back({edited.channel, std::move(now), std::move(old)});
     }
 
-    void savePicture(EditReport const& report) {
+    PlotCanvas drawPicture(EditReport const& report) {
         _chart.title =
             _verb.words().name + " " + std::filesystem::path(_options.input.file).filename().string();
         _chart.subtitle = report.summary();
         PlotCanvas canvas(*_picture, kPictureWidth, kPictureHeight);
         _chart.draw(canvas);
-        canvas.save(_options.plot);
+        return canvas;
     }
 
     EditVerb& _verb;
@@ -231,7 +242,7 @@ Verb declareEdit(CLI::App& program, std::shared_ptr<EditVerb> const& verb) {
     arguments->footer(footerOf(words, verb->sampleStep().has_value()));
     return {arguments,
             "FILE [CHANNEL...] " + words.usage + (words.usage.empty() ? "" : " ") +
-                "(-o OUT.lumen|csv|bvh | --in-place) [--from T] [--to T] [--rows input|keypoints] "
+                "(-o OUT.lumen|csv|bvh | --in-place) [--force] [--from T] [--to T] [--rows input|keypoints] "
                 "[--plot PICTURE.svg|png|pdf] [--frame-rate R] [--json]",
             [verb, options](OutputSink& out) { EditRun(*verb, *options).run(out); }};
 }

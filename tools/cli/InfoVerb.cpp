@@ -79,10 +79,15 @@ std::uint64_t keypointCount(ChannelInput const& input, std::vector<ChannelTree::
     return count;
 }
 
-void writeJson(ChannelInput const& input, std::vector<ChannelTree::Node> const& channels, OutputSink& out) {
+void writeJson(ChannelInput const& input, std::vector<ChannelTree::Node> const& channels, bool isOneOfSeveral,
+               OutputSink& out) {
     ChannelFile const& file = input.file();
     JsonWriter json(out);
     json.beginObject();
+    if (isOneOfSeveral) {
+        json.key("file");
+        json.string(file.file);
+    }
     json.key("format");
     json.string(channelFormatName(file.format));
     if (isDocument(input)) {
@@ -208,11 +213,8 @@ int tellFile(std::string const& file, InfoOptions const& options, OutputSink& ou
     ChannelInput const input(InputOptions{file, options.frameRate});
     std::vector<ChannelTree::Node> const channels = input.tree().channelsBelow(ChannelTree::kTop);
     if (options.json) {
-        writeJson(input, channels, out);
+        writeJson(input, channels, options.files.size() > 1, out);
         return kExitDone;
-    }
-    if (file != options.files.front()) {
-        out.write("\n");
     }
     writeSummary(input, channels, out);
     writeChannels(input.tree(), channels, out);
@@ -220,9 +222,14 @@ int tellFile(std::string const& file, InfoOptions const& options, OutputSink& ou
 }
 
 int runInfo(InfoOptions const& options, OutputSink& out) {
-    return forSeveralFiles(options.files, out, [&options](std::string const& file, OutputSink& text) {
+    auto const work = [&options](std::string const& file, OutputSink& text) {
         return tellFile(file, options, text);
-    });
+    };
+    SeveralTexts texts{"", "\n", ""};
+    if (options.json) {
+        texts = {"[\n", ",\n", "]\n"};
+    }
+    return forSeveralFiles(options.files, out, work, texts);
 }
 
 } // namespace
@@ -234,7 +241,9 @@ Verb declareInfo(CLI::App& program) {
     addFrameRateOption(*verb, options->frameRate);
     verb->add_flag("--json", options->json,
                    "For programs: counts, exact times and the names of the channels");
-    verb->footer("Example: lumenkey info walk.bvh");
+    verb->footer(
+        "With --json several FILEs make one array, in which each tells its name; one that is at fault "
+        "is left out.\n\nExample: lumenkey info walk.bvh");
     Verb declared{verb, "FILE... [--frame-rate R] [--json]", {}};
     declared.runForExit = [options](OutputSink& out) { return runInfo(*options, out); };
     return declared;

@@ -49,7 +49,7 @@ void writeKeypoint(JsonWriter& json, Keypoint const& key) {
 
 /// A channel may have no spline.
 std::vector<void*> handlesOf(KFSpline* spline) {
-    return spline == nullptr ? std::vector<void*>() : keypointHandles(*spline);
+    return spline == nullptr ? std::vector<void*>() : everyKeypointHandle(*spline);
 }
 
 void writeJson(std::string const& channel, KFSpline* spline, OutputSink& out) {

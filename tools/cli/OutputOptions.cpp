@@ -13,6 +13,12 @@ void OutputOptions::add(CLI::App& verb) {
                         "document made from one")
             ->option_text("OUT");
     verb.add_flag("--in-place", inPlace, "The same, in the place of FILE")->excludes(out);
+    addForceOption(verb, force);
+}
+
+void addForceOption(CLI::App& verb, bool& force) {
+    verb.add_flag("--force", force,
+                  "Write a document anew also without what lumenkey check says is passed over in it");
 }
 
 std::optional<ChannelFormat> OutputOptions::check(std::string const& file) const {

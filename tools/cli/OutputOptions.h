@@ -15,8 +15,9 @@ namespace lumenkey::tools {
 struct OutputOptions {
     std::string output;
     bool inPlace = false;
+    bool force = false;
 
-    /// Declares `-o` and `--in-place`.
+    /// Declares `-o`, `--in-place` and `--force`.
     void add(CLI::App& verb);
     /// Before the file is read: the format that the names tell, or nothing. Throws `UsageError` where none is
     /// asked for, or one that can't be written.
@@ -26,6 +27,8 @@ struct OutputOptions {
     /// What is written.
     std::string const& target(std::string const& file) const { return output.empty() ? file : output; }
 };
+
+void addForceOption(CLI::App& verb, bool& force);
 
 /// What the name of an output asks for. Throws `UsageError` for what can't be written from this input; of an
 /// unknown input it says nothing.

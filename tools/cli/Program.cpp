@@ -9,6 +9,7 @@
 #include "tools/output/TextForms.h"
 
 #include <CLI/CLI.hpp>
+#include <exception>
 #include <map>
 #include <new>
 #include <unistd.h>
@@ -40,6 +41,15 @@ private:
 
 void complain(std::string const& text) { writeFully(STDERR_FILENO, "lumenkey: " + text + "\n"); }
 
+/// An empty text would count as 0, or as if the option weren't there.
+void refuseEmptyTexts(CLI::App& verb) {
+    CLI::Validator const isSaid([](std::string& text) { return text.empty() ? "it is empty" : ""; }, "");
+    for (CLI::Option* const option :
+         verb.get_options([](CLI::Option* each) { return each->get_items_expected_max() > 0; })) {
+        option->check(isSaid);
+    }
+}
+
 class Program {
 public:
     Program() {
@@ -62,6 +72,7 @@ public:
         for (Verb const& verb : _verbs) {
             _usages[verb.arguments->get_name()] = verb.usage;
             verb.arguments->formatter(std::make_shared<HelpFormatter>(_usages));
+            refuseEmptyTexts(*verb.arguments);
         }
         _app.formatter(std::make_shared<HelpFormatter>(_usages));
     }
@@ -101,6 +112,10 @@ private:
             complain(error.text());
         } catch (OutputError const& error) {
             complain(printableText(error.target) + ": " + error.what);
+        } catch (std::bad_alloc const&) {
+            complain("out of memory");
+        } catch (std::exception const& error) {
+            complain(printableText(error.what()));
         }
         return verb.exitInTrouble;
     }

@@ -3,6 +3,7 @@
 #include <chrono>
 #include <functional>
 #include <string>
+#include <string_view>
 
 namespace lumenkey::tools {
 
@@ -12,12 +13,29 @@ enum class ProgressOf {
     Output,
 };
 
+/// Where bars are drawn, and the clock that they go by.
+struct ProgressScreen {
+    using Clock = std::chrono::steady_clock;
+
+    bool isSeen = false;
+    /// Results go there too.
+    bool showsResults = false;
+    std::function<Clock::time_point()> now;
+    std::function<void(std::string_view)> write;
+
+    /// Standard error.
+    static ProgressScreen const& real();
+};
+
+class ProgressPart;
+
 /// A bar on standard error while work lasts over a second and a person sits at the terminal; nothing
 /// otherwise, nor while another one lives: work that is a part of other work shows nothing of its own. It is
 /// wiped away at the end.
 class Progress {
 public:
-    explicit Progress(std::string what, ProgressOf kind = ProgressOf::Work);
+    explicit Progress(std::string what, ProgressOf kind = ProgressOf::Work,
+                      ProgressScreen const& screen = ProgressScreen::real());
     ~Progress();
     Progress(Progress const&) = delete;
     Progress& operator=(Progress const&) = delete;
@@ -27,13 +45,37 @@ public:
     /// The same as a function, for as long as the bar lives; empty where nothing is ever drawn.
     std::function<void(double)> teller();
 
-private:
-    using Clock = std::chrono::steady_clock;
+    /// Whether an update would draw something now.
+    bool isDue() const { return _hasLine && _screen.now() >= _nextDrawing; }
+    /// Whether anything is ever drawn.
+    bool hasLine() const { return _hasLine; }
 
+private:
+    ProgressScreen const& _screen;
     std::string _what;
+    /// Where this is a part of other work: who is told instead.
+    ProgressPart* _part;
     bool _hasLine;
     bool _isShown = false;
-    Clock::time_point _nextDrawing;
+    ProgressScreen::Clock::time_point _nextDrawing;
+};
+
+/// While it lives, the bars of this thread draw nothing and tell `whole` what share of the thread's work is
+/// done: each takes the next half of what is left, since nobody knows how many there will be.
+class ProgressPart {
+public:
+    explicit ProgressPart(std::function<void(double)> whole);
+    ~ProgressPart();
+    ProgressPart(ProgressPart const&) = delete;
+    ProgressPart& operator=(ProgressPart const&) = delete;
+
+private:
+    friend class Progress;
+
+    std::function<void(double)> _whole;
+    /// What the bars before took.
+    double _done = 0;
+    ProgressPart* _outer;
 };
 
 } // namespace lumenkey::tools

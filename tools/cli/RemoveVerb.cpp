@@ -23,11 +23,13 @@ void runRemove(RemoveOptions const& options) {
     if (node == ChannelTree::kTop) {
         throw UsageError{"the top of a document stays"};
     }
+    if (input.tree().base(node).isLocked(true)) {
+        throw UsageError{"'" + options.channel + "' is locked"};
+    }
     if (input.tree().isComponent(node)) {
         throw UsageError{"'" + options.channel + "' is a part of its compound, which can only go as a whole"};
     }
-    KFChannelBase& removed = input.tree().base(node);
-    removed.getParent()->removeDescendant(&removed);
+    input.file().tree->erase(node);
     options.author.write(input);
 }
 
@@ -43,7 +45,7 @@ Verb declareRemove(CLI::App& program) {
         ->required();
     options->author.addRest(*verb);
     verb->footer("Example: lumenkey remove ball.lumen Shadow");
-    return {verb, "FILE CHANNEL [-o OUT | --in-place] [--frame-rate R]",
+    return {verb, "FILE CHANNEL [-o OUT | --in-place] [--force] [--frame-rate R]",
             [options](OutputSink&) { runRemove(*options); }};
 }
 

@@ -1,5 +1,7 @@
 #include "tools/cli/EditVerb.h"
 
+#include "tools/curve/Keypoint.h"
+
 namespace lumenkey::tools {
 
 namespace {
@@ -19,15 +21,12 @@ public:
 
     void apply(KFChannel& channel, TimeSpan const& span) override {
         editKeypointsWithin(channel, span, [this](KFCurve& curve) {
+            std::vector<void*> const keypoints = everyKeypointHandle(*curve.getSpline());
             Tempus first{};
             Tempus last{};
-            void* firstHandle = nullptr;
-            void* lastHandle = nullptr;
-            curve.getFirstKeypoint(&first, nullptr);
-            curve.getLastKeypoint(&last, nullptr);
-            curve.getKeypointHandle(first, &firstHandle);
-            curve.getKeypointHandle(last, &lastHandle);
-            curve.reverseKeypoints(firstHandle, lastHandle, true); // about the middle of the two
+            curve.getKeypoint(keypoints.front(), &first, nullptr);
+            curve.getKeypoint(keypoints.back(), &last, nullptr);
+            curve.reverseKeypoints(keypoints.front(), keypoints.back(), true); // about the middle of the two
             curve.forceRetimeCurve(TempusMake(1, 1), _bothEnds - (first + last));
         });
     }

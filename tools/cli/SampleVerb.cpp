@@ -5,6 +5,7 @@
 #include "tools/cli/Stretches.h"
 #include "tools/cli/TimeArgument.h"
 #include "tools/cli/UsageError.h"
+#include "tools/cli/WholeNumber.h"
 #include "tools/curve/SampleTimes.h"
 #include "tools/output/CsvWriter.h"
 #include "tools/output/JsonWriter.h"
@@ -195,7 +196,7 @@ void writeCsvTitles(CsvWriter& csv, ChannelTree const& tree, std::vector<Channel
     csv.field("seconds");
     for (ChannelTree::Node const channel : channels) {
         std::string const name = tree.dottedName(channel);
-        csv.field(name);
+        csv.name(name);
         if (slope) {
             csv.field(name + " slope");
         }
@@ -339,7 +340,7 @@ Verb declareSample(CLI::App& program) {
         verb->add_option("--rate", options->rate, "Likewise, so many times a second: 24, 23.976, 24000/1001")
             ->option_text("R");
     auto* const count = verb->add_option("--count", options->count, "Read so many times, evenly spread")
-                            ->check(CLI::PositiveNumber)
+                            ->check(wholeNumberFrom(1))
                             ->option_text("N");
     for (CLI::Option* const other : {from, to, step, rate, count}) {
         at->excludes(other);
@@ -350,10 +351,12 @@ Verb declareSample(CLI::App& program) {
     verb->add_flag("--slope", options->slope, "Tell the slope too, by the second");
     auto* const json = verb->add_flag("--json", options->json, "For programs: every number in full");
     verb->add_flag("--csv", options->csv, "A row for each time, a column for each channel")->excludes(json);
-    verb->footer("A time is VALUE/TIMESCALE (1001/24000), seconds (0.5) or frames of the file (12f).\n"
-                 "Without CHANNEL all channels are read: at most 10000000 values, as CSV so many times.\n"
-                 "What --csv writes of ascending times can be read as a FILE.\n\n"
-                 "Example: lumenkey sample walk.bvh Hips.Yposition --rate 24 --csv");
+    verb->footer(
+        "A time is VALUE/TIMESCALE (1001/24000), seconds (0.5) or frames of the file (12f).\n"
+        "Without CHANNEL all channels are read: at most 10000000 values, as CSV so many times.\n"
+        "What --csv writes of ascending times can be read as a FILE; a value that isn't finite is an "
+        "empty cell.\n\n"
+        "Example: lumenkey sample walk.bvh Hips.Yposition --rate 24 --csv");
     return {
         verb,
         "FILE [CHANNEL...] (--at T[,T...] | [--from T] [--to T] (--step T | --rate R | --count N)) [--slope] "

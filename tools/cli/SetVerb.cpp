@@ -39,6 +39,7 @@ public:
         if (channel.isLocked(true)) {
             refuse("is locked");
         }
+        checkTarget(input.file());
         std::string told = input.tree().dottedName(node);
         if (_at) {
             Tempus const time = _at->resolve(input.file().frameDuration);
@@ -77,6 +78,51 @@ private:
         }
     }
 
+    /// Motions and tables don't hold everything that can be said of a channel.
+    void checkTarget(ChannelFile const& file) const {
+        ChannelFormat const format = _options.author.output.formatFor(file.format);
+        if (format == ChannelFormat::Document) {
+            return;
+        }
+        bool const isMotion = format == ChannelFormat::Motion;
+        std::string const such = isMotion ? "a BVH" : "a CSV";
+        if (_interpolation) {
+            refuseFor(file, such + " holds no interpolations");
+        }
+        if (isMotion && _options.remove) {
+            refuseFor(file, "a BVH has a value in every frame");
+        }
+        // The pose of a document is a frame.
+        if (!_at && !(isMotion && file.format == ChannelFormat::Document)) {
+            refuseFor(file, such + " holds no values without a time");
+        }
+        if (isMotion && _at && !isFrame(_at->resolve(file.frameDuration), file.frameDuration)) {
+            refuseFor(file, "a BVH has values at its frames alone, which are " +
+                                timeText(file.frameDuration) + " s apart");
+        }
+    }
+
+    static bool isFrame(Tempus const& time, Tempus const& duration) {
+        return duration * TempusMake(TempusFloorQuotient(time, duration), 1) == time;
+    }
+
+    [[noreturn]] void refuseFor(ChannelFile const& file, std::string const& why) const {
+        throw UsageError{"'" + _options.author.output.target(file.file) + "' can't hold that: " + why +
+                         (file.format == ChannelFormat::Document
+                              ? "; write a document"
+                              : "; make a document of it with lumenkey convert")};
+    }
+
+    void* unlockedKeypointAt(KFChannel& channel, Tempus const& time) const {
+        void* const handle = keypointAt(channel, time);
+        bool isLocked = false;
+        if (handle != nullptr && channel.getCurveInterface()->isLockedKeypoint(handle, &isLocked) &&
+            isLocked) {
+            refuse("can't change: the keypoint at " + timeText(time) + " s is locked");
+        }
+        return handle;
+    }
+
     static void* keypointAt(KFChannel& channel, Tempus const& time) {
         void* handle = nullptr;
         KFCurve& curve = *channel.getCurveInterface();
@@ -84,7 +130,7 @@ private:
     }
 
     void removeAt(KFChannel& channel, Tempus const& time) const {
-        void* const handle = keypointAt(channel, time);
+        void* const handle = unlockedKeypointAt(channel, time);
         if (handle == nullptr) {
             refuse("has no keypoint at " + timeText(time) + " s");
         }
@@ -97,7 +143,7 @@ private:
         if (!channel.getCurveInterface()->isCurveKeyframable()) {
             refuse("takes no keypoints: its class has one value for all times. Leave out --at");
         }
-        if (keypointAt(channel, time) == nullptr && !_options.hasValue()) {
+        if (unlockedKeypointAt(channel, time) == nullptr && !_options.hasValue()) {
             refuse("has no keypoint at " + timeText(time) + " s; with --value one is made");
         }
         if (_options.hasValue()) {
@@ -159,7 +205,7 @@ Verb declareSet(CLI::App& program) {
     return {verb,
             "FILE CHANNEL [--at T] (--value V [--interpolation NAME] | --interpolation NAME | --delete) [-o "
             "OUT | --in-place] "
-            "[--frame-rate R]",
+            "[--force] [--frame-rate R]",
             [options](OutputSink& out) { SetRun(*options).run(out); }};
 }
 

@@ -15,7 +15,8 @@ public:
                       "(Savitzky and Golay 1964): the longer\n"
                       "the step, the smoother. The last one is that of the last whole step; keypoints behind "
                       "it stay.\n";
-        words.example = "lumenkey smooth walk.bvh Spine --from 1 --to 2 -o smooth.bvh --plot smooth.svg";
+        words.example =
+            "lumenkey smooth walk.bvh Spine.Xrotation --from 1 --to 2 -o smooth.bvh --plot smooth.svg";
         return words;
     }
 

@@ -2,6 +2,7 @@
 
 #include "tools/cli/ChannelInput.h"
 #include "tools/cli/Progress.h"
+#include "tools/cli/WholeNumber.h"
 #include "tools/output/JsonWriter.h"
 #include "tools/output/Table.h"
 #include "tools/output/TextForms.h"
@@ -130,7 +131,7 @@ Verb declareTree(CLI::App& program) {
         program.add_subcommand("tree", "List the folders and channels of a file as the tree they are");
     options->input.add(*verb);
     verb->add_option("--depth", options->depth, "Only so many levels below the top")
-        ->check(CLI::NonNegativeNumber)
+        ->check(wholeNumberFrom(0))
         ->option_text("N");
     verb->add_flag("--json", options->json,
                    "For programs: a list in tree order, with the path of IDs and the class of each node");

@@ -6,7 +6,9 @@
 
 #include <algorithm>
 #include <map>
+#include <optional>
 #include <utility>
+#include <vector>
 
 namespace lumenkey::tools {
 
@@ -44,12 +46,14 @@ std::string fadesText(KFChannel const& channel) {
 /// One run.
 class Comparison {
 public:
-    Comparison(ChannelTree const& before, ChannelTree const& after, TimeSpan const& span, Tempus const& step)
-        : _before(before), _after(after), _span(span), _step(step) {}
+    Comparison(ChannelTree const& before, ChannelTree const& after, bool haveNamedTops, TimeSpan const& span,
+               Tempus const& step)
+        : _before(before), _after(after), _haveNamedTops(haveNamedTops), _span(span), _step(step) {}
 
     std::vector<NodeDifference> run(ReadingProgress const& progress) {
         std::map<Key, Node> const old = nodesByName(_before);
         std::map<Key, Node> const now = nodesByName(_after);
+        setPlaces(old, now);
         std::vector<std::pair<Node, Key>> ordered;
         for (auto const& [key, node] : now) {
             ordered.emplace_back(node, key);
@@ -80,6 +84,37 @@ public:
     }
 
 private:
+    /// Numbers the children of each folder that both trees have in it, in the order of either tree.
+    void setPlaces(std::map<Key, Node> const& old, std::map<Key, Node> const& now) {
+        std::vector<std::optional<Node>> oldOf(_after.count());
+        for (auto const& [key, node] : now) {
+            if (auto const found = old.find(key); found != old.end()) {
+                oldOf[node] = found->second;
+            }
+        }
+        std::vector<bool> isShared(_before.count());
+        _placeAfter = places(_after, [&](Node node) {
+            bool const stayed = oldOf[node] && oldOf[_after.parent(node)] == _before.parent(*oldOf[node]);
+            if (stayed) {
+                isShared[*oldOf[node]] = true;
+            }
+            return stayed;
+        });
+        _placeBefore = places(_before, [&](Node node) { return isShared[node]; });
+    }
+
+    /// From 1 on; 0 for the top, and for what doesn't count.
+    template <class Counts> static std::vector<std::size_t> places(ChannelTree const& tree, Counts counts) {
+        std::vector<std::size_t> places(tree.count());
+        std::vector<std::size_t> children(tree.count());
+        for (Node node = ChannelTree::kTop + 1; node < tree.count(); ++node) {
+            if (counts(node)) {
+                places[node] = ++children[tree.parent(node)];
+            }
+        }
+        return places;
+    }
+
     void detail(std::string const& what, std::string const& before, std::string const& after) {
         if (before != after) {
             _details.push_back(what + " " + before + " became " + after);
@@ -90,6 +125,11 @@ private:
         KFChannelBase const& before = _before.base(old);
         KFChannelBase const& after = _after.base(now);
         _details.clear();
+        if (now == ChannelTree::kTop && _haveNamedTops) {
+            detail("name", before.getName().str(), after.getName().str());
+        }
+        detail("place among its siblings", std::to_string(_placeBefore[old]),
+               std::to_string(_placeAfter[now]));
         detail("class", _before.typeName(old), _after.typeName(now));
         detail("ID", std::to_string(before.getID()), std::to_string(after.getID()));
         auto const flagsOf = [](KFChannelBase const& channel) {
@@ -134,7 +174,8 @@ private:
         if (digestOf(before) == digestOf(after)) {
             return std::nullopt;
         }
-        CurveChange const change = changeBetween(before, after, _span, _step);
+        CurveChange change = changeBetween(before, after, _span, _step);
+        compareAtKeypoints(before, after, change);
         detail("number of keypoints", std::to_string(before.getNumberOfKeypoints()),
                std::to_string(after.getNumberOfKeypoints()));
         if (change.most > 0) {
@@ -148,8 +189,11 @@ private:
 
     ChannelTree const& _before;
     ChannelTree const& _after;
+    bool _haveNamedTops;
     TimeSpan const& _span;
     Tempus const& _step;
+    std::vector<std::size_t> _placeBefore;
+    std::vector<std::size_t> _placeAfter;
     std::vector<std::string> _details;
     std::vector<NodeDifference> _all;
 };
@@ -157,9 +201,9 @@ private:
 } // namespace
 
 std::vector<NodeDifference> differencesBetween(ChannelTree const& before, ChannelTree const& after,
-                                               TimeSpan const& span, Tempus const& step,
+                                               bool haveNamedTops, TimeSpan const& span, Tempus const& step,
                                                ReadingProgress const& progress) {
-    return Comparison(before, after, span, step).run(progress);
+    return Comparison(before, after, haveNamedTops, span, step).run(progress);
 }
 
 } // namespace lumenkey::tools

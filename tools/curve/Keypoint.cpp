@@ -1,5 +1,6 @@
 #include "tools/curve/Keypoint.h"
 
+#include "lumenkey/splines/KFVertex.h"
 #include "tools/output/TextForms.h"
 
 #include <array>
@@ -52,6 +53,24 @@ std::vector<void*> keypointHandles(KFSpline& spline) {
     std::vector<void*> handles;
     spline.getAllVerticesHandles(handles);
     return handles;
+}
+
+std::vector<void*> everyKeypointHandle(KFSpline& spline) {
+    std::vector<void*> handles;
+    handles.reserve(spline.getNumberOfVertices());
+    for (KFVertexIterator place = spline.beginVertices(); place != spline.endVertices();
+         place = spline.nextPlace(place)) {
+        handles.push_back(spline.vertexAt(place));
+    }
+    return handles;
+}
+
+std::optional<KeypointEnds> keypointEnds(KFSpline const* spline) {
+    if (spline == nullptr || spline->getNumberOfVertices() == 0) {
+        return std::nullopt;
+    }
+    return KeypointEnds{spline->vertexAt(spline->beginVertices())->getValueU(),
+                        spline->vertexAt(spline->previousPlace(spline->endVertices()))->getValueU()};
 }
 
 std::string interpolationName(std::uint32_t type) {

@@ -1,5 +1,6 @@
 #pragma once
 
+#include "lumenkey/foundation/Tempus.h"
 #include "lumenkey/splines/KFSpline.h"
 
 #include <cstdint>
@@ -33,7 +34,19 @@ struct Keypoint {
 /// `handle` is that of a vertex of the spline.
 Keypoint readKeypoint(KFSpline& spline, void* handle);
 
+/// In the order of time; of several keypoints at one time the first.
 std::vector<void*> keypointHandles(KFSpline& spline);
+/// Likewise, with all of them.
+std::vector<void*> everyKeypointHandle(KFSpline& spline);
+
+/// Of the first keypoint and the last, disabled ones too.
+struct KeypointEnds {
+    Tempus first{};
+    Tempus last{};
+};
+
+/// Nothing without keypoints. `spline` may be null.
+std::optional<KeypointEnds> keypointEnds(KFSpline const* spline);
 
 /// The name of a type, such as "linear"; an unknown number draws as Bezier and is called "bezier (99)".
 std::string interpolationName(std::uint32_t type);

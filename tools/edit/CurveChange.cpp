@@ -4,6 +4,8 @@
 
 #include <algorithm>
 #include <cmath>
+#include <utility>
+#include <vector>
 
 namespace lumenkey::tools {
 
@@ -27,6 +29,16 @@ void compareAt(SampleTimes const& times, KFCurve& before, KFCurve& after, CurveC
     }
 }
 
+std::vector<Tempus> timesOfKeypoints(KFCurve& curve) {
+    std::vector<void*> handles;
+    curve.getKeypointHandleList(handles);
+    std::vector<Tempus> times(handles.size());
+    for (std::size_t i = 0; i < handles.size(); ++i) {
+        curve.getKeypoint(handles[i], &times[i], nullptr);
+    }
+    return times;
+}
+
 } // namespace
 
 CurveChange changeBetween(KFCurve& before, KFCurve& after, TimeSpan const& span, Tempus const& step) {
@@ -40,6 +52,25 @@ CurveChange changeBetween(KFCurve& before, KFCurve& after, TimeSpan const& span,
     }
     compareAt(SampleTimes::list({span.to}), before, after, change);
     return change;
+}
+
+void compareAtKeypoints(KFCurve& before, KFCurve& after, CurveChange& change) {
+    constexpr std::uint32_t beside = 1'000; // of the way from one keypoint to the next
+    std::vector<Tempus> keypoints = timesOfKeypoints(before);
+    std::vector<Tempus> const others = timesOfKeypoints(after);
+    keypoints.insert(keypoints.end(), others.begin(), others.end());
+    std::sort(keypoints.begin(), keypoints.end());
+    keypoints.erase(std::unique(keypoints.begin(), keypoints.end()), keypoints.end());
+    std::vector<Tempus> times;
+    for (std::size_t i = 0; i < keypoints.size(); ++i) {
+        if (i > 0) {
+            Tempus const gap = keypoints[i] - keypoints[i - 1];
+            times.insert(times.end(), {keypoints[i - 1] + gap / beside, keypoints[i - 1] + gap / 2U,
+                                       keypoints[i] - gap / beside});
+        }
+        times.push_back(keypoints[i]);
+    }
+    compareAt(SampleTimes::list(std::move(times)), before, after, change);
 }
 
 } // namespace lumenkey::tools

@@ -21,6 +21,10 @@ struct CurveChange {
 /// `kMostComparedValues` times, so many are spread evenly.
 CurveChange changeBetween(KFCurve& before, KFCurve& after, TimeSpan const& span, Tempus const& step);
 
+/// Compares them too at all keypoints of both, and between and just beside these: there `changeBetween` may
+/// see nothing of a step or a peak that is narrower than its own.
+void compareAtKeypoints(KFCurve& before, KFCurve& after, CurveChange& change);
+
 inline constexpr std::int64_t kMostComparedValues = 20'000'000;
 
 } // namespace lumenkey::tools

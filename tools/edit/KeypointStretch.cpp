@@ -2,6 +2,7 @@
 
 #include "lumenkey/Channels/KFKeyframeInfo.h"
 #include "lumenkey/splines/KFInterpolation.h"
+#include "tools/curve/Keypoint.h"
 
 #include <cstdint>
 #include <memory>
@@ -11,9 +12,8 @@ namespace lumenkey::tools {
 namespace {
 
 std::vector<void*> allKeypoints(KFCurve& curve) {
-    std::vector<void*> handles;
-    curve.getKeypointHandleList(handles);
-    return handles;
+    KFSpline* const spline = curve.getNumberOfKeypoints() == 0 ? nullptr : curve.getSpline();
+    return spline == nullptr ? std::vector<void*>() : everyKeypointHandle(*spline);
 }
 
 Tempus timeOf(KFCurve& curve, void* handle) {
@@ -28,6 +28,24 @@ void deleteKeypoints(KFCurve& curve, TimeSpan const& span, bool within) {
             curve.delKeypoint(handle, true);
         }
     }
+}
+
+/// All keypoints; the library's own gathering leaves out disabled ones at the ends.
+std::vector<_KFKeyframeInfo> gather(KFChannel& channel) {
+    std::vector<_KFKeyframeInfo> all;
+    for (void* const handle : allKeypoints(*channel.getCurveInterface())) {
+        _KFKeyframeInfo info;
+        channel.getKeyframe(handle, &info.time, &info.value);
+        channel.getKeyframeInputTangents(handle, &info.inputTangentX, &info.inputTangentY, true);
+        channel.getKeyframeOutputTangents(handle, &info.outputTangentX, &info.outputTangentY, true);
+        info.enabled = channel.getKeyframeEnabled(handle);
+        info.bias = channel.getKeyframeBias(handle);
+        info.flags = channel.getKeyframeFlags(handle);
+        info.interpolation = channel.getKeyframeInterpolation(handle);
+        info.normal = channel.getKeyframeNormal(handle);
+        all.push_back(info);
+    }
+    return all;
 }
 
 } // namespace
@@ -92,16 +110,10 @@ void editKeypointsWithin(KFChannel& channel, TimeSpan const& span,
     KFChannel& part = static_cast<KFChannel&>(*copy);
     deleteKeypoints(*part.getCurveInterface(), span, false);
     edit(*part.getCurveInterface());
-    TimeSpan arrival;
-    part.getFirstKeyframe(&arrival.from, nullptr);
-    part.getLastKeyframe(&arrival.to, nullptr);
-    KFChannelBase::KeyframesByChannel gathered;
-    part.keyframesWithChannels({arrival.from, arrival.to - arrival.from}, gathered);
+    std::vector<_KFKeyframeInfo> const gathered = gather(part);
     deleteKeypoints(curve, span, true);
-    deleteKeypoints(curve, arrival, true);
-    for (auto const& [owner, keypoints] : gathered) {
-        channel.setKeyframesWithInfo(arrival.from, keypoints);
-    }
+    deleteKeypoints(curve, {gathered.front().time, gathered.back().time}, true);
+    channel.setKeyframesWithInfo(gathered.front().time, gathered);
 }
 
 } // namespace lumenkey::tools

@@ -1,5 +1,7 @@
 #include "tools/export/ChannelFileWriter.h"
 
+#include "lumenkey/Channels/KFChannelFlags.h"
+#include "tools/check/DocumentCheck.h"
 #include "tools/curve/Keypoint.h"
 #include "tools/export/DocumentWriter.h"
 #include "tools/export/MotionFrames.h"
@@ -13,6 +15,7 @@
 #include <iterator>
 #include <limits>
 #include <optional>
+#include <utility>
 
 namespace lumenkey::tools {
 
@@ -98,11 +101,7 @@ void writeRows(std::vector<std::vector<double>> const& columns, std::vector<Temp
         csv.field(timeText(times[row]));
         csv.number(TempusGetSeconds(times[row]));
         for (std::vector<double> const& column : columns) {
-            if (std::isnan(column[row])) {
-                csv.field("");
-            } else {
-                csv.number(column[row]);
-            }
+            csv.number(column[row]); // an empty cell where there is none
         }
         csv.endRow();
         if (progress) {
@@ -131,7 +130,7 @@ WrittenRows writeTable(FileToWrite const& wanted, OutputSink& out, ReadingProgre
     csv.field("seconds");
     for (Node const channel : channels) {
         keypoints.push_back(keypointsOf(tree.spline(channel)));
-        csv.field(tree.dottedName(channel));
+        csv.name(tree.dottedName(channel));
     }
     csv.endRow();
     bool const isByKeypoints =
@@ -153,15 +152,40 @@ WrittenRows writeTable(FileToWrite const& wanted, OutputSink& out, ReadingProgre
     return {times.size(), times.empty() ? kTempusZero : times.front()};
 }
 
-/// Channels of unknown classes were passed over on reading; a document without them must not come in its
-/// place.
-void checkNothingIsLost(FileToWrite const& wanted) {
-    for (DocumentFactory const& factory : wanted.file.document.factories) {
-        if (!factory.isKnown()) {
-            throw OutputError{wanted.target, "not written: " + printableText(wanted.file.file) +
-                                                 " names a class that is unknown, " + factory.uuid.text() +
-                                                 ", whose channels would be lost; see lumenkey check"};
+/// What a reader passes over, and what a writer leaves out; empty for nothing.
+std::string firstLossIn(ChannelFile const& document) {
+    std::string const name = printableText(document.file);
+    if (std::pair(document.document.major, document.document.minor) >
+        std::pair(kWrittenMajor, kWrittenMinor)) {
+        return name + ": version " + document.document.versionText() + " is newer than what is written";
+    }
+    for (DocumentFinding const& finding : document.document.text
+                                              ? checkDocumentText(*document.document.text, {})
+                                              : checkDocument(document.file, {})) {
+        if (finding.isLoss) {
+            return name + ":" + std::to_string(finding.place.line) + ":" +
+                   std::to_string(finding.place.column) + ": " + printableText(finding.what);
         }
+    }
+    ChannelTree const& tree = *document.tree;
+    for (Node node = ChannelTree::kTop + 1; node < tree.count(); ++node) {
+        bool const isLeftOut = tree.base(node).testFlag(kChannelFlagNotSaved) ||
+                               tree.asFolder(tree.parent(node))->testFoldFlag(kFoldFlagChildrenNotSaved);
+        if (isLeftOut && !tree.isComponent(node)) {
+            return name + ": documents leave out the channel '" + printableText(tree.dottedName(node)) + "'";
+        }
+    }
+    return {};
+}
+
+void checkNothingIsLost(FileToWrite const& wanted) {
+    if (wanted.file.format != ChannelFormat::Document || wanted.acceptsLoss) {
+        return;
+    }
+    std::string const loss = firstLossIn(wanted.file);
+    if (!loss.empty()) {
+        throw OutputError{wanted.target, "not written, since something would be lost: " + loss +
+                                             "; --force writes it without"};
     }
 }
 

@@ -30,6 +30,8 @@ struct FileToWrite {
     /// The channels whose keypoints needn't be those of the file any more.
     std::vector<ChannelTree::Node> edited;
     std::string target;
+    /// Write a document also without what the reader of another passed over.
+    bool acceptsLoss = false;
 };
 
 /// How a file came out.
@@ -51,7 +53,8 @@ struct WrittenRows {
 /// channel, outside its keypoints. Of a document only channels with keypoints have a column, unless none has
 /// any, and a row stands at each keypoint.
 ///
-/// A document holds the tree; that of a motion, its skeleton too (`SkeletonChannels`).
+/// A document holds the tree; that of a motion, its skeleton too (`SkeletonChannels`). One that comes from
+/// another document, in which something was passed over, isn't written: see `FileToWrite::acceptsLoss`.
 WrittenRows writeChannelFile(FileToWrite const& wanted, ReadingProgress const& progress = {});
 
 /// Throws `OutputError` for more than `kMostWrittenValues`.

@@ -2,10 +2,12 @@
 
 #include "lumenkey/curves/KFCurve.h"
 #include "tools/import/MotionTime.h"
+#include "tools/import/MotionTree.h"
 #include "tools/output/TextForms.h"
+#include "tools/time/ExactDecimal.h"
 
-#include <algorithm>
 #include <charconv>
+#include <cmath>
 #include <optional>
 
 namespace lumenkey::tools {
@@ -13,9 +15,6 @@ namespace lumenkey::tools {
 namespace {
 
 using Node = ChannelTree::Node;
-
-constexpr char const* kOffsetName = "Offset";
-constexpr char const* kEndSiteName = "End Site";
 
 std::optional<MotionChannelKind> kindNamed(std::string_view name) {
     for (MotionChannelKind const kind :
@@ -28,19 +27,27 @@ std::optional<MotionChannelKind> kindNamed(std::string_view name) {
     return std::nullopt;
 }
 
-/// A decimal, as short as can be, that is read as this duration.
+/// A decimal, as short as can be, that is read as this duration and that other readers, which take it as it
+/// stands, don't misread either: exact, or with at least seven decimals and within a millionth.
 std::string frameTimeText(Tempus const& duration) {
     constexpr int mostDecimals = 17;
+    constexpr int leastDecimals = 7;
+    constexpr double nearness = 0.9e-6; // below a millionth however it is rounded
+    double const seconds = TempusGetSeconds(duration);
     for (int decimals = 2; decimals <= mostDecimals; ++decimals) {
         std::array<char, 64> buffer{};
-        auto const end = std::to_chars(buffer.data(), buffer.data() + buffer.size(),
-                                       TempusGetSeconds(duration), std::chars_format::fixed, decimals);
+        auto const end = std::to_chars(buffer.data(), buffer.data() + buffer.size(), seconds,
+                                       std::chars_format::fixed, decimals);
         std::string const text(buffer.data(), end.ptr);
-        if (frameDurationFromText(text).duration == duration) {
+        double printed = 0;
+        std::from_chars(text.data(), text.data() + text.size(), printed);
+        bool const isNear = decimals >= leastDecimals && std::abs(printed - seconds) <= nearness * seconds;
+        bool const isExact = ExactDecimal::parse(text)->toTempus() == duration;
+        if ((isExact || isNear) && frameDurationFromText(text).duration == duration) {
             return text;
         }
     }
-    return shortestText(TempusGetSeconds(duration));
+    return shortestText(seconds);
 }
 
 /// Walks the tree of a document in tree order, which is that of a motion's text.
@@ -54,6 +61,9 @@ public:
     DocumentSkeleton read() {
         Node const top = ChannelTree::kTop;
         for (Node child = top + 1; child < _tree.end(top) && isSound(); child = _tree.end(child)) {
+            if (isFrameTime(_tree, child)) {
+                continue;
+            }
             if (_tree.asFolder(child) == nullptr || isOffset(child)) {
                 refuse(child, "stands in no joint");
             } else {
@@ -72,10 +82,7 @@ private:
         _skeleton.fault = "'" + _tree.dottedName(node) + "' " + why;
     }
 
-    bool isOffset(Node node) const {
-        return _tree.base(node).getName().view() == kOffsetName &&
-               dynamic_cast<KFChannel3D*>(&_tree.base(node)) != nullptr;
-    }
+    bool isOffset(Node node) const { return tools::isOffset(_tree, node); }
 
     std::array<double, 3> offsetAt(Node node) const {
         auto const& offset = static_cast<KFChannel3D const&>(_tree.base(node));
@@ -162,6 +169,9 @@ SkeletonChannels::SkeletonChannels(Motion const& motion, ChannelTree const& tree
         _ends.push_back(std::make_unique<KFChannelFolder>(kEndSiteName, &joint, freeIDBelow(joint), 0, 0));
         addOffset(*_ends.back(), site.offset);
     }
+    KFChannelFolder& top = *tree.asFolder(ChannelTree::kTop);
+    _frameTime = std::make_unique<KFChannelDouble>(kFrameTimeName, &top, freeIDBelow(top), 0);
+    _frameTime->setInitialValue(TempusGetSeconds(motion.frameDuration), true);
 }
 
 void SkeletonChannels::addOffset(KFChannelFolder& joint, std::array<double, 3> const& offset) {
@@ -179,6 +189,7 @@ SkeletonChannels::~SkeletonChannels() {
     for (std::unique_ptr<KFChannelFolder> const& end : _ends) {
         end->getParent()->removeDescendant(end.get());
     }
+    _frameTime->getParent()->removeDescendant(_frameTime.get());
 }
 
 DocumentSkeleton skeletonOf(ChannelTree const& tree, Tempus const& frameDuration) {

@@ -1,5 +1,6 @@
 #pragma once
 
+#include "lumenkey/Channels/KFScalarChannels.h"
 #include "lumenkey/Channels/KFVectorChannels.h"
 #include "tools/import/MotionFile.h"
 #include "tools/tree/ChannelTree.h"
@@ -10,10 +11,7 @@
 
 namespace lumenkey::tools {
 
-// In a document, the skeleton of a motion capture stands beside its channels: in the folder of each joint a
-// `KFChannel3D` called `Offset`, and for each free end a folder called `End Site` with one of its own.
-
-/// While it lives, a tree that was made from a motion has its skeleton too.
+/// While it lives, a tree that was made from a motion has its skeleton too (`MotionTree.h`).
 class SkeletonChannels {
 public:
     SkeletonChannels(Motion const& motion, ChannelTree const& tree);
@@ -27,6 +25,7 @@ private:
     /// Ends of limbs, then the offsets in them and in joints.
     std::vector<std::unique_ptr<KFChannelFolder>> _ends;
     std::vector<std::unique_ptr<KFChannel3D>> _offsets;
+    std::unique_ptr<KFChannelDouble> _frameTime;
 };
 
 /// The skeleton that a document holds, without frames, and the value channel of each of its columns.

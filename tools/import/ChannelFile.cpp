@@ -5,6 +5,7 @@
 #include "tools/output/TextForms.h"
 
 #include <algorithm>
+#include <filesystem>
 #include <utility>
 
 namespace lumenkey::tools {
@@ -45,6 +46,11 @@ ChannelFile openCsv(std::string_view text, std::string const& file, ReadingProgr
     return opened;
 }
 
+Tempus frameDurationOf(ChannelTree const& document) {
+    std::optional<Tempus> const stored = storedFrameDuration(document);
+    return stored ? *stored : frameDurationOfKeypoints(document);
+}
+
 ChannelFile openDocument(DocumentFile document, std::string const& file,
                          std::optional<Tempus> const& frameDuration) {
     ChannelFile opened;
@@ -52,7 +58,7 @@ ChannelFile openDocument(DocumentFile document, std::string const& file,
     opened.format = ChannelFormat::Document;
     opened.tree = std::move(document.tree);
     opened.document = std::move(document);
-    opened.frameDuration = frameDuration ? *frameDuration : frameDurationOfKeypoints(*opened.tree);
+    opened.frameDuration = frameDuration ? *frameDuration : frameDurationOf(*opened.tree);
     opened.firstTime = kTempusZero;
     opened.lastTime = kTempusZero;
     if (std::optional<BXTimeRange> const keyed = opened.tree->keyedRange()) {
@@ -61,17 +67,6 @@ ChannelFile openDocument(DocumentFile document, std::string const& file,
     }
     opened.duration = opened.lastTime - opened.firstTime;
     return opened;
-}
-
-ChannelFormat formatOf(std::string_view text, std::string_view file) {
-    if (std::optional<ChannelFormat> const named = channelFormatNamed(file)) {
-        return *named;
-    }
-    if (looksLikeDocument(text)) {
-        return ChannelFormat::Document;
-    }
-    bool const hasComma = text.substr(0, text.find('\n')).find(',') != std::string_view::npos;
-    return hasComma ? ChannelFormat::Csv : ChannelFormat::Motion;
 }
 
 } // namespace
@@ -99,14 +94,38 @@ std::optional<ChannelFormat> channelFormatNamed(std::string_view file) {
     return std::nullopt;
 }
 
+ChannelFormat channelFormatOf(std::string_view text, std::string_view file) {
+    if (std::optional<ChannelFormat> const named = channelFormatNamed(file)) {
+        return *named;
+    }
+    if (looksLikeDocument(text)) {
+        return ChannelFormat::Document;
+    }
+    bool const hasComma = text.substr(0, text.find('\n')).find(',') != std::string_view::npos;
+    return hasComma ? ChannelFormat::Csv : ChannelFormat::Motion;
+}
+
 ChannelFile openChannelFile(std::string const& file, ReadingProgress const& progress,
                             std::optional<Tempus> const& frameDuration) {
-    Tempus const counted = frameDuration.value_or(defaultFrameDuration());
-    if (channelFormatNamed(file) == ChannelFormat::Document) {
+    std::error_code missing;
+    bool const isReadOnce =
+        std::filesystem::exists(file, missing) && !std::filesystem::is_regular_file(file, missing);
+    if (channelFormatNamed(file) == ChannelFormat::Document && !isReadOnce) {
+        Tempus const counted = frameDuration.value_or(defaultFrameDuration());
         return openDocument(readDocumentFile(file, counted, progress), file, frameDuration);
     }
-    std::string const text = readInputText(file);
-    switch (formatOf(text, file)) {
+    std::string text = readInputText(file);
+    ChannelFile opened = openChannelText(text, file, progress, frameDuration);
+    if (isReadOnce && opened.format == ChannelFormat::Document) {
+        opened.document.text = std::move(text);
+    }
+    return opened;
+}
+
+ChannelFile openChannelText(std::string_view text, std::string const& file, ReadingProgress const& progress,
+                            std::optional<Tempus> const& frameDuration) {
+    Tempus const counted = frameDuration.value_or(defaultFrameDuration());
+    switch (channelFormatOf(text, file)) {
     case ChannelFormat::Csv:
         return openCsv(text, file, progress);
     case ChannelFormat::Document:

@@ -27,7 +27,8 @@ struct ChannelFile {
     std::size_t joints = 0;
     /// Frames of a motion, rows of a table.
     std::size_t rows = 0;
-    /// Invalid where the rows of a table aren't evenly spaced. Of a document: see `frameDurationOfKeypoints`.
+    /// Invalid where the rows of a table aren't evenly spaced. Of a document: see `storedFrameDuration`, and
+    /// `frameDurationOfKeypoints` where that says nothing.
     Tempus frameDuration{};
     /// Of a document, those of its first and last keypoint. Both zero without rows or keypoints.
     Tempus firstTime{};
@@ -51,11 +52,19 @@ std::optional<ChannelFormat> channelFormatNamed(std::string_view file);
 
 /// A name that ends in `.csv` is that of a table, one that ends in `.bvh` of a motion, one that ends in
 /// `.lumen` of a document. Otherwise the content tells: a document begins with `<`, a table has a comma in
-/// its first line. Throws `InputError`.
+/// its first line.
+ChannelFormat channelFormatOf(std::string_view text, std::string_view file);
+
+/// Opens a file in the format that its name or its content tells. Throws `InputError`.
 ///
-/// `frameDuration` is that of a document, which doesn't say it itself; without one that of its keypoints is
-/// taken, and in documents that count frames the default.
+/// `frameDuration` is that of a document. Without one that of its skeleton or its keypoints is taken, and in
+/// documents that count frames the default.
 ChannelFile openChannelFile(std::string const& file, ReadingProgress const& progress = {},
+                            std::optional<Tempus> const& frameDuration = std::nullopt);
+
+/// The same for the content of a file; `file` is only its name.
+ChannelFile openChannelText(std::string_view text, std::string const& file,
+                            ReadingProgress const& progress = {},
                             std::optional<Tempus> const& frameDuration = std::nullopt);
 
 } // namespace lumenkey::tools

@@ -4,6 +4,7 @@
 #include "tools/time/ExactDecimal.h"
 #include "tools/time/TimeFraction.h"
 
+#include <algorithm>
 #include <limits>
 #include <optional>
 
@@ -17,6 +18,7 @@ bool isBlank(char c) { return c == ' ' || c == '\t'; }
 struct Cell {
     std::string_view text;
     std::size_t position;
+    bool isQuoted = false;
 };
 
 /// Takes the cells of a text one by one.
@@ -69,7 +71,11 @@ private:
         while (begin < end && isBlank(_text[end - 1])) {
             --end;
         }
-        return {_text.substr(begin, end - begin), begin};
+        std::string_view const text = _text.substr(begin, end - begin);
+        if (std::size_t const stray = text.find('\r'); stray != std::string_view::npos) {
+            _places.fail(begin + stray, "a carriage return inside a line; lines end in another way here");
+        }
+        return {text, begin};
     }
 
     Cell quotedCell() {
@@ -93,7 +99,7 @@ private:
         if (!atEnd() && _text[_position] != ',' && _text[_position] != '\n') {
             _places.fail(_position, "more stands here, behind the closing quotation mark");
         }
-        return {_unquoted, start};
+        return {_unquoted, start, true};
     }
 
     std::string_view _text;
@@ -130,7 +136,7 @@ private:
                 isTime = cell.text == "time";
             } else if (_columns == 1 && isTime && cell.text == "seconds") {
                 _skipped = 1;
-            } else if (cell.text.empty()) {
+            } else if (cell.text.empty() && !cell.isQuoted) {
                 _cells.places().fail(cell.position, "the name of the column is missing");
             } else {
                 _table.names.emplace_back(cell.text);
@@ -217,7 +223,14 @@ private:
 CsvFile readCsvText(std::string_view text, std::string const& file, ReadingProgress const& progress) {
     CsvFile table;
     table.file = file;
-    TableReader(checkedInputText(text, file), table, progress).read();
+    text = checkedInputText(text, file);
+    std::string withLineFeeds;
+    if (text.find('\n') == std::string_view::npos && text.find('\r') != std::string_view::npos) {
+        withLineFeeds = text;
+        std::replace(withLineFeeds.begin(), withLineFeeds.end(), '\r', '\n');
+        text = withLineFeeds;
+    }
+    TableReader(text, table, progress).read();
     return table;
 }
 

@@ -1,6 +1,7 @@
 #include "tools/import/DocumentFile.h"
 
 #include "lumenkey/Channels/KFChannelFactories.h"
+#include "lumenkey/Channels/KFChannelFlags.h"
 #include "lumenkey/Channels/KFFactories.h"
 #include "lumenkey/Channels/KFFactoryScope.h"
 #include "lumenkey/foundation/BXURL.h"
@@ -46,6 +47,7 @@ public:
         switch (element.tag()) {
         case kOldDocumentElement:
         case kDocumentElement:
+            element.getAttributeAsString(kVersionAttribute, &_document.writtenVersion);
             if (element.getAttributeAsString(kVersionAttribute, &text)) {
                 KFReadVersion(text.view(), stream.major, stream.minor);
                 _document.major = stream.major;
@@ -106,8 +108,27 @@ private:
             _problem = "the class of the channel '" + name.str() + "' is unknown: " + nameOfClass(number);
             return false;
         }
+        applyAttributes(element);
         stream.pushHandler(_top.get());
         return true;
+    }
+
+    /// As a folder does for its children: in a host's own document a channel has them in the place of
+    /// elements.
+    void applyAttributes(BXStreamElement const& element) {
+        std::uint64_t flags = 0;
+        if (element.getAttributeAsUInt64(kFlagsAttribute, &flags)) {
+            _top->setFlags((_top->getFlags() & kChannelParsePreservedFlags) |
+                           (flags & ~kChannelParsePreservedFlags));
+        }
+        auto* const channel = dynamic_cast<KFChannel*>(_top.get());
+        double number = 0;
+        if (channel != nullptr && element.getAttributeAsDouble(kDefaultAttribute, &number)) {
+            channel->setDefaultValue(number);
+        }
+        if (channel != nullptr && element.getAttributeAsDouble(kValueAttribute, &number)) {
+            channel->setInitialValue(number, false);
+        }
     }
 
     static KFChannelBase* make(KFFactory* factory, BXString const& name, unsigned id,

@@ -1,5 +1,6 @@
 #pragma once
 
+#include "lumenkey/foundation/BXString.h"
 #include "lumenkey/foundation/BXUUID.h"
 #include "tools/import/InputError.h"
 #include "tools/import/InputText.h"
@@ -13,6 +14,10 @@
 #include <vector>
 
 namespace lumenkey::tools {
+
+/// The version of the documents that are written.
+inline constexpr std::uint32_t kWrittenMajor = 5;
+inline constexpr std::uint32_t kWrittenMinor = 13;
 
 /// A class that a document names.
 struct DocumentFactory {
@@ -28,13 +33,17 @@ struct DocumentFactory {
 
 /// A channel document as its file has it.
 struct DocumentFile {
-    std::uint32_t major = 5;
-    std::uint32_t minor = 13;
+    std::uint32_t major = kWrittenMajor;
+    std::uint32_t minor = kWrittenMinor;
+    /// As it stands in the document; empty where it says none.
+    BXString writtenVersion;
 
-    /// Such as `5.13`.
+    /// Such as `5.13`: what the document is read as, whatever it says.
     std::string versionText() const { return std::to_string(major) + "." + std::to_string(minor); }
 
     std::vector<DocumentFactory> factories;
+    /// Its text, where the file can be read only once, as from a pipe.
+    std::optional<std::string> text;
     std::unique_ptr<ChannelTree> tree;
 };
 

@@ -1,5 +1,6 @@
 #include "tools/import/MotionTime.h"
 
+#include "tools/output/TextForms.h"
 #include "tools/time/ExactDecimal.h"
 
 #include <algorithm>
@@ -74,6 +75,18 @@ std::optional<Tempus> nearestUsualDuration(ExactDecimal const& printed) {
     return nearest;
 }
 
+/// Invalid beyond the limits.
+Tempus durationOfDecimal(ExactDecimal const& decimal) {
+    Tempus duration = decimal.toTempus();
+    if (!TempusIsNumeric(duration)) {
+        duration = decimal.toNearestTempus();
+    }
+    bool const isWithin = TempusIsNumeric(duration) &&
+                          duration.value <= int64_t{86'400} * duration.timescale &&
+                          Wide{duration.value} * 1'000'000'000 >= duration.timescale;
+    return isWithin ? duration : kTempusInvalid;
+}
+
 } // namespace
 
 FrameDuration frameDurationFromText(std::string_view text) {
@@ -87,15 +100,22 @@ FrameDuration frameDurationFromText(std::string_view text) {
     if (std::optional<Tempus> const usual = nearestUsualDuration(*printed)) {
         return {*usual, {}};
     }
-    Tempus duration = printed->toTempus();
+    Tempus const duration = durationOfDecimal(*printed);
     if (!TempusIsNumeric(duration)) {
-        duration = printed->toNearestTempus();
-    }
-    if (!TempusIsNumeric(duration) || duration.value > int64_t{86'400} * duration.timescale ||
-        Wide{duration.value} * 1'000'000'000 < duration.timescale) {
         return {kTempusInvalid, "a frame lasts at least a nanosecond and at most a day"};
     }
     return {duration, {}};
+}
+
+Tempus frameDurationFromSeconds(double seconds) {
+    for (UsualDuration const& usual : kUsualDurations) {
+        Tempus const duration = TempusMake(usual.value, usual.timescale);
+        if (TempusGetSeconds(duration) == seconds) {
+            return duration;
+        }
+    }
+    std::optional<ExactDecimal> const decimal = ExactDecimal::parse(shortestText(seconds));
+    return decimal && !decimal->negative ? durationOfDecimal(*decimal) : kTempusInvalid;
 }
 
 } // namespace lumenkey::tools

@@ -28,4 +28,8 @@ struct FrameDuration {
 /// flag. Durations are at least a nanosecond and at most a day.
 FrameDuration frameDurationFromText(std::string_view text);
 
+/// The duration that `TempusGetSeconds` turned into this number: that of a usual rate where it gives the same
+/// bits, else the decimal that the number is, at its shortest. Invalid beyond the limits above.
+Tempus frameDurationFromSeconds(double seconds);
+
 } // namespace lumenkey::tools

@@ -1,5 +1,8 @@
 #include "tools/import/MotionTree.h"
 
+#include "lumenkey/Channels/KFVectorChannels.h"
+#include "tools/import/MotionTime.h"
+
 #include <algorithm>
 #include <array>
 #include <filesystem>
@@ -63,6 +66,28 @@ MotionTree treeOfMotion(Motion const& motion) {
     }
     tree->finish({kTempusZero, motion.timeOfFrame(motion.frameCount)});
     return {std::move(tree), std::move(channels)};
+}
+
+bool isOffset(ChannelTree const& tree, ChannelTree::Node node) {
+    return tree.base(node).getName().view() == kOffsetName &&
+           dynamic_cast<KFChannel3D*>(&tree.base(node)) != nullptr;
+}
+
+bool isFrameTime(ChannelTree const& tree, ChannelTree::Node node) {
+    return tree.parent(node) == ChannelTree::kTop && tree.isChannel(node) &&
+           tree.base(node).getName().view() == kFrameTimeName;
+}
+
+std::optional<Tempus> storedFrameDuration(ChannelTree const& tree) {
+    bool hasOffset = false;
+    Tempus duration = kTempusInvalid;
+    for (ChannelTree::Node node = ChannelTree::kTop + 1; node < tree.count(); ++node) {
+        hasOffset = hasOffset || isOffset(tree, node);
+        if (isFrameTime(tree, node)) {
+            duration = frameDurationFromSeconds(tree.channel(node).getInitialValue());
+        }
+    }
+    return hasOffset && TempusIsNumeric(duration) ? std::optional(duration) : std::nullopt;
 }
 
 } // namespace lumenkey::tools

@@ -2,6 +2,8 @@
 
 #include "tools/output/TextForms.h"
 
+#include <cmath>
+
 namespace lumenkey::tools {
 
 namespace {
@@ -38,9 +40,16 @@ void CsvWriter::field(std::string_view text) {
     _pending += '"';
 }
 
+void CsvWriter::name(std::string_view text) {
+    field(text);
+    _pending += text.empty() ? "\"\"" : "";
+}
+
 void CsvWriter::number(double value) {
     separate();
-    appendShortest(_pending, value);
+    if (std::isfinite(value)) {
+        appendShortest(_pending, value);
+    }
 }
 
 void CsvWriter::endRow() {

@@ -15,7 +15,10 @@ public:
     explicit CsvWriter(OutputSink& out) : _out(out) {}
 
     void field(std::string_view text);
-    /// The shortest decimal that reads back to the same bits.
+    /// Likewise, but in quotation marks where it is empty: there is one.
+    void name(std::string_view text);
+    /// The shortest decimal that reads back to the same bits; an empty field for what isn't finite, which
+    /// tables can't hold.
     void number(double value);
     void endRow();
     /// The last of the text is out only after this.

@@ -77,7 +77,8 @@ SafeOutputFile::SafeOutputFile(std::string const& target) : _name(target) {
         fs::path const real = followLinks(target);
         mode_t const permissions = permissionsFor(real);
         _target = real.string();
-        _temporary = (directoryOf(real) / ("." + real.filename().string() + ".XXXXXX")).string();
+        // Not made of the target's name, which may be as long as a name can be.
+        _temporary = (directoryOf(real) / ".lumenkey-XXXXXX").string();
         _descriptor = ::mkostemp(_temporary.data(), O_CLOEXEC);
         if (_descriptor < 0) {
             _temporary.clear();

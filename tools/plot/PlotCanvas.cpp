@@ -227,6 +227,12 @@ void PlotCanvas::clip(PlotRectangle const& area) {
 void PlotCanvas::unclip() { cairo_restore(_context.get()); }
 
 void PlotCanvas::save(std::string const& file) {
+    SafeOutputFile out(file);
+    writeTo(out);
+    out.close();
+}
+
+void PlotCanvas::writeTo(OutputSink& out) {
     check(cairo_status(_context.get()));
     _context.reset();
     if (_format == PlotFormat::Png) {
@@ -234,9 +240,7 @@ void PlotCanvas::save(std::string const& file) {
     }
     cairo_surface_finish(_surface.get());
     check(cairo_surface_status(_surface.get()));
-    SafeOutputFile out(file);
     out.write(_format == PlotFormat::Svg ? withShortNumbers(*_bytes) : *_bytes);
-    out.close();
 }
 
 } // namespace lumenkey::tools

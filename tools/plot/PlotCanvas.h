@@ -1,5 +1,7 @@
 #pragma once
 
+#include "tools/output/OutputSink.h"
+
 #include <cairo.h>
 #include <memory>
 #include <optional>
@@ -85,6 +87,8 @@ public:
 
     /// Ends the picture and writes it to a file, as a whole or not at all.
     void save(std::string const& file);
+    /// Ends the picture and writes it.
+    void writeTo(OutputSink& out);
 
 private:
     struct Release {

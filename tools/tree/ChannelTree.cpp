@@ -1,5 +1,6 @@
 #include "tools/tree/ChannelTree.h"
 
+#include "tools/curve/Keypoint.h"
 #include "tools/tree/FileRoot.h"
 
 #include <algorithm>
@@ -73,6 +74,9 @@ void ChannelTree::adoptBelow(Node node) {
 }
 
 void ChannelTree::setEnds() {
+    for (Node node = kTop; node < count(); ++node) {
+        _entries[node].end = node + 1;
+    }
     for (Node node = count() - 1; node != kTop; --node) {
         Entry& above = _entries[_entries[node].parent];
         above.end = std::max(above.end, _entries[node].end);
@@ -106,6 +110,44 @@ void ChannelTree::finish(BXTimeRange const& extent) {
     base(kTop).finishInitializing();
 }
 
+// --- Changing ---
+
+ChannelTree::Node ChannelTree::append(Node parent, std::unique_ptr<KFChannelBase> channel) {
+    Node const place = _entries[parent].end;
+    std::size_t const before = count();
+    folder(parent).push_back(channel.get());
+    adoptBelow(add(parent, std::move(channel)));
+    // From the end of all to the end of the folder.
+    std::size_t const added = count() - before;
+    for (Node node = place; node < count(); ++node) {
+        Node& above = _entries[node].parent;
+        if (node < before) {
+            above += above >= place ? added : 0;
+        } else if (above >= before) {
+            above -= before - place;
+        }
+    }
+    auto const at = [this](Node node) { return _entries.begin() + static_cast<std::ptrdiff_t>(node); };
+    std::rotate(at(place), at(before), _entries.end());
+    setEnds();
+    return place;
+}
+
+void ChannelTree::erase(Node node) {
+    Node const behind = _entries[node].end;
+    base(node).getParent()->removeDescendant(&base(node));
+    for (Node below = behind; below-- > node;) {
+        _entries[below].owned.reset(); // children before their folders
+    }
+    for (Node later = behind; later < count(); ++later) {
+        Node& above = _entries[later].parent;
+        above -= above >= behind ? behind - node : 0;
+    }
+    auto const at = [this](Node place) { return _entries.begin() + static_cast<std::ptrdiff_t>(place); };
+    _entries.erase(at(node), at(behind));
+    setEnds();
+}
+
 std::vector<ChannelTree::Node> ChannelTree::channelsBelow(Node node) const {
     std::vector<Node> channels;
     for (Node below = node; below < _entries[node].end; ++below) {
@@ -120,12 +162,12 @@ std::optional<BXTimeRange> ChannelTree::keyedRange() const {
     std::optional<BXTimeRange> range;
     Tempus last{};
     for (Node const node : channelsBelow(kTop)) {
-        Tempus from{};
-        Tempus to{};
-        if (curve(node).getNumberOfKeypoints() > 0 && curve(node).getFirstKeypoint(&from, nullptr) &&
-            curve(node).getLastKeypoint(&to, nullptr)) {
-            last = range ? TempusMaximum(last, to) : to;
-            Tempus const first = range ? TempusMinimum(range->start, from) : from;
+        if (curve(node).getNumberOfKeypoints() == 0) {
+            continue;
+        }
+        if (std::optional<KeypointEnds> const ends = keypointEnds(spline(node))) {
+            last = range ? TempusMaximum(last, ends->last) : ends->last;
+            Tempus const first = range ? TempusMinimum(range->start, ends->first) : ends->first;
             range = BXTimeRange{first, last - first};
         }
     }

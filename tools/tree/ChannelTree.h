@@ -50,6 +50,13 @@ public:
     /// To be called once everything is there, and before anything below.
     void finish(BXTimeRange const& extent);
 
+    // Changing a tree that is there. Nodes behind the place are told by other numbers afterwards.
+
+    /// Adds a channel, and what its class puts below it, behind the children of a folder.
+    Node append(Node parent, std::unique_ptr<KFChannelBase> channel);
+    /// Takes a node, and all below it, out of its folder and destroys it. Neither the top nor a component.
+    void erase(Node node);
+
     // Nodes.
 
     std::size_t count() const { return _entries.size(); }
@@ -117,6 +124,7 @@ private:
     Node add(Node parent, KFChannelBase* channel, std::unique_ptr<KFChannelBase> owned);
     Node add(Node parent, std::unique_ptr<KFChannelBase> channel);
     void adoptBelow(Node folder);
+    /// From the parents alone.
     void setEnds();
     KFChannelFolder& folder(Node node) const { return static_cast<KFChannelFolder&>(base(node)); }
     unsigned nextID(Node parent) const;

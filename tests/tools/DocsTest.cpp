@@ -1,0 +1,77 @@
+// What the pages about the program and the document show is so.
+
+#include "tests/tools/RunProgram.h"
+#include "tests/tools/TestFolder.h"
+
+#include <gtest/gtest.h>
+
+namespace lumenkey::tools {
+namespace {
+
+std::string pageNamed(std::string const& name) { return contentOf(LUMENKEY_TEST_SOURCE_DIR "/" + name); }
+
+/// The blocks of a page that begin with such a line, such as three backquotes and `xml`.
+std::vector<std::string> blocksOf(std::string const& page, std::string const& opening) {
+    std::vector<std::string> blocks;
+    std::string const closing = "\n```\n";
+    for (std::size_t at = 0; (at = page.find("\n" + opening + "\n", at)) != std::string::npos;) {
+        std::size_t const begin = at + opening.size() + 2;
+        at = page.find(closing, begin);
+        blocks.push_back(page.substr(begin, at + 1 - begin));
+        at += closing.size();
+    }
+    return blocks;
+}
+
+class DocsTest : public ::testing::Test {
+protected:
+    TestFolder const _folder;
+
+    /// A session as it is shown: each command behind a `$ `, then what it says.
+    std::string sessionAgain(std::string const& shown) const {
+        std::string again;
+        std::istringstream lines(shown);
+        for (std::string line; std::getline(lines, line);) {
+            if (line.starts_with("$ ")) {
+                std::string const script =
+                    "lumenkey() { \"$0\" \"$@\"; }; cd \"$1\" || exit; " + line.substr(2);
+                Outcome const outcome =
+                    runProgramFile("/bin/sh", {"-c", script, programPath(), _folder.path().string()});
+                again += line + "\n" + outcome.out + outcome.err;
+            }
+        }
+        return again;
+    }
+};
+
+TEST_F(DocsTest, TheProgramSaysWhatItsPageShows) {
+    std::vector<std::string> const sessions = blocksOf(pageNamed("docs/program.md"), "```");
+    EXPECT_EQ(sessions.size(), 3U);
+    for (std::string const& session : sessions) {
+        EXPECT_EQ(sessionAgain(session), session);
+    }
+}
+
+TEST_F(DocsTest, TheProgramSaysWhatTheFirstPageShows) {
+    runProgramFile(LUMENKEY_MAKE_MOTION, {_folder.file("walk.bvh")});
+    std::vector<std::string> const sessions = blocksOf(pageNamed("README.md"), "```console");
+    ASSERT_EQ(sessions.size(), 1U);
+    EXPECT_EQ(sessionAgain(sessions[0]), sessions[0]);
+    EXPECT_TRUE(std::filesystem::exists(_folder.file("plot.svg")));
+}
+
+TEST_F(DocsTest, TheExampleOfADocumentIsOne) {
+    std::vector<std::string> const examples = blocksOf(pageNamed("docs/format.md"), "```xml");
+    ASSERT_EQ(examples.size(), 1U);
+    std::string const file = _folder.write("example.lumen", examples[0]);
+    EXPECT_EQ(outputOf({"check", file}), "");
+    Json const info = jsonOf({"info", file});
+    EXPECT_EQ(info["channelNames"], Json({"Size", "Blur"}));
+    EXPECT_EQ(info["keypoints"], 2);
+    Outcome const valid = runProgramFile(
+        "/usr/bin/xmllint", {"--noout", "--relaxng", LUMENKEY_TEST_SOURCE_DIR "/docs/document.rng", file});
+    EXPECT_EQ(valid.exit, 0) << valid.err;
+}
+
+} // namespace
+} // namespace lumenkey::tools

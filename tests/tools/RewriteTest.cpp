@@ -1,0 +1,155 @@
+// What a document keeps when the program writes it anew.
+
+#include "tests/tools/RunProgram.h"
+#include "tests/tools/TestFolder.h"
+
+#include <gtest/gtest.h>
+
+namespace lumenkey::tools {
+namespace {
+
+/// A folder, a percentage, a number and a progress are classes 1 to 4.
+std::string documentOf(std::string const& body, char const* version = "5.13") {
+    return std::string("<kfml version=\"") + version +
+           "\">\n<factory id=\"1\" uuid=\"E7BF3809-2290-11D7-98E5-00039389B702\"/>"
+           "<factory id=\"2\" uuid=\"27F3EE8B-2292-11D7-925A-00039389B702\"/>"
+           "<factory id=\"3\" uuid=\"FDC1944B-2291-11D7-B1C3-00039389B702\"/>"
+           "<factory id=\"4\" uuid=\"9DE2E4A6-6865-4D59-B31D-BEF26E4AFFAB\"/>\n" +
+           body + "</kfml>";
+}
+
+class RewriteTest : public ::testing::Test {
+protected:
+    TestFolder const _folder;
+    std::string const _file = _folder.file("f.lumen");
+
+    void write(std::string const& body, char const* version = "5.13") const {
+        _folder.write("f.lumen", documentOf(body, version));
+    }
+    /// `time value` of each keypoint, with `off` where it is disabled.
+    std::string keypointsOf(std::string const& channel) const {
+        Json const keys = jsonOf({"keys", _file, channel});
+        std::string all;
+        for (Json const& key : keys["keypoints"]) {
+            all += key["time"].get<std::string>() + " " + key["value"].dump() +
+                   (key["enabled"].get<bool>() ? "; " : " off; ");
+        }
+        return all;
+    }
+};
+
+TEST_F(RewriteTest, LosesNothingUnlessForced) {
+    std::string const two = "<parameter name=\"R\" id=\"1\" factoryID=\"1\">\n"
+                            "<parameter name=\"X\" id=\"1\" factoryID=\"3\"/>";
+    struct {
+        std::string inside;
+        char const* loss; // empty for none
+    } const cases[] = {
+        {"", ""},
+        {"\n<parameter name=\"Y\" id=\"2\" factoryID=\"9\"/>", "5:1: the channel 'Y' is of factory 9"},
+        {"\n<parameter name=\"Y\" id=\"2\"/>", "5:1: the channel 'Y' names no class"},
+        {"\n<parameter name=\"Y\" id=\"1\" factoryID=\"3\"/>", "5:1: the channel 'Y' has the ID 1"},
+        {"\n<shiny/>", "5:1: the element 'shiny'"},
+        {"\n<parameter id=\"2\" factoryID=\"3\"><curve "
+         "type=\"1\"><keypoint>\n<time>0/1</time><value>high</value>"
+         "</keypoint></curve></parameter>",
+         "6:17: 'high' is no number"},
+        {"\n<parameter name=\"Y\" id=\"2\" factoryID=\"4\"/>", "documents leave out the channel 'Y'"},
+        {"\n<parameter id=\"2\" factoryID=\"2\"><curve value=\"2\"/></parameter>",
+         "the value 2 is out of the limits"},
+        // Odd, but it stays.
+        {"<parameter id=\"2\" factoryID=\"2\"><curve type=\"1\" default=\"3\"><keypoint><time>0/1</time>"
+         "<value>1.5</value></keypoint></curve></parameter>",
+         ""},
+        {"<parameter id=\"2\" factoryID=\"3\"><curve type=\"1\"><keypoint "
+         "interpolation=\"99\"><time>1/1</time>"
+         "<value>5</value></keypoint><keypoint><time>0/1</time><value>6</value></keypoint></curve></"
+         "parameter>",
+         ""},
+    };
+    std::string const out = _folder.file("out.lumen");
+    for (auto const& each : cases) {
+        SCOPED_TRACE(each.inside);
+        write(two + each.inside + "</parameter>", "5.12");
+        std::string const before = contentOf(_file);
+        for (std::vector<std::string> arguments :
+             std::vector<std::vector<std::string>>{{"upgrade", _file, "-o", out},
+                                                   {"convert", _file, out},
+                                                   {"add", _file, "./", "Double", "Z", "-o", out},
+                                                   {"set", _file, "X", "--value", "1", "-o", out},
+                                                   {"convert", _file, _folder.file("out.csv")}}) {
+            bool const isRefused = *each.loss != '\0' && arguments.back() == out;
+            Outcome const outcome = runLumenkey(arguments);
+            EXPECT_EQ(outcome.exit, isRefused ? 1 : 0) << Json(arguments) << outcome.err;
+            EXPECT_NE(outcome.err.find(isRefused ? each.loss : ""), std::string::npos) << outcome.err;
+            if (isRefused) {
+                EXPECT_FALSE(std::filesystem::exists(out));
+                arguments.push_back("--force");
+                EXPECT_EQ(runLumenkey(arguments).exit, 0);
+            }
+            std::filesystem::remove(out);
+        }
+        EXPECT_EQ(contentOf(_file), before);
+    }
+    EXPECT_EQ(runLumenkey({"upgrade", _file}).exit, 0);
+    EXPECT_EQ(keypointsOf("./2"), "1/1 5; 0/1 6; ");
+    EXPECT_NE(contentOf(_file).find("interpolation=\"99\""), std::string::npos);
+
+    write(two + "</parameter>", "6.0");
+    EXPECT_NE(runLumenkey({"set", _file, "X", "--value", "1"}).err.find("version 6.0 is newer"),
+              std::string::npos);
+
+    // From a pipe, which can be read only once.
+    std::string const script = "cat '" + _folder.write("odd", documentOf(two + "<shiny/></parameter>")) +
+                               "' | '" + programPath() + "' convert /dev/stdin '" + out + "'";
+    Outcome const piped = runProgramFile("/bin/sh", {"-c", script});
+    EXPECT_EQ(piped.exit, 1);
+    EXPECT_NE(piped.err.find("/dev/stdin:4:43: the element 'shiny'"), std::string::npos) << piped.err;
+}
+
+TEST_F(RewriteTest, TheTopHasItsAttributesToo) {
+    write("<parameter name=\"P\" id=\"1\" factoryID=\"2\" default=\"0.25\" value=\"0.5\" flags=\"2\"/>");
+    outputOf({"convert", _file, _file});
+    EXPECT_NE(contentOf(_file).find("<flags>18</flags>"), std::string::npos) << contentOf(_file);
+    Json const top = jsonOf({"tree", _file})["nodes"][0];
+    EXPECT_EQ(top["default"], 0.25);
+    EXPECT_EQ(top["start"], 0.5);
+    write("<parameter name=\"R\" id=\"1\" flags=\"4\"><parameter name=\"X\" id=\"1\" factoryID=\"3\" "
+          "value=\"7\"/></parameter>");
+    EXPECT_EQ(jsonOf({"tree", _file})["nodes"][1]["start"], 7.0);
+    EXPECT_NE(runLumenkey({"set", _file, "X", "--value", "1"}).err.find("is locked"), std::string::npos);
+}
+
+std::string keypoint(char const* time, char const* value, char const* attributes = "") {
+    return std::string("<keypoint interpolation=\"1\" ") + attributes + "><time>" + time + "</time><value>" +
+           value +
+           "</value><outputTangentTime>0.1</outputTangentTime><outputTangentValue>0</outputTangentValue></"
+           "keypoint>";
+}
+
+TEST_F(RewriteTest, EveryKeypointCounts) {
+    std::string const body = "<parameter name=\"X\" id=\"1\" factoryID=\"3\"><curve type=\"1\">" +
+                             keypoint("0/1", "1", "enabled=\"0\"") + keypoint("1/1", "2") +
+                             keypoint("1/1", "3") + keypoint("2/1", "4") +
+                             keypoint("4/1", "5", "enabled=\"0\"") + "</curve></parameter>";
+    struct {
+        std::vector<std::string> arguments;
+        char const* keypoints;
+    } const cases[] = {
+        {{"convert", _file, _file}, "0/1 1 off; 1/1 2; 1/1 3; 2/1 4; 4/1 5 off; "},
+        {{"offset", _file, "--by", "10", "--in-place"}, "10/1 1 off; 11/1 2; 11/1 3; 12/1 4; 14/1 5 off; "},
+        {{"offset", _file, "--value", "1", "--in-place"}, "0/1 2 off; 1/1 3; 1/1 4; 2/1 5; 4/1 6 off; "},
+        {{"offset", _file, "--by", "10", "--from", "2", "--in-place"},
+         "0/1 1 off; 1/1 2; 1/1 3; 12/1 4; 14/1 5 off; "},
+        {{"reverse", _file, "--in-place"}, "0/1 5 off; 2/1 4; 3/1 3; 3/1 2; 4/1 1 off; "},
+        {{"retime", _file, "--factor", "2", "--in-place"}, "0/1 1 off; 2/1 2; 2/1 3; 4/1 4; 8/1 5 off; "},
+    };
+    for (auto const& each : cases) {
+        write(body);
+        outputOf(each.arguments);
+        EXPECT_EQ(keypointsOf("./"), each.keypoints) << Json(each.arguments);
+    }
+}
+
+} // namespace
+} // namespace lumenkey::tools

@@ -1,0 +1,67 @@
+#include "tools/check/AttributeCheck.h"
+
+#include "tools/check/DocumentVocabulary.h"
+#include "tools/import/DocumentFile.h"
+
+#include <utility>
+
+namespace lumenkey::tools {
+
+namespace {
+
+std::string faultOfText(DocumentAttribute const& attribute, std::string_view text, CurveLimits const& limits,
+                        bool countsFrames) {
+    std::string const name(attribute.name);
+    if (!canBeRead(text, attribute.text, countsFrames)) {
+        return "the attribute '" + name + "' is '" + std::string(text) + "', which is " +
+               std::string(nameOfTextKind(attribute.text));
+    }
+    switch (attribute.text) {
+    case TextKind::Whole32:
+    case TextKind::Whole64:
+        return readWhole(text).value_or(0) <= attribute.greatest
+                   ? ""
+                   : "the attribute '" + name + "' is " + std::string(text) +
+                         ", which is out of the limits, 0 to " + std::to_string(attribute.greatest);
+    case TextKind::Number:
+        return faultOfNumber(text, limits);
+    default:
+        return {};
+    }
+}
+
+std::string faultOfVersion(std::string_view text) {
+    std::size_t const point = text.find('.');
+    std::optional<std::uint64_t> const major = readWhole(text.substr(0, point));
+    std::optional<std::uint64_t> const minor =
+        point == std::string_view::npos ? std::nullopt : readWhole(text.substr(point + 1));
+    std::string const written = std::to_string(kWrittenMajor) + "." + std::to_string(kWrittenMinor);
+    if (!major || !minor) {
+        return "'" + std::string(text) + "' is no version, such as " + written;
+    }
+    bool const isNewer =
+        std::pair(*major, *minor) > std::pair<std::uint64_t, std::uint64_t>(kWrittenMajor, kWrittenMinor);
+    return isNewer ? "the version " + std::string(text) + " is newer than " + written : "";
+}
+
+} // namespace
+
+std::vector<AttributeFault> faultsOfAttributes(std::string_view element, Attributes const& attributes,
+                                               CurveLimits const& limits, bool countsFrames) {
+    std::vector<AttributeFault> faults;
+    for (DocumentAttribute const& attribute : documentAttributes()) {
+        if (auto const found = attributes.find(attribute.name);
+            attribute.element == element && found != attributes.end()) {
+            // A default may lie out of the limits; a value is brought within them.
+            bool const isKept = attribute.name == "default" && readNumber(found->second);
+            faults.push_back({faultOfText(attribute, found->second, limits, countsFrames), isKept});
+        }
+    }
+    if (auto const version = attributes.find("version");
+        (element == "kfml" || element == "kfdoc") && version != attributes.end()) {
+        faults.push_back({faultOfVersion(version->second), true});
+    }
+    return faults;
+}
+
+} // namespace lumenkey::tools
