@@ -60,14 +60,14 @@ TEST_F(CheckVerbTest, FindsWhatIsOddWithItsPlace) {
          "8:1: the channel '' has the ID 4 of one before it: it is read into that one\n"},
         {"<parameter id=\"1\" "
          "factoryID=\"2\">\n<foldFlags>1</foldFlags>\n<fadeInCurve>4</fadeInCurve>\n<curve "
-         "type=\"1\" value=\"2\">\n<preExtrapolation>-1</preExtrapolation>\n<keypoint interpolation=\"99\">\n"
+         "type=\"1\" value=\"3\">\n<preExtrapolation>-1</preExtrapolation>\n<keypoint interpolation=\"99\">\n"
          "<time>1/2</time>\n<value>0.5</value></keypoint>\n<keypoint><time>1/3</time>\n<value>1.5</"
          "value>\n<bias>"
          "big</bias></keypoint><max>2</max>\n<keypoint><time>3/4@x</time>\n<value>1.5</value></keypoint>\n"
          "</curve></parameter>",
          "5:1: the element 'foldFlags' is none of a channel of the class Percent: it is passed over\n"
          "6:1: the number 4 is out of the limits of 'fadeInCurve', 0 to 3\n"
-         "7:1: the value 2 is out of the limits of its curve, 0 to 1\n"
+         "7:1: the value 3 is out of the limits of its curve, 0 to 2\n"
          "8:1: '-1' is no whole number\n"
          "9:1: the interpolation '99' is unknown: it counts as Bezier\n"
          "12:11: the keypoint lies before the one in front of it\n"
@@ -90,7 +90,7 @@ TEST_F(CheckVerbTest, FindsWhatIsOddWithItsPlace) {
          "<keypoint/>\n<keypoint><value>nan</value></keypoint></curve></parameter></parameter>",
          "5:1: the value 7 is out of the limits of its curve, 0 to 1\n"
          "7:1: the attribute 'type' is 7, which is out of the limits, 0 to 1\n"
-         "7:1: the value 2 is out of the limits of its curve, 0 to 1\n"
+         "7:1: the value 2 is out of the limits of its curve, 5 to 3\n"
          "7:1: the attribute 'round' is 'no', which is neither 1 nor 0\n"
          "9:1: the least value, 5, is above the greatest, 3\n"
          "10:1: the attribute 'enabled' is 'maybe', which is neither 1 nor 0\n"

@@ -55,10 +55,9 @@ TEST_F(RewriteTest, LosesNothingUnlessForced) {
          "</keypoint></curve></parameter>",
          "6:17: 'high' is no number"},
         {"\n<parameter name=\"Y\" id=\"2\" factoryID=\"4\"/>", "documents leave out the channel 'Y'"},
-        {"\n<parameter id=\"2\" factoryID=\"2\"><curve value=\"2\"/></parameter>",
-         "the value 2 is out of the limits"},
         // Odd, but it stays.
-        {"<parameter id=\"2\" factoryID=\"2\"><curve type=\"1\" default=\"3\"><keypoint><time>0/1</time>"
+        {"<parameter id=\"2\" factoryID=\"2\"><curve type=\"1\" default=\"3\" "
+         "value=\"2\"><keypoint><time>0/1</time>"
          "<value>1.5</value></keypoint></curve></parameter>",
          ""},
         {"<parameter id=\"2\" factoryID=\"3\"><curve type=\"1\"><keypoint "

@@ -52,8 +52,8 @@ std::vector<AttributeFault> faultsOfAttributes(std::string_view element, Attribu
     for (DocumentAttribute const& attribute : documentAttributes()) {
         if (auto const found = attributes.find(attribute.name);
             attribute.element == element && found != attributes.end()) {
-            // A default may lie out of the limits; a value is brought within them.
-            bool const isKept = attribute.name == "default" && readNumber(found->second);
+            // Curves store numbers out of their limits, and bring them within when they are read.
+            bool const isKept = attribute.text == TextKind::Number && readNumber(found->second);
             faults.push_back({faultOfText(attribute, found->second, limits, countsFrames), isKept});
         }
     }

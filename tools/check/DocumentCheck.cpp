@@ -16,6 +16,7 @@
 #include <memory>
 #include <optional>
 #include <utility>
+#include <vector>
 
 namespace lumenkey::tools {
 
@@ -30,7 +31,8 @@ struct OpenElement {
     /// Of a channel: its class, or null; and those of its children so far, by ID.
     KFFactory* factory = nullptr;
     std::map<std::uint64_t, KFFactory*> children;
-    /// Of a curve.
+    /// Of a curve. What its attributes may be is known at its end.
+    std::vector<std::pair<std::string, std::string>> attributes;
     CurveLimits limits;
     Tempus lastTime = kTempusInvalid;
     /// Where the last of the limits stands.
@@ -85,7 +87,11 @@ private:
             _skipped = 1;
             return;
         }
-        checkAttributes(element, attributes);
+        if (element.name == "curve") {
+            element.attributes.assign(attributes.begin(), attributes.end());
+        } else {
+            checkAttributes(element, attributes);
+        }
         _open.push_back(std::move(element));
     }
 
@@ -238,9 +244,16 @@ private:
             endPartOfCurve(element);
         } else if (element.word->parent == "keypoint") {
             endPartOfKeypoint(element);
-        } else if (element.name == "curve" && element.limits.low > element.limits.high) {
-            find(element.limitPlace, "the least value, " + shortestText(element.limits.low) +
-                                         ", is above the greatest, " + shortestText(element.limits.high));
+        } else if (element.name == "curve") {
+            endCurve(element);
+        }
+    }
+
+    void endCurve(OpenElement const& curve) {
+        checkAttributes(curve, Attributes(curve.attributes.begin(), curve.attributes.end()));
+        if (curve.limits.low > curve.limits.high) {
+            find(curve.limitPlace, "the least value, " + shortestText(curve.limits.low) +
+                                       ", is above the greatest, " + shortestText(curve.limits.high));
         }
     }
 
