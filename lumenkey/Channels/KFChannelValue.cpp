@@ -179,7 +179,8 @@ double KFChannel::getInitialValue() const {
 }
 
 void KFChannel::setInitialValue(double value, bool silent) {
-    if (isSame(value, getInitialValue()))
+    // Held against what is stored, as documents hold it: the limits are for reading.
+    if (isSame(value, curve().getRootNode()->getInitialValue()))
         return;
     if (!silent)
         willBeModified(kModifyData);

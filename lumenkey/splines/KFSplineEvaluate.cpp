@@ -50,25 +50,22 @@ void KFSpline::interpolate(Tempus const& t, void* vA, void* vB, Tempus const& u,
 [[gnu::flatten]] double KFSpline::getVertexValue(Tempus const& u, Tempus const& t, bool lock) {
     // One position after another in one segment is what happens most: the thread has all that it needs.
     std::uint64_t const version = _store->acquiredVersion();
-    KFSegmentPlace& place = KFThreadSegments::placeOf(version);
-    KFSegmentCache const& segment = place.current();
+    KFSegmentPlace* const place = KFThreadSegments::placeOf(version);
     std::int64_t position = 0;
-    if (segment.scale.stepsOf(u, &position)) [[likely]] {
-        if (segment.holds(position)) {
-            if (segmentStandsWithoutLock(segment, version)) [[likely]]
-                return segment.valueAt(position);
-        } else if (place.keepsSeveral()) {
-            KFSegmentCache const& other = place.around(u, position, version);
-            if (other.scale.stepsOf(u, &position) && other.holds(position) &&
-                segmentStandsWithoutLock(other, version)) {
-                return other.valueAt(position);
-            }
+    if (place != nullptr && place->current().scale.stepsOf(u, &position)) [[likely]] {
+        KFSegmentCache const* segment = &place->current();
+        bool holds = segment->holds(position);
+        if (!holds && place->keepsSeveral(version)) {
+            segment = &place->around(u, position, version);
+            holds = segment->scale.stepsOf(u, &position) && segment->holds(position);
         }
+        if (holds && segmentStandsWithoutLock(*segment, version)) [[likely]]
+            return segment->valueAt(position);
     }
     return lock ? readUnderLock(u, t, place) : readWithoutLock(u, t, place);
 }
 
-[[gnu::noinline]] double KFSpline::readUnderLock(Tempus const& u, Tempus const& t, KFSegmentPlace& place) {
+[[gnu::noinline]] double KFSpline::readUnderLock(Tempus const& u, Tempus const& t, KFSegmentPlace* place) {
     double value = 0.0;
     bool wholeCurve = false;
     BXSpinLock& held = guard();
@@ -82,7 +79,7 @@ void KFSpline::interpolate(Tempus const& t, void* vA, void* vB, Tempus const& u,
     return wholeCurve ? valueOfWholeCurve(u, t, true) : value;
 }
 
-[[gnu::noinline]] double KFSpline::readWithoutLock(Tempus const& u, Tempus const& t, KFSegmentPlace& place) {
+[[gnu::noinline]] double KFSpline::readWithoutLock(Tempus const& u, Tempus const& t, KFSegmentPlace* place) {
     KFSegmentCache own;
     double value = 0.0;
     if (evaluateAndKeep(u, place, own, &value))
@@ -91,12 +88,14 @@ void KFSpline::interpolate(Tempus const& t, void* vA, void* vB, Tempus const& u,
 }
 
 /// Evaluates with a segment that the thread keeps for this spline, or with `instead` while it has no place for one.
-[[gnu::always_inline]] inline bool KFSpline::evaluateAndKeep(Tempus const& u, KFSegmentPlace& place,
+[[gnu::always_inline]] inline bool KFSpline::evaluateAndKeep(Tempus const& u, KFSegmentPlace* place,
                                                              KFSegmentCache& instead, double* out) {
     KFVertexStore const& store = *_store;
     std::uint64_t const version = store.version();
     bool const keepsAll = KFSegmentPlace::keepsAll(store.size());
-    KFSegmentCache* const kept = keepsAll ? place.claimFor(u, version) : place.claim(version);
+    KFSegmentCache* kept = nullptr;
+    if (place != nullptr)
+        kept = keepsAll ? place->claimFor(u, version) : place->claim(version);
     if (kept == nullptr)
         return evaluateIndexed(u, instead, out);
     bool const done = evaluateIndexed(u, *kept, out);
@@ -104,7 +103,7 @@ void KFSpline::interpolate(Tempus const& t, void* vA, void* vB, Tempus const& u,
     if (kept->version == version)
         kept->watch();
     if (keepsAll)
-        place.keep(*kept, u);
+        place->keep(*kept, u);
     return done;
 }
 

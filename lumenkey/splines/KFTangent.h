@@ -24,7 +24,7 @@ struct KFTangent {
 inline constexpr double kKFTangentTolerance = 1e-7;
 
 /// A handle, which callers see and which makes the control points, is this many times the tangent that a vertex
-/// stores; on a parametric spline it is a third of it.
+/// stores. On a parametric spline tangents make the control points as they are, and callers see a third of them.
 inline constexpr int kKFHandlesPerTangent = 12;
 
 /// The U part of a derived tangent, as a fraction of the distance to the neighbour: its handle reaches a third of

@@ -6,8 +6,6 @@
 
 #include <cstddef>
 #include <cstdint>
-#include <new>
-#include <type_traits>
 
 /// A place for one spline in the table of a thread: all segments of a spline with few vertices, that of the last read
 /// of another.
@@ -18,7 +16,10 @@ public:
 
     /// The segment that was read last. It may be another spline's, or none.
     KFSegmentCache const& current() const noexcept { return _segments[_current]; }
-    bool keepsSeveral() const noexcept { return _used > 1; }
+    /// Whether it keeps several segments of the spline with that version.
+    bool keepsSeveral(std::uint64_t version) const noexcept {
+        return _used > 1 && _owner == KFStoreVersion::runOf(version);
+    }
 
     /// The kept segment of that version that seems to hold `u`, at `position` by the scale of the current segment: ask
     /// it again by its own. The current one where there is none.
@@ -61,7 +62,7 @@ public:
         return &_segments[_next];
     }
 
-    /// What `claimFor` gave is the current segment, if it was prepared for `u`; at the position of a vertex none is.
+    /// What `claimFor` gave is the current segment, if it is around `u`; at the position of a vertex none is.
     void keep(KFSegmentCache const& claimed, Tempus const& u) noexcept {
         if (!holds(claimed, u))
             return;
@@ -95,7 +96,7 @@ private:
     std::uint32_t _current = 0;
     /// The one to be prepared when another is needed.
     std::uint32_t _next = 0;
-    /// Those behind were never prepared for this spline.
+    /// Those behind were never prepared, or for a version that doesn't come back.
     std::uint32_t _used = 0;
     /// The run of versions of the spline whose place it is, and of the one that missed it last.
     std::uint64_t _owner = 0;
@@ -123,31 +124,31 @@ private:
 /// A spline that an owner's custom lock guards is read under that lock always, since the lock may hold several splines
 /// still together. Vertices that aren't static ones have no segments.
 ///
-/// A thread's places are a fixed table of 70 KiB that nothing constructs or destroys: zeroed memory, whose pages a
-/// thread that reads no spline never touches. A spline's version tells its place. Of two splines that have the same
-/// one, the later gets it by missing it twice in a row, so that many splines read in turn leave it alone and use what
-/// each spline keeps under its own lock.
+/// A thread's places are a table of 70 KiB that it allocates when it first reads a spline and frees at its end. Without
+/// one, for want of memory or because the thread is ending, it reads under the locks. A spline's version tells its
+/// place. Of two splines that have the same one, the later gets it by missing it twice in a row, so that many splines
+/// read in turn leave it alone and use what each spline keeps under its own lock.
 class KFThreadSegments {
 public:
-    /// The calling thread's place for the spline with that version. It is the thread's own.
-    static KFSegmentPlace& placeOf(std::uint64_t version) noexcept {
-        ZeroedPlace* place = &_places[KFStoreVersion::runOf(version) % kPlaces];
-#if defined(__GNUC__)
-        // Else the compiler asks for the thread's address again at each use.
-        asm("" : "+r"(place));
-#endif
-        return *std::launder(reinterpret_cast<KFSegmentPlace*>(place->bytes));
+    /// The calling thread's place for the spline with that version, or null. It is the thread's own.
+    static KFSegmentPlace* placeOf(std::uint64_t version) noexcept {
+        KFSegmentPlace* places = _places;
+        if (places == nullptr) [[unlikely]] {
+            places = makePlaces();
+            if (places == nullptr)
+                return nullptr;
+        }
+        return places + KFStoreVersion::runOf(version) % kPlaces;
     }
 
 private:
-    /// All zeros are a place of nobody's that keeps nothing. Initialized in the language's way, the table would be an
-    /// image in the library that is copied for each thread.
-    struct ZeroedPlace {
-        alignas(KFSegmentPlace) std::byte bytes[sizeof(KFSegmentPlace)];
-    };
-    static_assert(std::is_trivially_copyable_v<KFSegmentPlace>);
+    struct Keeper;
+
+    static KFSegmentPlace* makePlaces() noexcept;
 
     static constexpr std::uint64_t kPlaces = 16;
 
-    static constinit thread_local ZeroedPlace _places[kPlaces];
+    // No object of a class, which each read would have to ask whether it is there.
+    static constinit thread_local KFSegmentPlace* _places;
+    static constinit thread_local bool _isEnding;
 };

@@ -141,7 +141,7 @@ TEST(Recording, HoldsTheStartAndTheLastValueAndKeepsTheExtremes) {
     curve.updateCurrentRecordingTime(at(5));
     EXPECT_EQ(curve.value(5), -50);
     curve.set(6, 60);
-    for (double t = 7; t < 9; t += 0.5)
+    for (double const t : {7.0, 7.5, 8.0, 8.5})
         curve.set(t, 5);
     EXPECT_EQ(curve.highest(), 60);
     EXPECT_EQ(curve.lowest(), -50);

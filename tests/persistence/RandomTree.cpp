@@ -61,8 +61,8 @@ void addKeypoints(Random& random, KFChannel& channel) {
         curve.closeCurve();
 }
 
-/// They may have crossed, also infinitely far. Where a class has none they may be infinite too; that others are
-/// taken off, no document tells.
+/// They may have crossed, also infinitely far. Where a class has none they may be infinite too; that others
+/// are taken off, no document tells.
 void setLimits(Random& random, KFCurve& curve) {
     constexpr double kNone = std::numeric_limits<double>::max();
     double classMin = 0.0;

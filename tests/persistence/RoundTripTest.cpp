@@ -41,7 +41,8 @@ TEST(RoundTrip, GivesTheSameBytesInAFreshTree) {
 }
 
 TEST(RoundTrip, GivesTheSameBytesInPlace) {
-    // Into the tree itself, where channels have been given other constants, and the keyed ones other keypoints.
+    // Into the tree itself, where channels have been given other constants, and the keyed ones other
+    // keypoints.
     for (std::uint64_t seed = 1; seed <= numberOfSeeds(); ++seed) {
         OwnedTree const tree = randomTree(seed);
         std::string const document = documentOf(*tree);

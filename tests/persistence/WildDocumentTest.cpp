@@ -75,13 +75,14 @@ TEST(WildDocument, HoldsNumbersThatAreNone) {
 }
 
 TEST(WildDocument, PromisesKeypointsInEveryChannel) {
-    std::size_t most[2];
+    std::size_t most[2] = {};
     for (bool const promises : {false, true}) {
         std::string document = kDocumentHead;
-        for (int id = 10; id < 10'010; ++id)
+        for (int id = 10; id < 10'010; ++id) {
             document += "<parameter id='" + std::to_string(id) +
                         "' factoryID='2'><curve type='1'><numberOfKeypoints>" +
                         (promises ? "4294967295" : "0000000001") + "</numberOfKeypoints></curve></parameter>";
+        }
         Victim victim;
         std::size_t const before = forgetPeak();
         EXPECT_EQ(victim.read(document + kDocumentTail), "");

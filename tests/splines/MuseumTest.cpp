@@ -118,7 +118,8 @@ TEST(Museum, SegmentsMeetTheirVertices) {
             greatest = std::max(greatest, std::fabs(vertex->getValueV(kTempusZero)));
         for (auto const& [a, b] : segmentsOf(*curve)) {
             std::uint32_t const type = a->getInterpolation();
-            // A cubic of less than 1e-5 s is drawn as if it had that, and handles may be as large as the others' values.
+            // A cubic of less than 1e-5 s is drawn as if it had that, and handles may be as large as the
+            // others' values.
             bool const isShort = TempusSecondsBetween(a->getValueU(), b->getValueU()) <= 1e-5;
             if (isWholeCurveType(type) || (isCubicType(type) && isShort)) {
                 continue;

@@ -143,7 +143,8 @@ long double distanceInSeconds(Tempus const& a, Tempus const& b) {
 
 namespace {
 
-/// The way after the fraction `p` of a motion that gets to its speed within `in` and stops within `out`, evenly.
+/// The way after the fraction `p` of a motion that gets to its speed within `in` and stops within `out`,
+/// evenly.
 long double easedFraction(long double p, long double in, long double out) {
     long double const speed = 2.0L / (2.0L - in - out);
     if (p < in)

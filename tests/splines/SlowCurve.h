@@ -15,7 +15,8 @@ bool isCubicType(std::uint32_t type);
 /// b - a, from whole numbers.
 long double distanceInSeconds(Tempus const& a, Tempus const& b);
 
-/// A segment of any other type that draws segments, in long double, at a fraction of it; how far the value may be off.
+/// A segment of any other type that draws segments, in long double, at a fraction of it; how far the value
+/// may be off.
 long double longShape(KFVertex const& a, KFVertex const& b, long double fraction);
 double longShapeTolerance(KFVertex const& a, KFVertex const& b);
 

@@ -418,7 +418,8 @@ TEST_F(KFSplineThreads, TwoSplinesShareOneLock) {
     EXPECT_EQ(differences, 0);
 }
 
-// Who holds a lock that several splines share holds them all still, also where a thread has kept all that it needs.
+// Who holds a lock that several splines share holds them all still, also where a thread has kept all that it
+// needs.
 TEST_F(KFSplineThreads, ACustomLockIsWaitedForByEveryRead) {
     Owner owner;
     BXSpinLock shared;

@@ -11,7 +11,6 @@ namespace lumenkey::tools {
 namespace {
 
 constexpr std::uint64_t kMost32 = std::numeric_limits<std::uint32_t>::max();
-constexpr std::uint64_t kMost64 = std::numeric_limits<std::uint64_t>::max();
 constexpr std::uint64_t kLastFadeCurve = 3;
 constexpr std::uint64_t kLastExtrapolation = 4;
 constexpr std::uint64_t kLastCurveType = 1;
@@ -25,22 +24,22 @@ constexpr DocumentWord kWords[] = {
     {"factory", "manufacturer", TextKind::Any},
     {"factory", "version", TextKind::Number},
     {"parameter", "flags", TextKind::Whole64},
-    {"parameter", "parameter", TextKind::None, kMost64, kOfFolders | kOfRoots},
-    {"parameter", "foldFlags", TextKind::Whole32, kMost32, kOfFolders | kOfRoots},
-    {"parameter", "timing", TextKind::None, kMost64, kOfRoots},
-    {"parameter", "baseFlags", TextKind::Whole64, kMost64, kOfRoots},
-    {"parameter", "enabled", TextKind::Bool, kMost64, kOfRoots},
-    {"parameter", "locked", TextKind::Bool, kMost64, kOfRoots},
-    {"parameter", "curve", TextKind::None, kMost64, kOfValues},
-    {"parameter", "fadeInOffset", TextKind::Time, kMost64, kOfValues},
-    {"parameter", "fadeOutOffset", TextKind::Time, kMost64, kOfValues},
-    {"parameter", "fadeInCurve", TextKind::Whole32, kLastFadeCurve, kOfValues},
-    {"parameter", "fadeOutCurve", TextKind::Whole32, kLastFadeCurve, kOfValues},
-    {"curve", "numberOfKeypoints", TextKind::Whole32, kMost32},
+    {"parameter", "parameter", TextKind::None, kOfFolders | kOfRoots},
+    {"parameter", "foldFlags", TextKind::Whole32, kOfFolders | kOfRoots, kMost32},
+    {"parameter", "timing", TextKind::None, kOfRoots},
+    {"parameter", "baseFlags", TextKind::Whole64, kOfRoots},
+    {"parameter", "enabled", TextKind::Bool, kOfRoots},
+    {"parameter", "locked", TextKind::Bool, kOfRoots},
+    {"parameter", "curve", TextKind::None, kOfValues},
+    {"parameter", "fadeInOffset", TextKind::Time, kOfValues},
+    {"parameter", "fadeOutOffset", TextKind::Time, kOfValues},
+    {"parameter", "fadeInCurve", TextKind::Whole32, kOfValues, kLastFadeCurve},
+    {"parameter", "fadeOutCurve", TextKind::Whole32, kOfValues, kLastFadeCurve},
+    {"curve", "numberOfKeypoints", TextKind::Whole32, kOfAll, kMost32},
     {"curve", "min", TextKind::Number},
     {"curve", "max", TextKind::Number},
-    {"curve", "preExtrapolation", TextKind::Whole32, kLastExtrapolation},
-    {"curve", "postExtrapolation", TextKind::Whole32, kLastExtrapolation},
+    {"curve", "preExtrapolation", TextKind::Whole32, kOfAll, kLastExtrapolation},
+    {"curve", "postExtrapolation", TextKind::Whole32, kOfAll, kLastExtrapolation},
     {"curve", "closed", TextKind::Bool},
     {"curve", "keypoint"},
     {"keypoint", "time", TextKind::Time},

@@ -17,10 +17,10 @@ struct DocumentWord {
     std::string_view parent;
     std::string_view name;
     TextKind text = TextKind::None;
-    /// Of a whole number.
-    std::uint64_t greatest = UINT64_MAX;
     /// Of elements of channels: which have it.
     unsigned classes = kOfAll;
+    /// Of a whole number.
+    std::uint64_t greatest = UINT64_MAX;
 };
 
 /// Null for an element that is unknown there. The parent of the outermost element has an empty name.

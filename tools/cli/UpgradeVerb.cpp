@@ -25,7 +25,7 @@ struct UpgradeOptions {
 
 /// With what the document says, where it is read as something else.
 std::string versionOf(DocumentFile const& document) {
-    std::string const version = document.versionText();
+    std::string version = document.versionText();
     std::string const written = printableText(document.writtenVersion.view());
     if (written == version) {
         return version;

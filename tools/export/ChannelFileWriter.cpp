@@ -112,7 +112,7 @@ void writeRows(std::vector<std::vector<double>> const& columns, std::vector<Temp
 
 /// All channels; of a document only those with keypoints, if there are any: it has many others.
 std::vector<Node> channelsOfTable(ChannelFile const& file) {
-    std::vector<Node> const all = file.tree->channelsBelow(ChannelTree::kTop);
+    std::vector<Node> all = file.tree->channelsBelow(ChannelTree::kTop);
     if (file.format != ChannelFormat::Document) {
         return all;
     }

@@ -38,7 +38,7 @@ std::string frameTimeText(Tempus const& duration) {
         std::array<char, 64> buffer{};
         auto const end = std::to_chars(buffer.data(), buffer.data() + buffer.size(), seconds,
                                        std::chars_format::fixed, decimals);
-        std::string const text(buffer.data(), end.ptr);
+        std::string text(buffer.data(), end.ptr);
         double printed = 0;
         std::from_chars(text.data(), text.data() + text.size(), printed);
         bool const isNear = decimals >= leastDecimals && std::abs(printed - seconds) <= nearness * seconds;
