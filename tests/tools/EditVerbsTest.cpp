@@ -215,6 +215,10 @@ TEST_F(EditVerbsTest, MotionsAreWrittenWithFramesOverTheirCurves) {
     EXPECT_EQ(columnOf({"reverse"}, 6), (Values{10, 5, 0}));
     EXPECT_EQ(edit(file, {"reverse", "Hips.Yposition"}, _out).exit, 0);
     EXPECT_EQ(readCsvFile(_out).values[1], 92);
+    EXPECT_EQ(
+        edit(file, {"scale", "Hips.Zrotation", "--factor", "1e308"}, file).err,
+        "lumenkey: " + file +
+            ": a BVH can't hold the value of 'Hips.Zrotation', which isn't finite in degrees or units\n");
     EXPECT_EQ(edit(file, {"retime", "--factor", "99999999"}, out).err,
               "lumenkey: " + out + ": it would hold more than 200000000 values\n");
 }

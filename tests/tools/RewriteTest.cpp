@@ -150,5 +150,40 @@ TEST_F(RewriteTest, EveryKeypointCounts) {
     }
 }
 
+TEST_F(RewriteTest, LockedKeypointsStay) {
+    // At 0 to 7 s, with the time as value; those at 0 and 3 s are locked.
+    std::string body = "<parameter name=\"X\" id=\"1\" factoryID=\"3\"><curve type=\"1\">";
+    for (char const* const at : {"0", "1", "2", "3", "4", "5", "6", "7"}) {
+        bool const isLocked = *at == '0' || *at == '3';
+        body += keypoint((std::string(at) + "/1").c_str(), at, isLocked ? "flags=\"2\"" : "");
+    }
+    body += "</curve></parameter>";
+    struct {
+        std::vector<std::string> arguments;
+        char const* keypoints;
+    } const cases[] = {
+        {{"reverse", _file, "--from", "4", "--to", "6"}, "0 0; 1 1; 2 2; 3 3; 4 6; 5 5; 6 4; 7 7; "},
+        {{"offset", _file, "--by", "10", "--from", "4", "--to", "6"},
+         "0 0; 1 1; 2 2; 3 3; 7 7; 14 4; 15 5; 16 6; "},
+        {{"retime", _file, "--factor", "2", "--from", "2", "--to", "5"}, "0 0; 1 1; 2 2; 3 3; 6 4; 8 5; "},
+        // What comes to where one stands gives way to it.
+        {{"offset", _file, "--by", "1"}, "0 0; 2 1; 3 3; 5 4; 6 5; 7 6; 8 7; "},
+        {{"offset", _file, "--by", "-1", "--from", "3", "--to", "4"}, "0 0; 1 1; 2 2; 3 3; 5 5; 6 6; 7 7; "},
+        {{"offset", _file, "--by", "1", "--from", "3", "--to", "3"},
+         "0 0; 1 1; 2 2; 3 3; 4 4; 5 5; 6 6; 7 7; "},
+    };
+    for (auto const& each : cases) {
+        write(body);
+        std::vector<std::string> arguments = each.arguments;
+        arguments.push_back("--in-place");
+        outputOf(arguments);
+        std::string keypoints = keypointsOf("./");
+        for (std::size_t at = 0; (at = keypoints.find("/1 ")) != std::string::npos;) {
+            keypoints.erase(at, 2);
+        }
+        EXPECT_EQ(keypoints, each.keypoints) << Json(arguments);
+    }
+}
+
 } // namespace
 } // namespace lumenkey::tools

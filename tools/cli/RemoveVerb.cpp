@@ -23,8 +23,10 @@ void runRemove(RemoveOptions const& options) {
     if (node == ChannelTree::kTop) {
         throw UsageError{"the top of a document stays"};
     }
-    if (input.tree().base(node).isLocked(true)) {
-        throw UsageError{"'" + options.channel + "' is locked"};
+    for (ChannelTree::Node below = node; below < input.tree().end(node); ++below) {
+        if (input.tree().base(below).isLocked(true)) {
+            throw UsageError{"'" + options.channel + "' is locked, or holds what is"};
+        }
     }
     if (input.tree().isComponent(node)) {
         throw UsageError{"'" + options.channel + "' is a part of its compound, which can only go as a whole"};

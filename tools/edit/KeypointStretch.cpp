@@ -4,6 +4,7 @@
 #include "lumenkey/splines/KFInterpolation.h"
 #include "tools/curve/Keypoint.h"
 
+#include <algorithm>
 #include <cstdint>
 #include <memory>
 
@@ -22,9 +23,38 @@ Tempus timeOf(KFCurve& curve, void* handle) {
     return time;
 }
 
-void deleteKeypoints(KFCurve& curve, TimeSpan const& span, bool within) {
+bool isLocked(KFCurve& curve, void* handle) {
+    bool locked = false;
+    return curve.isLockedKeypoint(handle, &locked) && locked;
+}
+
+/// In their order.
+std::vector<Tempus> timesOfLocked(KFCurve& curve) {
+    std::vector<Tempus> times;
     for (void* const handle : allKeypoints(curve)) {
-        if (span.holds(timeOf(curve, handle)) == within) {
+        if (isLocked(curve, handle)) {
+            times.push_back(timeOf(curve, handle));
+        }
+    }
+    std::sort(times.begin(), times.end());
+    return times;
+}
+
+/// But those that are locked.
+void deleteKeypoints(KFCurve& curve, TimeSpan const& span) {
+    for (void* const handle : keypointsWithin(curve, span)) {
+        curve.delKeypoint(handle, true);
+    }
+}
+
+/// Of a copy: what is locked stays where it is on the curve itself.
+void keepUnlockedWithin(KFCurve& curve, TimeSpan const& span) {
+    for (void* const handle : allKeypoints(curve)) {
+        bool const locked = isLocked(curve, handle);
+        if (locked) {
+            curve.lockKeypoint(handle, false, true);
+        }
+        if (locked || !span.holds(timeOf(curve, handle))) {
             curve.delKeypoint(handle, true);
         }
     }
@@ -65,9 +95,7 @@ SampledStretch::SampledStretch(TimeSpan const& span, Tempus const& sampleStep)
 
 OutsideKept::OutsideKept(KFCurve& curve, TimeSpan const& span) : _curve(curve) {
     for (void* const handle : allKeypoints(curve)) {
-        bool isLocked = false;
-        curve.isLockedKeypoint(handle, &isLocked);
-        if (!isLocked && !span.holds(timeOf(curve, handle))) {
+        if (!isLocked(curve, handle) && !span.holds(timeOf(curve, handle))) {
             curve.lockKeypoint(handle, true, true);
             _locked.push_back(handle);
         }
@@ -98,21 +126,29 @@ void makeLinesBezier(KFCurve& curve, TimeSpan const& span) {
 void editKeypointsWithin(KFChannel& channel, TimeSpan const& span,
                          std::function<void(KFCurve&)> const& edit) {
     KFCurve& curve = *channel.getCurveInterface();
-    std::size_t const count = keypointsWithin(curve, span).size();
-    if (count == curve.getNumberOfKeypoints()) {
+    std::vector<void*> edited = keypointsWithin(curve, span);
+    std::erase_if(edited, [&](void* handle) { return isLocked(curve, handle); });
+    if (edited.size() == curve.getNumberOfKeypoints()) {
         edit(curve);
         return;
     }
-    if (count == 0) {
+    if (edited.empty()) {
         return;
     }
     std::unique_ptr<KFChannelBase> const copy(channel.clone());
     KFChannel& part = static_cast<KFChannel&>(*copy);
-    deleteKeypoints(*part.getCurveInterface(), span, false);
+    keepUnlockedWithin(*part.getCurveInterface(), span);
     edit(*part.getCurveInterface());
-    std::vector<_KFKeyframeInfo> const gathered = gather(part);
-    deleteKeypoints(curve, span, true);
-    deleteKeypoints(curve, {gathered.front().time, gathered.back().time}, true);
+    std::vector<_KFKeyframeInfo> gathered = gather(part);
+    deleteKeypoints(curve, span);
+    deleteKeypoints(curve, {gathered.front().time, gathered.back().time});
+    std::vector<Tempus> const taken = timesOfLocked(curve);
+    std::erase_if(gathered, [&](_KFKeyframeInfo const& info) {
+        return std::binary_search(taken.begin(), taken.end(), info.time);
+    });
+    if (gathered.empty()) {
+        return;
+    }
     channel.setKeyframesWithInfo(gathered.front().time, gathered);
 }
 

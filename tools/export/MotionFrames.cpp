@@ -93,7 +93,13 @@ WrittenRows writeMotionOf(FileToWrite const& wanted, OutputSink& out, ReadingPro
         std::vector<double> const values = times.values(file.tree->curve(columns[i]));
         bool const turns = isRotation(motion.channels[i].kind);
         for (std::size_t frame = 0; frame < span.count; ++frame) {
-            motion.values[frame * width + i] = turns ? degreesOf(values[frame]) : values[frame];
+            double const value = turns ? degreesOf(values[frame]) : values[frame];
+            if (!std::isfinite(value)) {
+                throw OutputError{wanted.target, "a BVH can't hold the value of '" +
+                                                     printableText(file.tree->dottedName(columns[i])) +
+                                                     "', which isn't finite in degrees or units"};
+            }
+            motion.values[frame * width + i] = value;
         }
     }
     writeMotionText(motion, out, progress);
