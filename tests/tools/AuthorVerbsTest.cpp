@@ -62,12 +62,18 @@ TEST_F(AuthorVerbsTest, MakesADocumentFromNothing) {
     EXPECT_EQ(keys[1]["interpolation"], 6);
     EXPECT_EQ(keys[2]["value"], 2.0);
 
+    for (std::string const value : {"1e-09", "0"}) {
+        outputOf({"set", _file, "Place.X", "--value", value});
+        EXPECT_EQ(jsonOf({"tree", _file})["nodes"][4]["start"], std::stod(value));
+    }
     outputOf({"set", _file, "Height", "--at", "1", "--delete"});
     outputOf({"set", _file, "Height", "--at", "0", "--value", "4", "--in-place"});
     std::string const copy = _folder.file("copy.lumen");
     outputOf({"remove", _file, "Place", "-o", copy});
     EXPECT_EQ(jsonOf({"tree", copy})["nodes"].size(), 4U);
     EXPECT_EQ(jsonOf({"tree", _file})["nodes"].size(), 8U);
+    outputOf({"set", copy, "Height", "--at", "0", "--value", "4.0000000001"});
+    outputOf({"set", copy, "Height", "--at", "0", "--value", "4"});
     Json const left = jsonOf({"keys", copy, "Height"})["keypoints"];
     ASSERT_EQ(left.size(), 2U);
     EXPECT_EQ(left[0]["value"], 4.0);
@@ -132,6 +138,11 @@ TEST_F(AuthorVerbsTest, SetRefusesWhatTheFileCanNotHold) {
         {"m.lumen",
          {"Hips.Xposition", "--at", "0.1f", "--value", "1", "-o", _folder.file("o.bvh")},
          "apart; write a document"},
+        {"m.lumen", {"Frame Time", "--value", "0.1", "-o", _folder.file("o.bvh")}, "last as long as those"},
+        {"m.lumen",
+         {"Hips.Offset.X", "--at", "2f", "--value", "9", "-o", _folder.file("o.bvh")},
+         "an offset is the same in every frame; write a document"},
+        {"m.lumen", {"Hips.Offset.X", "--value", "9", "-o", _folder.file("o.bvh")}, ""},
         {"t.csv", {"X", "--at", "0", "--interpolation", "ease"}, "a CSV holds no interpolations; " + convert},
         {"t.csv", {"Y", "--value", "3"}, "a CSV holds no values without a time; " + convert},
         {"t.csv", {"Y", "--at", "1/3", "--value", "3", "-o", _folder.file("o.csv")}, ""},
@@ -250,12 +261,15 @@ TEST_F(AuthorVerbsTest, LockedChannelsStayAsTheyAre) {
     _folder.write("ball.lumen",
                   "<kfml version=\"5.13\"><factory id=\"1\" uuid=\"E7BF3809-2290-11D7-98E5-00039389B702\"/>"
                   "<factory id=\"2\" uuid=\"FDC1944B-2291-11D7-B1C3-00039389B702\"/><parameter id=\"1\" "
-                  "factoryID=\"1\"><parameter name=\"Body\" id=\"2\" factoryID=\"1\"><flags>4</flags>"
+                  "factoryID=\"1\"><parameter name=\"Above\" id=\"1\" factoryID=\"1\"><parameter "
+                  "name=\"Held\" id=\"1\" factoryID=\"2\"><flags>4</flags></parameter></parameter>"
+                  "<parameter name=\"Body\" id=\"2\" factoryID=\"1\"><flags>4</flags>"
                   "<parameter name=\"X\" id=\"3\" factoryID=\"2\"/></parameter></parameter></kfml>");
     expectRefused({"set", "X", "--value", "1"}, "'X' is locked");
     expectRefused({"add", "Body", "Double", "Y"}, "'Body' is locked");
     expectRefused({"remove", "X"}, "'X' is locked");
     expectRefused({"remove", "Body"}, "'Body' is locked");
+    expectRefused({"remove", "Above"}, "'Above' is locked, or holds what is");
 }
 
 TEST_F(AuthorVerbsTest, UpgradeWritesOldDocumentsInTodaysVersion) {

@@ -71,11 +71,13 @@ TEST_F(DocumentVerbsTest, MotionsOfAnyFrameTimeComeBackFromDocuments) {
         {"0.03300", 1, "0.0330"},
         {"0.0123456789123", 3, "0.0123456791"},
         {"0.02", 1, "0.02"},
+        {"0.00000002", 3, "0.00000002"},
     };
     std::string const back = _folder.file("back.bvh");
     for (auto const& each : cases) {
         SCOPED_TRACE(each.frameTime);
         std::string text = samples::replaced(kSmallMotion, ".0083333", each.frameTime);
+        text = samples::replaced(text, "OFFSET 3.5 0 0", "OFFSET 3.5 1e-9 0");
         text = samples::replaced(text, "Frames: 3", "Frames: " + std::to_string(each.frames));
         for (std::size_t lines = 3; lines > each.frames; --lines) {
             text.erase(text.rfind('\n', text.size() - 2) + 1);

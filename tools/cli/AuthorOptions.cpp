@@ -41,7 +41,7 @@ std::string limitsText(KFChannel const& channel, double value) {
 }
 
 void setConstant(KFChannel& channel, double value, std::string const& name) {
-    channel.setInitialValue(value, true);
+    storeConstant(channel, value);
     if (channel.getInitialValue() != value) {
         throw UsageError{"'" + name + "' " + limitsText(channel, value)};
     }

@@ -4,6 +4,7 @@
 #include "tools/cli/TimeArgument.h"
 #include "tools/cli/UsageError.h"
 #include "tools/curve/Keypoint.h"
+#include "tools/import/MotionTree.h"
 #include "tools/output/TextForms.h"
 
 #include <CLI/CLI.hpp>
@@ -39,7 +40,7 @@ public:
         if (channel.isLocked(true)) {
             refuse("is locked");
         }
-        checkTarget(input.file());
+        checkTarget(input.file(), node);
         std::string told = input.tree().dottedName(node);
         if (_at) {
             Tempus const time = _at->resolve(input.file().frameDuration);
@@ -79,7 +80,7 @@ private:
     }
 
     /// Motions and tables don't hold everything that can be said of a channel.
-    void checkTarget(ChannelFile const& file) const {
+    void checkTarget(ChannelFile const& file, ChannelTree::Node node) const {
         ChannelFormat const format = _options.author.output.formatFor(file.format);
         if (format == ChannelFormat::Document) {
             return;
@@ -88,6 +89,12 @@ private:
         std::string const such = isMotion ? "a BVH" : "a CSV";
         if (_interpolation) {
             refuseFor(file, such + " holds no interpolations");
+        }
+        if (isMotion && isFrameTime(*file.tree, node)) {
+            refuseFor(file, "its frames last as long as those of '" + file.file + "'");
+        }
+        if (isMotion && _at && isOffset(*file.tree, file.tree->parent(node))) {
+            refuseFor(file, "an offset is the same in every frame");
         }
         if (isMotion && _options.remove) {
             refuseFor(file, "a BVH has a value in every frame");

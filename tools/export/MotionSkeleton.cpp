@@ -6,6 +6,7 @@
 #include "tools/output/TextForms.h"
 #include "tools/time/ExactDecimal.h"
 
+#include <array>
 #include <charconv>
 #include <cmath>
 #include <optional>
@@ -171,15 +172,15 @@ SkeletonChannels::SkeletonChannels(Motion const& motion, ChannelTree const& tree
     }
     KFChannelFolder& top = *tree.asFolder(ChannelTree::kTop);
     _frameTime = std::make_unique<KFChannelDouble>(kFrameTimeName, &top, freeIDBelow(top), 0);
-    _frameTime->setInitialValue(TempusGetSeconds(motion.frameDuration), true);
+    storeConstant(*_frameTime, TempusGetSeconds(motion.frameDuration));
 }
 
 void SkeletonChannels::addOffset(KFChannelFolder& joint, std::array<double, 3> const& offset) {
     _offsets.push_back(std::make_unique<KFChannel3D>(kOffsetName, &joint, freeIDBelow(joint), 0));
     KFChannel3D& added = *_offsets.back();
-    added.x.setInitialValue(offset[0], true);
-    added.y.setInitialValue(offset[1], true);
-    added.z.setInitialValue(offset[2], true);
+    storeConstant(added.x, offset[0]);
+    storeConstant(added.y, offset[1]);
+    storeConstant(added.z, offset[2]);
 }
 
 SkeletonChannels::~SkeletonChannels() {

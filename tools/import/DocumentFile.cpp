@@ -127,7 +127,7 @@ private:
             channel->setDefaultValue(number);
         }
         if (channel != nullptr && element.getAttributeAsDouble(kValueAttribute, &number)) {
-            channel->setInitialValue(number, false);
+            storeConstant(*channel, number);
         }
     }
 

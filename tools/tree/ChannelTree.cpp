@@ -266,6 +266,11 @@ ChannelTree::Match ChannelTree::find(std::string_view text) const {
     return whole.first ? whole : byEnd;
 }
 
+void storeConstant(KFChannel& channel, double value) {
+    channel.createLocalChannelImplementation();
+    channel.getCurveInterface()->setCurveInitialValue(value);
+}
+
 unsigned freeIDBelow(KFChannelFolder const& folder) {
     unsigned highest = 0;
     if (auto const* const children = folder.getDescendants()) {

@@ -135,6 +135,9 @@ private:
     std::vector<Entry> _entries;
 };
 
+/// The value of a channel without keypoints, exactly: `setInitialValue` leaves what is nearly there already.
+void storeConstant(KFChannel& channel, double value);
+
 /// Above the IDs of a folder's children.
 unsigned freeIDBelow(KFChannelFolder const& folder);
 
