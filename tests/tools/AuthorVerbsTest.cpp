@@ -318,7 +318,8 @@ TEST_F(AuthorVerbsTest, UpgradeWritesOldDocumentsInTodaysVersion) {
     // A document that would lose channels stays.
     std::string const unknown = _folder.write(
         "unknown.lumen", "<kfml version=\"4.0\"><factory id=\"1\" uuid=\"00000000-0000-0000-0000-"
-                         "000000000001\"/><parameter name=\"R\"/></kfml>");
+                         "000000000001\"/><parameter name=\"R\"><parameter name=\"X\" id=\"1\" "
+                         "factoryID=\"1\"/></parameter></kfml>");
     std::string const before = contentOf(unknown);
     Outcome const refused = runLumenkey({"upgrade", unknown});
     EXPECT_EQ(refused.exit, 1);

@@ -8,14 +8,29 @@
 namespace lumenkey::tools {
 namespace {
 
-/// A folder, a percentage, a number and a progress are classes 1 to 4.
+/// A folder, a percentage, a number, a progress and a point are classes 1 to 5; 6 is unknown, and unused.
 std::string documentOf(std::string const& body, char const* version = "5.13") {
     return std::string("<kfml version=\"") + version +
            "\">\n<factory id=\"1\" uuid=\"E7BF3809-2290-11D7-98E5-00039389B702\"/>"
            "<factory id=\"2\" uuid=\"27F3EE8B-2292-11D7-925A-00039389B702\"/>"
            "<factory id=\"3\" uuid=\"FDC1944B-2291-11D7-B1C3-00039389B702\"/>"
-           "<factory id=\"4\" uuid=\"9DE2E4A6-6865-4D59-B31D-BEF26E4AFFAB\"/>\n" +
+           "<factory id=\"4\" uuid=\"9DE2E4A6-6865-4D59-B31D-BEF26E4AFFAB\"/>"
+           "<factory id=\"5\" uuid=\"5FDD789A-8EB4-4217-AB8A-8774AE4F08E9\"/>"
+           "<factory id=\"6\" uuid=\"00000000-0000-0000-0000-000000000001\"/>\n" +
            body + "</kfml>";
+}
+
+/// A number with a curve, in its own line.
+std::string curved(std::string const& attributes, std::string const& inside) {
+    return "<parameter name=\"C\" id=\"2\" factoryID=\"3\"><curve " + attributes + ">" + inside +
+           "</curve></parameter>";
+}
+
+std::string keypoint(char const* time, char const* value, char const* attributes = "") {
+    return std::string("<keypoint interpolation=\"1\" ") + attributes + "><time>" + time + "</time><value>" +
+           value +
+           "</value><outputTangentTime>0.1</outputTangentTime><outputTangentValue>0</outputTangentValue></"
+           "keypoint>";
 }
 
 class RewriteTest : public ::testing::Test {
@@ -55,6 +70,25 @@ TEST_F(RewriteTest, LosesNothingUnlessForced) {
          "</keypoint></curve></parameter>",
          "6:17: 'high' is no number"},
         {"\n<parameter name=\"Y\" id=\"2\" factoryID=\"4\"/>", "documents leave out the channel 'Y'"},
+        {curved("", keypoint("0/1", "1")), ": the curve is a constant"},
+        {curved("type=\"1\"", "<keypoint><time>0/1</time><value>1</value></keypoint>\n"
+                              "<numberOfKeypoints>1</numberOfKeypoints>"),
+         "5:1: the number stands behind keypoints"},
+        {curved("type=\"1\"", "<keypoint><time>0/1</time>\n<bias>2</bias><value>1</value></keypoint>"),
+         "5:1: 'bias' stands in front of the value"},
+        {curved("type=\"1\"", "\n<keypoint enabled=\" 0 \"><time>0/1</time><value>1</value></keypoint>"),
+         "5:1: the keypoint is disabled but has no output handle"},
+        {curved("type=\"1\"", "\n<keypoint interpolation=\"x\"><time>0/1</time><value>1</value></keypoint>"),
+         "5:1: the interpolation 'x' is unknown"},
+        {curved("type=\"1\"", "\n<keypoint foo=\"3\"><time>0/1</time><value>1</value></keypoint>"),
+         "5:1: the attribute 'foo' is unknown"},
+        {curved("type=\"1\"", "\n<closed>1</closed>" + keypoint("0/1", "1")),
+         "5:1: there are no keypoints yet that it would close"},
+        {"<parameter name=\"P\" id=\"2\" factoryID=\"5\"><foldFlags>16777216</foldFlags></parameter>",
+         "documents leave out the channel 'P.X'"},
+        {"<parameter name=\"P\" id=\"2\" factoryID=\"5\"><parameter name=\"X\" id=\"1\" "
+         "factoryID=\"3\"><flags>8</flags></parameter></parameter>",
+         "documents leave out the channel 'P.X'"},
         // Odd, but it stays.
         {"<parameter id=\"2\" factoryID=\"2\"><curve type=\"1\" default=\"3\" "
          "value=\"2\"><keypoint><time>0/1</time>"
@@ -106,6 +140,28 @@ TEST_F(RewriteTest, LosesNothingUnlessForced) {
     EXPECT_NE(piped.err.find("/dev/stdin:4:43: the element 'shiny'"), std::string::npos) << piped.err;
 }
 
+TEST_F(RewriteTest, OddTextsStayWithoutForce) {
+    write("<parameter name=\"R\" id=\"1\" factoryID=\"1\">" +
+          curved("type=\"1\" value=\"nan\" default=\"nan\"",
+                 "<min>5</min><max>3</max><preExtrapolation>5</preExtrapolation>"
+                 "<keypoint enabled=\" 1 \"><time> 1/2 </time><value>nan</value></keypoint>"
+                 "<keypoint><inputTangentTime>-0.5</inputTangentTime><value>1</value>"
+                 "<inputTangentValue>3</inputTangentValue></keypoint>"
+                 "<keypoint><time>invalid~</time><value>1</value></keypoint>"
+                 "<keypoint><time>5/0@2#0</time><value>1</value></keypoint><closed>2</closed>") +
+          "</parameter>");
+    std::string const out = _folder.file("out.lumen");
+    outputOf({"convert", _file, out});
+    std::string const text = contentOf(out);
+    for (char const* const kept :
+         {"default=\"nan\" value=\"nan\"", "<min>5</min>", "<max>3</max>",
+          "<preExtrapolation>5</preExtrapolation>", "<closed>1</closed>", "<value>nan</value>",
+          "<time>1/2</time>", "<time>0/1</time>", "<time>invalid~</time>", "<time>5/0@2#0</time>",
+          "<inputTangentTime>-0.5</inputTangentTime>"}) {
+        EXPECT_NE(text.find(kept), std::string::npos) << kept << text;
+    }
+}
+
 TEST_F(RewriteTest, TheTopHasItsAttributesToo) {
     write("<parameter name=\"P\" id=\"1\" factoryID=\"2\" default=\"0.25\" value=\"0.5\" flags=\"2\"/>");
     outputOf({"convert", _file, _file});
@@ -117,13 +173,6 @@ TEST_F(RewriteTest, TheTopHasItsAttributesToo) {
           "value=\"7\"/></parameter>");
     EXPECT_EQ(jsonOf({"tree", _file})["nodes"][1]["start"], 7.0);
     EXPECT_NE(runLumenkey({"set", _file, "X", "--value", "1"}).err.find("is locked"), std::string::npos);
-}
-
-std::string keypoint(char const* time, char const* value, char const* attributes = "") {
-    return std::string("<keypoint interpolation=\"1\" ") + attributes + "><time>" + time + "</time><value>" +
-           value +
-           "</value><outputTangentTime>0.1</outputTangentTime><outputTangentValue>0</outputTangentValue></"
-           "keypoint>";
 }
 
 TEST_F(RewriteTest, EveryKeypointCounts) {

@@ -3,6 +3,7 @@
 #include "tools/check/DocumentVocabulary.h"
 #include "tools/import/DocumentFile.h"
 
+#include <algorithm>
 #include <utility>
 
 namespace lumenkey::tools {
@@ -44,16 +45,29 @@ std::string faultOfVersion(std::string_view text) {
     return isNewer ? "the version " + std::string(text) + " is newer than " + written : "";
 }
 
+bool isKnown(std::string_view element, std::string_view name) {
+    std::span<DocumentAttribute const> const known = documentAttributes();
+    return std::any_of(known.begin(), known.end(), [&](DocumentAttribute const& attribute) {
+        return attribute.element == element && attribute.name == name;
+    });
+}
+
 } // namespace
 
 std::vector<AttributeFault> faultsOfAttributes(std::string_view element, Attributes const& attributes,
                                                CurveLimits const& limits, bool countsFrames) {
     std::vector<AttributeFault> faults;
+    for (auto const& [name, value] : attributes) {
+        if (!isKnown(element, name)) {
+            faults.push_back(
+                {"the attribute '" + std::string(name) + "' is unknown here: it is passed over", false});
+        }
+    }
     for (DocumentAttribute const& attribute : documentAttributes()) {
         if (auto const found = attributes.find(attribute.name);
             attribute.element == element && found != attributes.end()) {
             // Curves store numbers out of their limits, and bring them within when they are read.
-            bool const isKept = attribute.text == TextKind::Number && readNumber(found->second);
+            bool const isKept = attribute.text == TextKind::Number && isStorable(found->second);
             faults.push_back({faultOfText(attribute, found->second, limits, countsFrames), isKept});
         }
     }

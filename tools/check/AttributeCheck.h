@@ -2,6 +2,8 @@
 
 #include "tools/check/CurveCheck.h"
 
+#include <vector>
+
 namespace lumenkey::tools {
 
 struct AttributeFault {
@@ -11,7 +13,7 @@ struct AttributeFault {
     bool isKept = false;
 };
 
-/// What is at fault with the attributes of an element: texts that can't be read as what they are, numbers out
+/// What is at fault with the attributes of an element: unknown ones, texts that can't be read as what they are, numbers out
 /// of their limits, and a version that is unknown. `limits` are those of the element's curve or channel;
 /// `countsFrames` is for documents below version 5.
 std::vector<AttributeFault> faultsOfAttributes(std::string_view element, Attributes const& attributes,

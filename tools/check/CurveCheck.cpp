@@ -5,7 +5,6 @@
 #include "tools/check/DocumentVocabulary.h"
 #include "tools/curve/Keypoint.h"
 #include "tools/output/TextForms.h"
-#include "tools/time/TimeFraction.h"
 
 #include <utility>
 
@@ -53,7 +52,7 @@ std::string faultOfInterpolation(Attributes const& attributes) {
 }
 
 std::string faultOfOrder(std::string_view text, bool countsFrames, Tempus& lastTime) {
-    Tempus time = timeFromFraction(text.substr(0, text.find_first_of("@~")));
+    Tempus time = readTime(text).value_or(kTempusInvalid);
     if (countsFrames) {
         std::optional<double> const frames = readNumber(text);
         time = frames ? TempusMake(1, 1) * *frames : kTempusInvalid;

@@ -6,7 +6,6 @@
 #include <limits>
 #include <string>
 #include <string_view>
-#include <vector>
 
 namespace lumenkey::tools {
 

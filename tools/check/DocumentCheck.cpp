@@ -34,12 +34,17 @@ struct OpenElement {
     /// Of a curve. What its attributes may be is known at its end.
     std::vector<std::pair<std::string, std::string>> attributes;
     CurveLimits limits;
+    bool hasKeypoints = false;
+    /// As from the first keypoint on, or from their number.
+    bool canBeClosed = false;
     Tempus lastTime = kTempusInvalid;
     /// Where the last of the limits stands.
     TextPlace limitPlace;
     /// Of a keypoint.
     bool hasTime = false;
     bool hasValue = false;
+    bool isDisabled = false;
+    bool hasOutput = false;
 };
 
 /// The check of one document.
@@ -60,10 +65,6 @@ private:
     void find(TextPlace const& place, std::string what) { tell({place, std::move(what)}); }
     /// What a reader takes as it is.
     void findKept(TextPlace const& place, std::string what) { tell({place, std::move(what), false}); }
-    /// Of a number that a reader takes as it is, if it can be read.
-    void checkNumber(TextPlace const& place, std::string_view text, CurveLimits const& limits) {
-        tell({place, faultOfNumber(text, limits), !readNumber(text)});
-    }
     void tell(DocumentFinding finding) {
         if (!finding.what.empty()) {
             _findings.push_back(std::move(finding));
@@ -131,7 +132,9 @@ private:
         } else if (element.name == "curve") {
             element.limits = limitsOf(keptExampleOf(_open.back().factory));
         } else if (element.name == "keypoint") {
-            findKept(element.place, faultOfInterpolation(attributes));
+            element.isDisabled = readBool(attributeOf(attributes, "enabled")) == false;
+            tell({element.place, faultOfInterpolation(attributes),
+                  !readWhole(attributeOf(attributes, "interpolation"))});
         }
         return true;
     }
@@ -160,7 +163,8 @@ private:
             before->second = factory == nullptr ? before->second : factory;
         }
         if (factory == nullptr) {
-            find(element.place, "the class " + uuidText + " is unknown: its channels are passed over");
+            // A channel of it is a loss of its own.
+            findKept(element.place, "the class " + uuidText + " is unknown: its channels are passed over");
         }
     }
 
@@ -229,17 +233,27 @@ private:
         OpenElement const element = std::move(_open.back());
         _open.pop_back();
         _open.back().hasTime |= element.name == "time";
+        _open.back().hasOutput |= element.name == "outputTangentValue";
+        bool const comesTooEarly = isSpentOnValue(element) && !_open.back().hasValue;
         _open.back().hasValue |= element.name == "value";
         if (!canBeRead(element.text, element.word->text, _countsFrames)) {
-            find(element.place,
-                 "'" + element.text + "' is " + std::string(nameOfTextKind(element.word->text)));
+            bool const isKept = element.name == "value" && isStorable(element.text);
+            tell({element.place,
+                  "'" + element.text + "' is " + std::string(nameOfTextKind(element.word->text)), !isKept});
             return;
+        }
+        if (comesTooEarly) {
+            find(element.place,
+                 "'" + element.name + "' stands in front of the value, where it comes too early");
         }
         bool const isWhole =
             element.word->text == TextKind::Whole32 || element.word->text == TextKind::Whole64;
         if (isWhole && readWhole(element.text).value_or(0) > element.word->greatest) {
-            find(element.place, "the number " + element.text + " is out of the limits of '" + element.name +
-                                    "', 0 to " + std::to_string(element.word->greatest));
+            // Curves keep such numbers.
+            tell({element.place,
+                  "the number " + element.text + " is out of the limits of '" + element.name + "', 0 to " +
+                      std::to_string(element.word->greatest),
+                  element.word->parent != "curve"});
         } else if (element.word->parent == "curve") {
             endPartOfCurve(element);
         } else if (element.word->parent == "keypoint") {
@@ -249,11 +263,21 @@ private:
         }
     }
 
+    /// Whether the keypoint must be there, which its value makes. Times of handles wait for their values.
+    static bool isSpentOnValue(OpenElement const& element) {
+        return element.word->parent == "keypoint" && element.name != "time" && element.name != "value" &&
+               element.name != "inputTangentTime" && element.name != "outputTangentTime";
+    }
+
     void endCurve(OpenElement const& curve) {
-        checkAttributes(curve, Attributes(curve.attributes.begin(), curve.attributes.end()));
+        Attributes const attributes(curve.attributes.begin(), curve.attributes.end());
+        checkAttributes(curve, attributes);
+        if (curve.hasKeypoints && readWhole(attributeOf(attributes, "type")).value_or(0) == 0) {
+            find(curve.place, "the curve is a constant: its keypoints are passed over");
+        }
         if (curve.limits.low > curve.limits.high) {
-            find(curve.limitPlace, "the least value, " + shortestText(curve.limits.low) +
-                                       ", is above the greatest, " + shortestText(curve.limits.high));
+            findKept(curve.limitPlace, "the least value, " + shortestText(curve.limits.low) +
+                                           ", is above the greatest, " + shortestText(curve.limits.high));
         }
     }
 
@@ -263,7 +287,19 @@ private:
             (element.name == "min" ? curve.limits.low : curve.limits.high) = *readNumber(element.text);
             curve.limitPlace = element.place;
         } else if (element.name == "keypoint") {
-            find(element.place, faultOfParts(element.hasTime, element.hasValue));
+            curve.hasKeypoints = true;
+            curve.canBeClosed = true;
+            tell({element.place, faultOfParts(element.hasTime, element.hasValue), !element.hasValue});
+            if (element.isDisabled && element.hasValue && !element.hasOutput) {
+                find(element.place,
+                     "the keypoint is disabled but has no output handle: it comes back enabled");
+            }
+        } else if (element.name == "numberOfKeypoints") {
+            curve.canBeClosed = true;
+            find(element.place,
+                 curve.hasKeypoints ? "the number stands behind keypoints, which it clears" : "");
+        } else if (element.name == "closed" && !curve.canBeClosed && readBool(element.text) != false) {
+            find(element.place, "there are no keypoints yet that it would close");
         }
     }
 
@@ -271,7 +307,7 @@ private:
         OpenElement& keypoint = _open.back();
         OpenElement& curve = _open[_open.size() - 2];
         if (element.name == "value") {
-            checkNumber(element.place, element.text, curve.limits);
+            findKept(element.place, faultOfNumber(element.text, curve.limits));
         } else if (element.name == "time") {
             if (keypoint.hasValue) {
                 find(element.place, "the time stands behind the value, where it comes too late");

@@ -40,7 +40,7 @@ constexpr DocumentWord kWords[] = {
     {"curve", "max", TextKind::Number},
     {"curve", "preExtrapolation", TextKind::Whole32, kOfAll, kLastExtrapolation},
     {"curve", "postExtrapolation", TextKind::Whole32, kOfAll, kLastExtrapolation},
-    {"curve", "closed", TextKind::Bool},
+    {"curve", "closed", TextKind::Switch},
     {"curve", "keypoint"},
     {"keypoint", "time", TextKind::Time},
     {"keypoint", "value", TextKind::Number},
@@ -53,6 +53,11 @@ constexpr DocumentWord kWords[] = {
 };
 
 constexpr DocumentAttribute kAttributes[] = {
+    {"kfml", "version", TextKind::Any},
+    {"kfdoc", "version", TextKind::Any},
+    {"factory", "id", TextKind::Any},
+    {"factory", "uuid", TextKind::Any},
+    {"parameter", "name", TextKind::Any},
     {"parameter", "id", TextKind::Whole32, kMost32},
     {"parameter", "factoryID", TextKind::Whole32, kMost32},
     {"parameter", "flags", TextKind::Whole64},
@@ -67,35 +72,33 @@ constexpr DocumentAttribute kAttributes[] = {
     {"curve", "parametric", TextKind::Bool},
     {"curve", "round", TextKind::Bool},
     {"curve", "retimingExtrapolation", TextKind::Bool},
+    {"keypoint", "interpolation", TextKind::Any},
     {"keypoint", "enabled", TextKind::Bool},
     {"keypoint", "flags", TextKind::Whole32, kMost32},
 };
 
-template <class Number> std::optional<Number> readAs(std::string_view text) {
+std::string_view trimmed(std::string_view text) {
     constexpr std::string_view spaces = " \t\r\n";
     std::size_t const first = text.find_first_not_of(spaces);
-    if (first == std::string_view::npos) {
-        return std::nullopt;
-    }
-    text = text.substr(first, text.find_last_not_of(spaces) - first + 1);
+    return first == std::string_view::npos ? std::string_view()
+                                           : text.substr(first, text.find_last_not_of(spaces) - first + 1);
+}
+
+template <class Number> std::optional<Number> readExactly(std::string_view text) {
     Number number{};
     auto const [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
     return error == std::errc{} && end == text.data() + text.size() ? std::optional(number) : std::nullopt;
 }
 
-bool isTime(std::string_view text) {
-    for (std::string_view const word : {"invalid", "indefinite", "+infinity", "-infinity"}) {
-        if (text == word) {
-            return true;
-        }
+/// What stands behind a mark, which is cut off with it; nothing where there is no such mark.
+std::optional<std::string_view> cutBehind(std::string_view& text, char mark) {
+    std::size_t const at = text.find(mark);
+    if (at == std::string_view::npos) {
+        return std::nullopt;
     }
-    if (text.ends_with('~')) {
-        text.remove_suffix(1);
-    }
-    std::size_t const epoch = text.find('@');
-    bool const hasEpoch = epoch != std::string_view::npos;
-    return TempusIsNumeric(timeFromFraction(text.substr(0, epoch))) &&
-           (!hasEpoch || readAs<std::int64_t>(text.substr(epoch + 1)));
+    std::string_view const behind = text.substr(at + 1);
+    text = text.substr(0, at);
+    return behind;
 }
 
 } // namespace
@@ -112,22 +115,59 @@ DocumentWord const* documentWord(std::string_view parent, std::string_view name)
 std::span<DocumentAttribute const> documentAttributes() { return kAttributes; }
 
 std::optional<double> readNumber(std::string_view text) {
-    std::optional<double> const number = readAs<double>(text);
+    std::optional<double> const number = readExactly<double>(trimmed(text));
     return number && std::isnan(*number) ? std::nullopt : number;
 }
-std::optional<std::uint64_t> readWhole(std::string_view text) { return readAs<std::uint64_t>(text); }
+
+bool isStorable(std::string_view text) { return readExactly<double>(trimmed(text)).has_value(); }
+
+std::optional<std::uint64_t> readWhole(std::string_view text) {
+    return readExactly<std::uint64_t>(trimmed(text));
+}
+
+std::optional<bool> readBool(std::string_view text) {
+    text = trimmed(text);
+    bool const isOn = text == "1" || text == "true";
+    return isOn || text == "0" || text == "false" ? std::optional(isOn) : std::nullopt;
+}
+
+std::optional<Tempus> readTime(std::string_view text) {
+    text = trimmed(text);
+    std::optional<std::string_view> const flags = cutBehind(text, '#');
+    if (!flags && text.ends_with('~')) {
+        text.remove_suffix(1);
+    }
+    for (std::string_view const word : {"invalid", "indefinite", "+infinity", "-infinity"}) {
+        if (text == word && !flags) {
+            return kTempusInvalid;
+        }
+    }
+    std::optional<std::string_view> const epoch = cutBehind(text, '@');
+    if ((flags && !readExactly<std::uint32_t>(*flags)) || (epoch && !readExactly<std::int64_t>(*epoch))) {
+        return std::nullopt;
+    }
+    Tempus const time = timeFromFraction(text);
+    std::optional<std::string_view> const scale = cutBehind(text, '/');
+    if (flags) {
+        bool const isWhole = readExactly<std::int64_t>(text) && scale && readExactly<std::int32_t>(*scale);
+        return isWhole ? std::optional(kTempusInvalid) : std::nullopt;
+    }
+    return TempusIsNumeric(time) ? std::optional(time) : std::nullopt;
+}
 
 bool canBeRead(std::string_view text, TextKind kind, bool countsFrames) {
     switch (kind) {
     case TextKind::Bool:
-        return text == "1" || text == "0" || text == "true" || text == "false";
+        return readBool(text).has_value();
+    case TextKind::Switch:
+        return readBool(text) || readWhole(text);
     case TextKind::Whole32:
     case TextKind::Whole64:
         return readWhole(text).has_value();
     case TextKind::Number:
         return readNumber(text).has_value();
     case TextKind::Time:
-        return countsFrames ? readNumber(text).has_value() : isTime(text);
+        return countsFrames ? readNumber(text).has_value() : readTime(text).has_value();
     default:
         return true;
     }
@@ -136,6 +176,7 @@ bool canBeRead(std::string_view text, TextKind kind, bool countsFrames) {
 std::string_view nameOfTextKind(TextKind kind) {
     switch (kind) {
     case TextKind::Bool:
+    case TextKind::Switch:
         return "neither 1 nor 0";
     case TextKind::Whole32:
     case TextKind::Whole64:

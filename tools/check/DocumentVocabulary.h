@@ -1,5 +1,7 @@
 #pragma once
 
+#include "lumenkey/foundation/Tempus.h"
+
 #include <cstdint>
 #include <optional>
 #include <span>
@@ -7,7 +9,7 @@
 
 namespace lumenkey::tools {
 
-enum class TextKind { None, Any, Bool, Whole32, Whole64, Number, Time };
+enum class TextKind { None, Any, Bool, Whole32, Whole64, Number, Time, Switch };
 
 /// Whose element it is, as bits.
 enum : unsigned { kOfValues = 1, kOfFolders = 2, kOfRoots = 4, kOfAll = 7 };
@@ -35,7 +37,7 @@ struct DocumentAttribute {
     std::uint64_t greatest = UINT64_MAX;
 };
 
-/// Those of all elements.
+/// Those of all elements. One that isn't among them is unknown.
 std::span<DocumentAttribute const> documentAttributes();
 
 /// Whether a text can be read as its kind; `countsFrames` is for documents below version 5, where times are
@@ -44,8 +46,14 @@ bool canBeRead(std::string_view text, TextKind kind, bool countsFrames);
 /// What such a text should have been: `a number`, and so on.
 std::string_view nameOfTextKind(TextKind kind);
 
-/// Nothing for `nan` either, which no curve can use.
+/// Nothing for `nan` either, which lies within no limits.
 std::optional<double> readNumber(std::string_view text);
+/// Whether a curve takes it as a value: any number, and `nan`.
+bool isStorable(std::string_view text);
 std::optional<std::uint64_t> readWhole(std::string_view text);
+std::optional<bool> readBool(std::string_view text);
+/// A time in any of its forms, `VALUE/TIMESCALE@EPOCH#FLAGS` among them; those that aren't numbers as an
+/// invalid one.
+std::optional<Tempus> readTime(std::string_view text);
 
 } // namespace lumenkey::tools

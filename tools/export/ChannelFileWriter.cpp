@@ -171,7 +171,7 @@ std::string firstLossIn(ChannelFile const& document) {
     for (Node node = ChannelTree::kTop + 1; node < tree.count(); ++node) {
         bool const isLeftOut = tree.base(node).testFlag(kChannelFlagNotSaved) ||
                                tree.asFolder(tree.parent(node))->testFoldFlag(kFoldFlagChildrenNotSaved);
-        if (isLeftOut && !tree.isComponent(node)) {
+        if (isLeftOut) {
             return name + ": documents leave out the channel '" + printableText(tree.dottedName(node)) + "'";
         }
     }
