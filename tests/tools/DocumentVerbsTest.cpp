@@ -114,6 +114,33 @@ TEST_F(DocumentVerbsTest, AnyDocumentMakesATableThatCanBeRead) {
               "time,seconds,\"\"\n0/1,0,2\n");
 }
 
+TEST_F(DocumentVerbsTest, NoTableIsWrittenThatCanNotBeRead) {
+    std::string const keypoint = "<curve type=\"1\"><keypoint><time>";
+    struct {
+        std::string children;
+        char const* complaint;
+    } const cases[] = {
+        {"", "it has no channels"},
+        {"<parameter name=\"X\" id=\"2\" factoryID=\"2\">" + keypoint +
+             "indefinite</time><value>1</value></keypoint></curve></parameter>",
+         "a table can't hold the time of a keypoint of 'X'"},
+        {"<parameter name=\"X\" id=\"2\" factoryID=\"2\">" + keypoint +
+             "1/2@3</time><value>1</value></keypoint></curve></parameter>",
+         "a table can't hold the time of a keypoint of 'X'"},
+        {"<parameter name=\"\\x00\" id=\"2\" factoryID=\"2\"/>", "a table can't hold the name"},
+    };
+    std::string const table = _folder.write("t.csv", "old");
+    for (auto const& each : cases) {
+        std::string const document = _folder.write(
+            "odd.lumen", "<kfml version=\"5.13\"><factory id=\"2\" "
+                         "uuid=\"FDC1944B-2291-11D7-B1C3-00039389B702\"/><parameter name=\"R\" id=\"1\">" +
+                             each.children + "</parameter></kfml>");
+        EXPECT_NE(complaintOf({"convert", document, table}).find(each.complaint), std::string::npos)
+            << each.complaint;
+        EXPECT_EQ(contentOf(table), "old");
+    }
+}
+
 TEST_F(DocumentVerbsTest, ReadingVerbsTakeDocuments) {
     outputOf({"convert", _motion, _document});
     Json const info = jsonOf({"info", _document});

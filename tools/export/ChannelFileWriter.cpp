@@ -121,16 +121,34 @@ std::vector<Node> channelsOfTable(ChannelFile const& file) {
     return keyed.empty() ? all : keyed;
 }
 
+/// A table has times of one kind, and text.
+void requireReadable(FileToWrite const& wanted, std::string const& name, KeypointColumn const& column) {
+    for (Tempus const& time : column.times) {
+        if (!TempusIsNumeric(time) || time.epoch != 0) {
+            throw OutputError{wanted.target,
+                              "a table can't hold the time of a keypoint of '" + printableText(name) + "'"};
+        }
+    }
+    if (name.find('\0') != std::string::npos) {
+        throw OutputError{wanted.target, "a table can't hold the name '" + printableText(name) + "'"};
+    }
+}
+
 WrittenRows writeTable(FileToWrite const& wanted, OutputSink& out, ReadingProgress const& progress) {
     ChannelTree& tree = *wanted.file.tree;
     std::vector<Node> const channels = channelsOfTable(wanted.file);
+    if (channels.empty()) {
+        throw OutputError{wanted.target, "it has no channels, of which a table must have one"};
+    }
     std::vector<KeypointColumn> keypoints;
     CsvWriter csv(out);
     csv.field("time");
     csv.field("seconds");
     for (Node const channel : channels) {
+        std::string const name = tree.dottedName(channel);
         keypoints.push_back(keypointsOf(tree.spline(channel)));
-        csv.name(tree.dottedName(channel));
+        requireReadable(wanted, name, keypoints.back());
+        csv.name(name);
     }
     csv.endRow();
     bool const isByKeypoints =
@@ -153,15 +171,15 @@ WrittenRows writeTable(FileToWrite const& wanted, OutputSink& out, ReadingProgre
 }
 
 /// What a reader passes over, and what a writer leaves out; empty for nothing.
-std::string firstLossIn(ChannelFile const& document) {
+std::string firstLossIn(ChannelFile const& document, ReadingProgress const& progress) {
     std::string const name = printableText(document.file);
     if (std::pair(document.document.major, document.document.minor) >
         std::pair(kWrittenMajor, kWrittenMinor)) {
         return name + ": version " + document.document.versionText() + " is newer than what is written";
     }
     for (DocumentFinding const& finding : document.document.text
-                                              ? checkDocumentText(*document.document.text, {})
-                                              : checkDocument(document.file, {})) {
+                                              ? checkDocumentText(*document.document.text, progress)
+                                              : checkDocument(document.file, progress)) {
         if (finding.isLoss) {
             return name + ":" + std::to_string(finding.place.line) + ":" +
                    std::to_string(finding.place.column) + ": " + printableText(finding.what);
@@ -178,11 +196,20 @@ std::string firstLossIn(ChannelFile const& document) {
     return {};
 }
 
-void checkNothingIsLost(FileToWrite const& wanted) {
-    if (wanted.file.format != ChannelFormat::Document || wanted.acceptsLoss) {
-        return;
+bool isToBeLookedThrough(FileToWrite const& wanted) {
+    return wanted.file.format == ChannelFormat::Document && !wanted.acceptsLoss;
+}
+
+/// Tells the share of a part of the work as that of the whole.
+ReadingProgress partOf(ReadingProgress const& whole, double from, double to) {
+    if (!whole) {
+        return {};
     }
-    std::string const loss = firstLossIn(wanted.file);
+    return [&whole, from, to](double share) { whole(from + (to - from) * share); };
+}
+
+void checkNothingIsLost(FileToWrite const& wanted, ReadingProgress const& progress) {
+    std::string const loss = firstLossIn(wanted.file, progress);
     if (!loss.empty()) {
         throw OutputError{wanted.target, "not written, since something would be lost: " + loss +
                                              "; --force writes it without"};
@@ -190,7 +217,10 @@ void checkNothingIsLost(FileToWrite const& wanted) {
 }
 
 WrittenRows writeWholeDocument(FileToWrite const& wanted, OutputSink& out, ReadingProgress const& progress) {
-    checkNothingIsLost(wanted);
+    bool const isLookedThrough = isToBeLookedThrough(wanted);
+    if (isLookedThrough) {
+        checkNothingIsLost(wanted, partOf(progress, 0, 0.5));
+    }
     ChannelTree& tree = *wanted.file.tree;
     std::optional<SkeletonChannels> skeleton;
     if (wanted.file.format == ChannelFormat::Motion) {
@@ -200,7 +230,8 @@ WrittenRows writeWholeDocument(FileToWrite const& wanted, OutputSink& out, Readi
     for (Node const node : tree.channelsBelow(ChannelTree::kTop)) {
         keypoints += tree.curve(node).getNumberOfKeypoints();
     }
-    writeDocument(tree.base(ChannelTree::kTop), out, tree.count() + keypoints, progress);
+    writeDocument(tree.base(ChannelTree::kTop), out, tree.count() + keypoints,
+                  isLookedThrough ? partOf(progress, 0.5, 1) : progress);
     std::optional<BXTimeRange> const keyed = tree.keyedRange();
     return {keypoints, keyed ? keyed->start : kTempusZero};
 }

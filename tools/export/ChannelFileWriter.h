@@ -43,7 +43,7 @@ struct WrittenRows {
 };
 
 /// Replaces the target, as a whole or not at all, by the file as its tree is now. Throws `OutputError`, also
-/// where it would hold more than `kMostWrittenValues`.
+/// for more than `kMostWrittenValues`, and `InputError` where a document can't be read once more.
 ///
 /// The frames of a motion last as long as they did. They reach from time zero, or from before the first
 /// keypoint of all channels where that lies before zero, to the last one.
