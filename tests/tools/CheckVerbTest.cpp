@@ -127,10 +127,17 @@ TEST_F(CheckVerbTest, FindsWhatIsOddWithItsPlace) {
 TEST_F(CheckVerbTest, ReadsAPipeOnce) {
     std::string const odd = _folder.write(
         "odd.lumen", std::string(kHead) + "<parameter id=\"1\" factoryID=\"1\">\n<odd/></parameter></kfml>");
+    // Its blocks hold zero bytes.
+    std::string wide = "\xFF\xFE";
+    for (char const c : samples::replaced(contentOf(odd), "<odd/>", "<odd/>" + std::string(200'000, '\n'))) {
+        wide += {c, '\0'};
+    }
+    _folder.write("wide.lumen", wide);
     struct {
         char const* script;
         std::string name;
     } const cases[] = {
+        {"cat \"${2%odd.lumen}wide.lumen\" | timeout 20 \"$0\" check /dev/stdin", "/dev/stdin"},
         {"cat \"$2\" | timeout 20 \"$0\" check /dev/stdin", "/dev/stdin"},
         {"mkfifo \"$1\"; cat \"$2\" >\"$1\" & exec timeout 20 \"$0\" check \"$1\"", _folder.file("p.lumen")},
     };

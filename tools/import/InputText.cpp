@@ -1,5 +1,6 @@
 #include "tools/import/InputText.h"
 
+#include "tools/import/DocumentFile.h"
 #include "tools/import/InputError.h"
 #include "tools/import/MotionScanner.h"
 #include "tools/output/TextForms.h"
@@ -48,11 +49,12 @@ public:
         text.resize(expected + 1);
         std::size_t filled = 0;
         while (std::size_t const count = readSome(text.data() + filled, text.size() - filled)) {
-            // A zero byte ends it all; what comes from a device may never end otherwise.
-            bool const isText = std::memchr(text.data() + filled, 0, count) == nullptr;
+            // Else a zero byte ends it all; what comes from a device may never end otherwise.
+            bool const mayGoOn = std::memchr(text.data() + filled, 0, count) == nullptr ||
+                                 looksLikeDocument(std::string_view(text.data(), filled + count));
             filled += count;
             checkSize(filled);
-            if (!isText) {
+            if (!mayGoOn) {
                 break;
             }
             if (filled == text.size()) {
