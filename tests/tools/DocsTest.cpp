@@ -27,8 +27,8 @@ class DocsTest : public ::testing::Test {
 protected:
     TestFolder const _folder;
 
-    /// A session as it is shown: each command behind a `$ `, then what it says.
-    std::string sessionAgain(std::string const& shown) const {
+    /// A transcript as it is shown: each command behind a `$ `, then what it says.
+    std::string transcriptAgain(std::string const& shown) const {
         std::string again;
         std::istringstream lines(shown);
         for (std::string line; std::getline(lines, line);) {
@@ -45,18 +45,18 @@ protected:
 };
 
 TEST_F(DocsTest, TheProgramSaysWhatItsPageShows) {
-    std::vector<std::string> const sessions = blocksOf(pageNamed("docs/program.md"), "```");
-    EXPECT_EQ(sessions.size(), 3U);
-    for (std::string const& session : sessions) {
-        EXPECT_EQ(sessionAgain(session), session);
+    std::vector<std::string> const transcripts = blocksOf(pageNamed("docs/program.md"), "```");
+    EXPECT_EQ(transcripts.size(), 3U);
+    for (std::string const& transcript : transcripts) {
+        EXPECT_EQ(transcriptAgain(transcript), transcript);
     }
 }
 
 TEST_F(DocsTest, TheProgramSaysWhatTheFirstPageShows) {
     runProgramFile(LUMENKEY_MAKE_MOTION, {_folder.file("walk.bvh")});
-    std::vector<std::string> const sessions = blocksOf(pageNamed("README.md"), "```console");
-    ASSERT_EQ(sessions.size(), 1U);
-    EXPECT_EQ(sessionAgain(sessions[0]), sessions[0]);
+    std::vector<std::string> const transcripts = blocksOf(pageNamed("README.md"), "```console");
+    ASSERT_EQ(transcripts.size(), 1U);
+    EXPECT_EQ(transcriptAgain(transcripts[0]), transcripts[0]);
     EXPECT_TRUE(std::filesystem::exists(_folder.file("plot.svg")));
 }
 

@@ -15,7 +15,7 @@ struct AuthorOptions {
 
     /// Declares FILE.
     void add(CLI::App& verb);
-    /// Declares `-o`, `--in-place`, `--force` and `--frame-rate`, to be called behind the verb's own arguments.
+    /// Declares `-o`, `--in-place`, `--force` and `--frame-rate`; to be called behind the verb's arguments.
     void addRest(CLI::App& verb);
 
     /// Before the file is read. Throws `UsageError` for an output that can't be written.

@@ -25,11 +25,11 @@ struct NodeDifference {
 };
 
 /// Compares nodes that have the same dotted name; of several with one name the first with the first, and so
-/// on. The place of a node is that among the siblings which both trees have. The name of the top itself counts
-/// where `haveNamedTops`: that of a table or a motion is only that of its file.
+/// on. The place of a node is that among the siblings which both trees have. The name of the top itself
+/// counts where `haveNamedTops`: that of a table or a motion is only that of its file.
 ///
-/// Curves are compared over the span, at every `step` (`changeBetween`), and at and beside their keypoints. In
-/// the order of the second tree, with what it lacks behind.
+/// Curves are compared over the span, at every `step` (`changeBetween`), and at and beside their keypoints.
+/// In the order of the second tree, with what it lacks behind.
 std::vector<NodeDifference> differencesBetween(ChannelTree const& before, ChannelTree const& after,
                                                bool haveNamedTops, TimeSpan const& span, Tempus const& step,
                                                ReadingProgress const& progress);
