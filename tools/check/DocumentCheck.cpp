@@ -1,10 +1,10 @@
 #include "tools/check/DocumentCheck.h"
 
 #include "lumenkey/Channels/KFChannelFactories.h"
-#include "lumenkey/Channels/KFChannelFolder.h"
 #include "lumenkey/Channels/KFFactories.h"
 #include "lumenkey/persistence/KFDocumentVersion.h"
 #include "tools/check/AttributeCheck.h"
+#include "tools/check/ClassExamples.h"
 #include "tools/check/CurveCheck.h"
 #include "tools/check/DocumentVocabulary.h"
 #include "tools/output/TextForms.h"
@@ -13,7 +13,6 @@
 #include <algorithm>
 #include <limits>
 #include <map>
-#include <memory>
 #include <optional>
 #include <utility>
 #include <vector>
@@ -103,19 +102,12 @@ private:
         }
         KFFactory* const factory = _open.back().factory;
         if (element.word->parent == "parameter" && factory != nullptr &&
-            (element.word->classes & classesOf(factory)) == 0) {
+            (element.word->classes & ownersOf(*factory)) == 0) {
             find(element.place, "the element '" + element.name + "' is none of a channel of the class " +
                                     shortClassName(classNameOf(*factory)) + ": it is passed over");
             return false;
         }
         return true;
-    }
-
-    static unsigned classesOf(KFFactory* factory) {
-        if (factory->isKindOfClass(KFChannelObjectRootBase_Factory::getInstance().uuid())) {
-            return kOfRoots;
-        }
-        return factory->isKindOfClass(KFChannelFolder_Factory::getInstance().uuid()) ? kOfFolders : kOfValues;
     }
 
     bool isSound(OpenElement& element, Attributes const& attributes) {
@@ -130,7 +122,7 @@ private:
         } else if (element.name == "parameter") {
             return isSoundChannel(element, attributes);
         } else if (element.name == "curve") {
-            element.limits = limitsOf(keptExampleOf(_open.back().factory));
+            element.limits = limitsOf(_examples.of(_open.back().factory));
         } else if (element.name == "keypoint") {
             element.isDisabled = readBool(attributeOf(attributes, "enabled")) == false;
             tell({element.place, faultOfInterpolation(attributes),
@@ -141,7 +133,7 @@ private:
 
     void checkAttributes(OpenElement const& element, Attributes const& attributes) {
         CurveLimits const limits =
-            element.name == "parameter" ? limitsOf(keptExampleOf(element.factory)) : element.limits;
+            element.name == "parameter" ? limitsOf(_examples.of(element.factory)) : element.limits;
         for (AttributeFault& fault : faultsOfAttributes(element.name, attributes, limits, _countsFrames)) {
             tell({element.place, std::move(fault.what), !fault.isKept});
         }
@@ -179,7 +171,7 @@ private:
             return true;
         }
         std::optional<std::uint64_t> const number = readWhole(attributeOf(attributes, "factoryID"));
-        if (KFFactory* const component = componentOf(above.factory, id)) {
+        if (KFFactory* const component = _examples.componentOf(above.factory, id)) {
             element.factory = component;
         } else if (number) {
             auto const found = _factories.find(*number);
@@ -199,22 +191,6 @@ private:
         }
         above.children[id] = element.factory;
         return true;
-    }
-
-    /// The class of the child with that ID which a class makes for itself.
-    KFFactory* componentOf(KFFactory* factory, std::uint64_t id) {
-        auto const* const folder = dynamic_cast<KFChannelFolder const*>(keptExampleOf(factory));
-        KFChannelBase const* const component =
-            folder == nullptr ? nullptr : folder->getDescendant(static_cast<unsigned>(id));
-        return component == nullptr ? nullptr : component->getFactory();
-    }
-
-    KFChannelBase* keptExampleOf(KFFactory* factory) {
-        auto const [place, isNew] = _examples.try_emplace(factory);
-        if (isNew) {
-            place->second = exampleOf(factory);
-        }
-        return place->second.get();
     }
 
     // --- Texts ---
@@ -322,7 +298,7 @@ private:
     std::size_t _skipped = 0;
     std::vector<OpenElement> _open;
     std::map<std::uint64_t, KFFactory*> _factories;
-    std::map<KFFactory*, std::unique_ptr<KFChannelBase>> _examples;
+    ClassExamples _examples;
     std::vector<DocumentFinding> _findings;
 };
 

@@ -31,8 +31,8 @@ struct CsvFile {
 ///
 /// Taken are a byte-order mark, all three kinds of line ends (carriage returns alone where there are no line
 /// feeds; those within quotation marks become line feeds then), a last line without one, blank lines, blanks
-/// around cells without quotation marks, a plus sign before a number, and empty cells (no value at that time).
-/// A column may have an empty name in quotation marks, but not none. Only commas part cells.
+/// around cells without quotation marks, a plus sign before a number, and empty cells (no value at that
+/// time). A column may have an empty name in quotation marks, but not none. Only commas part cells.
 CsvFile readCsvFile(std::string const& file, ReadingProgress const& progress = {});
 
 /// The same for the content of a file; `file` is only its name.

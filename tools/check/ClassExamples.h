@@ -1,0 +1,27 @@
+#pragma once
+
+#include "lumenkey/Channels/KFChannelBase.h"
+#include "lumenkey/Channels/KFFactory.h"
+
+#include <cstdint>
+#include <map>
+#include <memory>
+
+namespace lumenkey::tools {
+
+/// Which elements channels of a class have, as the bits of `DocumentWord::classes`.
+unsigned ownersOf(KFFactory& factory);
+
+/// A channel of each class that was asked for, to learn what the class is like.
+class ClassExamples {
+public:
+    /// It lives as long as this; null for a class that makes none, and for null.
+    KFChannelBase* of(KFFactory* factory);
+    /// The class of the child with that ID which a class makes for itself; null for none.
+    KFFactory* componentOf(KFFactory* factory, std::uint64_t id);
+
+private:
+    std::map<KFFactory*, std::unique_ptr<KFChannelBase>> _examples;
+};
+
+} // namespace lumenkey::tools
