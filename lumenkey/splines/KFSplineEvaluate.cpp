@@ -263,13 +263,13 @@ bool KFSpline::evaluateIndexed(Tempus const& u, KFSegmentCache& cache, double* o
     auto const end = placeAtOrAfter(position, cache);
     if (end == store.end())
         return false;
-    auto const start = store.validBefore(end);
     std::int64_t high = 0;
     if (__builtin_mul_overflow(store.tickAt(end), cache.scale.perTick, &high))
         return false;
     if (high == position)
         return valueAtVertex(end, out);
 
+    auto const start = store.validBefore(end);
     std::int64_t low = 0;
     if (start == store.end() || __builtin_mul_overflow(store.tickAt(start), cache.scale.perTick, &low))
         return false;
