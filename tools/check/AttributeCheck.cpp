@@ -10,25 +10,18 @@ namespace lumenkey::tools {
 
 namespace {
 
-std::string faultOfText(DocumentAttribute const& attribute, std::string_view text, CurveLimits const& limits,
+std::string faultOfText(DocumentWord const& attribute, std::string_view text, CurveLimits const& limits,
                         bool countsFrames) {
     std::string const name(attribute.name);
     if (!canBeRead(text, attribute.text, countsFrames)) {
         return "the attribute '" + name + "' is '" + std::string(text) + "', which is " +
                std::string(nameOfTextKind(attribute.text));
     }
-    switch (attribute.text) {
-    case TextKind::Whole32:
-    case TextKind::Whole64:
-        return readWhole(text).value_or(0) <= attribute.greatest
-                   ? ""
-                   : "the attribute '" + name + "' is " + std::string(text) +
-                         ", which is out of the limits, 0 to " + std::to_string(attribute.greatest);
-    case TextKind::Number:
-        return faultOfNumber(text, limits);
-    default:
-        return {};
+    if (isBeyond(attribute, text)) {
+        return "the attribute '" + name + "' is " + std::string(text) +
+               ", which is out of the limits, 0 to " + std::to_string(attribute.greatest);
     }
+    return attribute.text == TextKind::Number ? faultOfNumber(text, limits) : "";
 }
 
 std::string faultOfVersion(std::string_view text) {
@@ -46,9 +39,9 @@ std::string faultOfVersion(std::string_view text) {
 }
 
 bool isKnown(std::string_view element, std::string_view name) {
-    std::span<DocumentAttribute const> const known = documentAttributes();
-    return std::any_of(known.begin(), known.end(), [&](DocumentAttribute const& attribute) {
-        return attribute.element == element && attribute.name == name;
+    std::span<DocumentWord const> const known = documentAttributes();
+    return std::any_of(known.begin(), known.end(), [&](DocumentWord const& attribute) {
+        return attribute.parent == element && attribute.name == name;
     });
 }
 
@@ -63,9 +56,9 @@ std::vector<AttributeFault> faultsOfAttributes(std::string_view element, Attribu
                 {"the attribute '" + std::string(name) + "' is unknown here: it is passed over", false});
         }
     }
-    for (DocumentAttribute const& attribute : documentAttributes()) {
+    for (DocumentWord const& attribute : documentAttributes()) {
         if (auto const found = attributes.find(attribute.name);
-            attribute.element == element && found != attributes.end()) {
+            attribute.parent == element && found != attributes.end()) {
             // Curves store numbers out of their limits, and bring them within when they are read.
             bool const isKept = attribute.text == TextKind::Number && isStorable(found->second);
             faults.push_back({faultOfText(attribute, found->second, limits, countsFrames), isKept});

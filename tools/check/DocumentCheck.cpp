@@ -82,7 +82,7 @@ private:
         OpenElement element;
         element.name = name;
         element.place = place;
-        element.word = documentWord(_open.back().name, name);
+        element.word = documentElement(_open.back().name, name);
         if (!isTaken(element) || !isSound(element, attributes)) {
             _skipped = 1;
             return;
@@ -222,9 +222,7 @@ private:
             find(element.place,
                  "'" + element.name + "' stands in front of the value, where it comes too early");
         }
-        bool const isWhole =
-            element.word->text == TextKind::Whole32 || element.word->text == TextKind::Whole64;
-        if (isWhole && readWhole(element.text).value_or(0) > element.word->greatest) {
+        if (isBeyond(*element.word, element.text)) {
             // Curves keep such numbers.
             tell({element.place,
                   "the number " + element.text + " is out of the limits of '" + element.name + "', 0 to " +

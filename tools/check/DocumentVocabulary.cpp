@@ -15,7 +15,7 @@ constexpr std::uint64_t kLastFadeCurve = 3;
 constexpr std::uint64_t kLastExtrapolation = 4;
 constexpr std::uint64_t kLastCurveType = 1;
 
-constexpr DocumentWord kWords[] = {
+constexpr DocumentWord kElements[] = {
     {"", "kfml"},
     {"", "kfdoc"},
     {"kfml", "factory"},
@@ -23,23 +23,23 @@ constexpr DocumentWord kWords[] = {
     {"factory", "description", TextKind::Any},
     {"factory", "manufacturer", TextKind::Any},
     {"factory", "version", TextKind::Number},
-    {"parameter", "flags", TextKind::Whole64},
+    {"parameter", "flags", TextKind::Whole},
     {"parameter", "parameter", TextKind::None, kOfFolders | kOfRoots},
-    {"parameter", "foldFlags", TextKind::Whole32, kOfFolders | kOfRoots, kMost32},
+    {"parameter", "foldFlags", TextKind::Whole, kOfFolders | kOfRoots, kMost32},
     {"parameter", "timing", TextKind::None, kOfRoots},
-    {"parameter", "baseFlags", TextKind::Whole64, kOfRoots},
+    {"parameter", "baseFlags", TextKind::Whole, kOfRoots},
     {"parameter", "enabled", TextKind::Bool, kOfRoots},
     {"parameter", "locked", TextKind::Bool, kOfRoots},
     {"parameter", "curve", TextKind::None, kOfValues},
     {"parameter", "fadeInOffset", TextKind::Time, kOfValues},
     {"parameter", "fadeOutOffset", TextKind::Time, kOfValues},
-    {"parameter", "fadeInCurve", TextKind::Whole32, kOfValues, kLastFadeCurve},
-    {"parameter", "fadeOutCurve", TextKind::Whole32, kOfValues, kLastFadeCurve},
-    {"curve", "numberOfKeypoints", TextKind::Whole32, kOfAll, kMost32},
+    {"parameter", "fadeInCurve", TextKind::Whole, kOfValues, kLastFadeCurve},
+    {"parameter", "fadeOutCurve", TextKind::Whole, kOfValues, kLastFadeCurve},
+    {"curve", "numberOfKeypoints", TextKind::Whole, kOfAll, kMost32},
     {"curve", "min", TextKind::Number},
     {"curve", "max", TextKind::Number},
-    {"curve", "preExtrapolation", TextKind::Whole32, kOfAll, kLastExtrapolation},
-    {"curve", "postExtrapolation", TextKind::Whole32, kOfAll, kLastExtrapolation},
+    {"curve", "preExtrapolation", TextKind::Whole, kOfAll, kLastExtrapolation},
+    {"curve", "postExtrapolation", TextKind::Whole, kOfAll, kLastExtrapolation},
     {"curve", "closed", TextKind::Switch},
     {"curve", "keypoint"},
     {"keypoint", "time", TextKind::Time},
@@ -52,21 +52,21 @@ constexpr DocumentWord kWords[] = {
     {"keypoint", "outputTangentValue", TextKind::Number},
 };
 
-constexpr DocumentAttribute kAttributes[] = {
+constexpr DocumentWord kAttributes[] = {
     {"kfml", "version", TextKind::Any},
     {"kfdoc", "version", TextKind::Any},
     {"factory", "id", TextKind::Any},
     {"factory", "uuid", TextKind::Any},
     {"parameter", "name", TextKind::Any},
-    {"parameter", "id", TextKind::Whole32, kMost32},
-    {"parameter", "factoryID", TextKind::Whole32, kMost32},
-    {"parameter", "flags", TextKind::Whole64},
+    {"parameter", "id", TextKind::Whole, kOfAll, kMost32},
+    {"parameter", "factoryID", TextKind::Whole, kOfAll, kMost32},
+    {"parameter", "flags", TextKind::Whole},
     {"parameter", "default", TextKind::Number},
     {"parameter", "value", TextKind::Number},
     {"timing", "in", TextKind::Time},
     {"timing", "out", TextKind::Time},
     {"timing", "offset", TextKind::Time},
-    {"curve", "type", TextKind::Whole32, kLastCurveType},
+    {"curve", "type", TextKind::Whole, kOfAll, kLastCurveType},
     {"curve", "value", TextKind::Number},
     {"curve", "default", TextKind::Number},
     {"curve", "parametric", TextKind::Bool},
@@ -74,7 +74,7 @@ constexpr DocumentAttribute kAttributes[] = {
     {"curve", "retimingExtrapolation", TextKind::Bool},
     {"keypoint", "interpolation", TextKind::Any},
     {"keypoint", "enabled", TextKind::Bool},
-    {"keypoint", "flags", TextKind::Whole32, kMost32},
+    {"keypoint", "flags", TextKind::Whole, kOfAll, kMost32},
 };
 
 std::string_view trimmed(std::string_view text) {
@@ -103,8 +103,8 @@ std::optional<std::string_view> cutBehind(std::string_view& text, char mark) {
 
 } // namespace
 
-DocumentWord const* documentWord(std::string_view parent, std::string_view name) {
-    for (DocumentWord const& word : kWords) {
+DocumentWord const* documentElement(std::string_view parent, std::string_view name) {
+    for (DocumentWord const& word : kElements) {
         if (word.name == name && word.parent == (parent == "kfdoc" ? "kfml" : parent)) {
             return &word;
         }
@@ -112,7 +112,11 @@ DocumentWord const* documentWord(std::string_view parent, std::string_view name)
     return nullptr;
 }
 
-std::span<DocumentAttribute const> documentAttributes() { return kAttributes; }
+std::span<DocumentWord const> documentAttributes() { return kAttributes; }
+
+bool isBeyond(DocumentWord const& word, std::string_view text) {
+    return word.text == TextKind::Whole && readWhole(text).value_or(0) > word.greatest;
+}
 
 std::optional<double> readNumber(std::string_view text) {
     std::optional<double> const number = readExactly<double>(trimmed(text));
@@ -161,8 +165,7 @@ bool canBeRead(std::string_view text, TextKind kind, bool countsFrames) {
         return readBool(text).has_value();
     case TextKind::Switch:
         return readBool(text) || readWhole(text);
-    case TextKind::Whole32:
-    case TextKind::Whole64:
+    case TextKind::Whole:
         return readWhole(text).has_value();
     case TextKind::Number:
         return readNumber(text).has_value();
@@ -178,8 +181,7 @@ std::string_view nameOfTextKind(TextKind kind) {
     case TextKind::Bool:
     case TextKind::Switch:
         return "neither 1 nor 0";
-    case TextKind::Whole32:
-    case TextKind::Whole64:
+    case TextKind::Whole:
         return "no whole number";
     case TextKind::Time:
         return "no time";

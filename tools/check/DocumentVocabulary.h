@@ -9,13 +9,14 @@
 
 namespace lumenkey::tools {
 
-enum class TextKind { None, Any, Bool, Whole32, Whole64, Number, Time, Switch };
+enum class TextKind { None, Any, Bool, Whole, Number, Time, Switch };
 
 /// Whose element it is, as bits.
 enum : unsigned { kOfValues = 1, kOfFolders = 2, kOfRoots = 4, kOfAll = 7 };
 
-/// An element that the library reads.
+/// An element or an attribute that the library reads.
 struct DocumentWord {
+    /// The element that it is in; empty for the outermost element.
     std::string_view parent;
     std::string_view name;
     TextKind text = TextKind::None;
@@ -25,20 +26,13 @@ struct DocumentWord {
     std::uint64_t greatest = UINT64_MAX;
 };
 
-/// Null for an element that is unknown there. The parent of the outermost element has an empty name.
-DocumentWord const* documentWord(std::string_view parent, std::string_view name);
-
-/// An attribute that the library reads.
-struct DocumentAttribute {
-    std::string_view element;
-    std::string_view name;
-    TextKind text = TextKind::None;
-    /// Of a whole number.
-    std::uint64_t greatest = UINT64_MAX;
-};
-
+/// Null for an element that is unknown there.
+DocumentWord const* documentElement(std::string_view parent, std::string_view name);
 /// Those of all elements. One that isn't among them is unknown.
-std::span<DocumentAttribute const> documentAttributes();
+std::span<DocumentWord const> documentAttributes();
+
+/// Whether a text is a whole number above the greatest of the word.
+bool isBeyond(DocumentWord const& word, std::string_view text);
 
 /// Whether a text can be read as its kind; `countsFrames` is for documents below version 5, where times are
 /// numbers.

@@ -210,9 +210,8 @@ Verb declareSet(CLI::App& program) {
                  ".\n\nExample: lumenkey set ball.lumen Height --at 1/2 --value 0 "
                  "--interpolation linear");
     return {verb,
-            "FILE CHANNEL [--at T] (--value V [--interpolation NAME] | --interpolation NAME | --delete) [-o "
-            "OUT | --in-place] "
-            "[--force] [--frame-rate R]",
+            "FILE CHANNEL [--at T] (--value V [--interpolation NAME] | --interpolation NAME | --delete) "
+            "[-o OUT | --in-place] [--force] [--frame-rate R]",
             [options](OutputSink& out) { SetRun(*options).run(out); }};
 }
 
