@@ -2,6 +2,7 @@
 
 #include "lumenkey/Channels/KFChannelObjectRootBase.h"
 #include "lumenkey/foundation/BXURL.h"
+#include "tests/tools/DocumentSamples.h"
 #include "tests/tools/MotionSamples.h"
 #include "tests/tools/RunProgram.h"
 #include "tests/tools/TestFolder.h"
@@ -12,6 +13,8 @@
 namespace lumenkey::tools {
 namespace {
 
+using samples::documentOf;
+
 class AuthorVerbsTest : public ::testing::Test {
 protected:
     TestFolder const _folder;
@@ -20,9 +23,8 @@ protected:
     void expectRefused(std::vector<std::string> arguments, std::string const& complaint, int exit = 2) const {
         std::string const before = contentOf(_file);
         arguments.insert(arguments.begin() + 1, _file);
-        Outcome const outcome = runLumenkey(arguments);
-        EXPECT_EQ(outcome.exit, exit) << Json(arguments);
-        EXPECT_NE(outcome.err.find(complaint), std::string::npos) << outcome.err;
+        std::string const said = complaintOf(arguments, exit);
+        EXPECT_NE(said.find(complaint), std::string::npos) << said;
         EXPECT_EQ(contentOf(_file), before);
     }
     void makeBall() const {
@@ -119,11 +121,9 @@ TEST_F(AuthorVerbsTest, SetRefusesWhatTheFileCanNotHold) {
     makeBall();
     outputOf({"convert", _folder.write("m.bvh", samples::kSmallMotion), _folder.file("m.lumen")});
     _folder.write("t.csv", "t,X,Y\n0,1,\n1,2,\n");
-    std::string const key = "<keypoint flags=\"2\"><time>0/1</time><value>1</value></keypoint>";
-    _folder.write("k.lumen", "<kfml version=\"5.13\"><factory id=\"1\" uuid=\"FDC1944B-2291-11D7-B1C3-"
-                             "00039389B702\"/><parameter id=\"1\"><parameter name=\"X\" id=\"1\" "
-                             "factoryID=\"1\"><curve type=\"1\">" +
-                                 key + "</curve></parameter></parameter></kfml>");
+    _folder.write("k.lumen", documentOf("<parameter id=\"1\"><parameter name=\"X\" id=\"1\" factoryID=\"3\">"
+                                        "<curve type=\"1\"><keypoint flags=\"2\"><time>0/1</time><value>1"
+                                        "</value></keypoint></curve></parameter></parameter>"));
     std::string const convert = "make a document of it with lumenkey convert";
     struct {
         std::string file;
@@ -240,17 +240,13 @@ TEST_F(AuthorVerbsTest, DiffSeesPeaksOfAMomentOrderAndNames) {
     EXPECT_TRUE(
         outputOf({"diff", linear, steps}, 1).starts_with("changed X: by up to 999.000000 units, at "));
 
-    auto const documentOf = [](std::string const& top, std::string const& children) {
-        return "<kfml version=\"5.13\"><factory id=\"1\" uuid=\"FDC1944B-2291-11D7-B1C3-00039389B702\"/>"
-               "<parameter name=\"" +
-               top + "\" id=\"1\">" + children + "</parameter></kfml>";
-    };
-    auto const child = [](std::string const& name, std::string const& id) {
-        return "<parameter name=\"" + name + "\" id=\"" + id + "\" factoryID=\"1\"/>";
-    };
-    std::string const before = _folder.write("1.lumen", documentOf("A", child("X", "1") + child("Y", "2")));
+    std::string const x = "<parameter name=\"X\" id=\"1\" factoryID=\"3\"/>";
+    std::string const y = "<parameter name=\"Y\" id=\"2\" factoryID=\"3\"/>";
+    std::string const added = "<parameter name=\"New\" id=\"3\" factoryID=\"3\"/>";
+    std::string const before =
+        _folder.write("1.lumen", documentOf("<parameter name=\"A\">" + x + y + "</parameter>"));
     std::string const after =
-        _folder.write("2.lumen", documentOf("B", child("New", "3") + child("Y", "2") + child("X", "1")));
+        _folder.write("2.lumen", documentOf("<parameter name=\"B\">" + added + y + x + "</parameter>"));
     EXPECT_EQ(outputOf({"diff", before, after}, 1), "changed ./: name A became B\n"
                                                     "added   New\n"
                                                     "changed Y: place among its siblings 2 became 1\n"
@@ -259,12 +255,11 @@ TEST_F(AuthorVerbsTest, DiffSeesPeaksOfAMomentOrderAndNames) {
 
 TEST_F(AuthorVerbsTest, LockedChannelsStayAsTheyAre) {
     _folder.write("ball.lumen",
-                  "<kfml version=\"5.13\"><factory id=\"1\" uuid=\"E7BF3809-2290-11D7-98E5-00039389B702\"/>"
-                  "<factory id=\"2\" uuid=\"FDC1944B-2291-11D7-B1C3-00039389B702\"/><parameter id=\"1\" "
-                  "factoryID=\"1\"><parameter name=\"Above\" id=\"1\" factoryID=\"1\"><parameter "
-                  "name=\"Held\" id=\"1\" factoryID=\"2\"><flags>4</flags></parameter></parameter>"
-                  "<parameter name=\"Body\" id=\"2\" factoryID=\"1\"><flags>4</flags>"
-                  "<parameter name=\"X\" id=\"3\" factoryID=\"2\"/></parameter></parameter></kfml>");
+                  documentOf("<parameter id=\"1\" factoryID=\"1\"><parameter name=\"Above\" id=\"1\" "
+                             "factoryID=\"1\"><parameter name=\"Held\" id=\"1\" factoryID=\"3\">"
+                             "<flags>4</flags></parameter></parameter><parameter name=\"Body\" id=\"2\" "
+                             "factoryID=\"1\"><flags>4</flags><parameter name=\"X\" id=\"3\" "
+                             "factoryID=\"3\"/></parameter></parameter>"));
     expectRefused({"set", "X", "--value", "1"}, "'X' is locked");
     expectRefused({"add", "Body", "Double", "Y"}, "'Body' is locked");
     expectRefused({"remove", "X"}, "'X' is locked");
@@ -316,14 +311,10 @@ TEST_F(AuthorVerbsTest, UpgradeWritesOldDocumentsInTodaysVersion) {
     }
 
     // A document that would lose channels stays.
-    std::string const unknown = _folder.write(
-        "unknown.lumen", "<kfml version=\"4.0\"><factory id=\"1\" uuid=\"00000000-0000-0000-0000-"
-                         "000000000001\"/><parameter name=\"R\"><parameter name=\"X\" id=\"1\" "
-                         "factoryID=\"1\"/></parameter></kfml>");
-    std::string const before = contentOf(unknown);
-    Outcome const refused = runLumenkey({"upgrade", unknown});
-    EXPECT_EQ(refused.exit, 1);
-    EXPECT_NE(refused.err.find("would be lost"), std::string::npos) << refused.err;
+    std::string const before =
+        documentOf("<parameter><parameter id=\"1\" factoryID=\"9\"/></parameter>", "4.0");
+    std::string const unknown = _folder.write("unknown.lumen", before);
+    EXPECT_NE(complaintOf({"upgrade", unknown}).find("would be lost"), std::string::npos);
     EXPECT_EQ(contentOf(unknown), before);
 }
 

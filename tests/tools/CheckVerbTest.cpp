@@ -1,5 +1,6 @@
 // What `lumenkey check` finds in documents.
 
+#include "tests/tools/DocumentSamples.h"
 #include "tests/tools/MotionSamples.h"
 #include "tests/tools/RunProgram.h"
 #include "tests/tools/TestFolder.h"
@@ -9,10 +10,7 @@
 namespace lumenkey::tools {
 namespace {
 
-constexpr char const* kHead =
-    "<kfml version=\"5.13\">\n"
-    "<factory id=\"1\" uuid=\"E7BF3809-2290-11D7-98E5-00039389B702\"/>\n"
-    "<factory id=\"2\" uuid=\"27F3EE8B-2292-11D7-925A-00039389B702\"/><!-- a percentage, 0 to 1 -->\n";
+using samples::documentOf;
 
 class CheckVerbTest : public ::testing::Test {
 protected:
@@ -41,11 +39,11 @@ TEST_F(CheckVerbTest, FindsWhatIsOddWithItsPlace) {
         {"<parameter id=\"1\" factoryID=\"1\"/>", ""},
         {"<parameter id=\"1\" factoryID=\"1\">\n <shiny><curve/></shiny>\n</parameter>",
          "5:2: the element 'shiny' is unknown here: it is passed over\n"},
-        {"<factory id=\"3\" uuid=\"00000000-0000-0000-0000-000000000001\"/>\n<parameter id=\"1\" "
+        {"<factory id=\"6\" uuid=\"00000000-0000-0000-0000-000000000001\"/>\n<parameter id=\"1\" "
          "factoryID=\"1\">\n"
-         "<parameter name=\"P\" id=\"4\" factoryID=\"3\"><odd/></parameter></parameter>",
+         "<parameter name=\"P\" id=\"4\" factoryID=\"6\"><odd/></parameter></parameter>",
          "4:1: the class 00000000-0000-0000-0000-000000000001 is unknown: its channels are passed over\n"
-         "6:1: the channel 'P' is of factory 3, which is unknown: it is passed over\n"},
+         "6:1: the channel 'P' is of factory 6, which is unknown: it is passed over\n"},
         {"<parameter id=\"1\" factoryID=\"1\">\n<parameter id=\"4\" factoryID=\"9\"/>\n<parameter "
          "id=\"5\"/>\n"
          "<parameter name=\"Q\" id=\"4\" factoryID=\"2\"/></parameter>",
@@ -102,7 +100,7 @@ TEST_F(CheckVerbTest, FindsWhatIsOddWithItsPlace) {
          "13:11: 'nan' is no number\n"},
     };
     for (auto const& each : cases) {
-        EXPECT_EQ(findingsIn(std::string(kHead) + each.body + "</kfml>"), each.findings);
+        EXPECT_EQ(findingsIn(documentOf("\n" + std::string(each.body))), each.findings);
     }
     EXPECT_EQ(findingsIn("<kfml/>"), "1:1: the document holds no channel\n");
     EXPECT_EQ(findingsIn("<kfml version=\"abc\"><parameter/></kfml>"),
@@ -110,11 +108,11 @@ TEST_F(CheckVerbTest, FindsWhatIsOddWithItsPlace) {
     EXPECT_EQ(findingsIn("<kfml version=\"99.1\"><parameter/></kfml>"),
               "1:1: the version 99.1 is newer than 5.13\n");
     EXPECT_EQ(findingsIn("<!DOCTYPE kfml><kfml/>"), "1:15: a document type declaration, which is refused\n");
-    std::string deep = std::string(kHead) + "<parameter id=\"1\" factoryID=\"1\">";
-    for (int i = 0; i < 1'000; ++i) {
+    std::string deep;
+    for (int i = 0; i < 1'001; ++i) {
         deep += "<parameter id=\"1\" factoryID=\"1\">";
     }
-    std::string const found = findingsIn(deep + "</kfml>");
+    std::string const found = findingsIn(documentOf(deep));
     EXPECT_LT(found.find("more than 990 elements deep"), found.find("mismatched tag"))
         << "not in the order of the text";
     EXPECT_EQ(findingsIn(contentOf(LUMENKEY_TEST_SOURCE_DIR "/tests/persistence/data/version2.lumen")), "");
@@ -125,8 +123,8 @@ TEST_F(CheckVerbTest, FindsWhatIsOddWithItsPlace) {
 }
 
 TEST_F(CheckVerbTest, ReadsAPipeOnce) {
-    std::string const odd = _folder.write(
-        "odd.lumen", std::string(kHead) + "<parameter id=\"1\" factoryID=\"1\">\n<odd/></parameter></kfml>");
+    std::string const odd =
+        _folder.write("odd.lumen", documentOf("<parameter id=\"1\" factoryID=\"1\">\n<odd/></parameter>"));
     // Its blocks hold zero bytes.
     std::string wide = "\xFF\xFE";
     for (char const c : samples::replaced(contentOf(odd), "<odd/>", "<odd/>" + std::string(200'000, '\n'))) {
@@ -144,7 +142,7 @@ TEST_F(CheckVerbTest, ReadsAPipeOnce) {
     for (auto const& each : cases) {
         Outcome const outcome = runProgramFile("/bin/sh", {"-c", each.script, programPath(), each.name, odd});
         EXPECT_EQ(outcome.exit, 1) << outcome.err;
-        EXPECT_EQ(outcome.out, each.name + ":5:1: the element 'odd' is unknown here: it is passed over\n");
+        EXPECT_EQ(outcome.out, each.name + ":4:1: the element 'odd' is unknown here: it is passed over\n");
     }
 }
 

@@ -1,5 +1,6 @@
 // What a document keeps when the program writes it anew.
 
+#include "tests/tools/DocumentSamples.h"
 #include "tests/tools/RunProgram.h"
 #include "tests/tools/TestFolder.h"
 
@@ -8,17 +9,8 @@
 namespace lumenkey::tools {
 namespace {
 
-/// A folder, a percentage, a number, a progress and a point are classes 1 to 5; 6 is unknown, and unused.
-std::string documentOf(std::string const& body, char const* version = "5.13") {
-    return std::string("<kfml version=\"") + version +
-           "\">\n<factory id=\"1\" uuid=\"E7BF3809-2290-11D7-98E5-00039389B702\"/>"
-           "<factory id=\"2\" uuid=\"27F3EE8B-2292-11D7-925A-00039389B702\"/>"
-           "<factory id=\"3\" uuid=\"FDC1944B-2291-11D7-B1C3-00039389B702\"/>"
-           "<factory id=\"4\" uuid=\"9DE2E4A6-6865-4D59-B31D-BEF26E4AFFAB\"/>"
-           "<factory id=\"5\" uuid=\"5FDD789A-8EB4-4217-AB8A-8774AE4F08E9\"/>"
-           "<factory id=\"6\" uuid=\"00000000-0000-0000-0000-000000000001\"/>\n" +
-           body + "</kfml>";
-}
+/// Unknown, and unused.
+std::string const kClass6 = "<factory id=\"6\" uuid=\"00000000-0000-0000-0000-000000000001\"/>";
 
 /// A number with a curve, in its own line.
 std::string curved(std::string const& attributes, std::string const& inside) {
@@ -39,7 +31,7 @@ protected:
     std::string const _file = _folder.file("f.lumen");
 
     void write(std::string const& body, char const* version = "5.13") const {
-        _folder.write("f.lumen", documentOf(body, version));
+        _folder.write("f.lumen", samples::documentOf(kClass6 + body, version));
     }
     /// `time value` of each keypoint, with `off` where it is disabled.
     std::string keypointsOf(std::string const& channel) const {
@@ -50,6 +42,21 @@ protected:
                    (key["enabled"].get<bool>() ? "; " : " off; ");
         }
         return all;
+    }
+    struct Edit {
+        std::vector<std::string> arguments;
+        std::string keypoints;
+    };
+    /// Each on a curve with these keypoints.
+    void expectKeypointsAfter(std::vector<Edit> const& edits, std::string const& before) const {
+        for (Edit const& each : edits) {
+            write("<parameter name=\"X\" id=\"1\" factoryID=\"3\"><curve type=\"1\">" + before +
+                  "</curve></parameter>");
+            std::vector<std::string> arguments = each.arguments;
+            arguments.insert(arguments.begin() + 1, {_file, "--in-place"});
+            outputOf(arguments);
+            EXPECT_EQ(keypointsOf("./"), each.keypoints) << Json(arguments);
+        }
     }
 };
 
@@ -133,7 +140,8 @@ TEST_F(RewriteTest, LosesNothingUnlessForced) {
               std::string::npos);
 
     // From a pipe, which can be read only once.
-    std::string const script = "cat '" + _folder.write("odd", documentOf(two + "<shiny/></parameter>")) +
+    std::string const script = "cat '" +
+                               _folder.write("odd", samples::documentOf(two + "<shiny/></parameter>")) +
                                "' | '" + programPath() + "' convert /dev/stdin '" + out + "'";
     Outcome const piped = runProgramFile("/bin/sh", {"-c", script});
     EXPECT_EQ(piped.exit, 1);
@@ -176,62 +184,38 @@ TEST_F(RewriteTest, TheTopHasItsAttributesToo) {
 }
 
 TEST_F(RewriteTest, EveryKeypointCounts) {
-    std::string const body = "<parameter name=\"X\" id=\"1\" factoryID=\"3\"><curve type=\"1\">" +
-                             keypoint("0/1", "1", "enabled=\"0\"") + keypoint("1/1", "2") +
+    std::string const body = keypoint("0/1", "1", "enabled=\"0\"") + keypoint("1/1", "2") +
                              keypoint("1/1", "3") + keypoint("2/1", "4") +
-                             keypoint("4/1", "5", "enabled=\"0\"") + "</curve></parameter>";
-    struct {
-        std::vector<std::string> arguments;
-        char const* keypoints;
-    } const cases[] = {
-        {{"convert", _file, _file}, "0/1 1 off; 1/1 2; 1/1 3; 2/1 4; 4/1 5 off; "},
-        {{"offset", _file, "--by", "10", "--in-place"}, "10/1 1 off; 11/1 2; 11/1 3; 12/1 4; 14/1 5 off; "},
-        {{"offset", _file, "--value", "1", "--in-place"}, "0/1 2 off; 1/1 3; 1/1 4; 2/1 5; 4/1 6 off; "},
-        {{"offset", _file, "--by", "10", "--from", "2", "--in-place"},
-         "0/1 1 off; 1/1 2; 1/1 3; 12/1 4; 14/1 5 off; "},
-        {{"reverse", _file, "--in-place"}, "0/1 5 off; 2/1 4; 3/1 3; 3/1 2; 4/1 1 off; "},
-        {{"retime", _file, "--factor", "2", "--in-place"}, "0/1 1 off; 2/1 2; 2/1 3; 4/1 4; 8/1 5 off; "},
-    };
-    for (auto const& each : cases) {
-        write(body);
-        outputOf(each.arguments);
-        EXPECT_EQ(keypointsOf("./"), each.keypoints) << Json(each.arguments);
-    }
+                             keypoint("4/1", "5", "enabled=\"0\"");
+    expectKeypointsAfter(
+        {{{"scale", "--factor", "1"}, "0/1 1 off; 1/1 2; 1/1 3; 2/1 4; 4/1 5 off; "},
+         {{"offset", "--by", "10"}, "10/1 1 off; 11/1 2; 11/1 3; 12/1 4; 14/1 5 off; "},
+         {{"offset", "--value", "1"}, "0/1 2 off; 1/1 3; 1/1 4; 2/1 5; 4/1 6 off; "},
+         {{"offset", "--by", "10", "--from", "2"}, "0/1 1 off; 1/1 2; 1/1 3; 12/1 4; 14/1 5 off; "},
+         {{"reverse"}, "0/1 5 off; 2/1 4; 3/1 3; 3/1 2; 4/1 1 off; "},
+         {{"retime", "--factor", "2"}, "0/1 1 off; 2/1 2; 2/1 3; 4/1 4; 8/1 5 off; "}},
+        body);
 }
 
 TEST_F(RewriteTest, LockedKeypointsStay) {
     // At 0 to 7 s, with the time as value; those at 0 and 3 s are locked.
-    std::string body = "<parameter name=\"X\" id=\"1\" factoryID=\"3\"><curve type=\"1\">";
-    for (char const* const at : {"0", "1", "2", "3", "4", "5", "6", "7"}) {
-        bool const isLocked = *at == '0' || *at == '3';
-        body += keypoint((std::string(at) + "/1").c_str(), at, isLocked ? "flags=\"2\"" : "");
+    std::string body;
+    for (std::string const at : {"0", "1", "2", "3", "4", "5", "6", "7"}) {
+        body += keypoint((at + "/1").c_str(), at.c_str(), at == "0" || at == "3" ? "flags=\"2\"" : "");
     }
-    body += "</curve></parameter>";
-    struct {
-        std::vector<std::string> arguments;
-        char const* keypoints;
-    } const cases[] = {
-        {{"reverse", _file, "--from", "4", "--to", "6"}, "0 0; 1 1; 2 2; 3 3; 4 6; 5 5; 6 4; 7 7; "},
-        {{"offset", _file, "--by", "10", "--from", "4", "--to", "6"},
-         "0 0; 1 1; 2 2; 3 3; 7 7; 14 4; 15 5; 16 6; "},
-        {{"retime", _file, "--factor", "2", "--from", "2", "--to", "5"}, "0 0; 1 1; 2 2; 3 3; 6 4; 8 5; "},
-        // What comes to where one stands gives way to it.
-        {{"offset", _file, "--by", "1"}, "0 0; 2 1; 3 3; 5 4; 6 5; 7 6; 8 7; "},
-        {{"offset", _file, "--by", "-1", "--from", "3", "--to", "4"}, "0 0; 1 1; 2 2; 3 3; 5 5; 6 6; 7 7; "},
-        {{"offset", _file, "--by", "1", "--from", "3", "--to", "3"},
-         "0 0; 1 1; 2 2; 3 3; 4 4; 5 5; 6 6; 7 7; "},
-    };
-    for (auto const& each : cases) {
-        write(body);
-        std::vector<std::string> arguments = each.arguments;
-        arguments.push_back("--in-place");
-        outputOf(arguments);
-        std::string keypoints = keypointsOf("./");
-        for (std::size_t at = 0; (at = keypoints.find("/1 ")) != std::string::npos;) {
-            keypoints.erase(at, 2);
-        }
-        EXPECT_EQ(keypoints, each.keypoints) << Json(arguments);
-    }
+    expectKeypointsAfter({{{"reverse", "--from", "4", "--to", "6"},
+                           "0/1 0; 1/1 1; 2/1 2; 3/1 3; 4/1 6; 5/1 5; 6/1 4; 7/1 7; "},
+                          {{"offset", "--by", "10", "--from", "4", "--to", "6"},
+                           "0/1 0; 1/1 1; 2/1 2; 3/1 3; 7/1 7; 14/1 4; 15/1 5; 16/1 6; "},
+                          {{"retime", "--factor", "2", "--from", "2", "--to", "5"},
+                           "0/1 0; 1/1 1; 2/1 2; 3/1 3; 6/1 4; 8/1 5; "},
+                          // What comes to where one stands gives way to it.
+                          {{"offset", "--by", "1"}, "0/1 0; 2/1 1; 3/1 3; 5/1 4; 6/1 5; 7/1 6; 8/1 7; "},
+                          {{"offset", "--by", "-1", "--from", "3", "--to", "4"},
+                           "0/1 0; 1/1 1; 2/1 2; 3/1 3; 5/1 5; 6/1 6; 7/1 7; "},
+                          {{"offset", "--by", "1", "--from", "3", "--to", "3"},
+                           "0/1 0; 1/1 1; 2/1 2; 3/1 3; 4/1 4; 5/1 5; 6/1 6; 7/1 7; "}},
+                         body);
 }
 
 } // namespace

@@ -85,6 +85,13 @@ std::string outputOf(std::vector<std::string> const& arguments, int exit) {
     return outcome.out;
 }
 
+std::string complaintOf(std::vector<std::string> const& arguments, int exit) {
+    Outcome const outcome = runLumenkey(arguments);
+    EXPECT_EQ(outcome.exit, exit) << Json(arguments) << outcome.err;
+    EXPECT_EQ(outcome.out, "");
+    return outcome.err;
+}
+
 Json jsonOf(std::vector<std::string> arguments, int exit) {
     arguments.push_back("--json");
     return Json::parse(outputOf(arguments, exit), nullptr, false);

@@ -27,7 +27,9 @@ Outcome runLumenkey(std::vector<std::string> const& arguments, std::string const
 
 /// What the program says where it exits so, without a complaint.
 std::string outputOf(std::vector<std::string> const& arguments, int exit = 0);
-/// The same for a verb with `--json`.
+/// What it complains of where it exits so and says nothing else.
+std::string complaintOf(std::vector<std::string> const& arguments, int exit = 1);
+/// What it says for a verb with `--json`.
 Json jsonOf(std::vector<std::string> arguments, int exit = 0);
 
 } // namespace lumenkey::tools
