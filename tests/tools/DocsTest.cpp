@@ -27,16 +27,18 @@ class DocsTest : public ::testing::Test {
 protected:
     TestFolder const _folder;
 
+    Outcome run(std::string const& command) const {
+        return runProgramFile("/bin/sh",
+                              {"-c", "lumenkey() { \"$0\" \"$@\"; }; cd \"$1\" || exit; " + command,
+                               programPath(), _folder.path().string()});
+    }
     /// A transcript as it is shown: each command behind a `$ `, then what it says.
     std::string transcriptAgain(std::string const& shown) const {
         std::string again;
         std::istringstream lines(shown);
         for (std::string line; std::getline(lines, line);) {
             if (line.starts_with("$ ")) {
-                std::string const script =
-                    "lumenkey() { \"$0\" \"$@\"; }; cd \"$1\" || exit; " + line.substr(2);
-                Outcome const outcome =
-                    runProgramFile("/bin/sh", {"-c", script, programPath(), _folder.path().string()});
+                Outcome const outcome = run(line.substr(2));
                 again += line + "\n" + outcome.out + outcome.err;
             }
         }
@@ -58,6 +60,24 @@ TEST_F(DocsTest, TheProgramSaysWhatTheFirstPageShows) {
     ASSERT_EQ(transcripts.size(), 1U);
     EXPECT_EQ(transcriptAgain(transcripts[0]), transcripts[0]);
     EXPECT_TRUE(std::filesystem::exists(_folder.file("plot.svg")));
+}
+
+TEST_F(DocsTest, TheCommandsOfTheGuideDrawItsPictures) {
+    _folder.write("hand.csv", pageNamed("docs/editing/hand.csv"));
+    std::istringstream lines(pageNamed("docs/editing.md"));
+    int commands = 0;
+    for (std::string line; std::getline(lines, line);) {
+        if (!line.starts_with("    lumenkey ")) {
+            continue;
+        }
+        ++commands;
+        Outcome const outcome = run(line);
+        EXPECT_EQ(outcome.exit, 0) << line << "\n" << outcome.err;
+        std::string const picture = line.substr(line.rfind(' ') + 1);
+        EXPECT_GT(contentOf(_folder.file(picture)).size(), 20'000U) << picture;
+        EXPECT_FALSE(pageNamed("docs/editing/" + picture).empty()) << picture;
+    }
+    EXPECT_EQ(commands, 7);
 }
 
 TEST_F(DocsTest, TheExampleOfADocumentIsOne) {

@@ -83,17 +83,11 @@ TEST_F(EditVerbsTest, ReportsWhatChanged) {
     EXPECT_EQ(json["channels"], Json::parse(R"([{"channel": "X", "unit": "units", "keypointsBefore": 3,
         "keypointsAfter": 3, "largestChange": 4.0, "at": "1/1"}])"));
 
+    // Pages show the rest of what is written without --json.
     std::string const picture = _folder.file("p.svg");
     Outcome const table = edit(file, {"simplify", "Y", "--tolerance", "0", "--plot", picture});
     EXPECT_EQ(table.exit, 0) << table.err;
-    EXPECT_EQ(table.out, "keypoints    3 before, 2 after, 1.50 to 1\n"
-                         "worst error  0.000000 units, of Y at 0.000000 s\n"
-                         "stretch      0/1 s to 2/1 s\n"
-                         "written      " +
-                             _out +
-                             ", 3 rows from 0/1 s on\n\n"
-                             "channel  unit   before  after  worst error\n"
-                             "Y        units       3      2     0.000000\n");
+    EXPECT_NE(table.out.find(_out + ", 3 rows from 0/1 s on\n"), std::string::npos) << table.out;
     std::string const drawn = contentOf(picture);
     ASSERT_EQ(edit(file, {"scale", "Y", "--factor", "1", "--plot", picture}).exit, 0);
     EXPECT_TRUE(drawn.starts_with("<?xml"));
@@ -227,18 +221,15 @@ TEST_F(EditVerbsTest, TheOutputIsReplacedAsAWholeOrNotAtAll) {
     std::string const file = _folder.write("small.bvh", kSmallMotion);
     std::string const faulty = _folder.write("faulty.bvh", samples::replaced(kSmallMotion, "91.5", "high"));
     _folder.write("out.bvh", "old");
-    Outcome const unread = edit(faulty, {"reverse"}, _folder.file("out.bvh"));
-    EXPECT_EQ(unread.exit, 1);
-    EXPECT_EQ(unread.err, "lumenkey: " + faulty + ":20:3: 'high' is not a number\n");
+    EXPECT_EQ(complaintOf({"reverse", faulty, "-o", _folder.file("out.bvh")}),
+              "lumenkey: " + faulty + ":20:3: 'high' is not a number\n");
     EXPECT_EQ(contentOf(_folder.file("out.bvh")), "old");
-    Outcome const nowhere = edit(file, {"reverse"}, _folder.file("missing/out.bvh"));
-    EXPECT_EQ(nowhere.exit, 1);
-    EXPECT_EQ(nowhere.err, "lumenkey: " + _folder.file("missing/out.bvh") + ": No such file or directory\n");
-
+    std::string const nowhere = _folder.file("missing/out.bvh");
+    EXPECT_EQ(complaintOf({"reverse", file, "-o", nowhere}),
+              "lumenkey: " + nowhere + ": No such file or directory\n");
     std::string const noPicture = _folder.file("missing/p.svg");
-    Outcome const undrawn = runLumenkey({"reverse", file, "--in-place", "--plot", noPicture});
-    EXPECT_EQ(undrawn.exit, 1);
-    EXPECT_EQ(undrawn.err, "lumenkey: " + noPicture + ": No such file or directory\n");
+    EXPECT_EQ(complaintOf({"reverse", file, "--in-place", "--plot", noPicture}),
+              "lumenkey: " + noPicture + ": No such file or directory\n");
     EXPECT_EQ(contentOf(file), kSmallMotion);
 
     // In its own place, there and back.
@@ -293,40 +284,18 @@ TEST_F(EditVerbsTest, WrongArgumentsAreToldBeforeAnythingIsWritten) {
         {table, {"reverse", "Y"}, "out.csv", "there is no channel 'Y'"},
     };
     for (auto const& each : cases) {
-        Outcome const outcome = edit(each.file, each.arguments, _folder.file(each.target));
-        EXPECT_EQ(outcome.exit, 2) << outcome.err;
-        EXPECT_EQ(outcome.out, "");
-        EXPECT_NE(outcome.err.find(each.complaint), std::string::npos) << outcome.err;
-        EXPECT_NE(outcome.err.find("\nusage: lumenkey " + each.arguments[0] + " FILE"), std::string::npos);
+        std::vector<std::string> arguments = each.arguments;
+        arguments.insert(arguments.begin() + 1, {each.file, "-o", _folder.file(each.target)});
+        std::string const said = complaintOf(arguments, 2);
+        EXPECT_NE(said.find(each.complaint), std::string::npos) << said;
+        EXPECT_NE(said.find("\nusage: lumenkey " + each.arguments[0] + " FILE"), std::string::npos);
     }
     EXPECT_EQ(_folder.entryCount(), 2U);
+    EXPECT_NE(complaintOf({"reverse", table}, 2).find("-o OUT, or --in-place"), std::string::npos);
     // Where only the content tells that it is no table.
     std::string const nameless = _folder.write("motion", kSmallMotion);
-    Outcome const rows = runLumenkey({"reverse", nameless, "--in-place", "--rows", "input"});
-    EXPECT_EQ(rows.exit, 2);
-    EXPECT_NE(rows.err.find("--rows is for a table, and '" + nameless + "' is none"), std::string::npos)
-        << rows.err;
-}
-
-TEST_F(EditVerbsTest, TheCommandsOfTheGuideDrawItsPictures) {
-    std::filesystem::path const docs = std::filesystem::path(LUMENKEY_TEST_SOURCE_DIR) / "docs";
-    std::filesystem::copy_file(docs / "editing/hand.csv", _folder.file("hand.csv"));
-    std::istringstream lines(contentOf((docs / "editing.md").string()));
-    std::string const prompt = "    lumenkey ";
-    int commands = 0;
-    for (std::string line; std::getline(lines, line);) {
-        if (!line.starts_with(prompt)) {
-            continue;
-        }
-        ++commands;
-        std::string const script = "cd '" + _folder.path().string() + "' && '" + programPath() + "' ";
-        Outcome const outcome = runProgramFile("/bin/sh", {"-c", script + line.substr(prompt.size())});
-        EXPECT_EQ(outcome.exit, 0) << line << "\n" << outcome.err;
-        std::string const picture = line.substr(line.rfind(' ') + 1);
-        EXPECT_GT(contentOf(_folder.file(picture)).size(), 20'000U) << picture;
-        EXPECT_TRUE(std::filesystem::exists(docs / "editing" / picture)) << picture;
-    }
-    EXPECT_EQ(commands, 7);
+    std::string const rows = complaintOf({"reverse", nameless, "--in-place", "--rows", "input"}, 2);
+    EXPECT_NE(rows.find("--rows is for a table, and '" + nameless + "' is none"), std::string::npos) << rows;
 }
 
 } // namespace

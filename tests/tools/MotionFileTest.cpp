@@ -26,20 +26,12 @@ std::string faultWith(std::string_view what, std::string_view by) {
     return faultOf(replaced(kSmallMotion, what, by));
 }
 
-TEST(MotionFile, ReadsEverythingAFileHolds) {
+TEST(MotionFile, ReadsWhatStandsBesideTheChannels) {
     Motion const motion = readMotionText(kSmallMotion, "f.bvh");
-    ASSERT_EQ(motion.joints.size(), 2U);
-    EXPECT_EQ(motion.joints[0].name, "Hips");
     EXPECT_EQ(motion.joints[0].offset, (std::array{0.0, 1.5, -2.0}));
-    EXPECT_EQ(motion.joints[1].parent, 0U);
-    EXPECT_EQ(motion.joints[1].firstChannel, 6U);
     ASSERT_EQ(motion.endSites.size(), 1U);
     EXPECT_EQ(motion.endSites[0].offset, (std::array{0.0, -10.0, 0.0}));
-    ASSERT_EQ(motion.channels.size(), 9U);
-    EXPECT_EQ(motion.channels[4].kind, MotionChannelKind::Xrotation);
-    EXPECT_EQ(motion.value(1, 1), 91.5);
     EXPECT_EQ(motion.value(2, 8), 180);
-    EXPECT_EQ(motion.timeOfFrame(2), TempusMake(1, 60));
 }
 
 TEST(MotionFile, TakesCommonDepartures) {

@@ -68,7 +68,7 @@ TEST_F(RewriteTest, LosesNothingUnlessForced) {
         char const* loss; // empty for none
     } const cases[] = {
         {"", ""},
-        {"\n<parameter name=\"Y\" id=\"2\" factoryID=\"9\"/>", "5:1: the channel 'Y' is of factory 9"},
+        {"\n<parameter name=\"Y\" id=\"2\" factoryID=\"6\"/>", "5:1: the channel 'Y' is of factory 6"},
         {"\n<parameter name=\"Y\" id=\"2\"/>", "5:1: the channel 'Y' names no class"},
         {"\n<parameter name=\"Y\" id=\"1\" factoryID=\"3\"/>", "5:1: the channel 'Y' has the ID 1"},
         {"\n<shiny/>", "5:1: the element 'shiny'"},
