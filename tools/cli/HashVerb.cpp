@@ -2,6 +2,7 @@
 
 #include "lumenkey/foundation/BXHashWriteStream.h"
 #include "tools/cli/ChannelInput.h"
+#include "tools/cli/Progress.h"
 #include "tools/cli/TimeArgument.h"
 
 #include <CLI/CLI.hpp>
@@ -29,10 +30,15 @@ std::string hexadecimal(std::array<std::uint8_t, 16> const& hash) {
     return text;
 }
 
-/// Of what is seen at a time of the curves below.
-std::array<std::uint8_t, 16> hashAt(KFChannelBase& channel, Tempus const& time) {
+/// Of all that it is, or of what is seen at a time of the curves below.
+std::array<std::uint8_t, 16> hashOf(KFChannelBase& channel, std::optional<TimeArgument> const& at,
+                                    Tempus const& frameDuration) {
+    Progress const bar("hashing");
+    if (!at) {
+        return channel.getHash();
+    }
     BXHashWriteStream stream;
-    channel.calcHashForState(stream, channel.localToGlobalTime(time));
+    channel.calcHashForState(stream, channel.localToGlobalTime(at->resolve(frameDuration)));
     return stream.getHash();
 }
 
@@ -42,8 +48,7 @@ void runHash(HashOptions const& options, OutputSink& out) {
     ChannelTree::Node const node =
         options.channel.empty() ? ChannelTree::kTop : input.nodeNamed(options.channel);
     KFChannelBase& channel = input.tree().base(node);
-    out.write(hexadecimal(at ? hashAt(channel, at->resolve(input.file().frameDuration)) : channel.getHash()) +
-              "\n");
+    out.write(hexadecimal(hashOf(channel, at, input.file().frameDuration)) + "\n");
 }
 
 } // namespace

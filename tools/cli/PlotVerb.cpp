@@ -42,8 +42,7 @@ TimeSpan spanOf(std::optional<TimeArgument> const& from, std::optional<TimeArgum
 }
 
 PlotChart chartOf(ChannelInput const& input, std::vector<ChannelTree::Node> const& channels,
-                  TimeSpan const& span, double width) {
-    Progress bar("plotting");
+                  TimeSpan const& span, double width, Progress& bar) {
     PlotChart chart;
     chart.title = std::filesystem::path(input.file().file).filename().string();
     chart.seconds = PlotRange::sound(TempusGetSeconds(span.from), TempusGetSeconds(span.to));
@@ -77,7 +76,9 @@ void runPlot(PlotOptions const& options) {
                          " channels are too many to tell apart in one picture; name " +
                          std::to_string(kMostDistinctCurves) + " at most, or a folder with no more"};
     }
-    PlotChart const chart = chartOf(input, channels, spanOf(from, to, input.file()), options.width);
+    TimeSpan const span = spanOf(from, to, input.file());
+    Progress bar("plotting");
+    PlotChart const chart = chartOf(input, channels, span, options.width, bar);
     PlotCanvas canvas(format, options.width, options.height);
     chart.draw(canvas);
     canvas.save(options.output);

@@ -3,7 +3,10 @@
 #include "tools/output/StandardOutput.h"
 
 #include <algorithm>
-#include <atomic>
+#include <condition_variable>
+#include <cstdlib>
+#include <mutex>
+#include <system_error>
 #include <unistd.h>
 #include <utility>
 
@@ -11,9 +14,13 @@ namespace lumenkey::tools {
 
 namespace {
 
-constexpr std::chrono::milliseconds kPatience{1'000};
-constexpr std::chrono::milliseconds kBetweenDrawings{100};
-constexpr int kBarWidth = 40;
+using std::chrono::milliseconds;
+
+constexpr milliseconds kPatience{1'000};
+constexpr milliseconds kBetweenDrawings{100};
+constexpr int kCells = 40;
+/// Of the mark that moves.
+constexpr int kCellsOfMark = 8;
 
 /// Whether a bar has the line.
 std::atomic<bool> isLineTaken = false;
@@ -25,19 +32,32 @@ bool takesLine(ProgressOf kind, ProgressScreen const& screen) {
            !isLineTaken.exchange(true);
 }
 
+bool waitUnlessStopped(std::stop_token const& stop, milliseconds time) {
+    std::mutex mutex;
+    std::condition_variable_any nothing;
+    std::unique_lock lock(mutex);
+    nothing.wait_for(lock, stop, time, [] { return false; });
+    return !stop.stop_requested();
+}
+
 } // namespace
 
 ProgressScreen const& ProgressScreen::real() {
     static ProgressScreen const screen{::isatty(STDERR_FILENO) == 1, ::isatty(STDOUT_FILENO) == 1,
-                                       [] { return Clock::now(); },
+                                       [] { return Clock::now(); }, waitUnlessStopped,
                                        [](std::string_view text) { writeFully(STDERR_FILENO, text); }};
     return screen;
 }
 
 Progress::Progress(std::string what, ProgressOf kind, ProgressScreen const& screen)
     : _screen(screen), _what(std::move(what)), _part(partOfThread), _hasLine(takesLine(kind, screen)) {
-    if (_hasLine) {
-        _nextDrawing = _screen.now() + kPatience;
+    if (!_hasLine) {
+        return;
+    }
+    try {
+        _drawing = std::jthread([this](std::stop_token const& stop) { drawUntil(stop); });
+    } catch (std::system_error const&) {
+        // No thread is to be had: the work is done all the same.
     }
 }
 
@@ -45,10 +65,8 @@ Progress::~Progress() {
     if (_part != nullptr) {
         _part->_done += (1 - _part->_done) / 2;
     }
-    if (_isShown) {
-        _screen.write("\r\x1B[K");
-    }
     if (_hasLine) {
+        _drawing = {};
         isLineTaken = false;
     }
 }
@@ -66,15 +84,34 @@ void Progress::update(double share) {
         _part->_whole(_part->_done + (1 - _part->_done) / 2 * share);
         return;
     }
-    if (!isDue()) {
-        return;
+    _share.store(share, std::memory_order_relaxed);
+}
+
+void Progress::drawUntil(std::stop_token const& stop) const {
+    ProgressScreen::Clock::time_point const start = _screen.now();
+    bool isShown = false;
+    for (int drawing = 0; _screen.wait(stop, isShown ? kBetweenDrawings : kPatience); ++drawing) {
+        auto const seconds = std::chrono::duration_cast<std::chrono::seconds>(_screen.now() - start);
+        _screen.write("\r" + _what + " " + cells(drawing) + " " + std::to_string(seconds.count()) +
+                      " s\x1B[K");
+        isShown = true;
     }
-    _nextDrawing = _screen.now() + kBetweenDrawings;
-    _isShown = true;
-    auto const done = static_cast<std::size_t>(share * kBarWidth);
-    std::string const bar = std::string(done, '#') + std::string(kBarWidth - done, '.');
-    std::string const percent = std::to_string(static_cast<int>(share * 100));
-    _screen.write("\r" + _what + " [" + bar + "] " + percent + "%\x1B[K");
+    if (isShown) {
+        _screen.write("\r\x1B[K");
+    }
+}
+
+/// `[####....] 50%`, or `[..####..]` as long as nobody knows.
+std::string Progress::cells(int drawing) const {
+    double const share = _share.load(std::memory_order_relaxed);
+    std::string bar(kCells, '.');
+    if (share >= 0) {
+        std::fill_n(bar.begin(), static_cast<int>(share * kCells), '#');
+        return "[" + bar + "] " + std::to_string(static_cast<int>(share * 100)) + "%,";
+    }
+    constexpr int way = kCells - kCellsOfMark;
+    std::fill_n(bar.begin() + (way - std::abs(drawing % (2 * way) - way)), kCellsOfMark, '#');
+    return "[" + bar + "]";
 }
 
 ProgressPart::ProgressPart(std::function<void(double)> whole)

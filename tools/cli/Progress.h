@@ -1,9 +1,11 @@
 #pragma once
 
+#include <atomic>
 #include <chrono>
 #include <functional>
 #include <string>
 #include <string_view>
+#include <thread>
 
 namespace lumenkey::tools {
 
@@ -21,6 +23,8 @@ struct ProgressScreen {
     /// Results go there too.
     bool showsResults = false;
     std::function<Clock::time_point()> now;
+    /// For so long, or until a stop is asked for: whether it wasn't.
+    std::function<bool(std::stop_token const&, std::chrono::milliseconds)> wait;
     std::function<void(std::string_view)> write;
 
     /// Standard error.
@@ -32,6 +36,9 @@ class ProgressPart;
 /// A bar on standard error while work lasts over a second and a person sits at the terminal; nothing
 /// otherwise, nor while another one lives: work that is a part of other work shows nothing of its own. It is
 /// wiped away at the end.
+///
+/// A thread of its own draws it, so that it stands there whatever the work is busy with. Where nobody tells a
+/// share, a mark moves to and fro.
 class Progress {
 public:
     explicit Progress(std::string what, ProgressOf kind = ProgressOf::Work,
@@ -40,24 +47,26 @@ public:
     Progress(Progress const&) = delete;
     Progress& operator=(Progress const&) = delete;
 
-    /// The share of the work done, 0 .. 1. Cheap enough to be called in a loop.
+    /// The share of the work done, 0 .. 1. Cheap enough to be called in a loop, and from any thread.
     void update(double share);
     /// The same as a function, for as long as the bar lives; empty where nothing is ever drawn.
     std::function<void(double)> teller();
 
-    /// Whether an update would draw something now.
-    bool isDue() const { return _hasLine && _screen.now() >= _nextDrawing; }
     /// Whether anything is ever drawn.
     bool hasLine() const { return _hasLine; }
 
 private:
+    void drawUntil(std::stop_token const& stop) const;
+    std::string cells(int drawing) const;
+
     ProgressScreen const& _screen;
     std::string _what;
     /// Where this is a part of other work: who is told instead.
     ProgressPart* _part;
     bool _hasLine;
-    bool _isShown = false;
-    ProgressScreen::Clock::time_point _nextDrawing;
+    /// Below 0 until one is told.
+    std::atomic<double> _share = -1;
+    std::jthread _drawing;
 };
 
 /// While it lives, the bars of this thread draw nothing and tell `whole` what share of the thread's work is

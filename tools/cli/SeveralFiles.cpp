@@ -10,9 +10,7 @@
 #include <algorithm>
 #include <atomic>
 #include <exception>
-#include <mutex>
 #include <new>
-#include <numeric>
 #include <thread>
 #include <unistd.h>
 #include <utility>
@@ -58,19 +56,15 @@ public:
 
     bool isSeen() const { return _bar.hasLine(); }
 
+    /// Of one file, by the one thread that works on it.
     void tell(std::size_t file, double share) {
-        _shares[file] = share;
-        // Whoever finds another one drawing need not wait: there will be a next time.
-        std::unique_lock const lock(_mutex, std::try_to_lock);
-        if (lock && _bar.isDue()) {
-            double const done = std::accumulate(_shares.begin(), _shares.end(), 0.0);
-            _bar.update(done / static_cast<double>(_shares.size()));
-        }
+        double const more = share - std::exchange(_shares[file], share);
+        _bar.update((_done += more) / static_cast<double>(_shares.size()));
     }
 
 private:
-    std::vector<std::atomic<double>> _shares;
-    std::mutex _mutex;
+    std::vector<double> _shares;
+    std::atomic<double> _done = 0;
     Progress _bar{"files"};
 };
 
