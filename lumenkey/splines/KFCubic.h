@@ -64,17 +64,14 @@ public:
 
     /// `p` in 0 to 1; the result is clamped to that range.
     double operator()(double p) const noexcept {
-        switch (_method) {
-        case Method::Identity:
-            return p;
-        case Method::TwoSteps:
+        return _method == Method::Search ? search(p) : withoutSearch(p);
+    }
+
+    /// For the other methods than `Search`.
+    double withoutSearch(double p) const noexcept {
+        if (_method == Method::TwoSteps)
             return iterate<2>(p);
-        case Method::ThreeSteps:
-            return iterate<3>(p);
-        case Method::Search:
-            break;
-        }
-        return search(p);
+        return _method == Method::ThreeSteps ? iterate<3>(p) : p;
     }
 
     /// For the methods that iterate; `Steps` is theirs.

@@ -19,6 +19,8 @@ bool KFStepScale::prepare(std::int64_t tickScaleIn, std::int32_t timescaleIn) no
 double KFSegmentCache::shapeAt(double p) const noexcept {
     if (kind == Kind::ParametricCubic)
         return value(p);
+    if (kind == Kind::Cubic)
+        return value(parameter(p));
     switch (type) {
     case kKFInterpolationEaseIn:
         return KFShape::easeIn(p, a, b);

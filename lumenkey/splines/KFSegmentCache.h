@@ -111,8 +111,8 @@ struct KFSegmentCache {
         double const p = static_cast<double>(position - low) / width;
         if (kind == Kind::Linear)
             return KFShape::linear(static_cast<double>(high - position) / width, p, a, b);
-        if (kind == Kind::Cubic)
-            return value(parameter(p));
+        if (kind == Kind::Cubic && parameter.method() != KFCubicInverse::Method::Search)
+            return value(parameter.withoutSearch(p));
         if (kind == Kind::Eased)
             return KFShape::eased(easing, p, a, b);
         return shapeAt(p);

@@ -442,6 +442,9 @@ private:
     double valueOfWholeCurve(Tempus const& u, Tempus const& t, bool lock);
     double evaluateByWalk(Tempus const& u, Tempus const& t);
     bool evaluateBetween(Tempus const& u, Tempus const& t, double* result);
+    double readFirst(Tempus const& u, Tempus const& t, bool lock, std::uint64_t version);
+    double readAround(Tempus const& u, Tempus const& t, bool lock, std::int64_t position,
+                      KFSegmentPlace& place);
     double readUnderLock(Tempus const& u, Tempus const& t, KFSegmentPlace* place);
     double readWithoutLock(Tempus const& u, Tempus const& t, KFSegmentPlace* place);
     bool evaluateAndKeep(Tempus const& u, KFSegmentPlace* place, KFSegmentCache& instead, double* out);

@@ -45,24 +45,44 @@ void KFSpline::interpolate(Tempus const& t, void* vA, void* vB, Tempus const& u,
     *out = strategy->interpolate(*this, t, vA, vB, u, getState()->parametric, derivative);
 }
 
-// The two functions that reading a point spends its time in are flattened: their calls cost as much as what they call.
+// The functions that reading a point spends its time in are flattened: their calls cost as much as what they call.
 
+/// One position after another in one segment is what happens most: the thread has all that it needs. All else is called
+/// last, so that this has no register to save.
 [[gnu::flatten]] double KFSpline::getVertexValue(Tempus const& u, Tempus const& t, bool lock) {
-    // One position after another in one segment is what happens most: the thread has all that it needs.
     std::uint64_t const version = _store->acquiredVersion();
     KFSegmentPlace* const place = KFThreadSegments::placeOf(version);
+    if (place == nullptr) [[unlikely]]
+        return readFirst(u, t, lock, version);
+    KFSegmentCache const& segment = place->current();
     std::int64_t position = 0;
-    if (place != nullptr && place->current().scale.stepsOf(u, &position)) [[likely]] {
-        KFSegmentCache const* segment = &place->current();
-        bool holds = segment->holds(position);
-        if (!holds && place->keepsSeveral(version)) {
-            segment = &place->around(u, position, version);
-            holds = segment->scale.stepsOf(u, &position) && segment->holds(position);
+    if (segment.scale.stepsOf(u, &position)) [[likely]] {
+        if (!segment.holds(position)) {
+            if (place->keepsSeveral(version))
+                return readAround(u, t, lock, position, *place);
+        } else if (segmentStandsWithoutLock(segment, version)) [[likely]] {
+            return segment.valueAt(position);
         }
-        if (holds && segmentStandsWithoutLock(*segment, version)) [[likely]]
-            return segment->valueAt(position);
     }
     return lock ? readUnderLock(u, t, place) : readWithoutLock(u, t, place);
+}
+
+[[gnu::noinline]] double KFSpline::readFirst(Tempus const& u, Tempus const& t, bool lock,
+                                             std::uint64_t version) {
+    KFSegmentPlace* const place = KFThreadSegments::makePlaceOf(version);
+    return lock ? readUnderLock(u, t, place) : readWithoutLock(u, t, place);
+}
+
+/// From another segment that the thread keeps of the spline; `position` is by the scale of the current one.
+[[gnu::noinline, gnu::flatten]] double KFSpline::readAround(Tempus const& u, Tempus const& t, bool lock,
+                                                            std::int64_t position, KFSegmentPlace& place) {
+    std::uint64_t const version = _store->acquiredVersion();
+    KFSegmentCache const& segment = place.around(u, position, version);
+    if (segment.scale.stepsOf(u, &position) && segment.holds(position) &&
+        segmentStandsWithoutLock(segment, version)) [[likely]] {
+        return segment.valueAt(position);
+    }
+    return lock ? readUnderLock(u, t, &place) : readWithoutLock(u, t, &place);
 }
 
 [[gnu::noinline]] double KFSpline::readUnderLock(Tempus const& u, Tempus const& t, KFSegmentPlace* place) {

@@ -14,8 +14,12 @@ public:
     /// So many segments are kept at most.
     static constexpr std::uint32_t kMost = 12;
 
+    KFSegmentPlace() noexcept = default;
+    KFSegmentPlace(KFSegmentPlace const&) = delete;
+    KFSegmentPlace& operator=(KFSegmentPlace const&) = delete;
+
     /// The segment that was read last. It may be another spline's, or none.
-    KFSegmentCache const& current() const noexcept { return _segments[_current]; }
+    KFSegmentCache const& current() const noexcept { return *_current; }
     /// Whether it keeps several segments of the spline with that version.
     bool keepsSeveral(std::uint64_t version) const noexcept {
         return _used > 1 && _owner == KFStoreVersion::runOf(version);
@@ -25,17 +29,17 @@ public:
     /// it again by its own. The current one where there is none.
     KFSegmentCache const& around(Tempus const& u, std::int64_t position, std::uint64_t version) noexcept {
         // No branch depends on what is found: at positions in any order none would be foreseen.
-        std::uint32_t found = _current;
+        KFSegmentCache* found = _current;
         for (std::uint32_t i = 0; i < _used; ++i) {
-            KFSegmentCache const& segment = _segments[i];
+            KFSegmentCache& segment = _segments[i];
             unsigned const fits = static_cast<unsigned>(segment.version == version) &
                                   static_cast<unsigned>(segment.scale.timescale == u.timescale) &
                                   static_cast<unsigned>(segment.low < position) &
                                   static_cast<unsigned>(position < segment.high);
-            found = fits != 0 ? i : found;
+            found = fits != 0 ? &segment : found;
         }
         _current = found;
-        return _segments[found];
+        return *found;
     }
 
     /// Whether it keeps all segments of a spline with so many vertices.
@@ -46,9 +50,10 @@ public:
     KFSegmentCache* claim(std::uint64_t version) noexcept {
         if (!own(KFStoreVersion::runOf(version)))
             return nullptr;
-        _current = _next = 0;
+        _current = _segments;
+        _next = 0;
         _used = 1;
-        return &_segments[0];
+        return _current;
     }
 
     /// The same of a spline all of whose segments are kept: the one that holds `u`, else the one prepared longest ago.
@@ -58,18 +63,19 @@ public:
             return nullptr;
         std::int64_t position = 0;
         if (current().scale.stepsOf(u, &position) && holds(around(u, position, version), u))
-            return &_segments[_current];
+            return _current;
         return &_segments[_next];
     }
 
     /// What `claimFor` gave is the current segment, if it is around `u`; at the position of a vertex none is.
-    void keep(KFSegmentCache const& claimed, Tempus const& u) noexcept {
+    void keep(KFSegmentCache& claimed, Tempus const& u) noexcept {
         if (!holds(claimed, u))
             return;
-        _current = static_cast<std::uint32_t>(&claimed - _segments);
-        if (_current == _next)
+        _current = &claimed;
+        auto const index = static_cast<std::uint32_t>(_current - _segments);
+        if (index == _next)
             _next = _next + 1 < kMost ? _next + 1 : 0;
-        _used = _used > _current ? _used : _current + 1;
+        _used = _used > index ? _used : index + 1;
     }
 
 private:
@@ -89,11 +95,12 @@ private:
         _owner = run;
         for (std::uint32_t i = 0; i < _used; ++i)
             _segments[i].forget();
-        _current = _next = _used = 0;
+        _current = _segments;
+        _next = _used = 0;
         return true;
     }
 
-    std::uint32_t _current = 0;
+    KFSegmentCache* _current = _segments;
     /// The one to be prepared when another is needed.
     std::uint32_t _next = 0;
     /// Those behind were never prepared, or for a version that doesn't come back.
@@ -130,20 +137,19 @@ private:
 /// read in turn leave it alone and use what each spline keeps under its own lock.
 class KFThreadSegments {
 public:
-    /// The calling thread's place for the spline with that version, or null. It is the thread's own.
-    static KFSegmentPlace* placeOf(std::uint64_t version) noexcept {
-        KFSegmentPlace* places = _places;
-        if (places == nullptr) [[unlikely]] {
-            places = makePlaces();
-            if (places == nullptr)
-                return nullptr;
-        }
-        return places + KFStoreVersion::runOf(version) % kPlaces;
+    /// The calling thread's place for the spline with that version; null before `makePlaceOf`. It is the thread's own.
+    static KFSegmentPlace* placeOf(std::uint64_t version) noexcept { return placeIn(_places, version); }
+    /// The same for a thread that has none yet. Null where it can't have one.
+    static KFSegmentPlace* makePlaceOf(std::uint64_t version) noexcept {
+        return placeIn(makePlaces(), version);
     }
 
 private:
     struct Keeper;
 
+    static KFSegmentPlace* placeIn(KFSegmentPlace* places, std::uint64_t version) noexcept {
+        return places == nullptr ? nullptr : places + KFStoreVersion::runOf(version) % kPlaces;
+    }
     static KFSegmentPlace* makePlaces() noexcept;
 
     static constexpr std::uint64_t kPlaces = 16;
