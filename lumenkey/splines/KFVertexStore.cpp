@@ -27,17 +27,17 @@ std::size_t lowerBoundOf(Item const* data, std::size_t count, std::int64_t tick)
     return first + (count == 1 && tickOf(data[first]) < tick ? 1 : 0);
 }
 
-/// The same in a block whose first tick is before `tick` and behind which the next tick is `next`. Keypoints mostly
-/// stand at fairly even distances, so it looks first near where `tick` would stand if they all were equal (Peterson,
-/// "Addressing for Random-Access Storage", 1957), and in most blocks touches two or three lines of memory instead of
-/// six.
+/// The same in a block whose first tick, `first`, is before `tick` and behind which the next tick is `next`. Keypoints
+/// mostly stand at fairly even distances, so it looks first near where `tick` would stand if they all were equal
+/// (Peterson, "Addressing for Random-Access Storage", 1957), and in most blocks touches one or two lines of memory
+/// instead of six.
 std::size_t lowerBoundInBlock(std::vector<KFVertexEntry> const& entries, std::int64_t tick,
-                              std::int64_t next) noexcept {
+                              std::int64_t first, std::int64_t next) noexcept {
     constexpr std::size_t window = 8;
     constexpr std::size_t worthGuessing = 4 * window;
     KFVertexEntry const* const data = entries.data();
     std::size_t const count = entries.size();
-    double const start = static_cast<double>(data[0].tick);
+    double const start = static_cast<double>(first);
     double const span = static_cast<double>(next) - start;
     if (count >= worthGuessing && span > 0.0) {
         double const last = static_cast<double>(count - window);
@@ -94,7 +94,7 @@ KFVertexStore::Place KFVertexStore::lowerBoundTick(std::int64_t tick) const noex
         return begin();
     Block const& block = *_blocks[behind - 1];
     std::int64_t const next = behind < _firstTicks.size() ? _firstTicks[behind] : block.entries.back().tick;
-    std::size_t const slot = lowerBoundInBlock(block.entries, tick, next);
+    std::size_t const slot = lowerBoundInBlock(block.entries, tick, _firstTicks[behind - 1], next);
     if (slot == block.entries.size())
         return {static_cast<std::uint32_t>(behind), 0};
     return {static_cast<std::uint32_t>(behind - 1), static_cast<std::uint32_t>(slot)};
