@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <bit>
 #include <cmath>
+#include <concepts>
 #include <cstring>
 #include <new>
 #include <string_view>
@@ -29,7 +30,6 @@ constexpr Type typeOf(bool) { return Type::Bool; }
 constexpr Type typeOf(std::uint32_t) { return Type::UInt32; }
 constexpr Type typeOf(std::uint64_t) { return Type::UInt64; }
 constexpr Type typeOf(double) { return Type::Double; }
-constexpr Type typeOf(std::string_view) { return Type::String; }
 constexpr Type typeOf(BXUUID const&) { return Type::Uuid; }
 constexpr Type typeOf(Tempus const&) { return Type::Time; }
 
@@ -50,12 +50,7 @@ public:
         XXH3_128bits_reset(_state.get());
     }
 
-    void start(std::uint32_t tag) {
-        reserve();
-        put(static_cast<std::uint8_t>(Call::Start));
-        put(tag);
-        put(_scopes);
-    }
+    void start(std::uint32_t tag) { taken(putStart(room(), tag)); }
 
     void pushScope() { ++_scopes; }
     void popScope() {
@@ -64,17 +59,25 @@ public:
         }
     }
 
-    template <typename Value> void value(Value const& value) {
-        reserve();
-        putKind(Call::Value, typeOf(value));
-        putValue(value);
+    template <typename Value> void value(Value const& value) { taken(putTyped(room(), value)); }
+
+    /// An element that holds nothing but a value.
+    template <typename Value> void element(std::uint32_t tag, Value const& value) {
+        taken(putTyped(putStart(room(), tag), value));
     }
 
     template <typename Value> void attribute(std::uint32_t tag, Value const& value) {
-        reserve();
-        putKind(Call::Attribute, typeOf(value));
-        put(tag);
-        putValue(value);
+        taken(put(put(putKind(room(), Call::Attribute, typeOf(value)), tag), value));
+    }
+
+    void value(std::string_view text) {
+        taken(put(putKind(room(), Call::Value, Type::String), std::uint64_t{text.size()}));
+        append(text);
+    }
+
+    void attribute(std::uint32_t tag, std::string_view text) {
+        taken(put(put(putKind(room(), Call::Attribute, Type::String), tag), std::uint64_t{text.size()}));
+        append(text);
     }
 
     std::array<std::uint8_t, 16> hash() {
@@ -88,64 +91,77 @@ public:
 
 private:
     static constexpr std::size_t kBlock = 1024;
-    /// The longest call without the text of a string: an attribute that is a time.
-    static constexpr std::size_t kLongestCall = 1 + 4 + 24;
+    /// The longest that is put at once: an element that is a time.
+    static constexpr std::size_t kLongest = 1 + 4 + 4 + 1 + 24;
 
-    void reserve() {
-        if (kBlock - _used < kLongestCall) {
+    /// Where up to so many bytes may be put; `taken` tells where they end.
+    std::uint8_t* room() {
+        if (kBlock - _used < kLongest) {
             flush();
         }
+        return _block.data() + _used;
     }
+    void taken(std::uint8_t const* end) { _used = static_cast<std::size_t>(end - _block.data()); }
 
     void flush() {
         XXH3_128bits_update(_state.get(), _block.data(), _used);
         _used = 0;
     }
 
-    template <typename Number> void put(Number number) {
-        if constexpr (std::endian::native == std::endian::little) {
-            std::memcpy(_block.data() + _used, &number, sizeof(Number));
-        } else {
-            for (std::size_t i = 0; i < sizeof(Number); ++i) {
-                _block[_used + i] = static_cast<std::uint8_t>(number >> (8 * i));
-            }
-        }
-        _used += sizeof(Number);
-    }
-
-    void putKind(Call call, Type type) {
-        put(static_cast<std::uint8_t>(static_cast<unsigned>(call) + static_cast<unsigned>(type)));
-    }
-
-    void putValue(bool value) { put(static_cast<std::uint8_t>(value)); }
-    void putValue(std::uint32_t value) { put(value); }
-    void putValue(std::uint64_t value) { put(value); }
-    void putValue(double value) {
-        constexpr std::uint64_t kAnyNaN = 0x7FF8000000000000;
-        put(std::isnan(value) ? kAnyNaN : std::bit_cast<std::uint64_t>(value));
-    }
-    void putValue(BXUUID const& value) {
-        for (std::uint32_t const word : value.words) {
-            put(word);
-        }
-    }
-    void putValue(Tempus const& value) {
-        put(static_cast<std::uint64_t>(value.value));
-        put(static_cast<std::uint32_t>(value.timescale));
-        put(value.flags);
-        put(static_cast<std::uint64_t>(value.epoch));
-    }
-    void putValue(std::string_view value) {
-        put(std::uint64_t{value.size()});
-        if (value.size() > kBlock - _used) {
+    void append(std::string_view text) {
+        if (text.size() > kBlock - _used) {
             flush();
         }
-        if (value.size() > kBlock) {
-            XXH3_128bits_update(_state.get(), value.data(), value.size());
+        if (text.size() > kBlock) {
+            XXH3_128bits_update(_state.get(), text.data(), text.size());
         } else {
-            std::memcpy(_block.data() + _used, value.data(), value.size());
-            _used += value.size();
+            std::memcpy(_block.data() + _used, text.data(), text.size());
+            _used += text.size();
         }
+    }
+
+    std::uint8_t* putStart(std::uint8_t* at, std::uint32_t tag) const {
+        return put(put(put(at, static_cast<std::uint8_t>(Call::Start)), tag), _scopes);
+    }
+
+    template <typename Value> static std::uint8_t* putTyped(std::uint8_t* at, Value const& value) {
+        return put(putKind(at, Call::Value, typeOf(value)), value);
+    }
+
+    static std::uint8_t* putKind(std::uint8_t* at, Call call, Type type) {
+        return put(at, static_cast<std::uint8_t>(static_cast<unsigned>(call) + static_cast<unsigned>(type)));
+    }
+
+    // Each gives the place behind.
+
+    template <std::unsigned_integral Number> static std::uint8_t* put(std::uint8_t* at, Number number) {
+        if constexpr (std::endian::native == std::endian::little) {
+            std::memcpy(at, &number, sizeof(Number));
+        } else {
+            for (std::size_t i = 0; i < sizeof(Number); ++i) {
+                at[i] = static_cast<std::uint8_t>(number >> (8 * i));
+            }
+        }
+        return at + sizeof(Number);
+    }
+    static std::uint8_t* put(std::uint8_t* at, bool value) {
+        return put(at, static_cast<std::uint8_t>(value));
+    }
+    static std::uint8_t* put(std::uint8_t* at, double value) {
+        constexpr std::uint64_t kAnyNaN = 0x7FF8000000000000;
+        return put(at, std::isnan(value) ? kAnyNaN : std::bit_cast<std::uint64_t>(value));
+    }
+    static std::uint8_t* put(std::uint8_t* at, BXUUID const& value) {
+        for (std::uint32_t const word : value.words) {
+            at = put(at, word);
+        }
+        return at;
+    }
+    static std::uint8_t* put(std::uint8_t* at, Tempus const& value) {
+        at = put(at, static_cast<std::uint64_t>(value.value));
+        at = put(at, static_cast<std::uint32_t>(value.timescale));
+        at = put(at, value.flags);
+        return put(at, static_cast<std::uint64_t>(value.epoch));
     }
 
     std::unique_ptr<XXH3_state_t, FreeState> _state;
@@ -190,12 +206,5 @@ void BXHashWriteStream::writeAttribute(std::uint32_t tag, Tempus const& value) {
 void BXHashWriteStream::endLine() {}
 bool BXHashWriteStream::isHashStream() const { return true; }
 
-void BXHashWriteStream::writeElement(std::uint32_t tag, double value) {
-    _digest->start(tag);
-    _digest->value(value);
-}
-
-void BXHashWriteStream::writeElement(std::uint32_t tag, Tempus const& value) {
-    _digest->start(tag);
-    _digest->value(value);
-}
+void BXHashWriteStream::writeElement(std::uint32_t tag, double value) { _digest->element(tag, value); }
+void BXHashWriteStream::writeElement(std::uint32_t tag, Tempus const& value) { _digest->element(tag, value); }
