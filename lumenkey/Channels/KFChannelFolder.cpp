@@ -3,6 +3,7 @@
 #include "lumenkey/Channels/KFChannelFolder.h"
 
 #include "lumenkey/Channels/KFChannelFactories.h"
+#include "lumenkey/Channels/KFChildIndex.h"
 
 #include <algorithm>
 
@@ -137,9 +138,9 @@ void KFChannelFolder::removeDescendant(KFChannelBase* child) {
         return;
     }
     auto const behind = _descendants->begin() + static_cast<std::ptrdiff_t>(position);
-    auto const entry = _index->find(child->getID());
-    if (!hasTold || entry == _index->end() ||
-        (entry->second.count > 1 && std::find(behind, _descendants->end(), child) != _descendants->end())) {
+    KFChildIndexEntry const* const entry = _index->find(child->getID());
+    if (!hasTold || entry == nullptr ||
+        (entry->count > 1 && std::find(behind, _descendants->end(), child) != _descendants->end())) {
         _index.reset(); // the last case: it has a second entry and now no parent to tell
     } else {
         leaveIndex(child, child->getID(), 1, position);
@@ -160,8 +161,8 @@ void KFChannelFolder::removeAllDescendants(bool detach) {
 
 KFChannelBase* KFChannelFolder::getDescendant(unsigned int id) const {
     if (_index) {
-        auto const found = _index->find(id);
-        return found != _index->end() ? found->second.first : nullptr;
+        KFChildIndexEntry const* const found = _index->find(id);
+        return found != nullptr ? found->first : nullptr;
     }
     if (_descendants) {
         for (KFChannelBase* const child : *_descendants) {
@@ -181,20 +182,20 @@ bool KFChannelFolder::comesFirst(KFChannelBase const* child, KFChannelBase const
 }
 
 void KFChannelFolder::buildIndex() {
-    auto index = std::make_unique<Index>();
+    auto index = std::make_unique<KFChildIndex>();
     index->reserve(_descendants->size());
     for (KFChannelBase* const child : *_descendants) {
         if (child->getParent() != this) {
             return; // left over from a child listed twice; nobody would tell of its new ID
         }
-        ++index->try_emplace(child->getID(), IndexEntry{child, 0}).first->second.count;
+        ++index->insert({child, child->getID(), 0}).count;
     }
     _index = std::move(index);
 }
 
 /// For a child that stands at `position` already.
 void KFChannelFolder::enterIndex(KFChannelBase* child, std::size_t position) {
-    IndexEntry& entry = _index->try_emplace(child->getID(), IndexEntry{child, 0}).first->second;
+    KFChildIndexEntry& entry = _index->insert({child, child->getID(), 0});
     ++entry.count;
     bool const isLast = position + 1 == _descendants->size();
     if (entry.first != child && !isLast && comesFirst(child, entry.first)) {
@@ -203,12 +204,11 @@ void KFChannelFolder::enterIndex(KFChannelBase* child, std::size_t position) {
 }
 
 /// For `count` entries of a child that had the ID, and stood at `oldPosition` at first.
-void KFChannelFolder::leaveIndex(KFChannelBase const* child, unsigned int id, std::size_t count,
+void KFChannelFolder::leaveIndex(KFChannelBase const* child, unsigned int id, unsigned int count,
                                  std::size_t oldPosition) {
-    auto const found = _index->find(id);
-    IndexEntry& entry = found->second;
+    KFChildIndexEntry& entry = *_index->find(id);
     if (entry.count <= count) {
-        _index->erase(found);
+        _index->erase(&entry);
         return;
     }
     entry.count -= count;
@@ -217,7 +217,7 @@ void KFChannelFolder::leaveIndex(KFChannelBase const* child, unsigned int id, st
         auto const next = std::find_if(behind, _descendants->end(),
                                        [id](KFChannelBase const* each) { return each->getID() == id; });
         if (next == _descendants->end()) {
-            _index->erase(found);
+            _index->erase(&entry);
         } else {
             entry.first = *next;
         }
@@ -228,22 +228,22 @@ void KFChannelFolder::descendantIDChanged(KFChannelBase* child, unsigned int old
     if (!_index || child == nullptr) {
         return;
     }
-    auto const old = _index->find(oldID);
-    if (old == _index->end()) {
+    KFChildIndexEntry const* const old = _index->find(oldID);
+    if (old == nullptr) {
         return; // not listed any more
     }
-    bool const isOnlyOne = old->second.count == 1;
-    auto const entries = isOnlyOne ? old->second.first == child
-                                   : std::count(_descendants->begin(), _descendants->end(), child);
+    bool const isOnlyOne = old->count == 1;
+    auto const entries =
+        isOnlyOne ? old->first == child : std::count(_descendants->begin(), _descendants->end(), child);
     if (entries == 0) {
         return;
     }
-    auto const count = static_cast<std::size_t>(entries);
+    auto const count = static_cast<unsigned int>(entries);
     leaveIndex(child, oldID, count, isOnlyOne ? 0 : positionOf(child));
-    auto const [entry, isNew] = _index->try_emplace(child->getID(), IndexEntry{child, 0});
-    entry->second.count += count;
-    if (!isNew && comesFirst(child, entry->second.first)) {
-        entry->second.first = child;
+    KFChildIndexEntry& entry = _index->insert({child, child->getID(), 0});
+    entry.count += count;
+    if (entry.first != child && comesFirst(child, entry.first)) {
+        entry.first = child;
     }
 }
 

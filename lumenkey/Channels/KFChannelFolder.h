@@ -4,7 +4,8 @@
 
 #include <cstddef>
 #include <memory>
-#include <unordered_map>
+
+class KFChildIndex;
 
 /// An inner node of the tree: an ordered list of children, for which it answers together and to which it
 /// passes most operations on.
@@ -178,12 +179,6 @@ protected:
     void storeFoldFlags(std::uint32_t flags) noexcept { _foldFlags = flags; }
 
 private:
-    struct IndexEntry {
-        KFChannelBase* first;
-        std::size_t count; // of entries in the list with this ID
-    };
-    using Index = std::unordered_map<unsigned int, IndexEntry>;
-
     KFChannelBase* childForElement(BXStreamElement const& element);
     void parseChild(BXSerializerReadStream& stream, BXStreamElement& element);
     void insertAt(std::size_t position, KFChannelBase* child);
@@ -194,13 +189,13 @@ private:
     bool comesFirst(KFChannelBase const* child, KFChannelBase const* other) const noexcept;
     void buildIndex();
     void enterIndex(KFChannelBase* child, std::size_t position);
-    void leaveIndex(KFChannelBase const* child, unsigned int id, std::size_t count, std::size_t oldPosition);
+    void leaveIndex(KFChannelBase const* child, unsigned int id, unsigned int count, std::size_t oldPosition);
     /// The other's children, if it is a folder with as many as this one; null else, and for folders without a
     /// list.
     std::vector<KFChannelBase*> const* matchingList(KFChannelBase const& other) const noexcept;
 
     std::unique_ptr<std::vector<KFChannelBase*>> _descendants;
-    std::unique_ptr<Index> _index; // the first child of each ID, once there are many children
+    std::unique_ptr<KFChildIndex> _index; // the first child of each ID, once there are many children
     std::uint32_t _foldFlags = 0;
     std::uint32_t _defaultFoldFlags = 0;
 };

@@ -1,26 +1,36 @@
 // Internal: not installed.
 #pragma once
 
+#include "lumenkey/foundation/BXProbingTable.h"
+
 #include <cstddef>
 #include <cstdint>
-#include <vector>
 
-/// A set of pointers that are compared and never followed: which handles are alive. Open addressing with linear
-/// probing and deletion by shifting back (Knuth, "The Art of Computer Programming", volume 3, 6.4, algorithm R).
+/// A set of pointers that are compared and never followed: which handles are alive.
 class KFHandleSet {
 public:
-    void reserve(std::size_t count);
-    void insert(void const* handle);
-    void erase(void const* handle) noexcept;
-    bool contains(void const* handle) const noexcept;
-    std::size_t bytes() const noexcept { return sizeof(*this) + _slots.capacity() * sizeof(void const*); }
+    void reserve(std::size_t count) { _handles.reserve(count); }
+    /// `handle` isn't null.
+    void insert(void const* handle) { _handles.insert({handle}); }
+    void erase(void const* handle) noexcept {
+        if (Handle const* const entry = _handles.find(handle))
+            _handles.erase(entry);
+    }
+    bool contains(void const* handle) const noexcept { return _handles.find(handle) != nullptr; }
+    std::size_t bytes() const noexcept { return sizeof(*this) + _handles.bytes(); }
 
 private:
-    std::size_t home(void const* handle) const noexcept;
-    std::size_t slotOf(void const* handle) const noexcept;
-    void rehash(std::size_t slots);
+    struct Handle {
+        using Key = void const*;
 
-    /// A power of two of slots, at most three quarters of them in use; null is free.
-    std::vector<void const*> _slots;
-    std::size_t _count = 0;
+        static std::uint64_t bits(Key handle) noexcept {
+            return static_cast<std::uint64_t>(reinterpret_cast<std::uintptr_t>(handle));
+        }
+        Key key() const noexcept { return handle; }
+        bool isFree() const noexcept { return handle == nullptr; }
+
+        void const* handle = nullptr;
+    };
+
+    BXProbingTable<Handle> _handles;
 };
