@@ -2,35 +2,30 @@
 
 #include <mutex>
 #include <thread>
-#include <vector>
 
 #include <gtest/gtest.h>
+
+#include "tests/support/AtOnce.h"
 
 TEST(BXSpinLock, ThreadsExcludeEachOther) {
     BXSpinLock lock;
     constexpr int turns = 100000;
     // A plain variable: the thread sanitizer must see the lock as what orders them.
     long count = 0;
-    std::vector<std::thread> threads;
-    for (int thread = 0; thread < 4; ++thread) {
-        threads.emplace_back([&, thread] {
-            for (int i = 0; i < turns; ++i) {
-                if (thread == 0) {
-                    while (!lock.tryLock()) {
-                        std::this_thread::yield();
-                    }
-                    ++count;
-                    lock.unlock();
-                } else {
-                    BXLockSentry const sentry(lock);
-                    ++count;
+    atOnce(4, [&](int thread) {
+        for (int i = 0; i < turns; ++i) {
+            if (thread == 0) {
+                while (!lock.tryLock()) {
+                    std::this_thread::yield();
                 }
+                ++count;
+                lock.unlock();
+            } else {
+                BXLockSentry const sentry(lock);
+                ++count;
             }
-        });
-    }
-    for (std::thread& thread : threads) {
-        thread.join();
-    }
+        }
+    });
     EXPECT_EQ(count, 4L * turns);
 }
 

@@ -3,10 +3,11 @@
 #include <atomic>
 #include <cstdlib>
 #include <iostream>
-#include <thread>
 #include <vector>
 
 #include <gtest/gtest.h>
+
+#include "tests/support/AtOnce.h"
 
 namespace {
 
@@ -51,13 +52,7 @@ TEST(BXSingletonDeathTest, TearsDownByRank) {
 
 TEST(BXSingleton, ThreadsShareOneInstance) {
     std::vector<BXSingleton*> seen(4);
-    std::vector<std::thread> threads;
-    for (BXSingleton*& place : seen) {
-        threads.emplace_back([&place] { place = &BXSingletonInstance<Counted>(); });
-    }
-    for (std::thread& thread : threads) {
-        thread.join();
-    }
+    atOnce(4, [&seen](int i) { seen[static_cast<std::size_t>(i)] = &BXSingletonInstance<Counted>(); });
     EXPECT_EQ(Counted::made, 1);
     EXPECT_EQ(seen, std::vector<BXSingleton*>(4, &BXSingletonInstance<Counted>()));
 }

@@ -3,11 +3,11 @@
 #include "lumenkey/Channels/KFChannel.h"
 #include "lumenkey/curves/KFCurve.h"
 #include "tests/persistence/RandomTree.h"
+#include "tests/support/AtOnce.h"
 
 #include <gtest/gtest.h>
 
 #include <cstdlib>
-#include <thread>
 
 namespace {
 
@@ -64,13 +64,8 @@ TEST(RoundTrip, GivesTheSameBytesInPlace) {
 }
 
 TEST(RoundTripThreads, SaveAndLoadDifferentTreesAtOnce) {
-    std::vector<std::thread> threads;
-    for (std::uint64_t worker = 0; worker < 8; ++worker) {
-        threads.emplace_back([worker] {
-            for (std::uint64_t i = 0; i < 10; ++i)
-                comesBack(1000 + worker * 10 + i);
-        });
-    }
-    for (std::thread& thread : threads)
-        thread.join();
+    atOnce(8, [](int worker) {
+        for (int i = 0; i < 10; ++i)
+            comesBack(static_cast<std::uint64_t>(1000 + worker * 10 + i));
+    });
 }

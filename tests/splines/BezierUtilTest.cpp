@@ -2,6 +2,7 @@
 
 #include "lumenkey/splines/KFBezierUtil.h"
 #include "lumenkey/splines/KFCubic.h"
+#include "tests/splines/SlowCurve.h"
 
 #include <gtest/gtest.h>
 
@@ -14,15 +15,6 @@ namespace {
 
 using Polygon = std::array<double, 4>;
 
-long double casteljau(Polygon const& p, long double t) {
-    long double level[4] = {p[0], p[1], p[2], p[3]};
-    for (int n = 3; n > 0; --n) {
-        for (int i = 0; i < n; ++i)
-            level[i] = (1.0L - t) * level[i] + t * level[i + 1];
-    }
-    return level[0];
-}
-
 /// Control values of (t - r0) (t - r1) (t - r2).
 Polygon withRoots(double r0, double r1, double r2) {
     double const c0 = -r0 * r1 * r2;
@@ -34,7 +26,7 @@ Polygon withRoots(double r0, double r1, double r2) {
 bool isMonotonic(Polygon const& p) {
     long double highest = -1e30L;
     for (int i = 0; i <= 4000; ++i) {
-        long double const u = casteljau(p, i / 4000.0L);
+        long double const u = casteljau(p.data(), i / 4000.0L);
         if (u < highest - 1e-13L)
             return false;
         highest = std::max(highest, u);
@@ -107,7 +99,8 @@ TEST(KFBezierUtil, InvertsRisingPolygonsAlikeByBothWays) {
             ASSERT_NEAR(inverse(value), found, 1e-12) << p[1] << " " << p[2] << " " << value;
             // Near a vertical tangent a value says little of its parameter, so U is compared there.
             double const tolerance = i % 2 == 0 ? 1e-13 : 1e-7;
-            ASSERT_NEAR(static_cast<double>(casteljau(p, found)), value, tolerance) << p[1] << " " << p[2];
+            ASSERT_NEAR(static_cast<double>(casteljau(p.data(), found)), value, tolerance)
+                << p[1] << " " << p[2];
         }
     }
 }

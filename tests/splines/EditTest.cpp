@@ -1,4 +1,3 @@
-#include "lumenkey/splines/KFSplineOwner.h"
 #include "tests/splines/SlowSpline.h"
 #include "tests/splines/museum.h"
 
@@ -13,12 +12,8 @@
 
 namespace {
 
-class LockOwner : public KFSplineOwner {
-public:
+struct LockOwner : TestOwner {
     LockOwner() { _customLock = &lock; }
-    double getInitialValue() const override { return 0.0; }
-    Tempus getFrameDuration() const override { return TempusMake(1, 25); }
-
     bool lockIsFree() {
         bool const isFree = lock.tryLock();
         if (isFree) {
@@ -177,8 +172,7 @@ void Twins::mark() {
     case 3: // slopes that no derivation gave
         key.setIn(-0.5, 2.0);
         key.setOut(0.25, -1.0);
-        vertex.setInputTangents(-0.5, 2.0, kTempusZero);
-        vertex.setOutputTangents(0.25, -1.0, kTempusZero);
+        setSides(vertex, {-0.5, 2.0, 0.25, -1.0});
         break;
     default:
         key.enabled = !key.enabled;
@@ -197,19 +191,15 @@ void Twins::expectAgreement() {
         ASSERT_TRUE(_handles.count(&key) == 0 || _handles[&key] == &vertex)
             << "another vertex at index " << i;
         handles[&key] = &vertex;
-        double in[2];
-        double out[2];
-        vertex.getInputTangents(&in[0], &in[1], kTempusZero);
-        vertex.getOutputTangents(&out[0], &out[1], kTempusZero);
+        Sides const sides{key.in[0], key.in[1], key.out[0], key.out[1]};
         ASSERT_EQ(TempusCompare(key.u, vertex.getValueU()), 0) << i;
         ASSERT_TRUE(agree(key.v, vertex.getValueV(kTempusZero))) << i;
         ASSERT_EQ(key.type, vertex.getInterpolation()) << i;
         ASSERT_EQ(key.flags, vertex.getFlags()) << i;
         ASSERT_EQ(key.enabled, vertex.isEnabled(kTempusZero)) << i;
-        ASSERT_TRUE(agree(key.in[0], in[0]) && agree(key.in[1], in[1]))
-            << i << ": input " << key.in[0] << " " << key.in[1] << ", not " << in[0] << " " << in[1];
-        ASSERT_TRUE(agree(key.out[0], out[0]) && agree(key.out[1], out[1]))
-            << i << ": output " << key.out[0] << " " << key.out[1] << ", not " << out[0] << " " << out[1];
+        for (std::size_t side = 0; side < 4; ++side) {
+            ASSERT_TRUE(agree(sides[side], sidesOf(vertex)[side])) << i << ", " << side;
+        }
     }
     _handles = handles;
     ASSERT_EQ(_answer == nullptr, _expected == nullptr);

@@ -1,4 +1,3 @@
-#include "lumenkey/splines/KFSplineOwner.h"
 #include "tests/splines/museum.h"
 
 #include <gtest/gtest.h>
@@ -9,12 +8,6 @@
 #include <random>
 
 namespace {
-
-struct Owner : KFSplineOwner {
-    double getInitialValue() const override { return 7.0; }
-    Tempus getFrameDuration() const override { return frame; }
-    Tempus frame = TempusMake(1, 32);
-};
 
 /// Positions of keys are in units of 1/128 s, so that doubles hold them exactly.
 struct Key {
@@ -135,15 +128,16 @@ struct Model {
 };
 
 struct Curve : MuseumSpline {
-    Owner owner;
+    TestOwner owner;
 
     explicit Curve(Keys const& keys = {}) {
+        owner.initialValue = 7.0;
+        owner.frame = TempusMake(1, 32);
         spline->setNode(&owner);
         for (Key const& key : keys) {
-            void* const handle = spline->appendVertexNoTangents(TempusMake(key.u, 128), key.v, kTempusZero);
-            spline->setVertexInterpolation(handle, key.isConstant ? 0 : 1);
+            KFVertex* const vertex = append(TempusMake(key.u, 128), key.v, key.isConstant ? 0 : 1);
             if (!key.isEnabled) {
-                spline->disableVertex(handle, kTempusZero);
+                spline->disableVertex(vertex, kTempusZero);
             }
         }
     }
@@ -187,8 +181,8 @@ TEST(KFSplineExtrapolate, FollowsTheRulesOnBothSidesOfEveryCurve) {
 
 TEST(KFSplineExtrapolate, CountsCyclesExactlyHoweverFarAway) {
     Curve curve;
-    curve->appendVertexNoTangents(TempusMake(1, 30), 1.0, kTempusZero);
-    curve->appendVertexNoTangents(TempusMake(8, 30), 8.0, kTempusZero);
+    curve.append(TempusMake(1, 30), 1.0);
+    curve.append(TempusMake(8, 30), 8.0);
     // 7/30 s a cycle: as doubles, positions so far out are coarser than a frame.
     for (std::int64_t const cycles : {std::int64_t{1} << 40, (std::int64_t{1} << 58) + 1}) {
         for (std::uint32_t const mode : {2u, 3u}) {
@@ -231,23 +225,6 @@ TEST(KFSplineExtrapolate, ComesToAnEndWhereverItIsAsked) {
 
 // --- Continuation as vertices ---
 
-/// A curve of every kind of segment, with tangents that are unlike on the two sides of each vertex.
-void fillAtRandom(Curve& curve, std::uint32_t seed, std::vector<std::uint32_t> const& types) {
-    std::mt19937 random(seed);
-    auto const number = [&random](int low, int high) {
-        return low + static_cast<int>(random() % static_cast<unsigned>(high - low + 1));
-    };
-    int u = number(-50, 50);
-    for (int i = number(2, 6); i > 0; --i) {
-        void* const handle = curve->appendVertexNoTangents(TempusMake(u, 30), number(-9, 9), kTempusZero);
-        auto* const vertex = static_cast<KFVertex*>(handle);
-        vertex->setInterpolation(types[random() % types.size()]);
-        vertex->setInputTangents(-number(0, 9) / 100.0, number(-9, 9) / 30.0, kTempusZero);
-        vertex->setOutputTangents(number(0, 9) / 100.0, number(-9, 9) / 30.0, kTempusZero);
-        u += number(10, 40);
-    }
-}
-
 TEST(KFSplineGenerateExtrapolatedVertices, DrawTheCurveThatWasExtrapolated) {
     constexpr int cycles = 3;
     constexpr int samples = 240;
@@ -259,7 +236,9 @@ TEST(KFSplineGenerateExtrapolatedVertices, DrawTheCurveThatWasExtrapolated) {
         // Only types that look alike from both directions can run backwards. What is written holds what was read,
         // so jumps inside a segment must not fall on a rounded position.
         using Types = std::vector<std::uint32_t>;
-        fillAtRandom(curve, seed, mode == 2 ? Types{1, 4} : Types{0, 1, 4, 7, 15});
+        std::mt19937 random(seed);
+        curve.appendAtRandom(random, 2 + static_cast<int>(random() % 5),
+                             mode == 2 ? Types{1, 4} : Types{0, 1, 4, 7, 15});
         curve.setModes(mode, mode);
         auto const vertices = museumVertices(*curve);
         KFVertex& beforeLast = *vertices[vertices.size() - 2];

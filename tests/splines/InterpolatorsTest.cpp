@@ -8,11 +8,8 @@
 #include <gtest/gtest.h>
 
 #include <cmath>
-#include <limits>
 
 namespace {
-
-constexpr std::uint32_t kBasicTypes[] = {0, 1, 7, 8, 13, 14, 15, 16, 17, 18, 19, 20, 21};
 
 /// One segment, of a spline that leaves tangents alone.
 struct Segment {
@@ -60,16 +57,6 @@ TEST(BasicInterpolators, ExponentialStaysSoundWhereItsGrowthVanishesOrOverflows)
     EXPECT_GT(far.value(TempusMake(999, 1000)), 1e307);
 }
 
-TEST(BasicInterpolators, TheClosingSegmentIsShort) {
-    Tempus const start = TempusMake(9, 1);
-    Tempus const u = start + TempusMake(1, 400);
-    for (std::uint32_t type : kBasicTypes) {
-        Segment closing(type, start, 2.0, TempusMake(1, 1), 7.0);
-        Segment open(type, start, 2.0, start + TempusMake(1, 100), 7.0);
-        EXPECT_EQ(closing.value(u), open.value(u)) << type;
-    }
-}
-
 TEST(BasicInterpolators, ASegmentOfNoLengthIsItsStart) {
     Tempus const u = TempusMake(7, 2);
     for (std::uint32_t type : {0u, 1u, 4u, 6u, 7u, 8u, 13u, 14u, 15u, 16u, 17u, 18u, 19u, 20u, 21u}) {
@@ -85,28 +72,6 @@ TEST(BasicInterpolators, ASegmentOfNoLengthIsItsStart) {
     }
     EXPECT_EQ(Segment(1, u, 2.0, u, 7.0).slope(u), 0.0);
     EXPECT_TRUE(Segment(13, u, 2.0, u, 7.0).positionsOf(2.0).empty());
-}
-
-TEST(BasicInterpolators, FindTheirValuesAgain) {
-    Tempus const u1 = TempusMake(1, 3);
-    Tempus const u2 = TempusMake(17, 5);
-    Tempus const span = u2 - u1;
-    for (auto const& [a, b] : {std::pair{2.0, 9.0}, std::pair{4.0, -1.5}}) {
-        for (std::uint32_t type : {1u, 7u, 8u, 14u, 18u}) {
-            Segment segment(type, u1, a, u2, b);
-            for (int i = 0; i <= 20; ++i) {
-                Tempus const u = u1 + span * TempusMake(i, 20);
-                std::vector<Tempus> const found =
-                    segment.positionsOf(segment.spline.getVertexValue(u, kTempusZero, false));
-                ASSERT_EQ(found.size(), 1u) << type << " " << i;
-                // EaseIn starts and EaseOut ends flat, where a value says little of its position.
-                EXPECT_NEAR(TempusRatio(found[0] - u1, span), i / 20.0, 1e-7) << type << " " << i;
-            }
-            for (double outside : {10.0, -2.0, std::numeric_limits<double>::quiet_NaN()}) {
-                EXPECT_TRUE(segment.positionsOf(outside).empty()) << type << " " << outside;
-            }
-        }
-    }
 }
 
 TEST(BasicInterpolators, ExponentialFindsPositionsButForTheStartOfItsGrowth) {
@@ -139,26 +104,27 @@ TEST(BasicInterpolators, FlatSegmentsHaveTheirValueAtTheStart) {
     }
 }
 
-TEST(BasicInterpolators, GiveTheExtremesBetweenTwoPositions) {
-    double min = 0.0;
-    double max = 0.0;
-    Tempus const early = TempusMake(-5, 1);
-    Tempus const late = TempusMake(50, 1);
-    Segment linear(1, TempusMake(1, 1), 8.0, TempusMake(3, 1), -2.0);
-    auto& linearStrategy = dynamic_cast<KFLinearInterpolator&>(linear.strategy());
-    linearStrategy.getMinMaxValues(linear.spline, linear.a, linear.b, TempusMake(3, 2), TempusMake(2, 1),
-                                   &min, &max);
-    EXPECT_EQ(min, 3.0);
-    EXPECT_EQ(max, 5.5);
-    linearStrategy.getMinMaxValues(linear.spline, linear.a, linear.b, early, late, &min, &max);
-    EXPECT_EQ(min, -2.0);
-    EXPECT_EQ(max, 8.0);
+namespace {
 
+template <class Strategy>
+std::pair<double, double> extremes(Segment& segment, Tempus const& low, Tempus const& high) {
+    double min = 0.0, max = 0.0;
+    auto& strategy = dynamic_cast<Strategy&>(segment.strategy());
+    strategy.getMinMaxValues(segment.spline, segment.a, segment.b, low, high, &min, &max);
+    return {min, max};
+}
+
+} // namespace
+
+TEST(BasicInterpolators, GiveTheExtremesBetweenTwoPositions) {
+    Tempus const early = TempusMake(-5, 1), middle = TempusMake(2, 1), late = TempusMake(50, 1);
+    Segment linear(1, TempusMake(1, 1), 8.0, TempusMake(3, 1), -2.0);
+    EXPECT_EQ(extremes<KFLinearInterpolator>(linear, TempusMake(3, 2), middle), std::pair(3.0, 5.5));
+    EXPECT_EQ(extremes<KFLinearInterpolator>(linear, early, late), std::pair(-2.0, 8.0));
     Segment growing(14, TempusMake(1, 1), 8.0, TempusMake(3, 1), -2.0);
-    auto& monotonic = dynamic_cast<KFMonotonicInterpolator&>(growing.strategy());
-    monotonic.getMinMaxValues(growing.spline, growing.a, growing.b, early, TempusMake(2, 1), &min, &max);
-    EXPECT_EQ(min, growing.value(TempusMake(2, 1)));
-    EXPECT_EQ(max, 8.0);
+    double const value = growing.value(middle);
+    EXPECT_EQ(extremes<KFMonotonicInterpolator>(growing, early, middle), std::pair(value, 8.0));
+    EXPECT_EQ(extremes<KFMonotonicInterpolator>(growing, middle, late), std::pair(-2.0, value));
 }
 
 TEST(BasicInterpolators, SubdivideOnTheCurve) {

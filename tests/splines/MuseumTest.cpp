@@ -1,8 +1,6 @@
 // Properties of evaluation over the whole museum.
 
 #include "tests/splines/museum.h"
-#include "lumenkey/splines/KFBezierUtil.h"
-#include "lumenkey/splines/KFSplineInterpolator.h"
 #include "tests/splines/SlowCurve.h"
 
 #include <gtest/gtest.h>
@@ -108,58 +106,6 @@ TEST(Museum, DrawsOtherSegmentsByTheirFormulas) {
         }
     });
     EXPECT_GT(compared, 1000u);
-}
-
-// Whatever is drawn between two vertices begins at the one and ends at the other.
-TEST(Museum, SegmentsMeetTheirVertices) {
-    overMuseum([](MuseumSpline& curve) {
-        double greatest = 0.0;
-        for (KFVertex const* const vertex : museumVertices(*curve))
-            greatest = std::max(greatest, std::fabs(vertex->getValueV(kTempusZero)));
-        for (auto const& [a, b] : segmentsOf(*curve)) {
-            std::uint32_t const type = a->getInterpolation();
-            // A cubic of less than 1e-5 s is drawn as if it had that, and handles may be as large as the
-            // others' values.
-            bool const isShort = TempusSecondsBetween(a->getValueU(), b->getValueU()) <= 1e-5;
-            if (isWholeCurveType(type) || (isCubicType(type) && isShort)) {
-                continue;
-            }
-            double const tolerance = isCubicType(type) ? 1e-14 * greatest : longShapeTolerance(*a, *b);
-            KFInterpolator& strategy = *curve->getInterpolator(type);
-            for (KFVertex* const end : {a, b}) {
-                double const value = strategy.interpolate(*curve, kTempusZero, a, b, end->getValueU(),
-                                                          curve.state->parametric, false);
-                double const expected = (type == 0 ? a : end)->getValueV(kTempusZero);
-                ASSERT_NEAR(value, expected, tolerance) << museumText(end->getValueU()) << ", type " << type;
-            }
-        }
-    });
-}
-
-TEST(Museum, SolvesForTheParameterAsTheRootsDo) {
-    overMuseum([](MuseumSpline& curve) {
-        auto const positions = museumPositions(*curve);
-        for (auto const& [a, b] : segmentsOf(*curve)) {
-            if (!isCubicType(a->getInterpolation()) || curve.state->parametric) {
-                continue;
-            }
-            auto& strategy =
-                dynamic_cast<KFBezierInterpolator&>(*curve->getInterpolator(a->getInterpolation()));
-            Tempus from, to;
-            double polygonU[4];
-            double polygonV[4];
-            strategy.getControlPoints(*curve, a, b, kTempusZero, from, to, polygonU, polygonV);
-            double size = 0.0;
-            for (double const v : polygonV)
-                size = std::max(size, std::fabs(v));
-            auto const begin = std::upper_bound(positions.begin(), positions.end(), from);
-            auto const end = std::lower_bound(positions.begin(), positions.end(), to);
-            for (auto u = begin; u < end && TempusSecondsBetween(from, to) > 1e-5; ++u) {
-                double const parameter = KFBezierFindParameter(polygonU, TempusFraction(*u, from, to));
-                ASSERT_NEAR(curve.at(*u), KFBezierEval(polygonV, parameter), 1e-11 * size) << museumText(*u);
-            }
-        }
-    });
 }
 
 TEST(Museum, CopiesReadAsTheirOriginal) {

@@ -1,6 +1,5 @@
 // Rows of samples beyond what the museum compares, the search for a value, and intervals set off on a curve.
 
-#include "lumenkey/splines/KFSplineOwner.h"
 #include "tests/splines/museum.h"
 
 #include <gtest/gtest.h>
@@ -24,21 +23,14 @@ struct Curve : MuseumSpline {
     int number(int low, int high) {
         return low + static_cast<int>(random() % static_cast<unsigned>(high - low + 1));
     }
-    KFVertex* append(Tempus const& u, double value, std::uint32_t type) {
-        auto* const vertex = static_cast<KFVertex*>(spline->appendVertexNoTangents(u, value, kTempusZero));
-        spline->setVertexInterpolation(vertex, type);
-        return vertex;
-    }
     void fill(std::vector<std::uint32_t> const& types, int count, bool mayShare) {
         int u = number(-60, 60);
         for (int i = 0; i < count; ++i) {
             KFVertex* const vertex = append(s(u, 60), number(-9, 9), types[random() % types.size()]);
             if (number(0, 2) > 0) {
                 double const size = number(0, 3) == 0 ? 1e-4 : 1.0; // almost flat is curved too
-                vertex->setInputTangents(-number(0, 9) * size / 100.0, number(-9, 9) * size / 30.0,
-                                         kTempusZero);
-                vertex->setOutputTangents(number(0, 9) * size / 100.0, number(-9, 9) * size / 30.0,
-                                          kTempusZero);
+                setSides(*vertex, {-number(0, 9) * size / 100.0, number(-9, 9) * size / 30.0,
+                                   number(0, 9) * size / 100.0, number(-9, 9) * size / 30.0});
             }
             u += mayShare && number(0, 4) == 0 ? 0 : number(1, 50);
             if (number(0, 4) == 0) {
@@ -112,12 +104,11 @@ struct LiteralWalk {
             return curve.state->postExtrapolation < 2;
         }
         if (start->getInterpolation() == 4 && into != Into::Vectors) {
-            double numbers[4];
-            next->getInputTangents(&numbers[0], &numbers[1], kTempusZero);
-            start->getOutputTangents(&numbers[2], &numbers[3], kTempusZero);
-            return std::all_of(std::begin(numbers), std::end(numbers), [into](double x) {
+            Sides const in = sidesOf(*next), out = sidesOf(*start);
+            auto const isFlat = [into](double x) {
                 return std::fabs(x * (into == Into::Arrays ? 12.0 : 1.0)) < 1e-7;
-            });
+            };
+            return isFlat(in[0]) && isFlat(in[1]) && isFlat(out[2]) && isFlat(out[3]);
         }
         return start->getInterpolation() == 1;
     }

@@ -210,16 +210,6 @@ constexpr long double kRoundings = 16.0L * std::numeric_limits<double>::epsilon(
 
 long double valueOf(KFVertex const* vertex) { return vertex->getValueV(kTempusZero); }
 
-long double casteljau(double const* p, long double t) {
-    long double level[4] = {p[0], p[1], p[2], p[3]};
-    for (int n = 3; n > 0; --n) {
-        for (int i = 0; i < n; ++i) {
-            level[i] += t * (level[i + 1] - level[i]);
-        }
-    }
-    return level[0];
-}
-
 /// The handles of a segment, as offsets from its ends.
 struct Handles {
     long double outU, outV, inU, inV;
@@ -262,6 +252,16 @@ Handles handlesFromNeighbours(KFSpline& spline, Segment const& segment) {
 }
 
 } // namespace
+
+long double casteljau(double const* p, long double t) {
+    long double level[4] = {p[0], p[1], p[2], p[3]};
+    for (int n = 3; n > 0; --n) {
+        for (int i = 0; i < n; ++i) {
+            level[i] += t * (level[i + 1] - level[i]);
+        }
+    }
+    return level[0];
+}
 
 LongCubic::LongCubic(KFSpline& spline, Segment const& segment)
     : _parametric(spline.getState()->parametric), _start(segment.a->getValueU()),

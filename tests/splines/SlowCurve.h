@@ -27,6 +27,9 @@ struct Segment {
 };
 std::vector<Segment> segmentsOf(KFSpline& spline);
 
+/// The value of a cubic with these control values.
+long double casteljau(double const* controls, long double t);
+
 /// A cubic segment from the tangents of its ends, or of its neighbours, in long double. Not for one that may fold back
 /// in time.
 class LongCubic {

@@ -106,13 +106,19 @@ double SlowSpline::valueAt(Tempus const& u) const {
     return a->type == 0 ? a->v : a->v + (b->v - a->v) * (seconds(u - a->u) / seconds(b->u - a->u));
 }
 
+/// Of the first key that isn't before `u`.
+std::size_t SlowSpline::placeOf(Tempus const& u) const {
+    std::size_t i = 0;
+    while (i < keys.size() && keys[i]->u < u) {
+        ++i;
+    }
+    return i;
+}
+
 // --- Adding ---
 
 SlowSpline::Key SlowSpline::join(std::unique_ptr<SlowKey> key, bool replace, bool stateType) {
-    std::size_t i = 0;
-    while (i < keys.size() && keys[i]->u < key->u) {
-        ++i;
-    }
+    std::size_t const i = placeOf(key->u);
     bool const taken = i < keys.size() && keys[i]->u == key->u;
     if (taken && replace) {
         if (!keys[i]->locked()) {
@@ -201,10 +207,7 @@ std::unique_ptr<SlowKey> SlowSpline::take(Key key) {
 }
 
 SlowSpline::Key SlowSpline::putBack(std::unique_ptr<SlowKey> key, double value) {
-    std::size_t i = 0;
-    while (i < keys.size() && keys[i]->u < key->u) {
-        ++i;
-    }
+    std::size_t const i = placeOf(key->u);
     if (i < keys.size() && keys[i]->u == key->u) {
         if (!keys[i]->locked()) {
             keys[i]->v = value;
@@ -263,10 +266,7 @@ SlowSpline::Key SlowSpline::move(Key key, Tempus const& newU, bool clone, bool r
         }
     }
     moved->u = targetU;
-    std::size_t i = 0;
-    while (i < keys.size() && keys[i]->u < targetU) {
-        ++i;
-    }
+    std::size_t const i = placeOf(targetU);
     bool const taken = i < keys.size() && keys[i]->u == targetU;
     if (taken && replace) {
         return keys[i].get();

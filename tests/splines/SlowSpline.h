@@ -52,6 +52,7 @@ private:
     Key after(Tempus const& u) const;
     Key previousOf(Key key) const;
     Key nextOf(Key key) const;
+    std::size_t placeOf(Tempus const& u) const;
     Key join(std::unique_ptr<SlowKey> key, bool replace, bool stateType);
     std::unique_ptr<SlowKey> take(Key key);
     Key putBack(std::unique_ptr<SlowKey> key, double value);

@@ -1,5 +1,4 @@
-#include "lumenkey/splines/KFSpline.h"
-#include "lumenkey/splines/KFStaticVertex.h"
+#include "tests/splines/museum.h"
 
 #include <gtest/gtest.h>
 
@@ -12,16 +11,14 @@ namespace {
 
 using Pair = std::array<double, 2>;
 
-Pair inputOf(void const* handle) {
-    Pair tangent{};
-    static_cast<KFVertex const*>(handle)->getInputTangents(&tangent[0], &tangent[1], kTempusZero);
-    return tangent;
+Pair inputOf(KFVertex const* vertex) {
+    Sides const sides = sidesOf(*vertex);
+    return {sides[0], sides[1]};
 }
 
-Pair outputOf(void const* handle) {
-    Pair tangent{};
-    static_cast<KFVertex const*>(handle)->getOutputTangents(&tangent[0], &tangent[1], kTempusZero);
-    return tangent;
+Pair outputOf(KFVertex const* vertex) {
+    Sides const sides = sidesOf(*vertex);
+    return {sides[2], sides[3]};
 }
 
 void expectNear(Pair const& expected, Pair const& actual, double tolerance = 1e-12) {
@@ -61,8 +58,7 @@ protected:
             double const in = i > 0 ? distance(i - 1) * reach / 12.0 : 0.0;
             double const out = i + 1 < kCount ? distance(i) * reach / 12.0 : 0.0;
             vertex->setInterpolation(type);
-            vertex->setInputTangents(-in, -in * kSlopes[i], kTempusZero);
-            vertex->setOutputTangents(out, out * kSlopes[i], kTempusZero);
+            setSides(*vertex, {-in, -in * kSlopes[i], out, out * kSlopes[i]});
         }
     }
 

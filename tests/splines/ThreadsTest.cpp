@@ -1,8 +1,8 @@
 // Many threads that evaluate beside one that edits. What they read must be what some state of the spline gives: here
 // that is a range of values that every edit keeps. The thread sanitizer watches. LUMENKEY_TEST_LONG=1 goes on longer.
 
-#include "lumenkey/splines/KFSplineOwner.h"
 #include "tests/splines/museum.h"
+#include "tests/support/AtOnce.h"
 
 #include <gtest/gtest.h>
 
@@ -54,21 +54,6 @@ private:
     std::atomic<long> _reads{0};
     std::vector<std::thread> _threads;
 };
-
-/// All on one start signal.
-template <class Work> void atOnce(int count, Work work) {
-    std::barrier start(count);
-    std::vector<std::thread> threads;
-    for (int i = 0; i < count; ++i) {
-        threads.emplace_back([&, i] {
-            start.arrive_and_wait();
-            work(i);
-        });
-    }
-    for (std::thread& thread : threads) {
-        thread.join();
-    }
-}
 
 // The vertices' values stay within 0 to 1, and the ends of all handles within the range below; a closed curve leaves it
 // only outside its ends. The first and the last vertex are neither moved nor deleted, so that their handles stay good.
@@ -244,23 +229,6 @@ TEST_F(KFSplineThreads, EvaluateBesideOneThatEdits) {
     }
 }
 
-// A reader that computes a segment while a value is written may not take what it computed for what was written.
-TEST_F(KFSplineThreads, WhatWasWrittenLastIsRead) {
-    auto& vertex = *static_cast<KFVertex*>(curve->addVertexNoTangents(s(101, 600), 0.0, kTempusZero, false));
-    vertex.setInterpolation(0);
-    Tempus const u = s(103, 600);
-    Readers readers;
-    readers.add([&](std::mt19937&) { curve.at(u); });
-    readers.add([&](std::mt19937&) { curve.at(u); });
-    for (int i = 0; i < times(5000); ++i) {
-        // Some readers begin at the first of several writings and end at the last.
-        for (int k = i % 60; k >= 0; --k) {
-            vertex.setValueV(i + k, kTempusZero);
-        }
-        ASSERT_EQ(curve.at(u), i);
-    }
-}
-
 // Threads keep what they computed, and none may go on with it after an edit that it knows to be over: through a handle,
 // by two threads at once on one vertex, and of the spline.
 TEST_F(KFSplineThreads, EditsReachWhatOtherThreadsKeep) {
@@ -370,18 +338,9 @@ TEST_F(KFSplineThreads, WholeCurvesAreReadByManyAtOnce) {
     }
 }
 
-namespace {
-
-struct Owner : KFSplineOwner {
-    double getInitialValue() const override { return 0.0; }
-    Tempus getFrameDuration() const override { return s(1, 25); }
-};
-
-} // namespace
-
 TEST_F(KFSplineThreads, TwoSplinesShareOneLock) {
     BXSpinLock shared;
-    Owner owners[2];
+    TestOwner owners[2];
     MuseumSpline curves[2];
     for (int i = 0; i < 2; ++i) {
         owners[i]._customLock = &shared;
@@ -421,7 +380,7 @@ TEST_F(KFSplineThreads, TwoSplinesShareOneLock) {
 // Who holds a lock that several splines share holds them all still, also where a thread has kept all that it
 // needs.
 TEST_F(KFSplineThreads, ACustomLockIsWaitedForByEveryRead) {
-    Owner owner;
+    TestOwner owner;
     BXSpinLock shared;
     owner._customLock = &shared;
     curve->setNode(&owner);

@@ -2,47 +2,21 @@
 
 #include <gtest/gtest.h>
 
-#include <array>
 #include <random>
 #include <utility>
 
 namespace {
 
 using Numbers = std::vector<double>;
-using Sides = std::array<double, 4>;
-
 Tempus seconds(int n) { return TempusMake(n, 1); }
-
-Sides sidesOf(KFVertex* vertex) {
-    Sides sides{};
-    vertex->getInputTangents(&sides[0], &sides[1], kTempusZero);
-    vertex->getOutputTangents(&sides[2], &sides[3], kTempusZero);
-    return sides;
-}
 
 struct Curve : MuseumSpline {
     Curve(std::initializer_list<std::pair<int, double>> keys = {}) {
         for (auto const& [u, v] : keys) {
-            append(seconds(u), v, 1);
+            append(seconds(u), v);
         }
     }
-    KFVertex* append(Tempus const& u, double value, std::uint32_t type) {
-        auto* const vertex = static_cast<KFVertex*>(spline->appendVertexNoTangents(u, value, kTempusZero));
-        vertex->setInterpolation(type);
-        return vertex;
-    }
-    void fillWithBeziers(std::mt19937& random, int count) {
-        auto const number = [&random](int high) {
-            return static_cast<int>(random() % static_cast<unsigned>(high + 1));
-        };
-        int u = number(60) - 30;
-        for (int i = 0; i < count; ++i) {
-            KFVertex* const vertex = append(TempusMake(u, 30), number(18) - 9, number(3) == 0 ? 1 : 4);
-            vertex->setInputTangents(-number(9) / 100.0, (number(18) - 9) / 30.0, kTempusZero);
-            vertex->setOutputTangents(number(9) / 100.0, (number(18) - 9) / 30.0, kTempusZero);
-            u += 10 + number(30);
-        }
-    }
+    void fillWithBeziers(std::mt19937& random, int count) { appendAtRandom(random, count, {4, 4, 4, 1}); }
     KFVertex* key(int index) { return museumVertices(*spline)[static_cast<std::size_t>(index)]; }
     void lock(int index) { key(index)->setFlag(kKFVertexFlagLocked); }
     void expect(Numbers const& positions, Numbers const& values) {
@@ -87,7 +61,7 @@ TEST(KFSplineTransform, OffsetsWithinLimits) {
             Numbers positions;
             for (double const value : row.values) {
                 positions.push_back(static_cast<double>(positions.size() + 1));
-                curve.append(seconds(static_cast<int>(positions.size())), value, 1);
+                curve.append(seconds(static_cast<int>(positions.size())), value);
             }
             Numbers expected = row.expected;
             if (locked && !row.keepShape) {
@@ -104,11 +78,10 @@ TEST(KFSplineTransform, OffsetsWithinLimits) {
 
 TEST(KFSplineTransform, ScalesValuesAndTheEndsOfTangents) {
     Curve curve{{0, 1.0}, {1, -4.0}};
-    curve.key(0)->setInputTangents(-0.5, 0.25, kTempusZero);
-    curve.key(0)->setOutputTangents(0.5, 1.0, kTempusZero);
+    setSides(*curve.key(0), {-0.5, 0.25, 0.5, 1.0});
     curve->scaleSpline(2.0, 0.0, 3.0, kTempusZero);
     curve.expect({0, 1}, {2.0, 0.0});
-    EXPECT_EQ((Sides{-0.5, 0.5, 0.5, 1.0}), sidesOf(curve.key(0)))
+    EXPECT_EQ((Sides{-0.5, 0.5, 0.5, 1.0}), sidesOf(*curve.key(0)))
         << "the end of the last stops at the limit";
 }
 
@@ -162,10 +135,10 @@ TEST(KFSplineReverseVertices, MirrorsTheCurve) {
         EXPECT_EQ(original.key(last)->getInterpolation(), curve.key(last)->getInterpolation());
         // An inner vertex has changed its two sides; what the first and last show outwards they keep.
         for (int i = first; i <= last; ++i) {
-            Sides const old = sidesOf(original.key(i));
+            Sides const old = sidesOf(*original.key(i));
             Sides const expected{i == last ? old[0] : -old[2], i == last ? old[1] : old[3],
                                  i == first ? old[2] : -old[0], i == first ? old[3] : old[1]};
-            EXPECT_EQ(expected, sidesOf(curve.key(first + last - i)));
+            EXPECT_EQ(expected, sidesOf(*curve.key(first + last - i)));
         }
     }
 }
@@ -201,15 +174,14 @@ TEST(KFSplineTransform, CountsVerticesAsParameter) {
     // A time curve becomes a path from value 0, tangents in fractions of a segment.
     Curve curve{{0, 5.0}, {2, 7.0}, {6, 4.0}};
     for (KFVertex* const vertex : museumVertices(*curve)) {
-        vertex->setInputTangents(-0.5, 0.25, kTempusZero);
-        vertex->setOutputTangents(0.5, 0.75, kTempusZero);
+        setSides(*vertex, {-0.5, 0.25, 0.5, 0.75});
     }
     curve.lock(1);
     curve->parametrizeSpline();
     curve.expect({0, 1, 2}, {0.0, 7.0, -1.0}); // a locked vertex keeps its value but is counted
     EXPECT_TRUE(curve.key(1)->testFlag(kKFVertexFlagLocked));
-    EXPECT_EQ((std::pair{0.25, 0.75}), (std::pair{sidesOf(curve.key(0))[2], sidesOf(curve.key(0))[3]}));
-    EXPECT_EQ((Sides{-0.125, 0.25, 0.125, -0.25}), sidesOf(curve.key(2)));
+    EXPECT_EQ((std::pair{0.25, 0.75}), (std::pair{sidesOf(*curve.key(0))[2], sidesOf(*curve.key(0))[3]}));
+    EXPECT_EQ((Sides{-0.125, 0.25, 0.125, -0.25}), sidesOf(*curve.key(2)));
 }
 
 TEST(KFSplineTransform, OpensAtAVertex) {

@@ -2,6 +2,7 @@
 
 #include "lumenkey/splines/KFStaticVertex.h"
 
+#include "tests/splines/museum.h"
 #include "tests/splines/slots.h"
 
 #include <gtest/gtest.h>
@@ -19,29 +20,11 @@ Tempus const kAny = TempusMake(7, 3);
 KFStaticVertex unusual() {
     KFStaticVertex vertex(TempusMake(1, 2), 3.0);
     vertex.setBias(0.25, kAny);
-    vertex.setInputTangents(-1.0, 2.0, kAny);
-    vertex.setOutputTangents(3.0, 4.0, kAny);
+    setSides(vertex, {-1.0, 2.0, 3.0, 4.0});
     vertex.setNormal(5.0, kAny);
     vertex.setInterpolation(13);
     vertex.setFlags(0x40000091);
     return vertex;
-}
-
-struct Pair {
-    double u, v;
-    bool operator==(Pair const&) const = default;
-};
-
-Pair inputOf(KFVertex const& vertex) {
-    Pair pair{};
-    vertex.getInputTangents(&pair.u, &pair.v, kAny);
-    return pair;
-}
-
-Pair outputOf(KFVertex const& vertex) {
-    Pair pair{};
-    vertex.getOutputTangents(&pair.u, &pair.v, kAny);
-    return pair;
 }
 
 struct Setter {
@@ -100,25 +83,19 @@ TEST(KFStaticVertex, GuardsWhatALockedOrDisabledVertexKeeps) {
 
 TEST(KFStaticVertex, KeepsTangentsOnTheirSides) {
     KFStaticVertex vertex = unusual();
-    vertex.setInputTangents(0.5, 2.0, kAny);
-    vertex.setOutputTangents(-0.5, 2.5, kAny);
-    EXPECT_EQ(inputOf(vertex), (Pair{0.0, 2.0}));
-    EXPECT_EQ(outputOf(vertex), (Pair{0.0, 2.5}));
+    setSides(vertex, {0.5, 2.0, -0.5, 2.5});
+    EXPECT_EQ(sidesOf(vertex), (Sides{0.0, 2.0, 0.0, 2.5}));
     double const nan = std::numeric_limits<double>::quiet_NaN();
-    vertex.setInputTangents(nan, 2.0, kAny);
-    vertex.setOutputTangents(nan, 2.5, kAny);
-    EXPECT_TRUE(std::isnan(inputOf(vertex).u));
-    EXPECT_TRUE(std::isnan(outputOf(vertex).u));
+    setSides(vertex, {nan, 2.0, nan, 2.5});
+    EXPECT_TRUE(std::isnan(sidesOf(vertex)[0]) && std::isnan(sidesOf(vertex)[2]));
 
     // Swapping looks at no side.
     vertex = unusual();
     vertex.swapTangents();
-    EXPECT_EQ(inputOf(vertex), (Pair{3.0, 4.0}));
-    EXPECT_EQ(outputOf(vertex), (Pair{-1.0, 2.0}));
+    EXPECT_EQ(sidesOf(vertex), (Sides{3.0, 4.0, -1.0, 2.0}));
 
     vertex.flattenTangents(kAny);
-    EXPECT_EQ(inputOf(vertex), (Pair{0.0, 0.0}));
-    EXPECT_EQ(outputOf(vertex), (Pair{0.0, 0.0}));
+    EXPECT_EQ(sidesOf(vertex), Sides{});
     EXPECT_EQ(vertex.getFlags(), 0x40000090u);
 }
 

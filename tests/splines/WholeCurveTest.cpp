@@ -167,11 +167,6 @@ TEST(WholeCurves, FollowTypesThatAreSetOnAVertexItself) {
         last->setInterpolation(10);
         EXPECT_EQ(typeOfAll(), kKFInterpolationBSpline);
     }
-    for (void* handle = curve.spline.getFirstVertex(); handle != nullptr;
-         handle = curve.spline.getNextVertex(handle)) {
-        static_cast<KFVertex*>(handle)->setInterpolation(12);
-        EXPECT_EQ(typeOfAll(), handle == last ? kKFInterpolationXSpline : kKFInterpolationMixed);
-    }
     *static_cast<KFStaticVertex*>(curve.spline.getFirstVertex()) = KFStaticVertex(kTempusZero, 1.0);
     EXPECT_EQ(typeOfAll(), kKFInterpolationMixed);
 }

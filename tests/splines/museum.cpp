@@ -1,7 +1,5 @@
 #include "tests/splines/museum.h"
 
-#include "lumenkey/splines/KFInterpolation.h"
-
 #include <algorithm>
 #include <cmath>
 
@@ -9,22 +7,10 @@ namespace {
 
 Tempus s(std::int64_t value, std::int32_t timescale = 1) { return TempusMake(value, timescale); }
 
-/// Puts a vertex behind the others.
-KFVertex& key(MuseumSpline& curve, Tempus const& u, double value,
-              std::uint32_t type = kKFInterpolationLinear) {
-    auto& vertex = *static_cast<KFVertex*>(curve->appendVertexNoTangents(u, value, kTempusZero));
-    vertex.setInterpolation(type);
-    return vertex;
-}
-
-struct Handles {
-    double inU, inV, outU, outV;
-};
-
 /// Handles in seconds and values, as a user sees them.
-void setHandles(MuseumSpline& curve, KFVertex& vertex, Handles const& handles) {
-    curve->setVertexInputHandles(&vertex, handles.inU, handles.inV, kTempusZero, true);
-    curve->setVertexOutputHandles(&vertex, handles.outU, handles.outV, kTempusZero, true);
+void setHandles(MuseumSpline& curve, KFVertex* vertex, Sides const& handles) {
+    curve->setVertexInputHandles(vertex, handles[0], handles[1], kTempusZero, true);
+    curve->setVertexOutputHandles(vertex, handles[2], handles[3], kTempusZero, true);
 }
 
 /// Handles of a part of the distance to each neighbour, all rising by `rise`.
@@ -36,7 +22,7 @@ void stretchHandles(MuseumSpline& curve, double part, double rise) {
         };
         double const before = i > 0 ? reach(i - 1, i) : 0.0;
         double const after = i + 1 < vertices.size() ? reach(i, i + 1) : 0.0;
-        setHandles(curve, *vertices[i], {-before, -rise, after, rise});
+        setHandles(curve, vertices[i], {-before, -rise, after, rise});
     }
 }
 
@@ -54,7 +40,7 @@ void zigzag(MuseumSpline& curve, std::uint32_t type) {
                           {s(58, 25), 0.5, 1.0},
                           {s(1000001, 262144), 2.75, 0.6}};
     for (Stop const& stop : stops) {
-        key(curve, stop.u, stop.v, type).setBias(stop.bias, kTempusZero);
+        curve.append(stop.u, stop.v, type)->setBias(stop.bias, kTempusZero);
     }
     stretchHandles(curve, 0.21, 0.7);
 }
@@ -67,13 +53,14 @@ void many(MuseumSpline& curve, int count) {
                          : i % 3 == 1 ? s(i, 24) + s(1, 240)
                                       : s(std::int64_t{i} * 1250, 30000);
         double const value = std::sin(i * 0.7) * 10.0 + i % 4;
-        KFVertex& vertex = key(curve, u, value, types[static_cast<std::size_t>(i / 2) % types.size()]);
+        KFVertex* const vertex =
+            curve.append(u, value, types[static_cast<std::size_t>(i / 2) % types.size()]);
         setHandles(curve, vertex, {-0.013, 0.2, 0.019, -0.3});
         if (i % 11 == 5) {
-            key(curve, u, value + 1.0, kKFInterpolationEaseOut);
+            curve.append(u, value + 1.0, kKFInterpolationEaseOut);
         }
         if (i % 7 == 3) {
-            curve->disableVertex(&vertex, kTempusZero);
+            curve->disableVertex(vertex, kTempusZero);
         }
     }
 }
@@ -82,7 +69,7 @@ void many(MuseumSpline& curve, int count) {
 void keysAt(MuseumSpline& curve, std::vector<Tempus> const& positions, std::uint32_t type) {
     double value = 1.0;
     for (Tempus const& u : positions) {
-        key(curve, u, value, type);
+        curve.append(u, value, type);
         value = 1.5 - value * 1.25;
     }
     stretchHandles(curve, 0.4, 0.2);
@@ -90,8 +77,8 @@ void keysAt(MuseumSpline& curve, std::vector<Tempus> const& positions, std::uint
 
 /// Two vertices a second apart, the handles of the segment between them being out (a, b) and in (c, d).
 void oneSegment(MuseumSpline& curve, double a, double b, double c, double d) {
-    setHandles(curve, key(curve, s(1), 2.0, kKFInterpolationBezier), {0.0, 0.0, a, b});
-    setHandles(curve, key(curve, s(2), 5.0, kKFInterpolationBezier), {c, d, 0.0, 0.0});
+    setHandles(curve, curve.append(s(1), 2.0, kKFInterpolationBezier), {0.0, 0.0, a, b});
+    setHandles(curve, curve.append(s(2), 5.0, kKFInterpolationBezier), {c, d, 0.0, 0.0});
 }
 
 void disable(MuseumSpline& curve, std::vector<std::size_t> const& indices) {
@@ -106,7 +93,7 @@ void controlPoints(MuseumSpline& curve, std::uint32_t type, int count, bool clos
     curve.state->parametric = true;
     curve.state->interpolation = type;
     for (int i = 0; i < count; ++i) {
-        key(curve, s(i), std::cos(i * 1.3) * 4.0, type).setBias(i % 3 == 2 ? -0.4 : 0.25 * i, kTempusZero);
+        curve.append(s(i), std::cos(i * 1.3) * 4.0, type)->setBias(i % 3 == 2 ? -0.4 : 0.25 * i, kTempusZero);
     }
     if (closed) {
         curve->setClosed(true, nullptr);
@@ -150,7 +137,7 @@ void addTypes(Builder& build) {
         build.add("all types, from " + std::to_string(cycle[0]),
                   [&types = museumSegmentTypes(), cycle](MuseumSpline& c) {
                       for (std::size_t i = 0; i < types.size(); ++i) {
-                          key(c, s(static_cast<int>(i), 3), cycle[i % cycle.size()], types[i]);
+                          c.append(s(static_cast<int>(i), 3), cycle[i % cycle.size()], types[i]);
                       }
                       stretchHandles(c, 0.5, -0.4 * std::fabs(cycle[1]));
                   });
@@ -328,6 +315,37 @@ MuseumSpline::MuseumSpline() : state(std::make_unique<KFSplineState>()) {
 MuseumSpline::MuseumSpline(MuseumSpline const& other)
     : state(std::make_unique<KFSplineState>(*other.state)),
       spline(std::make_unique<KFSpline>(*other.spline, state.get())) {}
+
+KFVertex* MuseumSpline::append(Tempus const& u, double value, std::uint32_t type) const {
+    auto* const vertex = static_cast<KFVertex*>(spline->appendVertexNoTangents(u, value, kTempusZero));
+    vertex->setInterpolation(type);
+    return vertex;
+}
+
+void MuseumSpline::appendAtRandom(std::mt19937& random, int count,
+                                  std::vector<std::uint32_t> const& types) const {
+    auto const number = [&random](int low, int high) {
+        return low + static_cast<int>(random() % static_cast<unsigned>(high - low + 1));
+    };
+    int u = number(-50, 50);
+    for (int i = 0; i < count; ++i, u += number(10, 40)) {
+        KFVertex* const vertex = append(TempusMake(u, 30), number(-9, 9), types[random() % types.size()]);
+        setSides(*vertex,
+                 {-number(0, 9) / 100.0, number(-9, 9) / 30.0, number(0, 9) / 100.0, number(-9, 9) / 30.0});
+    }
+}
+
+Sides sidesOf(KFVertex const& vertex) {
+    Sides sides{};
+    vertex.getInputTangents(&sides[0], &sides[1], kTempusZero);
+    vertex.getOutputTangents(&sides[2], &sides[3], kTempusZero);
+    return sides;
+}
+
+void setSides(KFVertex& vertex, Sides const& sides) {
+    vertex.setInputTangents(sides[0], sides[1], kTempusZero);
+    vertex.setOutputTangents(sides[2], sides[3], kTempusZero);
+}
 
 MuseumSpline Exhibit::build() const {
     MuseumSpline curve;

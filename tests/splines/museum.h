@@ -2,13 +2,17 @@
 // exhibit tests everything.
 #pragma once
 
+#include "lumenkey/splines/KFInterpolation.h"
 #include "lumenkey/splines/KFSpline.h"
+#include "lumenkey/splines/KFSplineOwner.h"
 #include "lumenkey/splines/KFSplineState.h"
 #include "lumenkey/splines/KFVertex.h"
 
+#include <array>
 #include <cstring>
 #include <functional>
 #include <memory>
+#include <random>
 #include <string>
 #include <vector>
 
@@ -31,7 +35,25 @@ struct MuseumSpline {
     double slopeAt(Tempus const& u, bool lock = true) const {
         return spline->getDerivativeValue(u, kTempusZero, lock);
     }
+    /// Puts a vertex behind the others.
+    KFVertex* append(Tempus const& u, double value, std::uint32_t type = kKFInterpolationLinear) const;
+    /// Of these types, at uneven distances, with tangents that are unlike on the two sides.
+    void appendAtRandom(std::mt19937& random, int count, std::vector<std::uint32_t> const& types) const;
 };
+
+/// An owner that answers as the test says.
+struct TestOwner : KFSplineOwner {
+    double getInitialValue() const override { return initialValue; }
+    Tempus getFrameDuration() const override { return frame; }
+
+    double initialValue = 0.0;
+    Tempus frame = TempusMake(1, 25);
+};
+
+/// The tangents of a vertex: U and V of the input, and of the output.
+using Sides = std::array<double, 4>;
+Sides sidesOf(KFVertex const& vertex);
+void setSides(KFVertex& vertex, Sides const& sides);
 
 struct Exhibit {
     std::string name;
