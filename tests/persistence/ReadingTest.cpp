@@ -34,12 +34,42 @@ struct Reading : testing::Test {
     OwnedTree top{new KFChannelFolder("Top", nullptr, 5, 0, 0)};
     KFChannelFolder& folder() { return *top; }
     KFChannel& child(unsigned id) { return dynamic_cast<KFChannel&>(*top->getDescendant(id)); }
+    void read(std::string const& body, std::string const& attributes = "") {
+        EXPECT_TRUE(readDocument(folder(), documentWith(body, attributes)));
+    }
 };
 
-std::string curve(std::string const& keypoints, std::string const& attributes = "type=\"1\"") {
-    return "<parameter id=\"1\" name=\"C\" factoryID=\"2\"><curve " + attributes + ">" + keypoints +
+std::string curve(std::string const& keypoints, std::string const& attributes = "type='1'") {
+    return "<parameter id='1' name='C' factoryID='2'><curve " + attributes + ">" + keypoints +
            "</curve></parameter>";
 }
+
+std::string keypoints(std::string const& number, std::string const& elements) {
+    return "<numberOfKeypoints>" + number + "</numberOfKeypoints>" + elements;
+}
+
+/// The keypoints of a channel, by their order.
+struct Keys {
+    explicit Keys(KFChannelBase* channel) : curve(*dynamic_cast<KFChannel&>(*channel).getCurveInterface()) {
+        curve.getKeypointHandleList(all);
+    }
+    Tempus time(std::size_t i) {
+        Tempus at = kTempusInvalid;
+        curve.getKeypoint(all.at(i), &at, nullptr);
+        return at;
+    }
+    std::pair<double, double> out(std::size_t i) {
+        std::pair<double, double> handle;
+        curve.getKeypointOutputNormalizedTangents(all.at(i), &handle.first, &handle.second);
+        return handle;
+    }
+    bool isEnabled(std::size_t i) {
+        bool enabled = false;
+        return curve.isEnabledKeypoint(all.at(i), &enabled) && enabled;
+    }
+    KFCurve& curve;
+    std::vector<void*> all;
+};
 
 } // namespace
 
@@ -48,18 +78,13 @@ TEST_F(Reading, FindsOrMakesChildren) {
     host->setFlag(kChannelFlagHostOption11 | kChannelFlagSoloable, true);
     host->resetFlag(kChannelFlagHostOption4, true);
     new KFChannelDouble(4.0, "NotMentioned", &folder(), 9, 0);
-    ASSERT_TRUE(
-        readDocument(folder(), documentWith("<parameter id=\"1\" name=\"Theirs\" factoryID=\"1\" "
-                                            "flags=\"18446744073709551615\" default=\"2\" "
-                                            "value=\"3\"/>"
-                                            "<parameter id=\"2\" name=\"New\" factoryID=\"2\" value=\"8\"/>"
-                                            "<parameter id=\"3\" name=\"Unknown\" factoryID=\"3\"><parameter "
-                                            "id=\"1\" factoryID=\"2\"/></parameter>"
-                                            "<parameter id=\"4\" name=\"None\"><unknown><parameter id=\"6\" "
-                                            "factoryID=\"2\"/></unknown></parameter>"
-                                            "<unknown><parameter id=\"6\" factoryID=\"2\"/></unknown>"
-                                            "<parameter id=\"2\" value=\"9\"/>",
-                                            "flags=\"0\"")));
+    read("<parameter id='1' name='Theirs' factoryID='1' flags='18446744073709551615' default='2' value='3'/>"
+         "<parameter id='2' name='New' factoryID='2' value='8'/>"
+         "<parameter id='3' name='Unknown' factoryID='3'><parameter id='1' factoryID='2'/></parameter>"
+         "<parameter id='4' name='None'><unknown><parameter id='6' factoryID='2'/></unknown></parameter>"
+         "<unknown><parameter id='6' factoryID='2'/></unknown>"
+         "<parameter id='2' value='9'/>",
+         "flags='0'");
     EXPECT_EQ(folder().getDescendant(1), host);
     EXPECT_EQ(host->getName().str(), "Mine");
     EXPECT_EQ(host->getInitialValue(), 3);
@@ -80,75 +105,50 @@ TEST_F(Reading, TakesKeypointsAsTheyStand) {
                "</outputTangentValue>";
     };
     std::string const disabled = "enabled='0' interpolation='1'";
-    ASSERT_TRUE(readDocument(
-        folder(), documentWith(curve("<numberOfKeypoints>4294967295</numberOfKeypoints>" +
-                                     keypointElement("2/1", "1", handle("12", "24"), "flags='34'") +
-                                     keypointElement("1/1", "5", "", disabled) +
-                                     keypointElement("3/1", "6", handle("0", "0"), disabled)))));
-    std::vector<void*> handles;
-    KFCurve& read = *child(1).getCurveInterface();
-    read.getKeypointHandleList(handles);
-    ASSERT_EQ(handles.size(), 3U);
-    std::uint32_t number = 0;
-    Tempus time = kTempusZero;
-    double x = 0;
-    double y = 0;
-    bool enabled = false;
-    read.getKeypoint(handles[0], &time, &x);
-    EXPECT_EQ(time, TempusMake(2, 1)) << "not sorted";
-    read.getKeypointFlags(handles[0], &number);
-    EXPECT_EQ(number & 0x22, 2U)
+    read(curve(keypoints("4294967295", keypointElement("2/1", "1", handle("12", "24"), "flags='34'") +
+                                           keypointElement("1/1", "5", "", disabled) +
+                                           keypointElement("3/1", "6", handle("0", "0"), disabled))));
+    Keys keys(&child(1));
+    ASSERT_EQ(keys.all.size(), 3U);
+    EXPECT_EQ(keys.time(0), TempusMake(2, 1)) << "not sorted";
+    EXPECT_EQ(child(1).getKeyframeFlags(keys.all[0]) & 0x22, 2U)
         << "without the obsolete bit; set behind all else, or the handle would be refused";
-    read.getKeypointOutputNormalizedTangents(handles[0], &x, &y);
-    EXPECT_EQ(x, 1);
-    EXPECT_EQ(y, 2);
-    read.getKeypointInterpolation(handles[0], &number, nullptr);
-    EXPECT_EQ(number, 4U);
-    EXPECT_TRUE(read.isEnabledKeypoint(handles[1], &enabled) && enabled) << "without output handle";
-    EXPECT_TRUE(read.isEnabledKeypoint(handles[2], &enabled) && !enabled);
+    EXPECT_EQ(keys.out(0), std::pair(1.0, 2.0));
+    EXPECT_EQ(child(1).getKeyframeInterpolation(keys.all[0]), 4U);
+    EXPECT_TRUE(keys.isEnabled(1)) << "without output handle";
+    EXPECT_FALSE(keys.isEnabled(2));
 
     // Once more, with two lists: the second clears the first.
-    std::string const one = "<numberOfKeypoints>1</numberOfKeypoints>";
-    ASSERT_TRUE(readDocument(folder(), documentWith(curve(one + keypointElement("1/1", "5") + one +
-                                                          keypointElement("4/1", "7")))));
+    read(curve(keypoints("1", keypointElement("1/1", "5")) + keypoints("1", keypointElement("4/1", "7"))));
     EXPECT_EQ(child(1).getNumberOfKeyframes(), 1U);
     EXPECT_TRUE(child(1).hasKeypointAt(TempusMake(4, 1), 0));
 
     // Where tangents don't count, only one type takes handles.
-    KFCurve& plain = *child(1).getCurveInterface();
-    plain.setCurveDeriveTangents(false);
-    ASSERT_TRUE(readDocument(
-        folder(), documentWith(curve("<numberOfKeypoints>2</numberOfKeypoints>" +
-                                     keypointElement("1/1", "5", handle("12", "24"), "interpolation='18'") +
-                                     keypointElement("2/1", "5", handle("12", "24"))))));
-    handles.clear();
-    plain.getKeypointHandleList(handles);
-    ASSERT_EQ(handles.size(), 2U);
-    plain.getKeypointOutputNormalizedTangents(handles[0], &x, &y);
-    EXPECT_EQ(std::pair(x, y), std::pair(1.0, 2.0));
-    plain.getKeypointOutputNormalizedTangents(handles[1], &x, &y);
-    EXPECT_EQ(std::pair(x, y), std::pair(0.0, 0.0));
+    child(1).getCurveInterface()->setCurveDeriveTangents(false);
+    read(curve(keypoints("2", keypointElement("1/1", "5", handle("12", "24"), "interpolation='18'") +
+                                  keypointElement("2/1", "5", handle("12", "24")))));
+    Keys plain(&child(1));
+    ASSERT_EQ(plain.all.size(), 2U);
+    EXPECT_EQ(plain.out(0), std::pair(1.0, 2.0));
+    EXPECT_EQ(plain.out(1), std::pair(0.0, 0.0));
 }
 
 TEST_F(Reading, TakesAConstantAsItIs) {
-    ASSERT_TRUE(readDocument(folder(), documentWith(curve("", "type=\"0\" value=\"3\" default=\"4\""))));
+    read(curve("", "type='0' value='3' default='4'"));
     EXPECT_FALSE(child(1).isSpline());
     EXPECT_EQ(child(1).getInitialValue(), 3);
     EXPECT_EQ(child(1).getDefaultValue(), 4);
     EXPECT_EQ(child(1).getCurveInterface()->getSpline(), nullptr);
     // What can't be read leaves things as they are.
-    ASSERT_TRUE(
-        readDocument(folder(), documentWith(curve("<min>low</min><preExtrapolation>-1</preExtrapolation>",
-                                                  "type=\"0\" value=\"x\" default=\"\""))));
+    read(curve("<min>low</min><preExtrapolation>-1</preExtrapolation>", "type='0' value='x' default=''"));
     EXPECT_EQ(child(1).getInitialValue(), 3);
     EXPECT_EQ(child(1).getDefaultValue(), 4);
 }
 
 TEST_F(Reading, IsNotStoppedByALock) {
-    ASSERT_TRUE(readDocument(
-        folder(), documentWith("<parameter id=\"1\" name=\"C\" factoryID=\"2\"><flags>4</flags>"
-                               "<fadeInOffset>3/1</fadeInOffset><fadeOutOffset>-3/1</fadeOutOffset>"
-                               "<fadeInCurve>3</fadeInCurve><fadeOutCurve>4</fadeOutCurve></parameter>")));
+    read("<parameter id='1' name='C' factoryID='2'><flags>4</flags>"
+         "<fadeInOffset>3/1</fadeInOffset><fadeOutOffset>-3/1</fadeOutOffset>"
+         "<fadeInCurve>3</fadeInCurve><fadeOutCurve>4</fadeOutCurve></parameter>");
     EXPECT_TRUE(child(1).isLocked(false));
     EXPECT_EQ(child(1).getFlags(), kChannelFlagLocked) << "this form replaces the whole word";
     EXPECT_EQ(child(1).getFadeInOffset(), TempusMake(3, 1));
@@ -156,7 +156,7 @@ TEST_F(Reading, IsNotStoppedByALock) {
     EXPECT_EQ(child(1).getFadeInCurve(), 3U);
     EXPECT_EQ(child(1).getFadeOutCurve(), 0U);
     // A document without fades takes them away, and gives the channel back to its class's record.
-    ASSERT_TRUE(readDocument(folder(), documentWith("<parameter id=\"1\"/>")));
+    read("<parameter id='1'/>");
     EXPECT_FALSE(child(1).hasFadeHandles());
     EXPECT_TRUE(child(1).getImpl()->isShared());
 }
@@ -164,13 +164,10 @@ TEST_F(Reading, IsNotStoppedByALock) {
 TEST_F(Reading, KeepsAWritersFolderOutOfAValue) {
     auto* const mine = new KFChannelDouble(4.0, "Mine", &folder(), 1, 0);
     KFChannelFlags const flags = mine->getFlags();
-    ASSERT_TRUE(readDocument(
-        folder(), documentWith("<parameter id=\"1\"><parameter id=\"1\" factoryID=\"2\"><flags>4</flags>"
-                               "<fadeInOffset>3/1</fadeInOffset>"
-                               "<curve type=\"1\" value=\"9\"><numberOfKeypoints>1</numberOfKeypoints>" +
-                               keypointElement("0/1", "9") +
-                               "</curve></parameter>"
-                               "<fadeOutOffset>3/1</fadeOutOffset></parameter>")));
+    read("<parameter id='1'><parameter id='1' factoryID='2'><flags>4</flags><fadeInOffset>3/1</fadeInOffset>"
+         "<curve type='1' value='9'>" +
+         keypoints("1", keypointElement("0/1", "9")) +
+         "</curve></parameter><fadeOutOffset>3/1</fadeOutOffset></parameter>");
     EXPECT_EQ(mine->getFlags(), flags);
     EXPECT_EQ(mine->getInitialValue(), 4);
     EXPECT_EQ(mine->getNumberOfKeyframes(), 0U);
@@ -203,11 +200,11 @@ TEST(ReadingOfHosts, MakesTheirClassesAndTellsThem) {
     KFFactories::getInstance().addFactory(&factory);
     OwnedTree const top(new HostRoot("Root", nullptr, 1, 0, 0));
     ASSERT_TRUE(readDocument(
-        *top, "<kfml version=\"5.13\"><factory id=\"1\" uuid=\"00000001-0000-0002-0000-000300000006\"/>"
-              "<factory uuid=\"FDC1944B-2291-11D7-B1C3-00039389B702\"/>"
-              "<parameter><parameter id=\"1\" name=\"Host\" factoryID=\"1\" value=\"3\">"
+        *top, "<kfml version='5.13'><factory id='1' uuid='00000001-0000-0002-0000-000300000006'/>"
+              "<factory uuid='FDC1944B-2291-11D7-B1C3-00039389B702'/>"
+              "<parameter><parameter id='1' name='Host' factoryID='1' value='3'>"
               "<fadeInOffset>1/1</fadeInOffset><fadeInCurve>2</fadeInCurve></parameter>"
-              "<parameter id=\"2\" factoryID=\"0\"/></parameter></kfml>"));
+              "<parameter id='2' factoryID='0'/></parameter></kfml>"));
     EXPECT_NE(dynamic_cast<HostChannel*>(top->getDescendant(1)), nullptr);
     EXPECT_EQ(top->getDescendant(2), nullptr) << "0 is no factory";
     EXPECT_EQ(static_cast<HostRoot&>(*top).announced, "Root data, Host data, Host data, Host data, ");
@@ -221,9 +218,8 @@ TEST_F(Reading, KeepsWhatStandsInDataOutOfTheFolder) {
     auto* const data = new HostChannel(&factory, "Data", 1, nullptr, nullptr);
     folder().push_back(data);
     KFChannelFlags const flags = folder().getFlags();
-    ASSERT_TRUE(readDocument(folder(), documentWith("<parameter id='1' value='5'><flags>2</flags>"
-                                                    "<foldFlags>16</foldFlags>"
-                                                    "<parameter id='2' factoryID='2'/></parameter>")));
+    read("<parameter id='1' value='5'><flags>2</flags><foldFlags>16</foldFlags>"
+         "<parameter id='2' factoryID='2'/></parameter>");
     EXPECT_EQ(folder().getFlags(), flags);
     EXPECT_EQ(folder().getNumberOfDescendants(), 1U);
     EXPECT_EQ(data->getInitialValue(), 0);
@@ -232,9 +228,9 @@ TEST_F(Reading, KeepsWhatStandsInDataOutOfTheFolder) {
 TEST_F(Reading, LocksARootBehindItsChildren) {
     OwnedTree const root(new KFChannelObjectRootBase("Root", nullptr, 1, 0, 0));
     ASSERT_TRUE(readDocument(
-        *root, documentWith("<timing in=\"1/1\" out=\"2/1\" offset=\"3/1\"/><baseFlags>4294967295</baseFlags>"
+        *root, documentWith("<timing in='1/1' out='2/1' offset='3/1'/><baseFlags>4294967295</baseFlags>"
                             "<enabled>0</enabled><locked>1</locked><foldFlags>131072</foldFlags>"
-                            "<parameter id=\"1\" name=\"C\" factoryID=\"2\" value=\"3\"/>")));
+                            "<parameter id='1' name='C' factoryID='2' value='3'/>")));
     auto& read = static_cast<KFChannelObjectRootBase&>(*root);
     EXPECT_TRUE(root->isLocked(false));
     EXPECT_TRUE(root->getDescendant(1)->isLocked(false));
@@ -290,25 +286,6 @@ std::uint32_t readFile(std::string const& name, KFChannelBase& top, Tempus const
     return stream.parse() && parser.hasFoundChannel() ? stream.major : 0;
 }
 
-struct Handles {
-    explicit Handles(KFChannelBase* channel)
-        : curve(*dynamic_cast<KFChannel&>(*channel).getCurveInterface()) {
-        curve.getKeypointHandleList(all);
-    }
-    Tempus time(std::size_t i) {
-        Tempus at = kTempusInvalid;
-        curve.getKeypoint(all.at(i), &at, nullptr);
-        return at;
-    }
-    std::pair<double, double> out(std::size_t i) {
-        std::pair<double, double> handle;
-        curve.getKeypointOutputNormalizedTangents(all.at(i), &handle.first, &handle.second);
-        return handle;
-    }
-    KFCurve& curve;
-    std::vector<void*> all;
-};
-
 } // namespace
 
 /// Documents of earlier versions stay readable for ever.
@@ -329,7 +306,7 @@ TEST_F(OldDocuments, CountFrames) {
         SCOPED_TRACE(version);
         EXPECT_EQ(readFile("version" + std::to_string(version) + ".lumen", root, frame), version);
         expectTiming(frame);
-        Handles keys(root.getDescendant(1));
+        Keys keys(root.getDescendant(1));
         ASSERT_EQ(keys.all.size(), 2U);
         EXPECT_EQ(keys.time(1), frame * 30);
         EXPECT_NEAR(keys.out(0).first, 10 * 1001.0 / 30000.0 / 12, 1e-15);
@@ -345,7 +322,7 @@ TEST_F(OldDocuments, HaveTimesFromVersion5On) {
         EXPECT_EQ(readFile(file, root, frame), 5U);
         EXPECT_EQ(root.getID(), 12U);
         expectTiming(frame);
-        Handles keys(root.getDescendant(1));
+        Keys keys(root.getDescendant(1));
         ASSERT_EQ(keys.all.size(), 2U);
         EXPECT_EQ(keys.time(1), frame * 30);
         EXPECT_EQ(keys.out(0), std::pair(0.5, 0.25));
@@ -372,7 +349,7 @@ TEST_F(OldDocuments, MayBeOdd) {
     EXPECT_EQ(readFile("odd.lumen", root, TempusMake(1, 24)), 5U) << "without a version, today's";
     EXPECT_EQ(root.getID(), 12U);
     ASSERT_EQ(root.getNumberOfDescendants(), 2U);
-    Handles keys(root.getDescendant(1));
+    Keys keys(root.getDescendant(1));
     ASSERT_EQ(keys.all.size(), 2U);
     EXPECT_EQ(keys.time(0), kTempusZero) << "its time comes behind its value, too late";
     EXPECT_EQ(keys.out(0), std::pair(0.0, 0.0)) << "and its handle too early";
