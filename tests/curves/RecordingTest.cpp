@@ -35,15 +35,17 @@ public:
         endRecording(at(t));
         endPlayback(at(t));
     }
-    double highest() {
-        double value = 0;
-        getCurrentMaxValueV(&value, false);
-        return value;
+    /// The lowest and the highest value.
+    std::pair<double, double> extremes() {
+        double low = 0, high = 0;
+        getCurrentMinValueV(&low, false);
+        getCurrentMaxValueV(&high, false);
+        return {low, high};
     }
-    double lowest() {
-        double value = 0;
-        getCurrentMinValueV(&value, false);
-        return value;
+    /// Times and values.
+    void expectValues(std::initializer_list<std::pair<double, double>> values) {
+        for (auto const& [t, v] : values)
+            EXPECT_EQ(value(t), v) << t;
     }
     /// `time value` of each keypoint, the linear ones' type left out.
     std::string keypoints() {
@@ -68,12 +70,8 @@ TEST(Recording, JoinsTheKeypointsAroundATakeWithoutGuards) {
     curve.set(3, 1);
     curve.set(5, 3);
     curve.set(4, 100); // back in time
-    EXPECT_EQ(curve.value(3), 1);
-    EXPECT_EQ(curve.value(4), 2);
-    EXPECT_EQ(curve.value(2.5), 1.5) << "from the keypoint at 2 to the first point";
-    EXPECT_EQ(curve.value(5.5), 4.5) << "from the last point to the keypoint at 6";
-    EXPECT_EQ(curve.value(1), 1);
-    EXPECT_EQ(curve.value(7), 7);
+    // From the keypoint at 2 to the first point, and from the last point to the keypoint at 6.
+    curve.expectValues({{1, 1}, {2.5, 1.5}, {3, 1}, {4, 2}, {5.5, 4.5}, {7, 7}});
     curve.set(5, 4); // the same time again
     EXPECT_EQ(curve.value(5), 4);
 
@@ -117,12 +115,9 @@ TEST(Recording, GuardsATakeAndCommitsByItsScope) {
         curve.set(3.25, 1);
         curve.updateCurrentRecordingTime(at(5));
         curve.updateCurrentRecordingTime(at(4)); // back in time
-        EXPECT_EQ(curve.value(4), 1) << "held";
-        EXPECT_EQ(curve.value(2.75), 2.75);
-        EXPECT_EQ(curve.value(5.25), 3.25) << "half way to the guard at 5.5";
-        EXPECT_EQ(curve.value(7), 7);
-        EXPECT_EQ(curve.highest(), 10);
-        EXPECT_EQ(curve.lowest(), 0);
+        // Held at 4, and half way to the guard at 5.5.
+        curve.expectValues({{2.75, 2.75}, {4, 1}, {5.25, 3.25}, {7, 7}});
+        EXPECT_EQ(curve.extremes(), std::pair(0.0, 10.0));
         curve.endRecording(at(5.5));
         EXPECT_EQ(curve.keypoints(), c.afterRecording) << c.scope;
         EXPECT_FALSE(curve.isRecording());
@@ -143,13 +138,12 @@ TEST(Recording, HoldsTheStartAndTheLastValueAndKeepsTheExtremes) {
     curve.set(6, 60);
     for (double const t : {7.0, 7.5, 8.0, 8.5})
         curve.set(t, 5);
-    EXPECT_EQ(curve.highest(), 60);
-    EXPECT_EQ(curve.lowest(), -50);
+    EXPECT_EQ(curve.extremes(), std::pair(-50.0, 60.0));
     curve.endRecording(at(9));
 
     // Begun anew before it became keypoints.
     curve.begin(3, kKFRecordingScopeJoin);
-    EXPECT_EQ(curve.lowest(), 0);
+    EXPECT_EQ(curve.extremes(), std::pair(0.0, 10.0));
     curve.end(4);
     EXPECT_EQ(curve.keypoints(), kOld);
 }
@@ -173,7 +167,7 @@ TEST(Recording, LeavesTheKeypointsOfATakeThatIsDropped) {
         curve.set(3, 50);
         curve.set(5, -50);
         EXPECT_EQ(curve.value(5), -50);
-        EXPECT_EQ(curve.lowest(), -50);
+        EXPECT_EQ(curve.extremes(), std::pair(-50.0, 50.0));
         curve.end(7);
         EXPECT_EQ(curve.keypoints(), kOld) << scope;
         EXPECT_EQ(curve.value(5), 5);
@@ -196,9 +190,7 @@ TEST(Recording, TakesOverlapAndReachBeyondTheKeypoints) {
     curve.begin(5, kKFRecordingScopeJoin); // empty
     curve.end(6);
     EXPECT_EQ(curve.getNumberOfKeypoints(), 3U);
-    EXPECT_EQ(curve.value(-3), 7);
-    EXPECT_EQ(curve.value(0), 1);
-    EXPECT_EQ(curve.value(12), 1);
+    curve.expectValues({{-3, 7}, {0, 1}, {12, 1}});
 }
 
 TEST(Recording, RefusesWhatOpensNoTake) {

@@ -90,8 +90,9 @@ TEST(ReshapeMuseum, SimplifyingStaysWithinTheTolerance) {
             double const tolerance = before.isLinear() ? 0.0 : part * before.height;
             ASSERT_TRUE(after.curve.simplifyCurve(after.first, after.last, after.step, tolerance * 200.0, 2.0,
                                                   KFCurve::kSimplifyByFit, 0));
-            EXPECT_LE(after.keypointsInStretch(),
-                      before.isLinear() ? before.keypointsInStretch() : unsigned{kSamples});
+            // Fewer than the samples where the tolerance is wide.
+            unsigned const most = part == 0.1 ? kSamples * 9 / 10 : kSamples;
+            EXPECT_LE(after.keypointsInStretch(), before.isLinear() ? before.keypointsInStretch() : most);
             std::vector<double> const was = before.read(kPerSample);
             std::vector<double> const is = after.read(kPerSample);
             for (std::size_t i = 0; i < was.size(); ++i) {
