@@ -145,7 +145,7 @@ using Keys = std::vector<std::tuple<Tempus, double, std::uint32_t>>;
 Shown shown(Keys const& keys, std::uint32_t mode = 0, bool retiming = false) {
     MuseumSpline curve;
     for (auto const& [u, value, type] : keys)
-        static_cast<KFVertex*>(curve->appendVertexNoTangents(u, value, kTempusZero))->setInterpolation(type);
+        curve.append(u, value, type);
     curve.state->preExtrapolation = curve.state->postExtrapolation = mode;
     curve.state->retimingExtrapolation = curve.state->parametric = retiming; // a frame is 1 then
     return Shown(curve);
@@ -343,9 +343,8 @@ TEST(KFChannelSegmentVisitor, FindsTheSameExtremesOfWildCurves) {
         for (int key = 0; key < 30; ++key) {
             double const value = isLevel ? plateaus[random() % 3] : between(-1.0, 1.0);
             Tempus const u = s(12 * key + static_cast<std::int64_t>(random() % 13), 24);
-            void* const vertex = curve->appendVertexNoTangents(u, value, kTempusZero);
             auto const type = museumSegmentTypes()[random() % museumSegmentTypes().size()];
-            curve->setVertexInterpolation(vertex, i % 4 == 3 ? type : i % 4 == 2 ? 6 : 4);
+            KFVertex* const vertex = curve.append(u, value, i % 4 == 3 ? type : i % 4 == 2 ? 6 : 4);
             double const rise = isLevel ? 0.0 : between(-1.0, 1.0);
             curve->setVertexInputHandles(vertex, -reach(), rise * between(0.0, 3.0), kTempusZero, true);
             curve->setVertexOutputHandles(vertex, reach(), rise * between(0.0, 3.0), kTempusZero, true);
