@@ -1,7 +1,7 @@
 // What every node of the tree does: flags, announcements, solo, copies, the route of time, IDs, reset callbacks.
 
-#include "lumenkey/Channels/KFChannelTimeConverter.h"
 #include "lumenkey/Channels/KFResetCallbackDataTable.h"
+#include "tests/Channels/LinearConverter.h"
 #include "tests/Channels/RecordingRoot.h"
 
 #include <gtest/gtest.h>
@@ -32,18 +32,6 @@ public:
     bool shouldIgnoreDynamicIDs() const override { return ignoresIDs; }
     bool isCompound = false;
     bool ignoresIDs = false;
-};
-
-/// Half the speed above, with a shift that tells which channel asked.
-class HalfSpeed : public KFChannelTimeConverter {
-public:
-    Tempus globalToLocalTime(KFChannelBase const* channel, Tempus const& t) const override {
-        return t * TempusMake(1, 2) + TempusMake(channel->getID(), 1);
-    }
-    Tempus localToGlobalTime(KFChannelBase const* channel, Tempus const& t) const override {
-        return (t - TempusMake(channel->getID(), 1)) * TempusMake(2, 1);
-    }
-    bool extentIsLocal() const override { return false; }
 };
 
 Tempus s(std::int64_t seconds) { return TempusMake(seconds, 1); }
@@ -205,11 +193,12 @@ TEST(KFChannelBase, RoutesTimeToTheNearestConverterOrRoot) {
         EXPECT_EQ(leaf.localToGlobalTime(local), s(30));
         EXPECT_EQ(leaf.getTimeOffset(), offset);
     };
-    HalfSpeed converter;
+    LinearConverter converter(TempusMake(1, 2), s(3));
     object.setTimeConverterDelegate(&converter); // a root doesn't ask its own
     expectRoute(s(20), s(10));
     folder.setTimeConverterDelegate(&converter);
     expectRoute(s(18), s(10)); // 30 / 2 + 3
+    EXPECT_EQ(converter.asked, &folder);
     folder.removeDescendant(&leaf);
     expectRoute(s(30), kTempusZero);
     EXPECT_TRUE(folder.getChannelRootBase() == &object && folder.getAncestorRootBase() == &world);

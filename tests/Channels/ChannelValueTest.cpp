@@ -1,11 +1,11 @@
 // Values of a channel over time: reading, writing with its announcements, limits, units, and fades.
 
-#include "lumenkey/Channels/KFChannelTimeConverter.h"
 #include "lumenkey/Channels/KFCompoundChannel.h"
 #include "lumenkey/Channels/KFScalarChannels.h"
 #include "lumenkey/curves/KFCurve.h"
 #include "tests/Channels/AddingNode.h"
 #include "tests/Channels/Animating.h"
+#include "tests/Channels/LinearConverter.h"
 #include "tests/Channels/RecordingRoot.h"
 
 #include <gtest/gtest.h>
@@ -34,24 +34,12 @@ struct Tree {
     }
 };
 
-/// Adds a second, and counts.
-class CountingConverter : public KFChannelTimeConverter {
-public:
-    Tempus globalToLocalTime(KFChannelBase const*, Tempus const& t) const override {
-        ++count;
-        return t + s(1);
-    }
-    Tempus localToGlobalTime(KFChannelBase const*, Tempus const& t) const override { return t - s(1); }
-    bool extentIsLocal() const override { return true; }
-    mutable int count = 0;
-};
-
 TEST(KFChannelValue, IsReadThroughTimeNodesAndFlags) {
-    CountingConverter converter;
+    LinearConverter converter(s(1), s(1));
     KFChannelDouble channel(3.0, "", nullptr, 1, 0);
     channel.setTimeConverterDelegate(&converter);
     EXPECT_EQ(channel.getValueAsDouble(s(1), 100.0), 3.0);
-    EXPECT_EQ(converter.count, 0) << "a constant doesn't ask for the time";
+    EXPECT_EQ(converter.asked, nullptr) << "a constant doesn't ask for the time";
 
     KFCurveNode* const node = new AddingNode(0.5);
     EXPECT_TRUE(channel.appendCurveProcessingNode(node));
@@ -216,7 +204,7 @@ TEST(KFChannelFades, ScaleTheValueAtTheEndsOfTheExtent) {
     channel.setFadeInOffset(s(20), false); // over the fade out, where it wins
     channel.setFadeInCurve(0);
     EXPECT_NEAR(channel.getFadeRatio(s(4)), 8.0 / 20.0, 1e-12);
-    CountingConverter converter;
+    LinearConverter converter(s(1), s(1));
     channel.setTimeConverterDelegate(&converter); // with the extent in local time
     EXPECT_NEAR(channel.getFadeRatio(s(4)), 3.0 / 20.0, 1e-12);
     root.removeDescendant(&channel);

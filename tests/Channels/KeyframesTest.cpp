@@ -1,9 +1,9 @@
 // Keyframes of a channel: walks and edits of ranges, gathering and pasting.
 
-#include "lumenkey/Channels/KFChannelTimeConverter.h"
 #include "lumenkey/Channels/KFScalarChannels.h"
 #include "lumenkey/splines/KFInterpolation.h"
 #include "tests/Channels/Keypoints.h"
+#include "tests/Channels/LinearConverter.h"
 #include "tests/Channels/RecordingRoot.h"
 
 #include <gtest/gtest.h>
@@ -50,24 +50,13 @@ TEST(KFChannelKeyframes, AreFoundAgainWhereConvertingTheirTimesRounds) {
     EXPECT_EQ(c.getKeyframeMinValue(false), 2.0);
 }
 
-/// A host's converter that holds the time, or lets it run backward.
-struct Held : KFChannelTimeConverter {
-    explicit Held(int speedIn) : speed(speedIn) {}
-    Tempus globalToLocalTime(KFChannelBase const*, Tempus const& t) const override { return t * speed; }
-    Tempus localToGlobalTime(KFChannelBase const*, Tempus const& t) const override {
-        return speed == 0 ? s(1) : t * speed;
-    }
-    bool extentIsLocal() const override { return false; }
-    int speed;
-};
-
 TEST(KFChannelKeyframes, AreWalkedToAnEndWhateverTheConverterDoes) {
     for (int const speed : {0, -1}) {
         Fixture f;
         KFChannelDouble forward("forward", &f.root, 3, 0);
         f.key({{1, 1.0}, {2, 2.0}, {3, 3.0}});
         forward.setKeyframe(s(2), 0.0, true);
-        Held converter(speed);
+        LinearConverter converter(s(speed)); // stands still, or runs backward
         f.channel.setTimeConverterDelegate(&converter);
         EXPECT_LE(f.root.keypoints({s(-4), s(9)}, true, 0).size(), 4u);
         EXPECT_LE(f.channel.keypoints({s(1), s(9)}, true, 0).size(), 4u);
