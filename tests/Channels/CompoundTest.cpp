@@ -62,14 +62,6 @@ TEST(KFCompoundChannel, EditsLinkedComponentsTogether) {
     EXPECT_EQ(point.compoundMoveKeypointTo(nullptr, s(1), s(2), false, false, true), s(2));
 }
 
-TEST(KFCompoundChannel, MovesTheOthersToWhereTheFirstCameToStand) {
-    Point point(nullptr, true);
-    point.x.addKeypointAt(s(1));
-    point.y.lock(true, true); // its keypoint stays
-    EXPECT_EQ(point.compoundMoveKeypointTo(&point.y, s(1), s(2), false, false, false), s(2));
-    EXPECT_EQ(point.keyed(s(1)), "xyz");
-}
-
 TEST(KFCompoundChannel, TakesOverTheEditsOfLinkedComponents) {
     Animating const animating;
     RecordingRoot root;

@@ -3,7 +3,8 @@
 #include "lumenkey/Channels/KFChannelFolder.h"
 #include "lumenkey/Channels/KFFactories.h"
 #include "lumenkey/Channels/KFScalarChannels.h"
-#include "lumenkey/foundation/BXHashWriteStream.h"
+#include "lumenkey/foundation/BXStream.h"
+#include "lumenkey/foundation/BXXMLWriteStream.h"
 
 #include <gtest/gtest.h>
 
@@ -80,13 +81,16 @@ TEST(KFFactories, MarksBecomeNumbersInTheOrderOfUUIDs) {
     KFFactory* const earlier = getKFChannelBool_FactoryBase(); // 0B00...
     later->setNeedsSaving(true);
     earlier->setNeedsSaving(true);
-    BXHashWriteStream nowhere;
-    registry().saveFactories(nowhere);
+    BXBufferWriteStream buffer(1024, 1024);
+    BXXMLWriteStream stream(buffer, 5, 13);
+    registry().saveFactories(stream);
     EXPECT_EQ(earlier->fileRefID(), 1U);
     EXPECT_EQ(later->fileRefID(), 2U);
     std::thread([&] { EXPECT_EQ(later->fileRefID(), 0U); }).join();
-    registry().saveFactories(nowhere); // nothing is marked any more
+    registry().saveFactories(stream); // nothing is marked any more
     EXPECT_EQ(later->fileRefID(), 0U);
+    stream.startElement(92);
+    EXPECT_FALSE(stream.close()) << "their scope goes with them";
 }
 
 TEST(KFFactories, NumbersOfADocumentBelongToTheThreadThatReadsIt) {

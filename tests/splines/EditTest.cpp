@@ -283,24 +283,6 @@ TEST_F(KFSplineEditFixture, OpensWhenTheLastVertexGoes) {
     }
 }
 
-TEST_F(KFSplineEditFixture, SuppressedVerticesCountAfterTheNextRefresh) {
-    KFVertex* const first = add(0, 0.0);
-    owner._suppressRefresh = true;
-    Tempus const u[] = {TempusMake(1, 1), TempusMake(2, 1)};
-    double const values[] = {1.0, 2.0};
-    auto const appended = spline.appendVertexesNoTangents(2, u, values, kTempusZero);
-    ASSERT_EQ(appended.size(), 2u);
-    EXPECT_EQ(spline.getNumberOfValidVertices(kTempusZero), 1u);
-    // One that moves keeps its part, wherever it goes.
-    EXPECT_TRUE(spline.setVertex(first, TempusMake(3, 2), 4.0, kTempusZero));
-    EXPECT_EQ(spline.getNumberOfValidVertices(kTempusZero), 1u);
-    EXPECT_EQ(spline.getVertexValue(TempusMake(9, 1), kTempusZero, false), 4.0);
-    owner._suppressRefresh = false;
-    // The next edit that ends with a refresh sees them all.
-    add(4, 9.0);
-    EXPECT_EQ(spline.getNumberOfValidVertices(kTempusZero), 4u);
-}
-
 // Each of these orders took minutes if one edit cost time in proportion to the vertices: 10^10 steps.
 TEST(KFSplineEdit, EditsHundredThousandVertices) {
     constexpr int count = 100000;

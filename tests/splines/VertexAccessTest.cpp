@@ -184,8 +184,15 @@ TEST_F(KFSplineAccessTest, SuppressedRefreshKeepsTheListOfValidVertices) {
     EXPECT_EQ(validCount(), 4u); // still listed
     EXPECT_FALSE(keys[3]->isEnabled(kTempusZero));
     curve->addVertexNoTangents(s(1, 2), 50.0, kTempusZero, false);
-    auto* const behind = static_cast<KFVertex*>(curve->addVertexNoTangents(s(9), 90.0, kTempusZero, false));
-    EXPECT_EQ(validCount(), 4u); // not yet listed
+    Tempus const end = s(9);
+    double const valueThere = 90.0;
+    void* const behind = curve->appendVertexesNoTangents(1, &end, &valueThere, kTempusZero).at(0);
+    EXPECT_EQ(validCount(), 4u);              // not yet listed
+    for (Tempus const& u : {s(1, 8), s(0)}) { // one that moves keeps its part, wherever it goes
+        EXPECT_TRUE(curve->setVertex(keys[0], u, 0.0, kTempusZero));
+        EXPECT_EQ(validCount(), 4u);
+        EXPECT_EQ(curve->getMinValueU(kTempusZero, true), u);
+    }
     EXPECT_EQ(curve->getMaxValueU(kTempusZero, true), s(3));
     EXPECT_TRUE(curve->isValidHandle(behind));
     void* handle = nullptr;
