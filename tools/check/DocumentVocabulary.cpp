@@ -1,8 +1,7 @@
 #include "tools/check/DocumentVocabulary.h"
 
-#include "tools/time/TimeFraction.h"
+#include "lumenkey/foundation/BXSerializerStreams.h"
 
-#include <charconv>
 #include <cmath>
 #include <limits>
 
@@ -77,28 +76,25 @@ constexpr DocumentWord kAttributes[] = {
     {"keypoint", "flags", TextKind::Whole, kOfAll, kMost32},
 };
 
-std::string_view trimmed(std::string_view text) {
-    constexpr std::string_view spaces = " \t\r\n";
-    std::size_t const first = text.find_first_not_of(spaces);
-    return first == std::string_view::npos ? std::string_view()
-                                           : text.substr(first, text.find_last_not_of(spaces) - first + 1);
-}
+/// A text that the library reads as it does that of an element.
+class GivenText : public BXStreamElement {
+public:
+    explicit GivenText(std::string_view text) : _text(text) {}
 
-template <class Number> std::optional<Number> readExactly(std::string_view text) {
-    Number number{};
-    auto const [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
-    return error == std::errc{} && end == text.data() + text.size() ? std::optional(number) : std::nullopt;
-}
+    std::uint32_t tag() const override { return 0; }
 
-/// What stands behind a mark, which is cut off with it; nothing where there is no such mark.
-std::optional<std::string_view> cutBehind(std::string_view& text, char mark) {
-    std::size_t const at = text.find(mark);
-    if (at == std::string_view::npos) {
-        return std::nullopt;
-    }
-    std::string_view const behind = text.substr(at + 1);
-    text = text.substr(0, at);
-    return behind;
+protected:
+    std::optional<std::string_view> text() const override { return _text; }
+    std::optional<std::string_view> attributeText(std::uint32_t) const override { return std::nullopt; }
+
+private:
+    std::string_view _text;
+};
+
+template <class Value>
+std::optional<Value> readAs(std::string_view text, bool (BXStreamElement::*read)(Value*) const) {
+    Value value{};
+    return (GivenText(text).*read)(&value) ? std::optional(value) : std::nullopt;
 }
 
 } // namespace
@@ -119,45 +115,19 @@ bool isBeyond(DocumentWord const& word, std::string_view text) {
 }
 
 std::optional<double> readNumber(std::string_view text) {
-    std::optional<double> const number = readExactly<double>(trimmed(text));
+    std::optional<double> const number = readAs(text, &BXStreamElement::getAsDouble);
     return number && std::isnan(*number) ? std::nullopt : number;
 }
 
-bool isStorable(std::string_view text) { return readExactly<double>(trimmed(text)).has_value(); }
+bool isStorable(std::string_view text) { return readAs(text, &BXStreamElement::getAsDouble).has_value(); }
 
 std::optional<std::uint64_t> readWhole(std::string_view text) {
-    return readExactly<std::uint64_t>(trimmed(text));
+    return readAs(text, &BXStreamElement::getAsUInt64);
 }
 
-std::optional<bool> readBool(std::string_view text) {
-    text = trimmed(text);
-    bool const isOn = text == "1" || text == "true";
-    return isOn || text == "0" || text == "false" ? std::optional(isOn) : std::nullopt;
-}
+std::optional<bool> readBool(std::string_view text) { return readAs(text, &BXStreamElement::getAsBool); }
 
-std::optional<Tempus> readTime(std::string_view text) {
-    text = trimmed(text);
-    std::optional<std::string_view> const flags = cutBehind(text, '#');
-    if (!flags && text.ends_with('~')) {
-        text.remove_suffix(1);
-    }
-    for (std::string_view const word : {"invalid", "indefinite", "+infinity", "-infinity"}) {
-        if (text == word && !flags) {
-            return kTempusInvalid;
-        }
-    }
-    std::optional<std::string_view> const epoch = cutBehind(text, '@');
-    if ((flags && !readExactly<std::uint32_t>(*flags)) || (epoch && !readExactly<std::int64_t>(*epoch))) {
-        return std::nullopt;
-    }
-    Tempus const time = timeFromFraction(text);
-    std::optional<std::string_view> const scale = cutBehind(text, '/');
-    if (flags) {
-        bool const isWhole = readExactly<std::int64_t>(text) && scale && readExactly<std::int32_t>(*scale);
-        return isWhole ? std::optional(kTempusInvalid) : std::nullopt;
-    }
-    return TempusIsNumeric(time) ? std::optional(time) : std::nullopt;
-}
+std::optional<Tempus> readTime(std::string_view text) { return readAs(text, &BXStreamElement::getAsTime); }
 
 bool canBeRead(std::string_view text, TextKind kind, bool countsFrames) {
     switch (kind) {

@@ -40,14 +40,14 @@ bool canBeRead(std::string_view text, TextKind kind, bool countsFrames);
 /// What such a text should have been: `a number`, and so on.
 std::string_view nameOfTextKind(TextKind kind);
 
+// What the library reads of a text; nothing where it takes it for none.
+
 /// Nothing for `nan` either, which lies within no limits.
 std::optional<double> readNumber(std::string_view text);
 /// Whether a curve takes it as a value: any number, and `nan`.
 bool isStorable(std::string_view text);
 std::optional<std::uint64_t> readWhole(std::string_view text);
 std::optional<bool> readBool(std::string_view text);
-/// A time in any of its forms, `VALUE/TIMESCALE@EPOCH#FLAGS` among them; those that aren't numbers as an
-/// invalid one.
 std::optional<Tempus> readTime(std::string_view text);
 
 } // namespace lumenkey::tools
