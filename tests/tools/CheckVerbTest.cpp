@@ -98,6 +98,67 @@ TEST_F(CheckVerbTest, FindsWhatIsOddWithItsPlace) {
          "12:1: the keypoint has no value: it is passed over\n"
          "13:1: the keypoint has no time: it counts as 0\n"
          "13:11: 'nan' is no number\n"},
+        // What a reader takes no notice of, or can't keep.
+        {"<parameter id=\"1\" factoryID=\"1\" default=\"3\">\nlost <![CDATA[too]]>\n<parameter id=\"2\" "
+         "factoryID=\"3\">\n<curve type=\"1\">\n  here<keypoint>\n&amp;<time>1/1</time><value>2</value>\n"
+         "</keypoint></curve>\n<curve/></parameter>\n<foldFlags>131073</foldFlags></parameter>and here",
+         "4:1: the attribute 'default' is none of a channel of the class Folder: it is passed over\n"
+         "5:1: text stands in the element 'parameter': it is passed over\n"
+         "8:3: text stands in the element 'curve': it is passed over\n"
+         "9:1: text stands in the element 'keypoint': it is passed over\n"
+         "11:1: the element 'curve' is here for the second time, where only one is kept\n"
+         "12:1: 'foldFlags' is 131073, but they become 1\n"
+         "12:42: text stands in the element 'kfml': it is passed over\n"},
+        {"<parameter id=\"1\" factoryID=\"3\" default=\"1\" value=\"2\" flags=\"6\">\n<flags>4160</flags>\n"
+         "<fadeInOffset>-1/2</fadeInOffset><fadeOutOffset>indefinite</fadeOutOffset>\n"
+         "<curve type=\"1\" default=\"1.0\" value=\"3\">\n<max>inf</max></curve></parameter>",
+         "4:1: 'flags' is 6, but the flags of the channel become 0\n"
+         "5:1: 'flags' is 4160, but the flags of the channel become 0\n"
+         "6:1: the fade is below 0: it counts as 0\n"
+         "7:1: the attribute 'value' is 3, which takes the place of that of the channel, 2\n"
+         "8:1: 'max' is inf, which isn't kept: it becomes that of the class, 1.7976931348623157e+308\n"},
+        {"<parameter id=\"1\" factoryID=\"3\"><curve "
+         "type=\"1\">\n<preExtrapolation>4294967297</preExtrapolation>"
+         "<keypoint interpolation=\"4294967297\">\n<time>1/1</time><time>2/1</time><value>2</value>\n"
+         "<value>3</value><bias>1.00000001</bias>\n<outputTangentTime>-1</outputTangentTime>"
+         "<outputTangentValue>1</outputTangentValue>\n<outputTangentTime>1</outputTangentTime></keypoint>\n"
+         "<keypoint enabled=\"0\"><time>3/1</time><value>1</value>"
+         "<outputTangentTime>0</outputTangentTime>\n<outputTangentValue>1e-9</outputTangentValue>"
+         "<normal>3</normal>\n<bias>2</bias></keypoint></curve></parameter>",
+         "5:1: the number 4294967297 is out of the limits of 'preExtrapolation', 0 to 4\n"
+         "5:48: the attribute 'interpolation' is 4294967297, which is out of the limits, 0 to 4294967295\n"
+         "6:17: the element 'time' is here for the second time, where only one is kept\n"
+         "7:1: a second value makes another keypoint\n"
+         "7:17: 'bias' is 1.00000001, which is kept as 1\n"
+         "8:1: the handle reaches to the wrong side of its keypoint: its time counts as 0\n"
+         "9:1: the element 'outputTangentTime' is here for the second time, where only one is kept\n"
+         "9:1: no 'outputTangentValue' stands behind 'outputTangentTime': it is passed over\n"
+         "11:1: 'outputTangentValue' is 1e-09, which is kept as no handle\n"
+         "12:1: 'bias' stands behind the output handle, which disables the keypoint: it is passed over\n"},
+        {"<factory id=\"0\" uuid=\" FDC1944B-2291-11D7-B1C3-00039389B702 \"/>\n"
+         "<factory id=\"6\" uuid=\"F112CFDE-0D76-11D7-83C8-000393670732\"/>\n"
+         "<factory id=\"7\" uuid=\"4B723EA5-2443-11D7-9C75-00039366FB58\"/>"
+         "<factory id=\"8\" uuid=\"0B00DE81-2292-11D7-AC3D-00039389B702\"/>\n<parameter id=\"1\">\n"
+         "<timing in=\"1/30@2\" out=\"5/30@1\"/><enabled>0</enabled>\n<baseFlags>36</baseFlags>"
+         "<flags>16</flags>\n<parameter name=\"A\" id=\"2\" factoryID=\"0\"/>\n"
+         "<parameter name=\"B\" id=\"3\" factoryID=\"6\"/>\n<parameter id=\"4\" factoryID=\"7\" value=\"3\">"
+         "<curve/></parameter>\n<parameter id=\"5\" factoryID=\"5\">\n"
+         "<parameter name=\"Width\" id=\"1\"/><parameter name=\"Y\" id=\"2\" factoryID=\"2\"/></parameter>\n"
+         "<parameter id=\"6\" factoryID=\"8\"><curve type=\"1\">\n<min>-5</min><keypoint><value>1</value>"
+         "<inputTangentValue>1</inputTangentValue></keypoint></curve></parameter></parameter>\n<parameter/>",
+         "8:1: 'out' is 1/6@1, but it becomes invalid\n"
+         "8:35: 'enabled' is 0, but the flags of the channel become 12304\n"
+         "9:1: 'baseFlags' is 36, but the flags of the channel become 12304\n"
+         "10:1: the channel 'A' is of factory 0, which stands for none: it is passed over\n"
+         "11:1: the channel 'B' is of factory 6, which makes no channels: it is passed over\n"
+         "12:1: the attribute 'value' is none of a channel of the class Base: it is passed over\n"
+         "12:43: the element 'curve' is none of a channel of the class Base: it is passed over\n"
+         "14:1: the channel 'X' is a part of its folder, which makes it: the name 'Width' is passed over\n"
+         "14:33: the channel 'Y' is a part of its folder, which makes it: the class Percent is passed over\n"
+         "16:1: 'min' is -5, which isn't kept: it becomes that of the class, 0\n"
+         "16:14: the keypoint has no time: it counts as 0\n"
+         "16:40: curves of this class have no handles: 'inputTangentValue' is passed over\n"
+         "17:1: a second channel: a document holds one, with all others inside it\n"},
     };
     for (auto const& each : cases) {
         EXPECT_EQ(findingsIn(documentOf("\n" + std::string(each.body))), each.findings);
@@ -116,6 +177,10 @@ TEST_F(CheckVerbTest, FindsWhatIsOddWithItsPlace) {
     EXPECT_LT(found.find("more than 990 elements deep"), found.find("mismatched tag"))
         << "not in the order of the text";
     EXPECT_EQ(findingsIn(contentOf(LUMENKEY_TEST_SOURCE_DIR "/tests/persistence/data/version2.lumen")), "");
+    EXPECT_EQ(findingsIn(documentOf("<parameter factoryID=\"3\"><fadeInOffset>1/2</fadeInOffset>\n"
+                                    "<fadeOutOffset>3</fadeOutOffset></parameter>",
+                                    "4.1")),
+              "4:1: '3' is no time\n");
     // Old also where spaces stand in front of the version.
     std::string const old = contentOf(LUMENKEY_TEST_SOURCE_DIR "/tests/persistence/data/version4.lumen");
     EXPECT_EQ(findingsIn(samples::replaced(old, "\"4.1\"", "\" 4.1\"")), "");

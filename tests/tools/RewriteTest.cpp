@@ -96,6 +96,13 @@ TEST_F(RewriteTest, LosesNothingUnlessForced) {
         {"<parameter name=\"P\" id=\"2\" factoryID=\"5\"><parameter name=\"X\" id=\"1\" "
          "factoryID=\"3\"><flags>8</flags></parameter></parameter>",
          "documents leave out the channel 'P.X'"},
+        {"\nlost", "5:1: text stands in the element 'parameter'"},
+        {curved("type=\"1\"", keypoint("0/1", "1") + "\n<closed>1</closed><closed>1</closed>"),
+         "5:19: the element 'closed' is here for the second time"},
+        {"\n<parameter id=\"2\" factoryID=\"3\" flags=\"2\"><flags>16</flags></parameter>",
+         "5:1: 'flags' is 2, but the flags of the channel become 16"},
+        {"\n<parameter id=\"2\" factoryID=\"3\"><fadeInOffset>-infinity</fadeInOffset></parameter>",
+         "5:34: the fade is below 0"},
         // Odd, but it stays.
         {"<parameter id=\"2\" factoryID=\"2\"><curve type=\"1\" default=\"3\" "
          "value=\"2\"><keypoint><time>0/1</time>"

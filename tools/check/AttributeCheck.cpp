@@ -1,7 +1,9 @@
 #include "tools/check/AttributeCheck.h"
 
+#include "tools/check/ClassExamples.h"
 #include "tools/check/DocumentVocabulary.h"
 #include "tools/import/DocumentFile.h"
+#include "tools/tree/ChannelClass.h"
 
 #include <algorithm>
 #include <utility>
@@ -47,28 +49,51 @@ bool isKnown(std::string_view element, std::string_view name) {
 
 } // namespace
 
-std::vector<AttributeFault> faultsOfAttributes(std::string_view element, Attributes const& attributes,
-                                               CurveLimits const& limits, bool countsFrames) {
-    std::vector<AttributeFault> faults;
+std::vector<Fault> faultsOfAttributes(std::string_view element, Attributes const& attributes,
+                                      CurveLimits const& limits, KFFactory* factory, bool countsFrames) {
+    std::vector<Fault> faults;
     for (auto const& [name, value] : attributes) {
         if (!isKnown(element, name)) {
             faults.push_back(
-                {"the attribute '" + std::string(name) + "' is unknown here: it is passed over", false});
+                {"the attribute '" + std::string(name) + "' is unknown here: it is passed over"});
         }
     }
     for (DocumentWord const& attribute : documentAttributes()) {
-        if (auto const found = attributes.find(attribute.name);
-            attribute.parent == element && found != attributes.end()) {
-            // Curves store numbers out of their limits, and bring them within when they are read.
-            bool const isKept = attribute.text == TextKind::Number && isStorable(found->second);
-            faults.push_back({faultOfText(attribute, found->second, limits, countsFrames), isKept});
+        auto const found = attributes.find(attribute.name);
+        if (attribute.parent != element || found == attributes.end()) {
+            continue;
         }
+        if (factory != nullptr && (attribute.classes & ownersOf(*factory)) == 0) {
+            faults.push_back({faultOfOwner("attribute", attribute.name, *factory)});
+            continue;
+        }
+        // Curves store numbers out of their limits, and bring them within when they are read.
+        bool const isKept = attribute.text == TextKind::Number && isStorable(found->second);
+        faults.push_back({faultOfText(attribute, found->second, limits, countsFrames), isKept});
     }
     if (auto const version = attributes.find("version");
         (element == "kfml" || element == "kfdoc") && version != attributes.end()) {
         faults.push_back({faultOfVersion(version->second), true});
     }
     return faults;
+}
+
+std::vector<Fault> faultsOfCurveInChannel(Attributes const& curve, Attributes const& channel) {
+    std::vector<Fault> faults;
+    for (std::string_view const name : {"default", "value"}) {
+        std::string_view const own = attributeOf(curve, name);
+        std::string_view const other = attributeOf(channel, name);
+        if (isStorable(own) && isStorable(other) && readNumber(own) != readNumber(other)) {
+            faults.push_back({"the attribute '" + std::string(name) + "' is " + std::string(own) +
+                              ", which takes the place of that of the channel, " + std::string(other)});
+        }
+    }
+    return faults;
+}
+
+std::string faultOfOwner(std::string_view kind, std::string_view name, KFFactory& factory) {
+    return "the " + std::string(kind) + " '" + std::string(name) + "' is none of a channel of the class " +
+           shortClassName(classNameOf(factory)) + ": it is passed over";
 }
 
 } // namespace lumenkey::tools

@@ -11,7 +11,10 @@ unsigned ownersOf(KFFactory& factory) {
     if (factory.isKindOfClass(KFChannelObjectRootBase_Factory::getInstance().uuid())) {
         return kOfRoots;
     }
-    return factory.isKindOfClass(KFChannelFolder_Factory::getInstance().uuid()) ? kOfFolders : kOfValues;
+    if (factory.isKindOfClass(KFChannelFolder_Factory::getInstance().uuid())) {
+        return kOfFolders;
+    }
+    return factory.isKindOfClass(KFChannel_Factory::getInstance().uuid()) ? kOfValues : kOfOthers;
 }
 
 KFChannelBase* ClassExamples::of(KFFactory* factory) {
@@ -22,11 +25,9 @@ KFChannelBase* ClassExamples::of(KFFactory* factory) {
     return place->second.get();
 }
 
-KFFactory* ClassExamples::componentOf(KFFactory* factory, std::uint64_t id) {
+KFChannelBase const* ClassExamples::componentOf(KFFactory* factory, std::uint64_t id) {
     auto const* const folder = dynamic_cast<KFChannelFolder const*>(of(factory));
-    KFChannelBase const* const component =
-        folder == nullptr ? nullptr : folder->getDescendant(static_cast<unsigned>(id));
-    return component == nullptr ? nullptr : component->getFactory();
+    return folder == nullptr ? nullptr : folder->getDescendant(static_cast<unsigned>(id));
 }
 
 } // namespace lumenkey::tools

@@ -17,8 +17,8 @@ class ClassExamples {
 public:
     /// It lives as long as this; null for a class that makes none, and for null.
     KFChannelBase* of(KFFactory* factory);
-    /// The class of the child with that ID which a class makes for itself; null for none.
-    KFFactory* componentOf(KFFactory* factory, std::uint64_t id);
+    /// The child with that ID which a class makes for itself; null for none.
+    KFChannelBase const* componentOf(KFFactory* factory, std::uint64_t id);
 
 private:
     std::map<KFFactory*, std::unique_ptr<KFChannelBase>> _examples;

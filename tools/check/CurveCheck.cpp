@@ -10,14 +10,16 @@
 
 namespace lumenkey::tools {
 
-CurveLimits limitsOf(KFChannelBase* channel) {
-    CurveLimits limits;
+CurveClass curveClassOf(KFChannelBase* channel) {
+    CurveClass made;
     if (channel != nullptr && channel->isValueChannel()) {
         KFCurve& curve = *static_cast<KFChannel&>(*channel).getCurveInterface();
-        curve.getAbsoluteMinValueV(&limits.low);
-        curve.getAbsoluteMaxValueV(&limits.high);
+        curve.getAbsoluteMinValueV(&made.limits.low);
+        curve.getAbsoluteMaxValueV(&made.limits.high);
+        made.hasWrittenLimits = !curve.isCurveBoolean();
+        made.derivesTangents = curve.isCurveDeriveTangents();
     }
-    return limits;
+    return made;
 }
 
 std::string faultOfNumber(std::string_view text, CurveLimits const& limits) {
@@ -32,11 +34,15 @@ std::string faultOfNumber(std::string_view text, CurveLimits const& limits) {
     return {};
 }
 
-std::string faultOfParts(bool hasTime, bool hasValue) {
-    if (!hasValue) {
-        return "the keypoint has no value: it is passed over";
-    }
-    return hasTime ? "" : "the keypoint has no time: it counts as 0";
+std::string faultOfLimit(std::string_view name, double limit, CurveClass const& curve) {
+    CurveLimits const none;
+    bool const isLeast = name == "min";
+    bool const isWritten = curve.hasWrittenLimits && (isLeast ? limit > none.low : limit < none.high);
+    double const own = isLeast ? curve.limits.low : curve.limits.high;
+    return isWritten || limit == own
+               ? ""
+               : "'" + std::string(name) + "' is " + shortestText(limit) +
+                     ", which isn't kept: it becomes that of the class, " + shortestText(own);
 }
 
 std::string faultOfInterpolation(Attributes const& attributes) {
@@ -45,6 +51,9 @@ std::string faultOfInterpolation(Attributes const& attributes) {
         return {};
     }
     std::optional<std::uint64_t> const type = readWhole(found->second);
+    if (type > std::numeric_limits<std::uint32_t>::max()) {
+        return {}; // told as out of the limits of the attribute
+    }
     if (!type || interpolationName(static_cast<std::uint32_t>(*type)).starts_with("bezier (")) {
         return "the interpolation '" + std::string(found->second) + "' is unknown: it counts as Bezier";
     }

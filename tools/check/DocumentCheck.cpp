@@ -1,14 +1,13 @@
 #include "tools/check/DocumentCheck.h"
 
-#include "lumenkey/Channels/KFChannelFactories.h"
-#include "lumenkey/Channels/KFFactories.h"
 #include "lumenkey/persistence/KFDocumentVersion.h"
 #include "tools/check/AttributeCheck.h"
-#include "tools/check/ClassExamples.h"
 #include "tools/check/CurveCheck.h"
+#include "tools/check/DocumentClasses.h"
 #include "tools/check/DocumentVocabulary.h"
+#include "tools/check/FlagsCheck.h"
+#include "tools/check/KeypointCheck.h"
 #include "tools/output/TextForms.h"
-#include "tools/tree/ChannelClass.h"
 
 #include <algorithm>
 #include <limits>
@@ -27,11 +26,18 @@ struct OpenElement {
     DocumentWord const* word = nullptr;
     TextPlace place;
     std::string text;
+    /// Its parts so far, but for those of which there may be several.
+    std::vector<DocumentWord const*> parts;
+    /// Whether text that is passed over has been told, and nothing has ended it.
+    bool isInStrayText = false;
     /// Of a channel: its class, or null; and those of its children so far, by ID.
     KFFactory* factory = nullptr;
     std::map<std::uint64_t, KFFactory*> children;
-    /// Of a curve. What its attributes may be is known at its end.
+    std::optional<FlagsCheck> flags;
+    /// Of a channel or a curve. What those of a curve may be is known at its end.
     std::vector<std::pair<std::string, std::string>> attributes;
+    /// Of a curve.
+    CurveClass curveClass;
     CurveLimits limits;
     bool hasKeypoints = false;
     /// As from the first keypoint on, or from their number.
@@ -39,12 +45,12 @@ struct OpenElement {
     Tempus lastTime = kTempusInvalid;
     /// Where the last of the limits stands.
     TextPlace limitPlace;
-    /// Of a keypoint.
-    bool hasTime = false;
-    bool hasValue = false;
-    bool isDisabled = false;
-    bool hasOutput = false;
+    std::optional<KeypointCheck> keypoint;
+
+    Attributes attributeViews() const { return {attributes.begin(), attributes.end()}; }
 };
+
+bool isBlank(std::string_view text) { return text.find_first_not_of(" \t\r\n") == std::string_view::npos; }
 
 /// The check of one document.
 class Checker : public DocumentScanner {
@@ -70,6 +76,13 @@ private:
         }
     }
 
+    void tell(TextPlace const& place, Fault const& fault) { tell({place, fault.what, !fault.isKept}); }
+    void tell(std::vector<std::pair<TextPlace, Fault>> const& faults) {
+        for (auto const& [place, fault] : faults) {
+            tell(place, fault);
+        }
+    }
+
     void fault(TextPlace const& place, std::string_view what) override { find(place, std::string(what)); }
 
     // --- Elements ---
@@ -79,6 +92,7 @@ private:
             ++_skipped;
             return;
         }
+        _open.back().isInStrayText = false;
         OpenElement element;
         element.name = name;
         element.place = place;
@@ -87,12 +101,26 @@ private:
             _skipped = 1;
             return;
         }
-        if (element.name == "curve") {
+        findRepeated(element);
+        if (element.name == "curve" || element.name == "parameter") {
             element.attributes.assign(attributes.begin(), attributes.end());
-        } else {
+        }
+        if (element.name != "curve") {
             checkAttributes(element, attributes);
         }
         _open.push_back(std::move(element));
+    }
+
+    void findRepeated(OpenElement const& element) {
+        std::vector<DocumentWord const*>& parts = _open.back().parts;
+        if (element.word->isRepeated) {
+            return;
+        }
+        if (std::find(parts.begin(), parts.end(), element.word) != parts.end()) {
+            find(element.place,
+                 "the element '" + element.name + "' is here for the second time, where only one is kept");
+        }
+        parts.push_back(element.word);
     }
 
     bool isTaken(OpenElement const& element) {
@@ -103,8 +131,7 @@ private:
         KFFactory* const factory = _open.back().factory;
         if (element.word->parent == "parameter" && factory != nullptr &&
             (element.word->classes & ownersOf(*factory)) == 0) {
-            find(element.place, "the element '" + element.name + "' is none of a channel of the class " +
-                                    shortClassName(classNameOf(*factory)) + ": it is passed over");
+            find(element.place, faultOfOwner("element", element.name, *factory));
             return false;
         }
         return true;
@@ -118,13 +145,18 @@ private:
             KFReadVersion(attributeOf(attributes, "version"), major, minor);
             _countsFrames = major < firstWithTimes;
         } else if (element.name == "factory") {
-            checkFactory(element, attributes);
+            for (Fault const& fault : _classes.readFactory(attributes)) {
+                tell(element.place, fault);
+            }
         } else if (element.name == "parameter") {
             return isSoundChannel(element, attributes);
         } else if (element.name == "curve") {
-            element.limits = limitsOf(_examples.of(_open.back().factory));
+            element.curveClass = curveClassOf(_classes.of(_open.back().factory));
+            element.limits = element.curveClass.limits;
+        } else if (element.name == "timing" && !_countsFrames) {
+            tell(element.place, faultOfTiming(*_classes.of(_open.back().factory), attributes));
         } else if (element.name == "keypoint") {
-            element.isDisabled = readBool(attributeOf(attributes, "enabled")) == false;
+            element.keypoint.emplace(attributes, _open.back().curveClass, _countsFrames);
             tell({element.place, faultOfInterpolation(attributes),
                   !readWhole(attributeOf(attributes, "interpolation"))});
         }
@@ -133,71 +165,56 @@ private:
 
     void checkAttributes(OpenElement const& element, Attributes const& attributes) {
         CurveLimits const limits =
-            element.name == "parameter" ? limitsOf(_examples.of(element.factory)) : element.limits;
-        for (AttributeFault& fault : faultsOfAttributes(element.name, attributes, limits, _countsFrames)) {
-            tell({element.place, std::move(fault.what), !fault.isKept});
-        }
-    }
-
-    void checkFactory(OpenElement const& element, Attributes const& attributes) {
-        std::optional<std::uint64_t> const number = readWhole(attributeOf(attributes, "id"));
-        std::string const uuidText(attributeOf(attributes, "uuid"));
-        BXUUID uuid;
-        if (!number || *number > std::numeric_limits<std::uint32_t>::max() ||
-            !BXUUID::fromText(uuidText, &uuid)) {
-            find(element.place, "a factory needs an 'id', which is a whole number, and a 'uuid'");
-            return;
-        }
-        KFFactory* const factory = KFFactories::getInstance().findFactory(uuid);
-        if (auto const [before, isNew] = _factories.try_emplace(*number, factory); !isNew) {
-            find(element.place, "the factory has the id " + std::to_string(*number) + " of one before it" +
-                                    (factory == nullptr ? "" : ", whose place it takes"));
-            before->second = factory == nullptr ? before->second : factory;
-        }
-        if (factory == nullptr) {
-            // A channel of it is a loss of its own.
-            findKept(element.place, "the class " + uuidText + " is unknown: its channels are passed over");
+            element.name == "parameter" ? curveClassOf(_classes.of(element.factory)).limits : element.limits;
+        for (Fault const& fault :
+             faultsOfAttributes(element.name, attributes, limits, element.factory, _countsFrames)) {
+            tell(element.place, fault);
         }
     }
 
     bool isSoundChannel(OpenElement& element, Attributes const& attributes) {
         OpenElement& above = _open.back();
+        bool const isTop = above.factory == nullptr;
         std::string const name = "the channel '" + std::string(attributeOf(attributes, "name")) + "'";
         std::uint64_t const id = readWhole(attributeOf(attributes, "id")).value_or(0);
+        if (isTop && !above.children.empty()) {
+            find(element.place, "a second channel: a document holds one, with all others inside it");
+            return false;
+        }
         if (auto const before = above.children.find(id); before != above.children.end()) {
             find(element.place,
                  name + " has the ID " + std::to_string(id) + " of one before it: it is read into that one");
             element.factory = before->second;
-            return true;
-        }
-        std::optional<std::uint64_t> const number = readWhole(attributeOf(attributes, "factoryID"));
-        if (KFFactory* const component = _examples.componentOf(above.factory, id)) {
-            element.factory = component;
-        } else if (number) {
-            auto const found = _factories.find(*number);
-            element.factory = found == _factories.end() ? nullptr : found->second;
-            if (element.factory == nullptr) {
-                find(element.place,
-                     name + " is of factory " + std::to_string(*number) +
-                         (found == _factories.end() ? ", which isn't listed" : ", which is unknown") +
-                         ": it is passed over");
-                return false;
-            }
-        } else if (above.word != nullptr && above.word->name == "parameter") {
-            find(element.place, name + " names no class: it is passed over");
+        } else if (KFChannelBase const* const component = _classes.componentOf(above.factory, id)) {
+            element.factory = component->getFactory();
+            find(element.place, _classes.faultOfComponent(*component, attributes));
+        } else if (std::string const fault = _classes.faultOfClass(attributes, isTop, &element.factory);
+                   !fault.empty()) {
+            find(element.place, name + fault + ": it is passed over");
             return false;
-        } else {
-            element.factory = &KFChannelObjectRootBase_Factory::getInstance();
         }
         above.children[id] = element.factory;
+        element.flags.emplace(*_classes.of(element.factory));
+        if (std::optional<std::uint64_t> const flags = readWhole(attributeOf(attributes, "flags"))) {
+            element.flags->readAttribute(element.place, *flags);
+        }
         return true;
     }
 
     // --- Texts ---
 
-    void text(std::string_view more) override {
-        if (_skipped == 0 && _open.back().word != nullptr && _open.back().word->text != TextKind::None) {
-            _open.back().text += more;
+    void text(TextPlace const& place, std::string_view more) override {
+        OpenElement& element = _open.back();
+        if (_skipped > 0 || element.word == nullptr) {
+            return;
+        }
+        if (element.word->text != TextKind::None) {
+            element.text += more;
+        } else if (!element.isInStrayText && !isBlank(more)) {
+            element.isInStrayText = true;
+            std::size_t const blanks = more.find_first_not_of(" \t\r\n");
+            find({place.line, place.column + blanks},
+                 "text stands in the element '" + element.name + "': it is passed over");
         }
     }
 
@@ -208,44 +225,63 @@ private:
         }
         OpenElement const element = std::move(_open.back());
         _open.pop_back();
-        _open.back().hasTime |= element.name == "time";
-        _open.back().hasOutput |= element.name == "outputTangentValue";
-        bool const comesTooEarly = isSpentOnValue(element) && !_open.back().hasValue;
-        _open.back().hasValue |= element.name == "value";
-        if (!canBeRead(element.text, element.word->text, _countsFrames)) {
+        OpenElement& above = _open.back();
+        above.isInStrayText = false;
+        bool const isReadable = canBeRead(element.text, element.word->text, _countsFrames);
+        if (!isReadable) {
             bool const isKept = element.name == "value" && isStorable(element.text);
             tell({element.place,
                   "'" + element.text + "' is " + std::string(nameOfTextKind(element.word->text)), !isKept});
-            return;
         }
-        if (comesTooEarly) {
-            find(element.place,
-                 "'" + element.name + "' stands in front of the value, where it comes too early");
+        if (above.keypoint) {
+            tell(element.place,
+                 above.keypoint->faultOfPart(element.place, element.name, element.text, isReadable));
         }
+        if (isReadable) {
+            endReadable(element);
+        }
+    }
+
+    void endReadable(OpenElement const& element) {
         if (isBeyond(*element.word, element.text)) {
-            // Curves keep such numbers.
+            // Curves keep such numbers as far as they have room for them; how many keypoints are promised
+            // doesn't matter.
+            bool const hasRoom = readWhole(element.text) <= std::numeric_limits<std::uint32_t>::max();
+            bool const isKept =
+                element.word->parent == "curve" && (hasRoom || element.name == "numberOfKeypoints");
             tell({element.place,
                   "the number " + element.text + " is out of the limits of '" + element.name + "', 0 to " +
                       std::to_string(element.word->greatest),
-                  element.word->parent != "curve"});
+                  !isKept});
         } else if (element.word->parent == "curve") {
             endPartOfCurve(element);
         } else if (element.word->parent == "keypoint") {
             endPartOfKeypoint(element);
         } else if (element.name == "curve") {
             endCurve(element);
+        } else if (element.name == "parameter") {
+            tell(element.flags->faultsAtEnd());
+        } else if (element.word->parent == "parameter") {
+            endPartOfChannel(element);
         }
     }
 
-    /// Whether the keypoint must be there, which its value makes. Times of handles wait for their values.
-    static bool isSpentOnValue(OpenElement const& element) {
-        return element.word->parent == "keypoint" && element.name != "time" && element.name != "value" &&
-               element.name != "inputTangentTime" && element.name != "outputTangentTime";
+    void endPartOfChannel(OpenElement const& element) {
+        OpenElement& channel = _open.back();
+        channel.flags->readElement(element.place, element.name, element.text);
+        if (element.name == "foldFlags") {
+            tell(element.place, faultOfFoldFlags(*_classes.of(channel.factory), element.text));
+        } else if (element.word->text == TextKind::Length && *readTime(element.text) < kTempusZero) {
+            find(element.place, "the fade is below 0: it counts as 0");
+        }
     }
 
     void endCurve(OpenElement const& curve) {
-        Attributes const attributes(curve.attributes.begin(), curve.attributes.end());
+        Attributes const attributes = curve.attributeViews();
         checkAttributes(curve, attributes);
+        for (Fault const& fault : faultsOfCurveInChannel(attributes, _open.back().attributeViews())) {
+            tell(curve.place, fault);
+        }
         if (curve.hasKeypoints && readWhole(attributeOf(attributes, "type")).value_or(0) == 0) {
             find(curve.place, "the curve is a constant: its keypoints are passed over");
         }
@@ -258,16 +294,14 @@ private:
     void endPartOfCurve(OpenElement const& element) {
         OpenElement& curve = _open.back();
         if (element.name == "min" || element.name == "max") {
-            (element.name == "min" ? curve.limits.low : curve.limits.high) = *readNumber(element.text);
+            double const limit = *readNumber(element.text);
+            (element.name == "min" ? curve.limits.low : curve.limits.high) = limit;
             curve.limitPlace = element.place;
+            find(element.place, faultOfLimit(element.name, limit, curve.curveClass));
         } else if (element.name == "keypoint") {
             curve.hasKeypoints = true;
             curve.canBeClosed = true;
-            tell({element.place, faultOfParts(element.hasTime, element.hasValue), !element.hasValue});
-            if (element.isDisabled && element.hasValue && !element.hasOutput) {
-                find(element.place,
-                     "the keypoint is disabled but has no output handle: it comes back enabled");
-            }
+            tell(element.keypoint->faultsAtEnd(element.place));
         } else if (element.name == "numberOfKeypoints") {
             curve.canBeClosed = true;
             find(element.place,
@@ -278,16 +312,11 @@ private:
     }
 
     void endPartOfKeypoint(OpenElement const& element) {
-        OpenElement& keypoint = _open.back();
-        OpenElement& curve = _open[_open.size() - 2];
         if (element.name == "value") {
-            findKept(element.place, faultOfNumber(element.text, curve.limits));
-        } else if (element.name == "time") {
-            if (keypoint.hasValue) {
-                find(element.place, "the time stands behind the value, where it comes too late");
-            } else {
-                findKept(element.place, faultOfOrder(element.text, _countsFrames, curve.lastTime));
-            }
+            findKept(element.place, faultOfNumber(element.text, _open[_open.size() - 2].limits));
+        } else if (element.name == "time" && !_open.back().keypoint->hasValue()) {
+            findKept(element.place,
+                     faultOfOrder(element.text, _countsFrames, _open[_open.size() - 2].lastTime));
         }
     }
 
@@ -295,8 +324,7 @@ private:
     /// How many elements are open in one that is passed over, itself counted.
     std::size_t _skipped = 0;
     std::vector<OpenElement> _open;
-    std::map<std::uint64_t, KFFactory*> _factories;
-    ClassExamples _examples;
+    DocumentClasses _classes;
     std::vector<DocumentFinding> _findings;
 };
 

@@ -29,7 +29,9 @@ public:
             },
             [](void* self, char const*) { guard(self, [](Run& run) { run._scanner.end(); }); });
         XML_SetCharacterDataHandler(_parser.get(), [](void* self, char const* text, int size) {
-            guard(self, [&](Run& run) { run._scanner.text({text, static_cast<std::size_t>(size)}); });
+            guard(self, [&](Run& run) {
+                run._scanner.text(run.place(), {text, static_cast<std::size_t>(size)});
+            });
         });
         XML_SetStartDoctypeDeclHandler(
             _parser.get(), [](void* self, char const*, char const*, char const*, int) {

@@ -37,7 +37,8 @@ protected:
 
     virtual void start(TextPlace const& place, std::string_view name, Attributes const& attributes) = 0;
     virtual void end() = 0;
-    virtual void text(std::string_view more) = 0;
+    /// A stretch of one that stands in one line at most.
+    virtual void text(TextPlace const& place, std::string_view more) = 0;
     /// What ends the scan: text that is no XML, or a document type declaration, which is refused.
     virtual void fault(TextPlace const& place, std::string_view what) = 0;
 

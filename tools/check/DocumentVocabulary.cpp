@@ -4,6 +4,7 @@
 
 #include <cmath>
 #include <limits>
+#include <memory>
 
 namespace lumenkey::tools {
 
@@ -17,21 +18,21 @@ constexpr std::uint64_t kLastCurveType = 1;
 constexpr DocumentWord kElements[] = {
     {"", "kfml"},
     {"", "kfdoc"},
-    {"kfml", "factory"},
-    {"kfml", "parameter"},
-    {"factory", "description", TextKind::Any},
-    {"factory", "manufacturer", TextKind::Any},
-    {"factory", "version", TextKind::Number},
+    {.parent = "kfml", .name = "factory", .isRepeated = true},
+    {.parent = "kfml", .name = "parameter", .isRepeated = true},
+    {"factory", "description", TextKind::Any, kOfAll, UINT64_MAX, true},
+    {"factory", "manufacturer", TextKind::Any, kOfAll, UINT64_MAX, true},
+    {"factory", "version", TextKind::Number, kOfAll, UINT64_MAX, true},
     {"parameter", "flags", TextKind::Whole},
-    {"parameter", "parameter", TextKind::None, kOfFolders | kOfRoots},
+    {"parameter", "parameter", TextKind::None, kOfFolders | kOfRoots, UINT64_MAX, true},
     {"parameter", "foldFlags", TextKind::Whole, kOfFolders | kOfRoots, kMost32},
     {"parameter", "timing", TextKind::None, kOfRoots},
     {"parameter", "baseFlags", TextKind::Whole, kOfRoots},
     {"parameter", "enabled", TextKind::Bool, kOfRoots},
     {"parameter", "locked", TextKind::Bool, kOfRoots},
     {"parameter", "curve", TextKind::None, kOfValues},
-    {"parameter", "fadeInOffset", TextKind::Time, kOfValues},
-    {"parameter", "fadeOutOffset", TextKind::Time, kOfValues},
+    {"parameter", "fadeInOffset", TextKind::Length, kOfValues},
+    {"parameter", "fadeOutOffset", TextKind::Length, kOfValues},
     {"parameter", "fadeInCurve", TextKind::Whole, kOfValues, kLastFadeCurve},
     {"parameter", "fadeOutCurve", TextKind::Whole, kOfValues, kLastFadeCurve},
     {"curve", "numberOfKeypoints", TextKind::Whole, kOfAll, kMost32},
@@ -39,10 +40,10 @@ constexpr DocumentWord kElements[] = {
     {"curve", "max", TextKind::Number},
     {"curve", "preExtrapolation", TextKind::Whole, kOfAll, kLastExtrapolation},
     {"curve", "postExtrapolation", TextKind::Whole, kOfAll, kLastExtrapolation},
-    {"curve", "closed", TextKind::Switch},
-    {"curve", "keypoint"},
+    {"curve", "closed", TextKind::Switch, kOfAll, kMost32},
+    {.parent = "curve", .name = "keypoint", .isRepeated = true},
     {"keypoint", "time", TextKind::Time},
-    {"keypoint", "value", TextKind::Number},
+    {"keypoint", "value", TextKind::Number, kOfAll, UINT64_MAX, true},
     {"keypoint", "bias", TextKind::Number},
     {"keypoint", "normal", TextKind::Number},
     {"keypoint", "inputTangentTime", TextKind::Number},
@@ -60,8 +61,8 @@ constexpr DocumentWord kAttributes[] = {
     {"parameter", "id", TextKind::Whole, kOfAll, kMost32},
     {"parameter", "factoryID", TextKind::Whole, kOfAll, kMost32},
     {"parameter", "flags", TextKind::Whole},
-    {"parameter", "default", TextKind::Number},
-    {"parameter", "value", TextKind::Number},
+    {"parameter", "default", TextKind::Number, kOfValues},
+    {"parameter", "value", TextKind::Number, kOfValues},
     {"timing", "in", TextKind::Time},
     {"timing", "out", TextKind::Time},
     {"timing", "offset", TextKind::Time},
@@ -71,12 +72,12 @@ constexpr DocumentWord kAttributes[] = {
     {"curve", "parametric", TextKind::Bool},
     {"curve", "round", TextKind::Bool},
     {"curve", "retimingExtrapolation", TextKind::Bool},
-    {"keypoint", "interpolation", TextKind::Any},
+    {"keypoint", "interpolation", TextKind::Any, kOfAll, kMost32},
     {"keypoint", "enabled", TextKind::Bool},
     {"keypoint", "flags", TextKind::Whole, kOfAll, kMost32},
 };
 
-/// A text that the library reads as it does that of an element.
+/// A text that the library reads as it does that of an element, or of an attribute.
 class GivenText : public BXStreamElement {
 public:
     explicit GivenText(std::string_view text) : _text(text) {}
@@ -85,7 +86,7 @@ public:
 
 protected:
     std::optional<std::string_view> text() const override { return _text; }
-    std::optional<std::string_view> attributeText(std::uint32_t) const override { return std::nullopt; }
+    std::optional<std::string_view> attributeText(std::uint32_t) const override { return _text; }
 
 private:
     std::string_view _text;
@@ -111,7 +112,7 @@ DocumentWord const* documentElement(std::string_view parent, std::string_view na
 std::span<DocumentWord const> documentAttributes() { return kAttributes; }
 
 bool isBeyond(DocumentWord const& word, std::string_view text) {
-    return word.text == TextKind::Whole && readWhole(text).value_or(0) > word.greatest;
+    return readWhole(text).value_or(0) > word.greatest;
 }
 
 std::optional<double> readNumber(std::string_view text) {
@@ -127,6 +128,11 @@ std::optional<std::uint64_t> readWhole(std::string_view text) {
 
 std::optional<bool> readBool(std::string_view text) { return readAs(text, &BXStreamElement::getAsBool); }
 
+std::optional<BXUUID> readUUID(std::string_view text) {
+    std::unique_ptr<BXUUID const> const uuid(GivenText(text).getAttributeAsUUID(0));
+    return uuid ? std::optional(*uuid) : std::nullopt;
+}
+
 std::optional<Tempus> readTime(std::string_view text) { return readAs(text, &BXStreamElement::getAsTime); }
 
 bool canBeRead(std::string_view text, TextKind kind, bool countsFrames) {
@@ -139,6 +145,8 @@ bool canBeRead(std::string_view text, TextKind kind, bool countsFrames) {
         return readWhole(text).has_value();
     case TextKind::Number:
         return readNumber(text).has_value();
+    case TextKind::Length:
+        return readTime(text).has_value();
     case TextKind::Time:
         return countsFrames ? readNumber(text).has_value() : readTime(text).has_value();
     default:
@@ -154,6 +162,7 @@ std::string_view nameOfTextKind(TextKind kind) {
     case TextKind::Whole:
         return "no whole number";
     case TextKind::Time:
+    case TextKind::Length:
         return "no time";
     default:
         return "no number";

@@ -1,5 +1,6 @@
 #pragma once
 
+#include "lumenkey/foundation/BXUUID.h"
 #include "lumenkey/foundation/Tempus.h"
 
 #include <cstdint>
@@ -9,10 +10,11 @@
 
 namespace lumenkey::tools {
 
-enum class TextKind { None, Any, Bool, Whole, Number, Time, Switch };
+/// A length of time is one in all documents, where others may be numbers of frames.
+enum class TextKind { None, Any, Bool, Whole, Number, Time, Length, Switch };
 
 /// Whose element it is, as bits.
-enum : unsigned { kOfValues = 1, kOfFolders = 2, kOfRoots = 4, kOfAll = 7 };
+enum : unsigned { kOfValues = 1, kOfFolders = 2, kOfRoots = 4, kOfOthers = 8, kOfAll = 15 };
 
 /// An element or an attribute that the library reads.
 struct DocumentWord {
@@ -20,10 +22,12 @@ struct DocumentWord {
     std::string_view parent;
     std::string_view name;
     TextKind text = TextKind::None;
-    /// Of elements of channels: which have it.
+    /// Of elements and attributes of channels: which have it.
     unsigned classes = kOfAll;
     /// Of a whole number.
     std::uint64_t greatest = UINT64_MAX;
+    /// Whether there may be several of it, each for itself.
+    bool isRepeated = false;
 };
 
 /// Null for an element that is unknown there.
@@ -48,6 +52,7 @@ std::optional<double> readNumber(std::string_view text);
 bool isStorable(std::string_view text);
 std::optional<std::uint64_t> readWhole(std::string_view text);
 std::optional<bool> readBool(std::string_view text);
+std::optional<BXUUID> readUUID(std::string_view text);
 std::optional<Tempus> readTime(std::string_view text);
 
 } // namespace lumenkey::tools

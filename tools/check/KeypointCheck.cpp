@@ -1,0 +1,116 @@
+#include "tools/check/KeypointCheck.h"
+
+#include "lumenkey/splines/KFInterpolation.h"
+#include "tools/check/DocumentVocabulary.h"
+#include "tools/output/TextForms.h"
+
+#include <cmath>
+
+namespace lumenkey::tools {
+
+namespace {
+
+/// Documents leave out what is nearer to its usual value than this.
+constexpr double kLeastWritten = 1e-7;
+
+bool isLeftOut(double number, double usual) {
+    return number != usual && std::fabs(number - usual) < kLeastWritten;
+}
+
+Fault leftOut(std::string_view name, double number, std::string const& usual) {
+    return {"'" + std::string(name) + "' is " + shortestText(number) + ", which is kept as " + usual};
+}
+
+} // namespace
+
+KeypointCheck::KeypointCheck(Attributes const& attributes, CurveClass const& curve, bool countsFrames)
+    : _takesHandles(curve.derivesTangents || readWhole(attributeOf(attributes, "interpolation")) ==
+                                                 std::uint64_t{kKFInterpolationLinearToo}),
+      _countsFrames(countsFrames), _isDisabled(readBool(attributeOf(attributes, "enabled")) == false) {}
+
+Fault KeypointCheck::faultOfPart(TextPlace const& place, std::string_view name, std::string_view text,
+                                 bool canBeRead) {
+    bool const wasDisabled = _isDisabled && _hasOutput;
+    _hasOutput |= name == _out.valueName;
+    if (name == "time" || name == "value") {
+        Fault const fault = faultOfTimeOrValue(name == "time");
+        return canBeRead ? fault : Fault();
+    }
+    Handle& handle = name.starts_with("input") ? _in : _out;
+    if (name == handle.timeName) {
+        return canBeRead ? faultOfHandleTime(handle, place, text) : Fault();
+    }
+    bool const isHandle = name == handle.valueName;
+    double const time = isHandle ? std::exchange(handle.time, std::nullopt).value_or(0) : 0;
+    if (!canBeRead) {
+        return {};
+    }
+    std::string const quoted = "'" + std::string(name) + "'";
+    if (!_hasValue) {
+        return {quoted + " stands in front of the value, where it comes too early"};
+    }
+    if (wasDisabled && name != "normal") {
+        return {quoted + " stands behind the output handle, which disables the keypoint: it is passed over"};
+    }
+    double const number = *readNumber(text);
+    if (isHandle) {
+        return faultOfHandle(name, time, number);
+    }
+    double const usual = name == "bias" ? 1 : 0;
+    return isLeftOut(number, usual) ? leftOut(name, number, shortestText(usual)) : Fault();
+}
+
+Fault KeypointCheck::faultOfTimeOrValue(bool isTime) {
+    bool const hadValue = _hasValue;
+    (isTime ? _hasTime : _hasValue) = true;
+    if (!hadValue) {
+        return {};
+    }
+    return {isTime ? "the time stands behind the value, where it comes too late"
+                   : "a second value makes another keypoint"};
+}
+
+Fault KeypointCheck::faultOfHandleTime(Handle& handle, TextPlace const& place, std::string_view text) {
+    double const time = *readNumber(text);
+    handle.time = time;
+    handle.timePlace = place;
+    bool const pointsBack = &handle == &_in ? time > 0 : time < 0;
+    return pointsBack && _takesHandles
+               ? Fault{"the handle reaches to the wrong side of its keypoint: its time counts as 0"}
+               : Fault();
+}
+
+Fault KeypointCheck::faultOfHandle(std::string_view name, double time, double value) const {
+    if (time == 0 && value == 0) {
+        return {};
+    }
+    if (!_takesHandles) {
+        return {"curves of this class have no handles: '" + std::string(name) + "' is passed over"};
+    }
+    bool const isShort = std::fabs(time) < kLeastWritten && std::fabs(value) < kLeastWritten;
+    // How short a handle in frames is depends on how long a frame is.
+    return isShort && !_countsFrames ? leftOut(name, value, "no handle") : Fault();
+}
+
+std::vector<std::pair<TextPlace, Fault>> KeypointCheck::faultsAtEnd(TextPlace const& place) const {
+    std::vector<std::pair<TextPlace, Fault>> faults;
+    if (!_hasValue) {
+        faults.push_back({place, {"the keypoint has no value: it is passed over"}});
+    } else if (!_hasTime) {
+        faults.push_back({place, {"the keypoint has no time: it counts as 0", true}});
+    }
+    if (_isDisabled && _hasValue && !_hasOutput) {
+        faults.push_back(
+            {place, {"the keypoint is disabled but has no output handle: it comes back enabled"}});
+    }
+    for (Handle const* const handle : {&_in, &_out}) {
+        if (handle->time) {
+            faults.push_back({handle->timePlace,
+                              {"no '" + std::string(handle->valueName) + "' stands behind '" +
+                               std::string(handle->timeName) + "': it is passed over"}});
+        }
+    }
+    return faults;
+}
+
+} // namespace lumenkey::tools

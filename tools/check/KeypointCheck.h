@@ -1,0 +1,50 @@
+#pragma once
+
+#include "tools/check/CurveCheck.h"
+#include "tools/check/DocumentScanner.h"
+#include "tools/check/Fault.h"
+
+#include <optional>
+#include <string_view>
+#include <utility>
+#include <vector>
+
+namespace lumenkey::tools {
+
+/// Looks through the parts of a keypoint in their order, in which a reader acts on them.
+class KeypointCheck {
+public:
+    /// Of a keypoint with these attributes in a curve of this class.
+    KeypointCheck(Attributes const& attributes, CurveClass const& curve, bool countsFrames);
+
+    bool hasValue() const { return _hasValue; }
+
+    /// A part of the keypoint that has ended, and whether its text can be read.
+    Fault faultOfPart(TextPlace const& place, std::string_view name, std::string_view text, bool canBeRead);
+    /// What is at fault with the whole, where it stands.
+    std::vector<std::pair<TextPlace, Fault>> faultsAtEnd(TextPlace const& place) const;
+
+private:
+    struct Handle {
+        std::string_view timeName;
+        std::string_view valueName;
+        /// Its time, as long as no value has followed.
+        std::optional<double> time;
+        TextPlace timePlace;
+    };
+
+    Fault faultOfTimeOrValue(bool isTime);
+    Fault faultOfHandleTime(Handle& handle, TextPlace const& place, std::string_view text);
+    Fault faultOfHandle(std::string_view name, double time, double value) const;
+
+    bool _takesHandles;
+    bool _countsFrames;
+    bool _isDisabled;
+    bool _hasTime = false;
+    bool _hasValue = false;
+    bool _hasOutput = false;
+    Handle _in{"inputTangentTime", "inputTangentValue", {}, {}};
+    Handle _out{"outputTangentTime", "outputTangentValue", {}, {}};
+};
+
+} // namespace lumenkey::tools
