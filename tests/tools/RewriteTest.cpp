@@ -102,7 +102,7 @@ TEST_F(RewriteTest, LosesNothingUnlessForced) {
         {"\n<parameter id=\"2\" factoryID=\"3\" flags=\"2\"><flags>16</flags></parameter>",
          "5:1: 'flags' is 2, but the flags of the channel become 16"},
         {"\n<parameter id=\"2\" factoryID=\"3\"><fadeInOffset>-infinity</fadeInOffset></parameter>",
-         "5:34: the fade is below 0"},
+         "5:33: the fade is below 0"},
         // Odd, but it stays.
         {"<parameter id=\"2\" factoryID=\"2\"><curve type=\"1\" default=\"3\" "
          "value=\"2\"><keypoint><time>0/1</time>"
@@ -200,8 +200,27 @@ TEST_F(RewriteTest, EveryKeypointCounts) {
          {{"offset", "--value", "1"}, "0/1 2 off; 1/1 3; 1/1 4; 2/1 5; 4/1 6 off; "},
          {{"offset", "--by", "10", "--from", "2"}, "0/1 1 off; 1/1 2; 1/1 3; 12/1 4; 14/1 5 off; "},
          {{"reverse"}, "0/1 5 off; 2/1 4; 3/1 3; 3/1 2; 4/1 1 off; "},
-         {{"retime", "--factor", "2"}, "0/1 1 off; 2/1 2; 2/1 3; 4/1 4; 8/1 5 off; "}},
+         {{"retime", "--factor", "2"}, "0/1 1 off; 2/1 2; 2/1 3; 4/1 4; 8/1 5 off; "},
+         {{"offset", "--by", "1/2", "--from", "1", "--to", "2"},
+          "0/1 1 off; 3/2 2; 3/2 3; 5/2 4; 4/1 5 off; "},
+         {{"reverse", "--from", "1", "--to", "2"}, "0/1 1 off; 1/1 4; 2/1 3; 2/1 2; 4/1 5 off; "},
+         {{"retime", "--factor", "2", "--to", "1"}, "0/1 1 off; 2/1 2; 2/1 3; 4/1 5 off; "}},
         body);
+    // Disabled ones too, each with all that it has.
+    std::string const several = keypoint("1/1", "1", "enabled=\"0\"") +
+                                "<keypoint interpolation=\"18\" flags=\"8\"><time>1/1</time><value>2</value>"
+                                "<bias>3</bias><normal>4</normal><inputTangentTime>-0.5</inputTangentTime>"
+                                "<inputTangentValue>5</inputTangentValue></keypoint>" +
+                                keypoint("1/1", "3") + keypoint("1/1", "4", "enabled=\"0\"");
+    expectKeypointsAfter({{{"offset", "--by", "1", "--from", "1", "--to", "1"},
+                           "0/1 0; 2/1 1 off; 2/1 2; 2/1 3; 2/1 4 off; 3/1 5; "}},
+                         keypoint("0/1", "0") + several + keypoint("3/1", "5"));
+    std::string const text = contentOf(_file);
+    for (char const* const part :
+         {"<keypoint interpolation=\"18\" flags=\"8\">", "<bias>3</bias>", "<normal>4</normal>",
+          "<inputTangentTime>-0.5</inputTangentTime>", "<inputTangentValue>5</inputTangentValue>"}) {
+        EXPECT_NE(text.find(part), std::string::npos) << part << text;
+    }
 }
 
 TEST_F(RewriteTest, LockedKeypointsStay) {

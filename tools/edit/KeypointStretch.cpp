@@ -2,6 +2,7 @@
 
 #include "lumenkey/Channels/KFKeyframeInfo.h"
 #include "lumenkey/splines/KFInterpolation.h"
+#include "lumenkey/splines/KFVertex.h"
 #include "tools/curve/Keypoint.h"
 
 #include <algorithm>
@@ -26,6 +27,12 @@ Tempus timeOf(KFCurve& curve, void* handle) {
 bool isLocked(KFCurve& curve, void* handle) {
     bool locked = false;
     return curve.isLockedKeypoint(handle, &locked) && locked;
+}
+
+std::vector<void*> unlockedWithin(KFCurve& curve, TimeSpan const& span) {
+    std::vector<void*> handles = keypointsWithin(curve, span);
+    std::erase_if(handles, [&](void* handle) { return isLocked(curve, handle); });
+    return handles;
 }
 
 /// In their order.
@@ -55,16 +62,26 @@ void keepUnlockedWithin(KFCurve& curve, TimeSpan const& span) {
             curve.lockKeypoint(handle, false, true);
         }
         if (locked || !span.holds(timeOf(curve, handle))) {
-            curve.delKeypoint(handle, true);
+            curve.getSpline()->deleteVertex(handle, false, kTempusZero); // others keep their handles
         }
     }
 }
 
+/// A keypoint as it is pasted, and where it stands in its curve.
+struct GatheredKeypoint {
+    _KFKeyframeInfo info;
+    Tempus time{};
+    double value = 0;
+};
+
 /// All keypoints; the library's own gathering leaves out disabled ones at the ends.
-std::vector<_KFKeyframeInfo> gather(KFChannel& channel) {
-    std::vector<_KFKeyframeInfo> all;
-    for (void* const handle : allKeypoints(*channel.getCurveInterface())) {
-        _KFKeyframeInfo info;
+std::vector<GatheredKeypoint> gather(KFChannel& channel) {
+    std::vector<GatheredKeypoint> all;
+    KFCurve& curve = *channel.getCurveInterface();
+    for (void* const handle : allKeypoints(curve)) {
+        GatheredKeypoint keypoint;
+        _KFKeyframeInfo& info = keypoint.info;
+        curve.getKeypoint(handle, &keypoint.time, &keypoint.value);
         channel.getKeyframe(handle, &info.time, &info.value);
         channel.getKeyframeInputTangents(handle, &info.inputTangentX, &info.inputTangentY, true);
         channel.getKeyframeOutputTangents(handle, &info.outputTangentX, &info.outputTangentY, true);
@@ -73,9 +90,54 @@ std::vector<_KFKeyframeInfo> gather(KFChannel& channel) {
         info.flags = channel.getKeyframeFlags(handle);
         info.interpolation = channel.getKeyframeInterpolation(handle);
         info.normal = channel.getKeyframeNormal(handle);
-        all.push_back(info);
+        all.push_back(keypoint);
     }
     return all;
+}
+
+/// Gives a keypoint of the curve all but the time of a gathered one.
+void write(KFCurve& curve, void* handle, GatheredKeypoint const& keypoint) {
+    _KFKeyframeInfo const& info = keypoint.info;
+    // What ties handles together, or guards a keypoint, comes last.
+    curve.setKeypointFlags(handle, kKFVertexFlagHandlesBroken, true);
+    curve.enableKeypoint(handle, true, true);
+    curve.setKeypointValue(handle, keypoint.value, true);
+    curve.setKeypointNormal(handle, info.normal, true);
+    curve.setKeypointInterpolation(handle, info.interpolation, true);
+    curve.setKeypointBiasLinear(handle, info.bias);
+    curve.setKeypointInputHandles(handle, info.inputTangentX, info.inputTangentY, true);
+    curve.setKeypointOutputHandles(handle, info.outputTangentX, info.outputTangentY, true);
+    curve.setKeypointFlags(handle, info.flags, true);
+    curve.enableKeypoint(handle, info.enabled, true);
+}
+
+/// All of them, in their order, into a stretch that is free of others. Pasting goes by time: it takes one of
+/// several at one time, and shortens handles of each for the sake of the next.
+void paste(KFChannel& channel, std::vector<GatheredKeypoint> const& keypoints) {
+    std::vector<_KFKeyframeInfo> pasted;
+    std::vector<GatheredKeypoint const*> others;
+    for (GatheredKeypoint const& keypoint : keypoints) {
+        bool const isLast = &keypoint == &keypoints.back() || (&keypoint)[1].time != keypoint.time;
+        if (isLast) {
+            pasted.push_back(keypoint.info);
+        } else {
+            others.push_back(&keypoint);
+        }
+    }
+    channel.setKeyframesWithInfo(pasted.front().time, pasted);
+    KFCurve& curve = *channel.getCurveInterface();
+    TimeSpan const arrival{keypoints.front().time, keypoints.back().time};
+    if (unlockedWithin(curve, arrival).size() != pasted.size()) {
+        return; // a curve that takes no keypoints
+    }
+    for (std::size_t i = others.size(); i > 0; --i) {
+        // In front of those that are there.
+        curve.getSpline()->addVertexNoTangents(others[i - 1]->time, 0, kTempusZero, false);
+    }
+    std::vector<void*> const handles = unlockedWithin(curve, arrival);
+    for (std::size_t i = 0; i < handles.size(); ++i) {
+        write(curve, handles[i], keypoints[i]);
+    }
 }
 
 } // namespace
@@ -126,8 +188,7 @@ void makeLinesBezier(KFCurve& curve, TimeSpan const& span) {
 void editKeypointsWithin(KFChannel& channel, TimeSpan const& span,
                          std::function<void(KFCurve&)> const& edit) {
     KFCurve& curve = *channel.getCurveInterface();
-    std::vector<void*> edited = keypointsWithin(curve, span);
-    std::erase_if(edited, [&](void* handle) { return isLocked(curve, handle); });
+    std::vector<void*> const edited = unlockedWithin(curve, span);
     if (edited.size() == curve.getNumberOfKeypoints()) {
         edit(curve);
         return;
@@ -139,17 +200,16 @@ void editKeypointsWithin(KFChannel& channel, TimeSpan const& span,
     KFChannel& part = static_cast<KFChannel&>(*copy);
     keepUnlockedWithin(*part.getCurveInterface(), span);
     edit(*part.getCurveInterface());
-    std::vector<_KFKeyframeInfo> gathered = gather(part);
+    std::vector<GatheredKeypoint> gathered = gather(part);
     deleteKeypoints(curve, span);
     deleteKeypoints(curve, {gathered.front().time, gathered.back().time});
     std::vector<Tempus> const taken = timesOfLocked(curve);
-    std::erase_if(gathered, [&](_KFKeyframeInfo const& info) {
-        return std::binary_search(taken.begin(), taken.end(), info.time);
+    std::erase_if(gathered, [&](GatheredKeypoint const& keypoint) {
+        return std::binary_search(taken.begin(), taken.end(), keypoint.time);
     });
-    if (gathered.empty()) {
-        return;
+    if (!gathered.empty()) {
+        paste(channel, gathered);
     }
-    channel.setKeyframesWithInfo(gathered.front().time, gathered);
 }
 
 } // namespace lumenkey::tools
