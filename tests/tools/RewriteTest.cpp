@@ -214,7 +214,7 @@ TEST_F(RewriteTest, EveryKeypointCounts) {
                                 keypoint("1/1", "3") + keypoint("1/1", "4", "enabled=\"0\"");
     expectKeypointsAfter({{{"offset", "--by", "1", "--from", "1", "--to", "1"},
                            "0/1 0; 2/1 1 off; 2/1 2; 2/1 3; 2/1 4 off; 3/1 5; "}},
-                         keypoint("0/1", "0") + several + keypoint("3/1", "5"));
+                         "<max>1</max>" + keypoint("0/1", "0") + several + keypoint("3/1", "5"));
     std::string const text = contentOf(_file);
     for (char const* const part :
          {"<keypoint interpolation=\"18\" flags=\"8\">", "<bias>3</bias>", "<normal>4</normal>",

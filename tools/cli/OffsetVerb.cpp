@@ -45,10 +45,12 @@ public:
 
     void apply(KFChannel& channel, TimeSpan const& span) override {
         KFCurve& curve = *channel.getCurveInterface();
-        for (void* const keypoint : keypointsWithin(curve, span)) {
-            double value = 0;
-            curve.getKeypoint(keypoint, nullptr, &value);
-            curve.setKeypointValue(keypoint, value + _value, true);
+        if (_value != 0 && curve.isCurveKeyframable()) {
+            for (void* const keypoint : keypointsWithin(curve, span)) {
+                double value = 0;
+                curve.getKeypoint(keypoint, nullptr, &value);
+                curve.setKeypointValue(keypoint, value + _value, true);
+            }
         }
         if (_delay != kTempusZero) {
             editKeypointsWithin(channel, span,

@@ -101,7 +101,8 @@ void write(KFCurve& curve, void* handle, GatheredKeypoint const& keypoint) {
     // What ties handles together, or guards a keypoint, comes last.
     curve.setKeypointFlags(handle, kKFVertexFlagHandlesBroken, true);
     curve.enableKeypoint(handle, true, true);
-    curve.setKeypointValue(handle, keypoint.value, true);
+    // As it is stored, also out of the limits.
+    curve.getSpline()->setVertexValue(handle, keypoint.value, kTempusZero);
     curve.setKeypointNormal(handle, info.normal, true);
     curve.setKeypointInterpolation(handle, info.interpolation, true);
     curve.setKeypointBiasLinear(handle, info.bias);
@@ -127,9 +128,6 @@ void paste(KFChannel& channel, std::vector<GatheredKeypoint> const& keypoints) {
     channel.setKeyframesWithInfo(pasted.front().time, pasted);
     KFCurve& curve = *channel.getCurveInterface();
     TimeSpan const arrival{keypoints.front().time, keypoints.back().time};
-    if (unlockedWithin(curve, arrival).size() != pasted.size()) {
-        return; // a curve that takes no keypoints
-    }
     for (std::size_t i = others.size(); i > 0; --i) {
         // In front of those that are there.
         curve.getSpline()->addVertexNoTangents(others[i - 1]->time, 0, kTempusZero, false);
@@ -188,6 +186,9 @@ void makeLinesBezier(KFCurve& curve, TimeSpan const& span) {
 void editKeypointsWithin(KFChannel& channel, TimeSpan const& span,
                          std::function<void(KFCurve&)> const& edit) {
     KFCurve& curve = *channel.getCurveInterface();
+    if (!curve.isCurveKeyframable()) {
+        return;
+    }
     std::vector<void*> const edited = unlockedWithin(curve, span);
     if (edited.size() == curve.getNumberOfKeypoints()) {
         edit(curve);

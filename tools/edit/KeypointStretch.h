@@ -55,7 +55,8 @@ void makeLinesBezier(KFCurve& curve, TimeSpan const& span);
 /// Lets `edit` change the whole curve where the span holds all of its keypoints and none is locked. Else it
 /// changes that of a copy with the unlocked keypoints within the span alone; they are then cut out of the
 /// channel and those of the copy are pasted over what lies where they come to, but for what is locked, which
-/// stays. Nothing happens where the span holds no unlocked one.
+/// stays. All come there in their order, also those that share a time, each with its handles. Nothing happens
+/// where the span holds no unlocked one, and to a curve whose class takes no keypoints.
 void editKeypointsWithin(KFChannel& channel, TimeSpan const& span, std::function<void(KFCurve&)> const& edit);
 
 } // namespace lumenkey::tools
