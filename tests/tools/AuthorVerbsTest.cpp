@@ -240,6 +240,19 @@ TEST_F(AuthorVerbsTest, DiffSeesPeaksOfAMomentOrderAndNames) {
     EXPECT_TRUE(
         outputOf({"diff", linear, steps}, 1).starts_with("changed X: by up to 999.000000 units, at "));
 
+    std::vector<std::string> ages{"15", programPath(), "diff"};
+    for (char const* const last : {"1", "2"}) {
+        ages.push_back(_folder.write(
+            last + std::string(".lumen"),
+            samples::documentOf("<parameter factoryID=\"3\"><curve type=\"1\">"
+                                "<keypoint><time>0/1</time><value>0</value></keypoint>"
+                                "<keypoint><time>9000000000000000000/1</time><value>" +
+                                std::string(last) + "</value></keypoint></curve></parameter>")));
+    }
+    Outcome const farApart = runProgramFile("/usr/bin/timeout", ages);
+    EXPECT_EQ(farApart.exit, 1) << "too long";
+    EXPECT_EQ(farApart.out, "changed ./: by up to 1.000000 units, at 9000000000000000000/1 s\n");
+
     std::string const x = "<parameter name=\"X\" id=\"1\" factoryID=\"3\"/>";
     std::string const y = "<parameter name=\"Y\" id=\"2\" factoryID=\"3\"/>";
     std::string const added = "<parameter name=\"New\" id=\"3\" factoryID=\"3\"/>";

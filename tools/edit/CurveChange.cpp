@@ -44,11 +44,11 @@ std::vector<Tempus> timesOfKeypoints(KFCurve& curve) {
 CurveChange changeBetween(KFCurve& before, KFCurve& after, TimeSpan const& span, Tempus const& step) {
     CurveChange change{0, span.from};
     std::int64_t const steps = TempusFloorQuotient(span.to - span.from, step);
-    if (steps < kMostComparedValues) {
+    if (steps < kMostComparedSteps) {
         compareAt(SampleTimes::row(span.from, step, static_cast<std::size_t>(steps) + 1), before, after,
                   change);
     } else {
-        compareAt(SampleTimes::spread(span.from, span.to, kMostComparedValues), before, after, change);
+        compareAt(SampleTimes::spread(span.from, span.to, kComparedOfMore), before, after, change);
     }
     compareAt(SampleTimes::list({span.to}), before, after, change);
     return change;

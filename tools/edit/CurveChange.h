@@ -17,14 +17,17 @@ struct CurveChange {
     Tempus at{};
 };
 
-/// Reads both curves at `from`, at every step from there on, and at `to`. Where that would be more than
-/// `kMostComparedValues` times, so many are spread evenly.
+/// Steps are read in one walk; times that are spread over more of them one by one, which takes forty times as
+/// long for each.
+inline constexpr std::int64_t kMostComparedSteps = 20'000'000;
+inline constexpr std::size_t kComparedOfMore = 500'000;
+
+/// Reads both curves at `from`, at every step from there on, and at `to`. From `kMostComparedSteps` steps on,
+/// `kComparedOfMore` times are spread evenly.
 CurveChange changeBetween(KFCurve& before, KFCurve& after, TimeSpan const& span, Tempus const& step);
 
 /// Compares them too at all keypoints of both, and between and just beside these: there `changeBetween` may
 /// see nothing of a step or a peak that is narrower than its own.
 void compareAtKeypoints(KFCurve& before, KFCurve& after, CurveChange& change);
-
-inline constexpr std::int64_t kMostComparedValues = 20'000'000;
 
 } // namespace lumenkey::tools
