@@ -66,6 +66,7 @@ TEST_F(DocumentVerbsTest, MotionsOfAnyFrameTimeComeBackFromDocuments) {
         {"0.0123456789123", 3, "0.0123456791"},
         {"0.02", 1, "0.02"},
         {"0.00000002", 3, "0.00000002"},
+        {"0.04", 0, "0.04"},
     };
     std::string const back = _folder.file("back.bvh");
     for (auto const& each : cases) {
@@ -83,6 +84,10 @@ TEST_F(DocumentVerbsTest, MotionsOfAnyFrameTimeComeBackFromDocuments) {
         EXPECT_NE(contentOf(back).find("Frame Time: " + std::string(each.written) + "\n"), std::string::npos)
             << contentOf(back);
     }
+    // Without frames, but with a pose.
+    outputOf({"set", _document, "Hips.Xposition", "--value", "5"});
+    outputOf({"convert", _document, back});
+    EXPECT_EQ(jsonOf({"info", back})["frames"], 1);
     // Frames last as long when few keypoints are left, and as long as a user says.
     outputOf({"convert", _motion, _document});
     outputOf({"simplify", _document, "--tolerance", "1000", "--in-place"});

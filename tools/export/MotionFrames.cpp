@@ -23,14 +23,23 @@ struct FrameSpan {
     std::uint64_t count = 0;
 };
 
+/// Whether a document without keypoints is a pose, which is one frame, and not the skeleton of a motion that
+/// has none.
+bool isPose(ChannelFile const& file, std::vector<Node> const& columns) {
+    return file.format == ChannelFormat::Document &&
+           (!storedFrameDuration(*file.tree) ||
+            std::any_of(columns.begin(), columns.end(), [&](Node channel) {
+                return file.tree->curve(channel).getValue(kTempusZero, 0.0) != 0;
+            }));
+}
+
 FrameSpan framesOver(ChannelFile const& file, std::vector<Node> const& columns) {
     if (columns.empty()) {
         return {0, file.rows};
     }
     constexpr std::int64_t farthest = std::int64_t{1} << 52; // beyond what can be written
     std::int64_t begin = 0;
-    // A document without keypoints is a pose, which is one frame.
-    std::int64_t end = file.format == ChannelFormat::Document ? 1 : 0;
+    std::int64_t end = isPose(file, columns) ? 1 : 0;
     for (Node const channel : columns) {
         KFCurve& curve = file.tree->curve(channel);
         Tempus first{};
