@@ -144,11 +144,23 @@ TEST(Document, WritesOfAChannelWhatIsNotAsUsual) {
         return handle;
     };
     std::string const head = "  <parameter name=\"V\" id=\"1\" flags=\"16\"";
-    auto const keyed = [](std::string const& handles) {
+    // A handle of a keypoint of this type.
+    auto const bend = [&](KFCurve& curve, unsigned type, bool derives) {
+        void* const handle = key(curve, type);
+        curve.setKeypointOutputNormalizedTangents(handle, 0, 0.5, true);
+        curve.setCurveDeriveTangents(derives);
+        return handle;
+    };
+    std::string const outputHandle = "        <outputTangentTime>0</outputTangentTime>\n"
+                                     "        <outputTangentValue>6</outputTangentValue>\n";
+    auto const keyed = [](std::string const& handles, std::string const& type = "",
+                          std::string const& value = "0", std::string const& limits = "") {
         return R"(>
-    <curve type="1" default="0" value="0">
+    <curve type="1" default="0" value=")" +
+               value + R"(">
       <numberOfKeypoints>1</numberOfKeypoints>
-      <keypoint flags="128">
+)" + limits + "      <keypoint" +
+               type + R"( flags="128">
         <time>600/600</time>
         <value>2</value>
 )" + handles + R"(      </keypoint>
@@ -201,41 +213,18 @@ TEST(Document, WritesOfAChannelWhatIsNotAsUsual) {
              curve.setCurveExtrapolation(2, 0);
          }},
         // Handles are twelve times what is stored; both parts of one, and only where tangents count.
-        {keyed("        <outputTangentTime>0</outputTangentTime>\n"
-               "        <outputTangentValue>6</outputTangentValue>\n"),
-         [&](auto&, KFCurve& curve) {
-             void* const handle = key(curve, 4);
-             curve.setKeypointBiasLinear(handle, 1.0000000001);
-             curve.setKeypointOutputNormalizedTangents(handle, 0, 0.5, true);
-         }},
-        {keyed(""),
-         [&](auto&, KFCurve& curve) {
-             curve.setKeypointOutputNormalizedTangents(key(curve, 4), 0, 0.5, true);
-             curve.setCurveDeriveTangents(false);
-         }},
+        {keyed(outputHandle),
+         [&](auto&, KFCurve& curve) { curve.setKeypointBiasLinear(bend(curve, 4, true), 1.0000000001); }},
+        {keyed(""), [&](auto&, KFCurve& curve) { bend(curve, 4, false); }},
         // The value isn't what the limits let be seen of it, which may have crossed.
         {" default=\"0\" value=\"500\"/>\n",
          [](auto&, KFCurve& curve) {
              curve.setCurveInitialValue(500);
              curve.setAbsoluteMaxValueV(100);
          }},
-        {R"(>
-    <curve type="1" default="0" value="inf">
-      <numberOfKeypoints>1</numberOfKeypoints>
-      <min>5</min>
-      <max>3</max>
-      <keypoint interpolation="18" flags="128">
-        <time>600/600</time>
-        <value>2</value>
-        <outputTangentTime>0</outputTangentTime>
-        <outputTangentValue>6</outputTangentValue>
-      </keypoint>
-    </curve>
-  </parameter>
-)",
+        {keyed(outputHandle, " interpolation=\"18\"", "inf", "      <min>5</min>\n      <max>3</max>\n"),
          [&](auto&, KFCurve& curve) {
-             curve.setKeypointOutputNormalizedTangents(key(curve, 18), 0, 0.5, true);
-             curve.setCurveDeriveTangents(false);
+             bend(curve, 18, false);
              curve.setCurveInitialValue(std::numeric_limits<double>::infinity());
              curve.setAbsoluteMinValueV(5);
              curve.setAbsoluteMaxValueV(3);
