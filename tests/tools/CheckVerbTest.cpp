@@ -144,7 +144,8 @@ TEST_F(CheckVerbTest, FindsWhatIsOddWithItsPlace) {
          "<parameter name=\"B\" id=\"3\" factoryID=\"6\"/>\n<parameter id=\"4\" factoryID=\"7\" value=\"3\">"
          "<curve/></parameter>\n<parameter id=\"5\" factoryID=\"5\">\n"
          "<parameter name=\"Width\" id=\"1\"/><parameter name=\"Y\" id=\"2\" factoryID=\"2\"/></parameter>\n"
-         "<parameter id=\"6\" factoryID=\"8\"><curve type=\"1\">\n<min>-5</min><keypoint><value>1</value>"
+         "<parameter id=\"6\" factoryID=\"8\" value=\"1e-9\"><curve "
+         "type=\"1\">\n<min>-5</min><keypoint><value>1</value>"
          "<inputTangentValue>1</inputTangentValue></keypoint></curve></parameter></parameter>\n<parameter/>",
          "8:1: 'out' is 1/6@1, but it becomes invalid\n"
          "8:35: 'enabled' is 0, but the flags of the channel become 12304\n"
@@ -155,6 +156,7 @@ TEST_F(CheckVerbTest, FindsWhatIsOddWithItsPlace) {
          "12:43: the element 'curve' is none of a channel of the class Base: it is passed over\n"
          "14:1: the channel 'X' is a part of its folder, which makes it: the name 'Width' is passed over\n"
          "14:33: the channel 'Y' is a part of its folder, which makes it: the class Percent is passed over\n"
+         "15:1: the attribute 'value' is 1e-09, which is kept as 0\n"
          "16:1: 'min' is -5, which isn't kept: it becomes that of the class, 0\n"
          "16:14: the keypoint has no time: it counts as 0\n"
          "16:40: curves of this class have no handles: 'inputTangentValue' is passed over\n"

@@ -178,11 +178,11 @@ TEST_F(RewriteTest, OddTextsStayWithoutForce) {
 }
 
 TEST_F(RewriteTest, TheTopHasItsAttributesToo) {
-    write("<parameter name=\"P\" id=\"1\" factoryID=\"2\" default=\"0.25\" value=\"0.5\" flags=\"2\"/>");
+    write("<parameter name=\"P\" id=\"1\" factoryID=\"2\" default=\"1e-9\" value=\"0.5\" flags=\"2\"/>");
     outputOf({"convert", _file, _file});
     EXPECT_NE(contentOf(_file).find("<flags>18</flags>"), std::string::npos) << contentOf(_file);
     Json const top = jsonOf({"tree", _file})["nodes"][0];
-    EXPECT_EQ(top["default"], 0.25);
+    EXPECT_EQ(top["default"], 1e-9);
     EXPECT_EQ(top["start"], 0.5);
     write("<parameter name=\"R\" id=\"1\" flags=\"4\"><parameter name=\"X\" id=\"1\" factoryID=\"3\" "
           "value=\"7\"/></parameter>");

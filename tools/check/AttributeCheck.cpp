@@ -1,11 +1,14 @@
 #include "tools/check/AttributeCheck.h"
 
+#include "lumenkey/Channels/KFChannel.h"
 #include "tools/check/ClassExamples.h"
 #include "tools/check/DocumentVocabulary.h"
 #include "tools/import/DocumentFile.h"
+#include "tools/output/TextForms.h"
 #include "tools/tree/ChannelClass.h"
 
 #include <algorithm>
+#include <cmath>
 #include <utility>
 
 namespace lumenkey::tools {
@@ -86,6 +89,24 @@ std::vector<Fault> faultsOfCurveInChannel(Attributes const& curve, Attributes co
         if (isStorable(own) && isStorable(other) && readNumber(own) != readNumber(other)) {
             faults.push_back({"the attribute '" + std::string(name) + "' is " + std::string(own) +
                               ", which takes the place of that of the channel, " + std::string(other)});
+        }
+    }
+    return faults;
+}
+
+std::vector<Fault> faultsOfNearValues(Attributes const& attributes, KFChannelBase const* example) {
+    constexpr double nearest = 1e-7;
+    std::vector<Fault> faults;
+    auto const* const channel = dynamic_cast<KFChannel const*>(example);
+    for (std::string_view const name : {"default", "value"}) {
+        std::optional<double> const given = readNumber(attributeOf(attributes, name));
+        if (channel == nullptr || !given) {
+            continue;
+        }
+        double const own = name == "value" ? channel->getInitialValue() : channel->getDefaultValue();
+        if (*given != own && std::fabs(*given - own) < nearest) {
+            faults.push_back({"the attribute '" + std::string(name) + "' is " + shortestText(*given) +
+                              ", which is kept as " + shortestText(own)});
         }
     }
     return faults;

@@ -17,6 +17,10 @@ std::vector<Fault> faultsOfAttributes(std::string_view element, Attributes const
 /// Of those of a curve beside the attributes of its channel, whose place they take.
 std::vector<Fault> faultsOfCurveInChannel(Attributes const& curve, Attributes const& channel);
 
+/// Of a channel with these attributes, of the class of the example, in a folder: a value that is nearly that
+/// of the class counts as it. `example` may be null.
+std::vector<Fault> faultsOfNearValues(Attributes const& attributes, KFChannelBase const* example);
+
 /// Of an element or attribute that channels of the class haven't.
 std::string faultOfOwner(std::string_view kind, std::string_view name, KFFactory& factory);
 

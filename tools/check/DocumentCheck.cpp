@@ -77,6 +77,11 @@ private:
     }
 
     void tell(TextPlace const& place, Fault const& fault) { tell({place, fault.what, !fault.isKept}); }
+    void tell(TextPlace const& place, std::vector<Fault> const& faults) {
+        for (Fault const& fault : faults) {
+            tell(place, fault);
+        }
+    }
     void tell(std::vector<std::pair<TextPlace, Fault>> const& faults) {
         for (auto const& [place, fault] : faults) {
             tell(place, fault);
@@ -145,9 +150,7 @@ private:
             KFReadVersion(attributeOf(attributes, "version"), major, minor);
             _countsFrames = major < firstWithTimes;
         } else if (element.name == "factory") {
-            for (Fault const& fault : _classes.readFactory(attributes)) {
-                tell(element.place, fault);
-            }
+            tell(element.place, _classes.readFactory(attributes));
         } else if (element.name == "parameter") {
             return isSoundChannel(element, attributes);
         } else if (element.name == "curve") {
@@ -166,9 +169,10 @@ private:
     void checkAttributes(OpenElement const& element, Attributes const& attributes) {
         CurveLimits const limits =
             element.name == "parameter" ? curveClassOf(_classes.of(element.factory)).limits : element.limits;
-        for (Fault const& fault :
-             faultsOfAttributes(element.name, attributes, limits, element.factory, _countsFrames)) {
-            tell(element.place, fault);
+        tell(element.place,
+             faultsOfAttributes(element.name, attributes, limits, element.factory, _countsFrames));
+        if (element.name == "parameter" && _open.back().factory != nullptr) {
+            tell(element.place, faultsOfNearValues(attributes, _classes.of(element.factory)));
         }
     }
 
@@ -279,9 +283,7 @@ private:
     void endCurve(OpenElement const& curve) {
         Attributes const attributes = curve.attributeViews();
         checkAttributes(curve, attributes);
-        for (Fault const& fault : faultsOfCurveInChannel(attributes, _open.back().attributeViews())) {
-            tell(curve.place, fault);
-        }
+        tell(curve.place, faultsOfCurveInChannel(attributes, _open.back().attributeViews()));
         if (curve.hasKeypoints && readWhole(attributeOf(attributes, "type")).value_or(0) == 0) {
             find(curve.place, "the curve is a constant: its keypoints are passed over");
         }

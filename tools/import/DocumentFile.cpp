@@ -124,7 +124,7 @@ private:
         auto* const channel = dynamic_cast<KFChannel*>(_top.get());
         double number = 0;
         if (channel != nullptr && element.getAttributeAsDouble(kDefaultAttribute, &number)) {
-            channel->setDefaultValue(number);
+            storeDefault(*channel, number);
         }
         if (channel != nullptr && element.getAttributeAsDouble(kValueAttribute, &number)) {
             storeConstant(*channel, number);

@@ -271,6 +271,11 @@ void storeConstant(KFChannel& channel, double value) {
     channel.getCurveInterface()->setCurveInitialValue(value);
 }
 
+void storeDefault(KFChannel& channel, double value) {
+    channel.createLocalChannelImplementation();
+    channel.getCurveInterface()->setCurveDefaultValue(value);
+}
+
 unsigned freeIDBelow(KFChannelFolder const& folder) {
     unsigned highest = 0;
     if (auto const* const children = folder.getDescendants()) {

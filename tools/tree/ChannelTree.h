@@ -137,6 +137,8 @@ private:
 
 /// The value of a channel without keypoints, exactly: `setInitialValue` leaves what is nearly there already.
 void storeConstant(KFChannel& channel, double value);
+/// Its default, likewise.
+void storeDefault(KFChannel& channel, double value);
 
 /// Above the IDs of a folder's children.
 unsigned freeIDBelow(KFChannelFolder const& folder);
