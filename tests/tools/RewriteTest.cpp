@@ -206,6 +206,11 @@ TEST_F(RewriteTest, EveryKeypointCounts) {
          {{"reverse", "--from", "1", "--to", "2"}, "0/1 1 off; 1/1 4; 2/1 3; 2/1 2; 4/1 5 off; "},
          {{"retime", "--factor", "2", "--to", "1"}, "0/1 1 off; 2/1 2; 2/1 3; 4/1 5 off; "}},
         body);
+    // Of those that stand out of order too.
+    expectKeypointsAfter({{{"offset", "--by", "1/2", "--from", "1", "--to", "2"},
+                           "0/1 0; 3/2 2; 3/2 4; 5/2 1; 5/2 3; 4/1 5; "}},
+                         keypoint("0/1", "0") + keypoint("2/1", "1") + keypoint("1/1", "2") +
+                             keypoint("2/1", "3") + keypoint("1/1", "4") + keypoint("4/1", "5"));
     // Disabled ones too, each with all that it has.
     std::string const several = keypoint("1/1", "1", "enabled=\"0\"") +
                                 "<keypoint interpolation=\"18\" flags=\"8\"><time>1/1</time><value>2</value>"

@@ -133,7 +133,7 @@ void paste(KFChannel& channel, std::vector<GatheredKeypoint> const& keypoints) {
         curve.getSpline()->addVertexNoTangents(others[i - 1]->time, 0, kTempusZero, false);
     }
     std::vector<void*> const handles = unlockedWithin(curve, arrival);
-    for (std::size_t i = 0; i < handles.size(); ++i) {
+    for (std::size_t i = 0; i < std::min(handles.size(), keypoints.size()); ++i) {
         write(curve, handles[i], keypoints[i]);
     }
 }
@@ -202,6 +202,8 @@ void editKeypointsWithin(KFChannel& channel, TimeSpan const& span,
     keepUnlockedWithin(*part.getCurveInterface(), span);
     edit(*part.getCurveInterface());
     std::vector<GatheredKeypoint> gathered = gather(part);
+    std::stable_sort(gathered.begin(), gathered.end(),
+                     [](GatheredKeypoint const& a, GatheredKeypoint const& b) { return a.time < b.time; });
     deleteKeypoints(curve, span);
     deleteKeypoints(curve, {gathered.front().time, gathered.back().time});
     std::vector<Tempus> const taken = timesOfLocked(curve);
