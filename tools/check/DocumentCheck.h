@@ -21,7 +21,8 @@ struct DocumentFinding {
 /// neighbour has, factories of one number, values and attributes that can't be read or lie beyond their
 /// limits, limits that cross, keypoints of a constant, without a time or a value or out of the order of time,
 /// disabled ones that come back enabled, parts that stand where they are passed over, twice, or against each
-/// other, stray text, numbers that are kept as others, and a version that is unknown. In the order of the text. Nothing follows text that is no XML.
+/// other, stray text, numbers that are kept as others, and a version that is unknown. In the order of the
+/// text. Nothing follows text that is no XML.
 ///
 /// The limits of a curve are those that the document gives, else those of the class. Throws `InputError` for
 /// a file that can't be read.
