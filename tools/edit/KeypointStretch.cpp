@@ -95,12 +95,20 @@ std::vector<GatheredKeypoint> gather(KFChannel& channel) {
     return all;
 }
 
+/// Only where it changes something: a curve looks for the keypoint among all that share its time.
+void enable(KFCurve& curve, void* handle, bool on) {
+    bool isOn = false;
+    if (curve.isEnabledKeypoint(handle, &isOn) && isOn != on) {
+        curve.enableKeypoint(handle, on, true);
+    }
+}
+
 /// Gives a keypoint of the curve all but the time of a gathered one.
 void write(KFCurve& curve, void* handle, GatheredKeypoint const& keypoint) {
     _KFKeyframeInfo const& info = keypoint.info;
     // What ties handles together, or guards a keypoint, comes last.
     curve.setKeypointFlags(handle, kKFVertexFlagHandlesBroken, true);
-    curve.enableKeypoint(handle, true, true);
+    enable(curve, handle, true);
     // As it is stored, also out of the limits.
     curve.getSpline()->setVertexValue(handle, keypoint.value, kTempusZero);
     curve.setKeypointNormal(handle, info.normal, true);
@@ -109,7 +117,7 @@ void write(KFCurve& curve, void* handle, GatheredKeypoint const& keypoint) {
     curve.setKeypointInputHandles(handle, info.inputTangentX, info.inputTangentY, true);
     curve.setKeypointOutputHandles(handle, info.outputTangentX, info.outputTangentY, true);
     curve.setKeypointFlags(handle, info.flags, true);
-    curve.enableKeypoint(handle, info.enabled, true);
+    enable(curve, handle, info.enabled);
 }
 
 /// All of them, in their order, into a stretch that is free of others. Pasting goes by time: it takes one of
