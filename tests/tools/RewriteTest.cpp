@@ -226,6 +226,20 @@ TEST_F(RewriteTest, EveryKeypointCounts) {
           "<inputTangentTime>-0.5</inputTangentTime>", "<inputTangentValue>5</inputTangentValue>"}) {
         EXPECT_NE(text.find(part), std::string::npos) << part << text;
     }
+
+    // Those beside them have theirs as before.
+    expectKeypointsAfter(
+        {{{"scale", "--factor", "2", "--from", "1", "--to", "1"}, "0/1 1; 1/1 4; 8/1 3; "}},
+        "<keypoint><time>0/1</time><value>1</value><outputTangentTime>0.25</outputTangentTime>"
+        "<outputTangentValue>2</outputTangentValue></keypoint>" +
+            keypoint("1/1", "2") +
+            "<keypoint><time>8/1</time><value>3</value><inputTangentTime>-0.5</inputTangentTime>"
+            "<inputTangentValue>5</inputTangentValue></keypoint>");
+    for (char const* const part :
+         {"<outputTangentTime>0.25</outputTangentTime>", "<outputTangentValue>2</outputTangentValue>",
+          "<inputTangentTime>-0.5</inputTangentTime>", "<inputTangentValue>5</inputTangentValue>"}) {
+        EXPECT_NE(contentOf(_file).find(part), std::string::npos) << part << contentOf(_file);
+    }
 }
 
 TEST_F(RewriteTest, LockedKeypointsStay) {

@@ -47,10 +47,15 @@ std::vector<Tempus> timesOfLocked(KFCurve& curve) {
     return times;
 }
 
+/// Others keep their handles, unlike where a user deletes one.
+void deleteKeypoint(KFCurve& curve, void* handle) {
+    curve.getSpline()->deleteVertex(handle, false, kTempusZero);
+}
+
 /// But those that are locked.
 void deleteKeypoints(KFCurve& curve, TimeSpan const& span) {
-    for (void* const handle : keypointsWithin(curve, span)) {
-        curve.delKeypoint(handle, true);
+    for (void* const handle : unlockedWithin(curve, span)) {
+        deleteKeypoint(curve, handle);
     }
 }
 
@@ -62,7 +67,7 @@ void keepUnlockedWithin(KFCurve& curve, TimeSpan const& span) {
             curve.lockKeypoint(handle, false, true);
         }
         if (locked || !span.holds(timeOf(curve, handle))) {
-            curve.getSpline()->deleteVertex(handle, false, kTempusZero); // others keep their handles
+            deleteKeypoint(curve, handle);
         }
     }
 }
