@@ -6,12 +6,11 @@
 #include "tools/check/DocumentClasses.h"
 #include "tools/check/DocumentVocabulary.h"
 #include "tools/check/FlagsCheck.h"
-#include "tools/check/KeypointCheck.h"
+#include "tools/check/OpenElement.h"
 #include "tools/output/TextForms.h"
 
 #include <algorithm>
 #include <limits>
-#include <map>
 #include <optional>
 #include <utility>
 #include <vector>
@@ -19,36 +18,6 @@
 namespace lumenkey::tools {
 
 namespace {
-
-/// An element that is open.
-struct OpenElement {
-    std::string name;
-    DocumentWord const* word = nullptr;
-    TextPlace place;
-    std::string text;
-    /// Its parts so far, but for those of which there may be several.
-    std::vector<DocumentWord const*> parts;
-    /// Whether text that is passed over has been told, and nothing has ended it.
-    bool isInStrayText = false;
-    /// Of a channel: its class, or null; and those of its children so far, by ID.
-    KFFactory* factory = nullptr;
-    std::map<std::uint64_t, KFFactory*> children;
-    std::optional<FlagsCheck> flags;
-    /// Of a channel or a curve. What those of a curve may be is known at its end.
-    std::vector<std::pair<std::string, std::string>> attributes;
-    /// Of a curve.
-    CurveClass curveClass;
-    CurveLimits limits;
-    bool hasKeypoints = false;
-    /// As from the first keypoint on, or from their number.
-    bool canBeClosed = false;
-    Tempus lastTime = kTempusInvalid;
-    /// Where the last of the limits stands.
-    TextPlace limitPlace;
-    std::optional<KeypointCheck> keypoint;
-
-    Attributes attributeViews() const { return {attributes.begin(), attributes.end()}; }
-};
 
 bool isBlank(std::string_view text) { return text.find_first_not_of(" \t\r\n") == std::string_view::npos; }
 

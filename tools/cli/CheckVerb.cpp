@@ -92,8 +92,8 @@ Verb declareCheck(CLI::App& program) {
         "A line for each finding, FILE:LINE:COLUMN: what it is; nothing is changed. Of documents: text that "
         "is no XML,\nelements and classes that are unknown and so passed over, values and attributes that "
         "can't be read or are out of\nlimits, keypoints out of order or without a time or a value, what is "
-        "there "
-        "twice or contradicts itself, a version\nthat is unknown. Exits 0 where there is nothing, else 1.\n\n"
+        "there twice or contradicts itself, a version\nthat is unknown. Exits 0 where there is nothing, else "
+        "1.\n\n"
         "Example: lumenkey check *.lumen");
     Verb declared{verb, "FILE...", {}};
     declared.runForExit = [options](OutputSink& out) { return forSeveralFiles(options->files, out, check); };
