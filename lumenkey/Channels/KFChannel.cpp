@@ -103,6 +103,8 @@ void KFChannel::resetLocalChannelImplementation() {
         return;
     if (_prototypeImpl == nullptr || _prototypeImpl == _impl || !(*_impl == *_prototypeImpl))
         return;
+    if (_impl->getCurve() != nullptr && !_impl->getCurve()->hasSignsOf(*_prototypeImpl->getCurve()))
+        return;
     freeLocalImpl();
     _impl = _prototypeImpl;
     installPrototypeCurveInterface();

@@ -9,6 +9,9 @@
 #include "lumenkey/splines/KFSplineAccess.h"
 #include "lumenkey/splines/KFSplineState.h"
 
+#include <array>
+#include <cmath>
+
 KFCurve::KFCurve(double minimum, double maximum, double initialValue)
     : _rootNode(&_constantNode), _constantNode(initialValue), _splineNode(this), _minValue(minimum),
       _maxValue(maximum) {}
@@ -44,6 +47,18 @@ bool KFCurve::operator==(KFCurve const& other) const {
            _constantNode.compare(&other._constantNode) && _pointToPoint == other._pointToPoint &&
            _remapsTime == other._remapsTime && _keyframable.get() == other._keyframable.get() &&
            _splineNode.compare(&other._splineNode) && settings() == other.settings() && sameRoot(other);
+}
+
+bool KFCurve::hasSignsOf(KFCurve const& other) const {
+    auto const signs = [](KFCurve const& curve) {
+        return std::array{std::signbit(curve._minValue.get()),
+                          std::signbit(curve._maxValue.get()),
+                          std::signbit(curve._constantNode.getInitialValue()),
+                          std::signbit(curve._constantNode.getDefaultValue()),
+                          std::signbit(curve._splineNode.getInitialValue()),
+                          std::signbit(curve._splineNode.getDefaultValue())};
+    };
+    return signs(*this) == signs(other);
 }
 
 /// The kinds too: a constant node takes a spline node for its equal, but not the other way round.

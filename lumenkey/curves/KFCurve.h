@@ -62,6 +62,9 @@ public:
     /// Limits, flags (those about the chain included), both embedded nodes, settings, kinds of root; the nodes of the
     /// chain are not looked at.
     bool operator==(KFCurve const& other) const;
+    /// Whether zeros among constants, defaults and limits have the signs of the other's, which equality doesn't see:
+    /// documents tell 0 and -0 apart.
+    bool hasSignsOf(KFCurve const& other) const;
     ~KFCurve() override;
 
     // Of BXSerializer. The keypoints are read 4096 at a time under the spline's lock, for a digest 128, and written

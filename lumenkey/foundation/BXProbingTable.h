@@ -10,6 +10,9 @@
 /// Entries by their keys, in one block. Open addressing with linear probing and deletion by shifting back (Knuth, "The
 /// Art of Computer Programming", volume 3, 6.4, algorithm R).
 ///
+/// Keys may come from whoever wrote a document, so their homes differ from process to process: nobody can choose keys
+/// that all want the same place.
+///
 /// `Entry` has a type `Key`, `key()`, `isFree()`, which is true of a new one, and a static `bits(Key)`, which differs
 /// between keys. Pointers to entries stay good until the next call that isn't const.
 template <class Entry> class BXProbingTable {
@@ -69,10 +72,13 @@ private:
         return std::bit_ceil(std::max(kSmallestTable, count + count / 3 + 1));
     }
 
+    /// Two rounds of a multiplication and a fold, as in the finalizer of MurmurHash3 (Appleby), behind a secret: where
+    /// the system has put this library.
     std::size_t home(Key key) const noexcept {
-        // Multiplicative hashing by the golden ratio: the low bits of pointers carry little.
-        return static_cast<std::size_t>((Entry::bits(key) * 0x9E3779B97F4A7C15ULL) >> 32) &
-               (_slots.size() - 1);
+        auto const secret = static_cast<std::uint64_t>(reinterpret_cast<std::uintptr_t>(&kSmallestTable));
+        std::uint64_t mixed = (Entry::bits(key) ^ secret) * 0x9E3779B97F4A7C15ULL;
+        mixed = (mixed ^ (mixed >> 32)) * 0xFF51AFD7ED558CCDULL;
+        return static_cast<std::size_t>(mixed >> 32) & (_slots.size() - 1);
     }
 
     /// The slot of the key, or the free one where it would go.

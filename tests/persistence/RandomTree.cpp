@@ -167,7 +167,7 @@ void deleteBelow(KFChannelFolder& folder) {
 double randomNumber(Random& random) {
     switch (below(random, 6)) {
     case 0:
-        return 0.0;
+        return oneIn(random, 2) ? 0.0 : -0.0;
     case 1:
         return static_cast<double>(static_cast<std::int64_t>(below(random, 2001)) - 1000);
     case 2:

@@ -49,6 +49,20 @@ TEST_F(DocumentVerbsTest, MotionsAndTablesComeBackFromDocuments) {
         << "a failure has replaced the file";
 }
 
+TEST_F(DocumentVerbsTest, ZerosKeepTheirSigns) {
+    std::string const zeros =
+        _folder.write("zeros.lumen", documentOf("<parameter id=\"1\" factoryID=\"1\"><parameter id=\"2\" "
+                                                "factoryID=\"3\"><curve type=\"1\" value=\"-0\"/>"
+                                                "</parameter><parameter id=\"3\" factoryID=\"3\"><curve "
+                                                "type=\"1\" default=\"-0\"/></parameter></parameter>"));
+    outputOf({"convert", zeros, _document});
+    std::string const once = contentOf(_document);
+    EXPECT_NE(once.find("default=\"0\" value=\"-0\""), std::string::npos) << once;
+    EXPECT_NE(once.find("default=\"-0\" value=\"0\""), std::string::npos) << once;
+    outputOf({"convert", _document, _document});
+    EXPECT_EQ(contentOf(_document), once);
+}
+
 TEST_F(DocumentVerbsTest, MotionsOfAnyFrameTimeComeBackFromDocuments) {
     struct {
         char const* frameTime;
