@@ -189,6 +189,12 @@ TEST_F(CheckVerbTest, FindsWhatIsOddWithItsPlace) {
     EXPECT_EQ(jsonOf({"info", _folder.file("f.lumen")})["version"], "4.1");
 }
 
+TEST_F(CheckVerbTest, EndsAtAnEndlessTag) {
+    std::string const name(std::size_t{65} << 20, 'a');
+    EXPECT_EQ(findingsIn("<kfml version=\"5.13\"><parameter id=\"1\" name=\"" + name + "\"/></kfml>"),
+              "1:22: a tag or comment is longer than 67108864 bytes\n");
+}
+
 TEST_F(CheckVerbTest, ReadsAPipeOnce) {
     std::string const odd =
         _folder.write("odd.lumen", documentOf("<parameter id=\"1\" factoryID=\"1\">\n<odd/></parameter>"));

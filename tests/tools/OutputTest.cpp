@@ -11,6 +11,7 @@
 #include <nlohmann/json.hpp>
 #include <random>
 #include <sys/stat.h>
+#include <unistd.h>
 
 namespace lumenkey::tools {
 namespace {
@@ -115,7 +116,15 @@ TEST_F(SafeOutputFileTest, KeepsPermissionsAndLinks) {
     fs::permissions(_target, fs::perms::owner_read | fs::perms::owner_write | fs::perms::group_read);
     fs::create_symlink("out.txt", _folder.file("link"));
     fs::create_symlink("link", _folder.file("linkToLink"));
+    constexpr ::uid_t someone = 65'534;
+    bool const maySetOwners = ::geteuid() == 0;
+    if (maySetOwners) {
+        ASSERT_EQ(::chown(_target.c_str(), someone, someone), 0);
+    }
     EXPECT_EQ(faultOfWriting(_folder.file("linkToLink")), "");
+    struct stat written {};
+    ASSERT_EQ(::stat(_target.c_str(), &written), 0);
+    EXPECT_EQ(written.st_uid, maySetOwners ? someone : ::geteuid());
     EXPECT_TRUE(fs::is_symlink(_folder.file("linkToLink")) && fs::is_symlink(_folder.file("link")));
     EXPECT_EQ(contentOf(_target), "new");
     EXPECT_EQ(fs::status(_target).permissions(),

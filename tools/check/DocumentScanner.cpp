@@ -1,8 +1,10 @@
 #include "tools/check/DocumentScanner.h"
 
+#include "lumenkey/foundation/BXDocumentReader.h"
 #include "tools/import/InputError.h"
 #include "tools/output/TextForms.h"
 
+#include <algorithm>
 #include <cerrno>
 #include <cstdio>
 #include <exception>
@@ -12,6 +14,13 @@
 #include <new>
 
 namespace lumenkey::tools {
+
+namespace {
+
+constexpr std::size_t kBlock = 65'536;
+constexpr std::size_t kLongestToken = BXDocumentReader::kLongestText;
+
+} // namespace
 
 /// One scan, as its parser calls it.
 class DocumentScanner::Run {
@@ -62,13 +71,13 @@ public:
     }
 
     void runText(std::string_view text, ReadingProgress const& progress) {
-        constexpr std::size_t block = 65'536;
         auto const size = static_cast<double>(text.size());
         for (bool isLast = false; !isLast && !_isStopped;) {
-            std::string_view const part = text.substr(0, block);
+            std::string_view const part = text.substr(0, _block);
             text.remove_prefix(part.size());
             isLast = text.empty();
-            endBlock(XML_Parse(_parser.get(), part.data(), static_cast<int>(part.size()), isLast));
+            endBlock(XML_Parse(_parser.get(), part.data(), static_cast<int>(part.size()), isLast),
+                     part.size());
             if (progress) {
                 progress(1 - static_cast<double>(text.size()) / size);
             }
@@ -83,11 +92,27 @@ private:
         }
     }
 
-    void endBlock(XML_Status status) {
-        if (status != XML_STATUS_OK && !_isStopped) {
+    /// A token that a block cuts off is begun anew with the next one. Blocks as long as what is left over keep
+    /// that linear; one that the library doesn't read ends the scan.
+    void endBlock(XML_Status status, std::size_t size) {
+        if (_isStopped) {
+            return;
+        }
+        if (status != XML_STATUS_OK) {
             _isStopped = true;
             _scanner.fault(place(), XML_ErrorString(XML_GetErrorCode(_parser.get())));
+            return;
         }
+        _fed += size;
+        XML_Index const done = XML_GetCurrentByteIndex(_parser.get());
+        std::size_t const left = done < 0 ? 0 : _fed - std::min(_fed, static_cast<std::size_t>(done));
+        if (left >= kLongestToken) {
+            _isStopped = true;
+            _scanner.fault(place(),
+                           "a tag or comment is longer than " + std::to_string(kLongestToken) + " bytes");
+            return;
+        }
+        _block = std::min(std::max(kBlock, left), kLongestToken - left);
     }
 
     /// Nothing may be thrown through the parser, which is written in C.
@@ -122,22 +147,23 @@ private:
     }
 
     std::size_t feedBlock(std::FILE& stream, std::string const& file, bool* isLast) {
-        constexpr int block = 65'536;
-        void* const room = XML_GetBuffer(_parser.get(), block);
+        void* const room = XML_GetBuffer(_parser.get(), static_cast<int>(_block));
         if (room == nullptr) {
             throw std::bad_alloc();
         }
-        std::size_t const got = std::fread(room, 1, block, &stream);
+        std::size_t const got = std::fread(room, 1, _block, &stream);
         if (std::ferror(&stream) != 0) {
             throw InputError{file, 1, 1, systemErrorText(errno)};
         }
-        *isLast = got < block;
-        endBlock(XML_ParseBuffer(_parser.get(), static_cast<int>(got), *isLast));
+        *isLast = got < _block;
+        endBlock(XML_ParseBuffer(_parser.get(), static_cast<int>(got), *isLast), got);
         return got;
     }
 
     DocumentScanner& _scanner;
     std::unique_ptr<XML_ParserStruct, void (*)(XML_Parser)> _parser;
+    std::size_t _block = kBlock;
+    std::size_t _fed = 0;
     bool _isStopped = false;
     std::exception_ptr _thrown;
 };

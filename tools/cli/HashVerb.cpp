@@ -63,9 +63,11 @@ Verb declareHash(CLI::App& program) {
     verb->add_option("--at", options->at, "Only of the values at that time")->option_text("T");
     options->input.addFrameRate(*verb);
     verb->footer(
-        "32 hexadecimal digits, the same for the same names, IDs, values and keypoints, however the file "
-        "came to them;\nwith --at for the same values, whatever the keypoints are. Defaults don't enter. "
-        "It is no proof against forgery.\n\nExample: lumenkey hash ball.lumen Body --at 1/2");
+        "32 hexadecimal digits, the same for the same names, IDs, values and keypoints, with times in the "
+        "same "
+        "terms\n(2/4 isn't 1/2 here); with --at for the same values, whatever the keypoints are. Defaults "
+        "don't "
+        "enter. It is no\nproof against forgery.\n\nExample: lumenkey hash ball.lumen Body --at 1/2");
     return {verb, "FILE [CHANNEL] [--at T] [--frame-rate R]",
             [options](OutputSink& out) { runHash(*options, out); }};
 }

@@ -8,6 +8,7 @@
 #include <cstdlib>
 #include <fcntl.h>
 #include <filesystem>
+#include <optional>
 #include <sys/stat.h>
 #include <system_error>
 #include <unistd.h>
@@ -40,19 +41,32 @@ mode_t permissionsOfNewFiles() {
     return 0666 & ~mask;
 }
 
-/// The permissions that the replacement of `path` gets. Throws `std::system_error`.
-mode_t permissionsFor(fs::path const& path) {
+/// What the file at `path` is; nothing where there is none. Throws `std::system_error`.
+std::optional<struct stat> replacedFile(fs::path const& path) {
     struct stat status {};
     if (::stat(path.c_str(), &status) != 0) {
         if (errno == ENOENT) {
-            return permissionsOfNewFiles();
+            return std::nullopt;
         }
         throw std::system_error(errno, std::generic_category());
     }
     if (!S_ISREG(status.st_mode)) {
         throw std::system_error(S_ISDIR(status.st_mode) ? EISDIR : EINVAL, std::generic_category());
     }
-    return status.st_mode & 07777;
+    return status;
+}
+
+/// Gives a new file the owner, the group and the permissions of the one that it replaces. Where the owner or
+/// the group can't be had, what runs a file as them goes too. 0, or the number of the error.
+int takeOver(int descriptor, std::optional<struct stat> const& replaced) {
+    mode_t permissions = replaced ? replaced->st_mode & 07777 : permissionsOfNewFiles();
+    if (replaced) {
+        // Each for itself: a group of one's own can be given where the owner can't.
+        bool const hasGroup = ::fchown(descriptor, static_cast<uid_t>(-1), replaced->st_gid) == 0;
+        bool const hasOwner = ::fchown(descriptor, replaced->st_uid, static_cast<gid_t>(-1)) == 0;
+        permissions &= ~static_cast<mode_t>((hasOwner ? 0 : S_ISUID) | (hasGroup ? 0 : S_ISGID));
+    }
+    return ::fchmod(descriptor, permissions) != 0 ? errno : 0;
 }
 
 int synchronizeDirectory(fs::path const& directory) {
@@ -75,7 +89,7 @@ fs::path directoryOf(fs::path const& path) {
 SafeOutputFile::SafeOutputFile(std::string const& target) : _name(target) {
     try {
         fs::path const real = followLinks(target);
-        mode_t const permissions = permissionsFor(real);
+        std::optional<struct stat> const replaced = replacedFile(real);
         _target = real.string();
         // Not made of the target's name, which may be as long as a name can be.
         _temporary = (directoryOf(real) / ".lumenkey-XXXXXX").string();
@@ -84,8 +98,8 @@ SafeOutputFile::SafeOutputFile(std::string const& target) : _name(target) {
             _temporary.clear();
             fail(errno);
         }
-        if (::fchmod(_descriptor, permissions) != 0) {
-            fail(errno);
+        if (int const error = takeOver(_descriptor, replaced)) {
+            fail(error);
         }
     } catch (std::system_error const& error) {
         fail(error.code().value());
