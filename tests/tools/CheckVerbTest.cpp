@@ -56,6 +56,12 @@ TEST_F(CheckVerbTest, FindsWhatIsOddWithItsPlace) {
          "6:1: the channel 'Q' has the ID 4 of one before it: it is read into that one\n"
          "7:1: the element 'foldFlags' is none of a channel of the class Percent: it is passed over\n"
          "8:1: the channel '' has the ID 4 of one before it: it is read into that one\n"},
+        {"<parameter id=\"1\" factoryID=\"3\"><curve type=\"1\">\n<keypoint><time>1/1</time><value>1</value>"
+         "</keypoint>\n<keypoint><time>indefinite</time><value>1</value></keypoint>\n<keypoint><time>0/1</"
+         "time>"
+         "<value>1</value></keypoint></curve></parameter>",
+         "6:11: the time of the keypoint is 'indefinite', which is no place in time\n"
+         "7:11: the keypoint lies before the one in front of it\n"},
         {"<parameter id=\"1\" "
          "factoryID=\"2\">\n<foldFlags>1</foldFlags>\n<fadeInCurve>4</fadeInCurve>\n<curve "
          "type=\"1\" value=\"3\">\n<preExtrapolation>-1</preExtrapolation>\n<keypoint interpolation=\"99\">\n"

@@ -66,8 +66,11 @@ std::string faultOfOrder(std::string_view text, bool countsFrames, Tempus& lastT
         std::optional<double> const frames = readNumber(text);
         time = frames ? TempusMake(1, 1) * *frames : kTempusInvalid;
     }
+    if (!TempusIsNumeric(time)) {
+        return "the time of the keypoint is '" + std::string(text) + "', which is no place in time";
+    }
     Tempus const before = std::exchange(lastTime, time);
-    bool const isBehind = TempusIsNumeric(time) && TempusIsNumeric(before) && time < before;
+    bool const isBehind = TempusIsNumeric(before) && time < before;
     return isBehind ? "the keypoint lies before the one in front of it" : "";
 }
 

@@ -11,8 +11,8 @@ namespace lumenkey::tools {
 /// away.
 ///
 /// An existing file gives its permissions to the new one, and its owner and group where that is allowed (else
-/// without what runs it as them). A symbolic link stays, and the file it leads to is
-/// replaced. A target that is neither missing nor a plain file is refused.
+/// without what runs it as them). A symbolic link stays, and the file it leads to is replaced. A target that
+/// is neither missing nor a plain file is refused.
 ///
 /// Failures throw `OutputError`; the target is untouched then, and the temporary gone. Only a failure to
 /// bring the renamed entry itself to the disk is told after the replacement.
