@@ -10,8 +10,9 @@
 /// Entries by their keys, in one block. Open addressing with linear probing and deletion by shifting back (Knuth, "The
 /// Art of Computer Programming", volume 3, 6.4, algorithm R).
 ///
-/// Keys may come from whoever wrote a document, so their homes differ from process to process: nobody can choose keys
-/// that all want the same place.
+/// Keys may come from whoever wrote a document. Where the system places code at random, their homes differ from process
+/// to process, so that nobody can choose keys that all want the same place; in a program that is always placed alike
+/// (linked without PIE around the static library) somebody who knows it can.
 ///
 /// `Entry` has a type `Key`, `key()`, `isFree()`, which is true of a new one, and a static `bits(Key)`, which differs
 /// between keys. Pointers to entries stay good until the next call that isn't const.
