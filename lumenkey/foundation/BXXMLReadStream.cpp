@@ -2,6 +2,7 @@
 
 #include "lumenkey/foundation/BXByteSource.h"
 #include "lumenkey/foundation/BXDocumentReader.h"
+#include "lumenkey/foundation/BXParserBlock.h"
 
 #include <algorithm>
 #include <exception>
@@ -14,8 +15,6 @@
 
 namespace {
 
-constexpr std::uint64_t kBlock = 64 << 10;
-constexpr std::uint64_t kLongestToken = BXDocumentReader::kLongestText;
 constexpr std::uint64_t kUsualSizeLimit = std::uint64_t{4} << 30;
 
 bool startsWithMark(std::string_view text) {
@@ -133,18 +132,14 @@ void BXXMLReadStream::Reading::run() {
     XML_SetCharacterDataHandler(_parser.get(), onText);
     XML_SetStartDoctypeDeclHandler(_parser.get(), onDocumentType);
 
-    std::uint64_t block = kBlock;
+    std::uint64_t block = kFirstParserBlock;
     bool isLast = false;
     while (!isLast && feed(&block, &isLast)) {
-        // The parser begins a token that a block cuts off anew with the next one. Blocks as long as what is
-        // left over keep that linear, and none reaches past the longest token.
-        XML_Index const done = XML_GetCurrentByteIndex(_parser.get());
-        std::uint64_t const left = done < 0 ? 0 : _fed - std::min(_fed, static_cast<std::uint64_t>(done));
-        if (left >= kLongestToken) {
-            failHere("a tag or comment is longer than " + std::to_string(kLongestToken) + " bytes");
+        block = BXNextParserBlock(_fed, XML_GetCurrentByteIndex(_parser.get()));
+        if (block == 0) {
+            failHere(BXTokenTooLong());
             return;
         }
-        block = std::min(std::max(kBlock, left), kLongestToken - left);
     }
 }
 

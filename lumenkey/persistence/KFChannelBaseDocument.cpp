@@ -3,6 +3,7 @@
 #include "lumenkey/Channels/KFChannelBase.h"
 #include "lumenkey/Channels/KFFactory.h"
 #include "lumenkey/persistence/KFDocumentElements.h"
+#include "lumenkey/persistence/KFDocumentFlags.h"
 
 namespace {
 
@@ -59,9 +60,7 @@ bool KFChannelBase::parseBegin(BXSerializerReadStream& stream) {
 
 bool KFChannelBase::parseEnd(BXSerializerReadStream&) { return true; }
 
-/// The flags of a document that stands alone. They replace the whole word, but for what a node is: a document
-/// can't make a folder of a value. A root is locked only when its children have been read, and keeps the bit
-/// that no document holds.
+/// The flags of a document that stands alone.
 bool KFChannelBase::parseElement(BXSerializerReadStream& stream, BXStreamElement& element) {
     // This was a folder for the writer; what its children hold isn't for this node.
     if (element.tag() == kParameterElement && !testFlag(kChannelFlagIsFolder))
@@ -71,11 +70,6 @@ bool KFChannelBase::parseElement(BXSerializerReadStream& stream, BXStreamElement
         return true;
     if ((flags & ~kChannelNonStateFlags) != 0)
         willBeModified(kModifyState);
-    KFChannelFlags own = kChannelClassFlags;
-    if (testFlag(kChannelFlagIsObjectRoot)) {
-        flags &= ~std::uint64_t{kChannelFlagLocked};
-        own |= kChannelFlagNameUnset;
-    }
-    _flags = (flags & ~own) | (_flags & own);
+    _flags = KFFlagsOfElement(_flags, flags);
     return true;
 }

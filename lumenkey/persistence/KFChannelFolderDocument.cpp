@@ -5,14 +5,13 @@
 #include "lumenkey/Channels/KFFactories.h"
 #include "lumenkey/Channels/KFFactory.h"
 #include "lumenkey/persistence/KFDocumentElements.h"
+#include "lumenkey/persistence/KFDocumentFlags.h"
 
 #include <memory>
 
 namespace {
 
 constexpr std::uint32_t kFoldFlagsOfDigest = 0x7FF8DFF0;
-/// Bits 17, 21 and 25 are the class's.
-constexpr std::uint32_t kFoldFlagsOfClass = 0x2220000;
 
 constexpr BXUUID kBlindData = KFClassUUID("6F69A722-E95C-4B7A-870B-FB0345C9F167");
 
@@ -64,7 +63,7 @@ bool KFChannelFolder::parseElement(BXSerializerReadStream& stream, BXStreamEleme
     if (element.tag() == kFoldFlagsElement) {
         std::uint32_t flags = 0;
         if (element.getAsUInt32(&flags))
-            _foldFlags = (flags & ~kFoldFlagsOfClass) | (_foldFlags & kFoldFlagsOfClass);
+            _foldFlags = KFFoldFlagsOfElement(_foldFlags, flags);
     } else if (element.tag() == kParameterElement) {
         parseChild(stream, element);
     }
@@ -103,8 +102,7 @@ void KFChannelFolder::parseChild(BXSerializerReadStream& stream, BXStreamElement
     }
     std::uint64_t flags = 0;
     if (element.getAttributeAsUInt64(kFlagsAttribute, &flags))
-        child->setFlags((child->getFlags() & kChannelParsePreservedFlags) |
-                        (flags & ~kChannelParsePreservedFlags));
+        child->setFlags(KFFlagsOfAttribute(child->getFlags(), flags));
     auto* const channel = dynamic_cast<KFChannel*>(child);
     double number = 0.0;
     if (channel != nullptr && element.getAttributeAsDouble(kDefaultAttribute, &number))

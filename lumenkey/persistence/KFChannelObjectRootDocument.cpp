@@ -3,6 +3,7 @@
 #include "lumenkey/Channels/KFChannelObjectRootBase.h"
 #include "lumenkey/Channels/KFFactory.h"
 #include "lumenkey/persistence/KFDocumentElements.h"
+#include "lumenkey/persistence/KFDocumentFlags.h"
 
 namespace {
 
@@ -10,9 +11,6 @@ namespace {
 constexpr KFChannelFlags kFlagsLeftOut = kChannelFlagLocked | kChannelFlagNotSaved | kChannelFlagIsFolder |
                                          kChannelFlagIsObjectRoot | kChannelFlagDisabled |
                                          kChannelFlagNameUnset;
-/// What the flags of a document don't change.
-constexpr KFChannelFlags kFlagsKept = kChannelFlagDisabled | kChannelFlagLocked | kChannelFlagNameUnset;
-constexpr KFChannelFlags kLowWord = 0xFFFFFFFF;
 constexpr KFChannelFlags kSelfDigestFlags = kChannelFlagDisabled | kChannelFlagSolo;
 constexpr std::uint32_t kSelfDigestFoldFlagsLeftOut = 0x7200F;
 
@@ -117,7 +115,7 @@ bool KFChannelObjectRootBase::parseElement(BXSerializerReadStream& stream, BXStr
     case kBaseFlagsElement:
         // Only the low word of a document counts.
         if (element.getAsUInt64(&flags))
-            setFlags((flags & kLowWord & ~kFlagsKept) | (getFlags() & kFlagsKept) | kChannelClassFlags);
+            setFlags(KFFlagsOfBaseFlags(getFlags(), flags));
         break;
     case kEnabledElement:
         if (element.getAsBool(&on))

@@ -19,8 +19,6 @@ namespace lumenkey::tools {
 
 namespace {
 
-bool isBlank(std::string_view text) { return text.find_first_not_of(" \t\r\n") == std::string_view::npos; }
-
 /// The check of one document.
 class Checker : public DocumentScanner {
 public:
@@ -183,9 +181,9 @@ private:
         }
         if (element.word->text != TextKind::None) {
             element.text += more;
-        } else if (!element.isInStrayText && !isBlank(more)) {
+        } else if (std::size_t const blanks = more.find_first_not_of(" \t\r\n");
+                   !element.isInStrayText && blanks != std::string_view::npos) {
             element.isInStrayText = true;
-            std::size_t const blanks = more.find_first_not_of(" \t\r\n");
             find({place.line, place.column + blanks},
                  "text stands in the element '" + element.name + "': it is passed over");
         }

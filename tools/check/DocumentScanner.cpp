@@ -1,10 +1,9 @@
 #include "tools/check/DocumentScanner.h"
 
-#include "lumenkey/foundation/BXDocumentReader.h"
+#include "lumenkey/foundation/BXParserBlock.h"
 #include "tools/import/InputError.h"
 #include "tools/output/TextForms.h"
 
-#include <algorithm>
 #include <cerrno>
 #include <cstdio>
 #include <exception>
@@ -14,13 +13,6 @@
 #include <new>
 
 namespace lumenkey::tools {
-
-namespace {
-
-constexpr std::size_t kBlock = 65'536;
-constexpr std::size_t kLongestToken = BXDocumentReader::kLongestText;
-
-} // namespace
 
 /// One scan, as its parser calls it.
 class DocumentScanner::Run {
@@ -59,12 +51,10 @@ public:
         }
         std::error_code unknown;
         auto const size = static_cast<double>(std::filesystem::file_size(file, unknown));
-        double done = 0;
         for (bool isLast = false; !isLast && !_isStopped;) {
-            std::size_t const got = feedBlock(*stream, file, &isLast);
-            done += static_cast<double>(got);
+            feedBlock(*stream, file, &isLast);
             if (progress && !unknown) {
-                progress(done / size);
+                progress(static_cast<double>(_fed) / size);
             }
         }
         rethrow();
@@ -92,27 +82,18 @@ private:
         }
     }
 
-    /// A token that a block cuts off is begun anew with the next one. Blocks as long as what is left over keep
-    /// that linear; one that the library doesn't read ends the scan.
+    /// Of as many bytes.
     void endBlock(XML_Status status, std::size_t size) {
         if (_isStopped) {
             return;
         }
-        if (status != XML_STATUS_OK) {
-            _isStopped = true;
-            _scanner.fault(place(), XML_ErrorString(XML_GetErrorCode(_parser.get())));
-            return;
-        }
         _fed += size;
-        XML_Index const done = XML_GetCurrentByteIndex(_parser.get());
-        std::size_t const left = done < 0 ? 0 : _fed - std::min(_fed, static_cast<std::size_t>(done));
-        if (left >= kLongestToken) {
+        _block = BXNextParserBlock(_fed, XML_GetCurrentByteIndex(_parser.get()));
+        if (status != XML_STATUS_OK || _block == 0) {
             _isStopped = true;
-            _scanner.fault(place(),
-                           "a tag or comment is longer than " + std::to_string(kLongestToken) + " bytes");
-            return;
+            _scanner.fault(place(), status != XML_STATUS_OK ? XML_ErrorString(XML_GetErrorCode(_parser.get()))
+                                                            : BXTokenTooLong());
         }
-        _block = std::min(std::max(kBlock, left), kLongestToken - left);
     }
 
     /// Nothing may be thrown through the parser, which is written in C.
@@ -146,7 +127,7 @@ private:
         _scanner.start(place(), name, attributes);
     }
 
-    std::size_t feedBlock(std::FILE& stream, std::string const& file, bool* isLast) {
+    void feedBlock(std::FILE& stream, std::string const& file, bool* isLast) {
         void* const room = XML_GetBuffer(_parser.get(), static_cast<int>(_block));
         if (room == nullptr) {
             throw std::bad_alloc();
@@ -157,13 +138,12 @@ private:
         }
         *isLast = got < _block;
         endBlock(XML_ParseBuffer(_parser.get(), static_cast<int>(got), *isLast), got);
-        return got;
     }
 
     DocumentScanner& _scanner;
     std::unique_ptr<XML_ParserStruct, void (*)(XML_Parser)> _parser;
-    std::size_t _block = kBlock;
-    std::size_t _fed = 0;
+    std::uint64_t _block = kFirstParserBlock;
+    std::uint64_t _fed = 0;
     bool _isStopped = false;
     std::exception_ptr _thrown;
 };

@@ -2,6 +2,7 @@
 
 #include "lumenkey/Channels/KFChannelFolder.h"
 #include "lumenkey/Channels/KFChannelObjectRootBase.h"
+#include "lumenkey/persistence/KFDocumentFlags.h"
 #include "tools/check/DocumentVocabulary.h"
 #include "tools/output/TextForms.h"
 
@@ -10,13 +11,6 @@
 namespace lumenkey::tools {
 
 namespace {
-
-/// Only the low word of `baseFlags` counts, and of that what no other element tells.
-constexpr KFChannelFlags kLowWord = 0xFFFFFFFF;
-constexpr KFChannelFlags kNotOfBaseFlags =
-    kChannelFlagDisabled | kChannelFlagLocked | kChannelFlagNameUnset | kChannelClassFlags;
-/// Folders keep these as they were made.
-constexpr std::uint32_t kFoldFlagsOfClass = 0x2220000;
 
 /// Says nothing of a channel.
 constexpr KFChannelFlags kUnstored = kChannelFlagNameUnset;
@@ -27,8 +21,7 @@ std::string saying(std::string_view name, std::string const& text) {
 
 } // namespace
 
-FlagsCheck::FlagsCheck(KFChannelBase const& example)
-    : _isRoot(example.testFlag(kChannelFlagIsObjectRoot)), _flags(example.getFlags()) {}
+FlagsCheck::FlagsCheck(KFChannelBase const& example) : _flags(example.getFlags()) {}
 
 void FlagsCheck::add(TextPlace const& place, std::string_view name, KFChannelFlags number, KFChannelFlags set,
                      KFChannelFlags clear) {
@@ -36,7 +29,7 @@ void FlagsCheck::add(TextPlace const& place, std::string_view name, KFChannelFla
 }
 
 void FlagsCheck::readAttribute(TextPlace const& place, KFChannelFlags flags) {
-    _flags = (_flags & kChannelParsePreservedFlags) | (flags & ~kChannelParsePreservedFlags);
+    _flags = KFFlagsOfAttribute(_flags, flags);
     // Whoever reads the document initializes the channel.
     add(place, "flags", flags, flags & ~(kUnstored | kChannelFlagInitialized),
         ~(flags | kUnstored | kChannelParsePreservedFlags));
@@ -59,14 +52,12 @@ void FlagsCheck::readElement(TextPlace const& place, std::string_view name, std:
 }
 
 void FlagsCheck::readFlags(TextPlace const& place, KFChannelFlags flags) {
-    KFChannelFlags const own = kChannelClassFlags | (_isRoot ? kChannelFlagNameUnset : 0);
-    KFChannelFlags const taken = _isRoot ? flags & ~kChannelFlagLocked : flags;
-    _flags = (taken & ~own) | (_flags & own);
+    _flags = KFFlagsOfElement(_flags, flags);
     add(place, "flags", flags, flags & ~kUnstored, ~(flags | kUnstored | kChannelClassFlags));
 }
 
 void FlagsCheck::readBaseFlags(TextPlace const& place, KFChannelFlags flags) {
-    _flags = (flags & kLowWord & ~kNotOfBaseFlags) | (_flags & kNotOfBaseFlags);
+    _flags = KFFlagsOfBaseFlags(_flags, flags);
     add(place, "baseFlags", flags, flags & ~(kUnstored | kChannelFlagInitialized),
         kLowWord & ~(flags | kNotOfBaseFlags | kChannelFlagNotSaved));
 }
@@ -90,7 +81,7 @@ Fault faultOfFoldFlags(KFChannelBase const& example, std::string_view text) {
     if (folder == nullptr || example.testFlag(kChannelFlagIsObjectRoot)) {
         return {};
     }
-    std::uint32_t const kept = (flags & ~kFoldFlagsOfClass) | (folder->getFoldFlags() & kFoldFlagsOfClass);
+    std::uint32_t const kept = KFFoldFlagsOfElement(folder->getFoldFlags(), flags);
     return kept == flags ? Fault()
                          : Fault{saying("foldFlags", std::to_string(flags)) + ", but they become " +
                                  std::to_string(kept)};

@@ -40,7 +40,6 @@ private:
     void add(TextPlace const& place, std::string_view name, KFChannelFlags number, KFChannelFlags set,
              KFChannelFlags clear);
 
-    bool _isRoot;
     KFChannelFlags _flags;
     bool _isLockedAtEnd = false;
     std::vector<Source> _sources;

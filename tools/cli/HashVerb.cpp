@@ -64,10 +64,9 @@ Verb declareHash(CLI::App& program) {
     options->input.addFrameRate(*verb);
     verb->footer(
         "32 hexadecimal digits, the same for the same names, IDs, values and keypoints, with times in the "
-        "same "
-        "terms\n(2/4 isn't 1/2 here); with --at for the same values, whatever the keypoints are. Defaults "
-        "don't "
-        "enter. It is no\nproof against forgery.\n\nExample: lumenkey hash ball.lumen Body --at 1/2");
+        "same terms\n(2/4 isn't 1/2 here); with --at for the same values, whatever the keypoints are. "
+        "Defaults don't enter. It is no\nproof against forgery.\n\n"
+        "Example: lumenkey hash ball.lumen Body --at 1/2");
     return {verb, "FILE [CHANNEL] [--at T] [--frame-rate R]",
             [options](OutputSink& out) { runHash(*options, out); }};
 }

@@ -6,6 +6,7 @@
 #include "lumenkey/Channels/KFFactoryScope.h"
 #include "lumenkey/foundation/BXURL.h"
 #include "lumenkey/foundation/BXXMLReadStream.h"
+#include "lumenkey/persistence/KFDocumentFlags.h"
 #include "lumenkey/persistence/KFDocumentScopes.h"
 #include "lumenkey/persistence/KFDocumentVersion.h"
 #include "tools/curve/Keypoint.h"
@@ -118,8 +119,7 @@ private:
     void applyAttributes(BXStreamElement const& element) {
         std::uint64_t flags = 0;
         if (element.getAttributeAsUInt64(kFlagsAttribute, &flags)) {
-            _top->setFlags((_top->getFlags() & kChannelParsePreservedFlags) |
-                           (flags & ~kChannelParsePreservedFlags));
+            _top->setFlags(KFFlagsOfAttribute(_top->getFlags(), flags));
         }
         auto* const channel = dynamic_cast<KFChannel*>(_top.get());
         double number = 0;
