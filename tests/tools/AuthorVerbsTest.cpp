@@ -266,6 +266,22 @@ TEST_F(AuthorVerbsTest, DiffSeesPeaksOfAMomentOrderAndNames) {
                                                     "changed X: place among its siblings 1 became 2\n");
 }
 
+TEST_F(AuthorVerbsTest, OtherFilesBecomeDocuments) {
+    std::string const motion = _folder.write("m.bvh", samples::kSmallMotion);
+    std::string const out = _folder.file("out.lumen");
+    std::string const converted = _folder.file("converted.lumen");
+    outputOf({"convert", motion, converted});
+    outputOf({"add", motion, "Hips", "Double", "Weight", "--value", "2", "-o", out});
+    EXPECT_EQ(outputOf({"diff", converted, out}, 1), "added   Hips.Weight\n");
+    std::string const table = _folder.write("t.csv", "time,X,Y\n0,1,2\n1,3,4\n");
+    outputOf({"remove", table, "Y", "-o", out});
+    EXPECT_EQ(outputOf({"diff", table, out}, 1), "removed Y\n");
+    for (std::string const& file : {motion, table}) {
+        EXPECT_NE(complaintOf({"remove", file, "./1", "--in-place"}, 2).find("write one with -o OUT.lumen"),
+                  std::string::npos);
+    }
+}
+
 TEST_F(AuthorVerbsTest, LockedChannelsStayAsTheyAre) {
     _folder.write("ball.lumen",
                   documentOf("<parameter id=\"1\" factoryID=\"1\"><parameter name=\"Above\" id=\"1\" "

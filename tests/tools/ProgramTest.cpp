@@ -396,6 +396,8 @@ TEST_F(ProgramTest, ManualAndCompletionAreMadeOfTheSameTexts) {
     };
     EXPECT_EQ(completionsOf("lumenkey sm", 1), "smooth\n");
     EXPECT_EQ(completionsOf("lumenkey set f.lumen --in", 3), "--interpolation --in-place\n");
+    EXPECT_EQ(completionsOf("lumenkey set f.lumen X --interpolation ca", 5), "catmull-rom\n");
+    EXPECT_EQ(completionsOf("lumenkey add f.lumen ./ Dou", 4), "Double\n");
     EXPECT_EQ(completionsOf("lumenkey info '" + _folder.file("sma") + "'", 2), _file + "\n");
 }
 

@@ -11,10 +11,16 @@ using std::chrono::milliseconds;
 /// A screen whose time goes on only when it is told.
 class TestScreen {
 public:
-    ProgressScreen const screen{
-        true, true, [this] { return ProgressScreen::Clock::time_point(_time); },
-        [this](std::stop_token const& stop, milliseconds time) { return waitFor(stop, time); },
-        [this](std::string_view text) { shown += text; }};
+    /// Work began before, if it did.
+    explicit TestScreen(milliseconds begin = {})
+        : screen{true,
+                 true,
+                 ProgressScreen::Clock::time_point(begin),
+                 [this] { return ProgressScreen::Clock::time_point(_time); },
+                 [this](std::stop_token const& stop, milliseconds time) { return waitFor(stop, time); },
+                 [this](std::string_view text) { shown += text; }} {}
+
+    ProgressScreen const screen;
     /// Only to be looked at while time stands still.
     std::string shown;
 
@@ -67,6 +73,12 @@ TEST(Progress, IsDrawnAfterASecondAndThenNowAndThen) {
         test.shown.clear();
     }
     EXPECT_EQ(test.shown, "\r\x1B[K");
+}
+
+TEST(Progress, CountsTheWorkBeforeItsOwn) {
+    TestScreen test(milliseconds(-950));
+    Progress const bar("writing", ProgressOf::Work, test.screen);
+    EXPECT_NE(test.after(milliseconds(100)), "");
 }
 
 TEST(Progress, LeavesResultsAndShortWorkAlone) {

@@ -1,5 +1,6 @@
 #include "tools/check/DocumentCheck.h"
 
+#include "lumenkey/foundation/BXDocumentReader.h"
 #include "lumenkey/persistence/KFDocumentVersion.h"
 #include "tools/check/AttributeCheck.h"
 #include "tools/check/CurveCheck.h"
@@ -180,7 +181,9 @@ private:
             return;
         }
         if (element.word->text != TextKind::None) {
-            element.text += more;
+            if (element.text.size() <= BXDocumentReader::kLongestText) { // no longer one is read
+                element.text += more;
+            }
         } else if (std::size_t const blanks = more.find_first_not_of(" \t\r\n");
                    !element.isInStrayText && blanks != std::string_view::npos) {
             element.isInStrayText = true;
@@ -202,7 +205,7 @@ private:
         if (!isReadable) {
             bool const isKept = element.name == "value" && isStorable(element.text);
             tell({element.place,
-                  "'" + element.text + "' is " + std::string(nameOfTextKind(element.word->text)), !isKept});
+                  quoted(element.text) + " is " + std::string(nameOfTextKind(element.word->text)), !isKept});
         }
         if (above.keypoint) {
             tell(element.place,

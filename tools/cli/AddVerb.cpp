@@ -64,8 +64,7 @@ ChannelTree::Node requireParent(ChannelInput const& input, AddOptions const& opt
 void runAdd(AddOptions const& options, OutputSink& out) {
     options.author.check();
     KFChannelFactory& maker = requireMaker(options.type);
-    ChannelInput const input(options.author.input);
-    requireDocument(input);
+    ChannelInput const input = options.author.openAsDocument();
     ChannelTree::Node const parent = requireParent(input, options);
     std::unique_ptr<KFChannelBase> added(
         maker.createChannel(options.name, freeIDBelow(*input.tree().asFolder(parent))));

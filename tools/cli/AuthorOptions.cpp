@@ -28,6 +28,17 @@ void AuthorOptions::check() const {
     }
 }
 
+ChannelInput AuthorOptions::openAsDocument() const {
+    ChannelInput opened(input);
+    if (opened.file().format == ChannelFormat::Document) {
+        return opened;
+    }
+    if (output.formatFor(opened.file().format) != ChannelFormat::Document) {
+        throw UsageError{"'" + input.file + "' is no document: write one with -o OUT.lumen"};
+    }
+    return ChannelInput(asDocument(opened.file(), output.target(input.file)));
+}
+
 void AuthorOptions::write(ChannelInput const& opened) const {
     ChannelFormat const format = output.formatFor(opened.file().format);
     Progress bar("writing");
@@ -44,12 +55,6 @@ void setConstant(KFChannel& channel, double value, std::string const& name) {
     storeConstant(channel, value);
     if (channel.getInitialValue() != value) {
         throw UsageError{"'" + name + "' " + limitsText(channel, value)};
-    }
-}
-
-void requireDocument(ChannelInput const& input) {
-    if (input.file().format != ChannelFormat::Document) {
-        throw UsageError{"'" + input.file().file + "' is no document: make one of it with lumenkey convert"};
     }
 }
 

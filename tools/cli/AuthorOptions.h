@@ -20,6 +20,9 @@ struct AuthorOptions {
 
     /// Before the file is read. Throws `UsageError` for an output that can't be written.
     void check() const;
+    /// The file as a document: only those hold channels of any class. Another file is made one where one is
+    /// written; else throws `UsageError`.
+    ChannelInput openAsDocument() const;
     /// Throws `OutputError`, or `UsageError` for an output that can't be written from this input.
     void write(ChannelInput const& input) const;
 };
@@ -28,8 +31,5 @@ struct AuthorOptions {
 void setConstant(KFChannel& channel, double value, std::string const& name);
 /// Why a channel doesn't take a value.
 std::string limitsText(KFChannel const& channel, double value);
-
-/// Throws `UsageError` where the file is no document: only those hold channels of any class.
-void requireDocument(ChannelInput const& input);
 
 } // namespace lumenkey::tools

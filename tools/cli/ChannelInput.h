@@ -3,6 +3,7 @@
 #include "tools/import/ChannelFile.h"
 
 #include <string>
+#include <utility>
 #include <vector>
 
 namespace CLI {
@@ -37,6 +38,8 @@ class ChannelInput {
 public:
     /// Throws `InputError`, and `UsageError` for a rate that is none or that the file has no use for.
     explicit ChannelInput(InputOptions const& options);
+    /// Of a file that is open.
+    explicit ChannelInput(ChannelFile file) : _file(std::move(file)) {}
 
     ChannelFile const& file() const { return _file; }
     ChannelTree const& tree() const { return *_file.tree; }

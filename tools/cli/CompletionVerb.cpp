@@ -1,6 +1,12 @@
 #include "tools/cli/Verbs.h"
 
+#include "lumenkey/Channels/KFFactories.h"
+#include "lumenkey/Channels/KFFactory.h"
+#include "tools/curve/Keypoint.h"
+#include "tools/tree/ChannelClass.h"
+
 #include <CLI/CLI.hpp>
+#include <algorithm>
 #include <memory>
 
 namespace lumenkey::tools {
@@ -18,6 +24,25 @@ std::string optionsOf(CLI::App const& verb) {
     return words;
 }
 
+/// The words that bash takes apart at blanks: names of several words are known with hyphens too.
+std::string wordsOf(std::string names) {
+    for (std::size_t at = 0; (at = names.find(", ", at)) != std::string::npos;) {
+        names[at] = '\n';
+        names.erase(at + 1, 1);
+    }
+    std::replace(names.begin(), names.end(), ' ', '-');
+    std::replace(names.begin(), names.end(), '\n', ' ');
+    return names;
+}
+
+std::string classNames() {
+    std::string names;
+    for (auto const& [uuid, factory] : KFFactories::getInstance().factories()) {
+        names += (names.empty() ? "" : " ") + shortClassName(classNameOf(*factory));
+    }
+    return names;
+}
+
 void writeForBash(std::vector<Verb> const& verbs, OutputSink& out) {
     std::string names;
     std::string cases;
@@ -27,7 +52,7 @@ void writeForBash(std::vector<Verb> const& verbs, OutputSink& out) {
     }
     out.write("# Completion of lumenkey for bash: . <(lumenkey completion bash)\n"
               "_lumenkey() {\n"
-              "    local word=\"${COMP_WORDS[COMP_CWORD]}\" options=''\n"
+              "    local word=\"${COMP_WORDS[COMP_CWORD]}\" options='' values=''\n"
               "    COMPREPLY=()\n"
               "    if [ \"$COMP_CWORD\" -eq 1 ]; then\n"
               "        COMPREPLY=($(compgen -W '" +
@@ -38,6 +63,22 @@ void writeForBash(std::vector<Verb> const& verbs, OutputSink& out) {
               "    case \"${COMP_WORDS[1]}\" in\n" +
               cases +
               "    esac\n"
+              "    case \"${COMP_WORDS[COMP_CWORD - 1]}\" in\n"
+              "    --interpolation) values='" +
+              wordsOf(interpolationNames()) +
+              "' ;;\n"
+              "    --rows) values='input keypoints' ;;\n"
+              "    *) case \"${COMP_WORDS[1]} $COMP_CWORD\" in\n"
+              "       'add 4') values='" +
+              classNames() +
+              "' ;;\n"
+              "       'completion 2') values='bash' ;;\n"
+              "       esac ;;\n"
+              "    esac\n"
+              "    if [ -n \"$values\" ]; then\n"
+              "        COMPREPLY=($(compgen -W \"$values\" -- \"$word\"))\n"
+              "        return\n"
+              "    fi\n"
               "    case \"$word\" in\n"
               "    -*) COMPREPLY=($(compgen -W \"$options\" -- \"$word\")) ;;\n"
               "    *) local IFS=$'\\n'; COMPREPLY=($(compgen -f -- \"$word\")) ;;\n"

@@ -32,6 +32,11 @@ bool takesLine(ProgressOf kind, ProgressScreen const& screen) {
            !isLineTaken.exchange(true);
 }
 
+milliseconds patienceLeft(ProgressScreen const& screen) {
+    auto const waited = std::chrono::duration_cast<milliseconds>(screen.now() - screen.begin);
+    return std::max(kPatience - waited, kBetweenDrawings);
+}
+
 bool waitUnlessStopped(std::stop_token const& stop, milliseconds time) {
     std::mutex mutex;
     std::condition_variable_any nothing;
@@ -43,8 +48,11 @@ bool waitUnlessStopped(std::stop_token const& stop, milliseconds time) {
 } // namespace
 
 ProgressScreen const& ProgressScreen::real() {
-    static ProgressScreen const screen{::isatty(STDERR_FILENO) == 1, ::isatty(STDOUT_FILENO) == 1,
-                                       [] { return Clock::now(); }, waitUnlessStopped,
+    static ProgressScreen const screen{::isatty(STDERR_FILENO) == 1,
+                                       ::isatty(STDOUT_FILENO) == 1,
+                                       Clock::now(),
+                                       [] { return Clock::now(); },
+                                       waitUnlessStopped,
                                        [](std::string_view text) { writeFully(STDERR_FILENO, text); }};
     return screen;
 }
@@ -90,7 +98,9 @@ void Progress::update(double share) {
 void Progress::drawUntil(std::stop_token const& stop) const {
     ProgressScreen::Clock::time_point const start = _screen.now();
     bool isShown = false;
-    for (int drawing = 0; _screen.wait(stop, isShown ? kBetweenDrawings : kPatience); ++drawing) {
+    milliseconds pause = patienceLeft(_screen);
+    for (int drawing = 0; _screen.wait(stop, pause); ++drawing) {
+        pause = kBetweenDrawings;
         auto const seconds = std::chrono::duration_cast<std::chrono::seconds>(_screen.now() - start);
         _screen.write("\r" + _what + " " + cells(drawing) + " " + std::to_string(seconds.count()) +
                       " s\x1B[K");

@@ -22,6 +22,8 @@ struct ProgressScreen {
     bool isSeen = false;
     /// Results go there too.
     bool showsResults = false;
+    /// When the first work began: bars wait for a second from then on only.
+    Clock::time_point begin{};
     std::function<Clock::time_point()> now;
     /// For so long, or until a stop is asked for: whether it wasn't.
     std::function<bool(std::stop_token const&, std::chrono::milliseconds)> wait;
@@ -33,8 +35,8 @@ struct ProgressScreen {
 
 class ProgressPart;
 
-/// A bar on standard error while work lasts over a second and a person sits at the terminal; nothing
-/// otherwise, nor while another one lives: work that is a part of other work shows nothing of its own. It is
+/// A bar on standard error while work lasts over a second, that before it counted too, and a person sits at
+/// the terminal; nothing otherwise, nor while another one lives: work that is a part of other work shows nothing of its own. It is
 /// wiped away at the end.
 ///
 /// A thread of its own draws it, so that it stands there whatever the work is busy with. Where nobody tells a

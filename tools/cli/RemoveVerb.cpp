@@ -17,8 +17,7 @@ struct RemoveOptions {
 
 void runRemove(RemoveOptions const& options) {
     options.author.check();
-    ChannelInput const input(options.author.input);
-    requireDocument(input);
+    ChannelInput const input = options.author.openAsDocument();
     ChannelTree::Node const node = input.nodeNamed(options.channel);
     if (node == ChannelTree::kTop) {
         throw UsageError{"the top of a document stays"};

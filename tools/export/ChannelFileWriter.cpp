@@ -256,6 +256,14 @@ void checkWrittenValues(FileToWrite const& wanted, std::uint64_t rows, std::size
     }
 }
 
+ChannelFile asDocument(ChannelFile const& file, std::string const& name) {
+    StringSink document;
+    writeWholeDocument({file, ChannelFormat::Document, RowsOf::Input, {}, name}, document, {});
+    ChannelFile opened = openChannelText(document.text(), name);
+    opened.document.text = document.text();
+    return opened;
+}
+
 WrittenRows writeChannelFile(FileToWrite const& wanted, ReadingProgress const& progress) {
     SafeOutputFile out(wanted.target);
     WrittenRows const rows = writeAs(wanted, out, progress);

@@ -57,6 +57,9 @@ struct WrittenRows {
 /// another document, in which something was passed over, isn't written: see `FileToWrite::acceptsLoss`.
 WrittenRows writeChannelFile(FileToWrite const& wanted, ReadingProgress const& progress = {});
 
+/// The file as it is once it is written as a document. `name` is that of the document, which ends as such do.
+ChannelFile asDocument(ChannelFile const& file, std::string const& name);
+
 /// Throws `OutputError` for more than `kMostWrittenValues`.
 void checkWrittenValues(FileToWrite const& wanted, std::uint64_t rows, std::size_t columns);
 

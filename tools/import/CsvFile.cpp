@@ -1,6 +1,7 @@
 #include "tools/import/CsvFile.h"
 
 #include "tools/import/MotionScanner.h"
+#include "tools/output/TextForms.h"
 #include "tools/time/ExactDecimal.h"
 #include "tools/time/TimeFraction.h"
 

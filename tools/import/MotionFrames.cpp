@@ -1,6 +1,7 @@
 #include "tools/import/MotionReaders.h"
 
 #include "tools/import/MotionTime.h"
+#include "tools/output/TextForms.h"
 
 #include <algorithm>
 #include <charconv>

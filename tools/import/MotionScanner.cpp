@@ -21,14 +21,6 @@ unsigned limited(std::size_t n) {
 
 } // namespace
 
-std::string quoted(std::string_view text) {
-    constexpr std::size_t longest = 40;
-    bool const isLong = text.size() > longest;
-    std::string result(1, '\'');
-    result.append(text.substr(0, longest)).append(isLong ? "...'" : "'");
-    return result;
-}
-
 void MotionScanner::skipBlanks() {
     while (!atEnd() && isBlank(_text[_position])) {
         ++_position;

@@ -65,7 +65,4 @@ private:
     std::size_t _token = 0;
 };
 
-/// In quotes, and shortened where it is long.
-std::string quoted(std::string_view text);
-
 } // namespace lumenkey::tools

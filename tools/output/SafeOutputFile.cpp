@@ -98,6 +98,7 @@ SafeOutputFile::SafeOutputFile(std::string const& target) : _name(target) {
             _temporary.clear();
             fail(errno);
         }
+        _temporaryName = TemporaryName(_temporary);
         if (int const error = takeOver(_descriptor, replaced)) {
             fail(error);
         }
@@ -126,7 +127,7 @@ void SafeOutputFile::close() {
     if (::close(descriptor) != 0 || std::rename(_temporary.c_str(), _target.c_str()) != 0) {
         fail(errno);
     }
-    _temporary.clear();
+    forgetTemporary();
     if (int const error = synchronizeDirectory(directoryOf(_target))) {
         fail(error);
     }
@@ -139,8 +140,13 @@ void SafeOutputFile::discard() noexcept {
     }
     if (!_temporary.empty()) {
         ::unlink(_temporary.c_str());
-        _temporary.clear();
+        forgetTemporary();
     }
+}
+
+void SafeOutputFile::forgetTemporary() noexcept {
+    _temporary.clear();
+    _temporaryName = {};
 }
 
 } // namespace lumenkey::tools

@@ -1,6 +1,7 @@
 #pragma once
 
 #include "tools/output/OutputSink.h"
+#include "tools/output/TemporaryFiles.h"
 
 #include <string>
 
@@ -15,7 +16,8 @@ namespace lumenkey::tools {
 /// is neither missing nor a plain file is refused.
 ///
 /// Failures throw `OutputError`; the target is untouched then, and the temporary gone. Only a failure to
-/// bring the renamed entry itself to the disk is told after the replacement.
+/// bring the renamed entry itself to the disk is told after the replacement. The temporary is a
+/// `TemporaryName`, so that a signal doesn't leave it behind either.
 class SafeOutputFile : public OutputSink {
 public:
     explicit SafeOutputFile(std::string const& target);
@@ -29,12 +31,14 @@ public:
 
 private:
     [[noreturn]] void fail(int error);
+    void forgetTemporary() noexcept;
 
     /// As the caller named it, for messages.
     std::string _name;
     /// Where it is once symbolic links are followed.
     std::string _target;
     std::string _temporary;
+    TemporaryName _temporaryName;
     int _descriptor = -1;
 };
 

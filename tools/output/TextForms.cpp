@@ -87,6 +87,14 @@ std::string printableText(std::string_view text) {
     return printable;
 }
 
+std::string quoted(std::string_view text) {
+    constexpr std::size_t longest = 40;
+    bool const isLong = text.size() > longest;
+    std::string result(1, '\'');
+    result.append(text.substr(0, longest)).append(isLong ? "...'" : "'");
+    return result;
+}
+
 std::string systemErrorText(int error) {
     char const* const text = ::strerrordesc_np(error);
     return text != nullptr ? text : "error " + std::to_string(error);

@@ -21,6 +21,9 @@ std::string timeText(Tempus const& time);
 /// What never breaks a line or moves the cursor: control characters as `\xNN`.
 std::string printableText(std::string_view text);
 
+/// In quotes, and shortened where it is long.
+std::string quoted(std::string_view text);
+
 /// What the system calls an error, such as "No such file or directory"; in English whatever the locale.
 std::string systemErrorText(int error);
 
