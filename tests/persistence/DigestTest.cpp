@@ -64,6 +64,8 @@ TEST(Digest, TellsEachChangeOfState) {
         [](Subject& x) { x.channel.setFlag(kChannelFlagBehaviorsOff, true); },
         [](Subject& x) { x.channel.setFlag(kChannelFlagKeepOnFolderReset, true); },
         [](Subject& x) { x.channel.setFadeInOffset(s(2), false); },
+        // Documents keep the terms of a time.
+        [](Subject& x) { x.channel.setFadeInOffset(TempusMake(2, 1), false); },
         [](Subject& x) { x.channel.setFadeOutOffset(s(1), false); },
         [](Subject& x) { x.channel.setFadeInCurve(1); },
         [](Subject& x) { x.channel.setFadeOutCurve(1); },

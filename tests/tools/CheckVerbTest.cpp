@@ -129,6 +129,7 @@ TEST_F(CheckVerbTest, FindsWhatIsOddWithItsPlace) {
          "<value>3</value><bias>1.00000001</bias>\n<outputTangentTime>-1</outputTangentTime>"
          "<outputTangentValue>1</outputTangentValue>\n<outputTangentTime>1</outputTangentTime></keypoint>\n"
          "<keypoint enabled=\"0\"><time>3/1</time><value>1</value>"
+         "<inputTangentTime>nan</inputTangentTime><inputTangentValue>nan</inputTangentValue>"
          "<outputTangentTime>0</outputTangentTime>\n<outputTangentValue>1e-9</outputTangentValue>"
          "<normal>3</normal>\n<bias>2</bias></keypoint></curve></parameter>",
          "5:1: the number 4294967297 is out of the limits of 'preExtrapolation', 0 to 4\n"
@@ -139,6 +140,9 @@ TEST_F(CheckVerbTest, FindsWhatIsOddWithItsPlace) {
          "8:1: the handle reaches to the wrong side of its keypoint: its time counts as 0\n"
          "9:1: the element 'outputTangentTime' is here for the second time, where only one is kept\n"
          "9:1: no 'outputTangentValue' stands behind 'outputTangentTime': it is passed over\n"
+         "10:55: 'nan' is no number\n"
+         "10:95: 'nan' is no number\n"
+         "10:95: 'inputTangentValue' is nan, which is kept as no handle\n"
          "11:1: 'outputTangentValue' is 1e-09, which is kept as no handle\n"
          "12:1: 'bias' stands behind the output handle, which disables the keypoint: it is passed over\n"},
         {"<factory id=\"0\" uuid=\" FDC1944B-2291-11D7-B1C3-00039389B702 \"/>\n"

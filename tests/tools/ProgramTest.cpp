@@ -5,9 +5,13 @@
 #include "tests/tools/TestFolder.h"
 
 #include <algorithm>
+#include <chrono>
+#include <fcntl.h>
 #include <gtest/gtest.h>
 #include <numbers>
 #include <sys/stat.h>
+#include <thread>
+#include <unistd.h>
 
 namespace lumenkey::tools {
 namespace {
@@ -52,6 +56,35 @@ TEST_F(ProgramTest, InfoTellsOfSeveralFilesInTheirOrder) {
     Json expected = jsonOf({"info", _file});
     expected["file"] = _file;
     EXPECT_EQ(Json::parse(several.out, nullptr, false), Json({expected, expected}));
+}
+
+TEST_F(ProgramTest, SeveralFilesAreOpenAtOnce) {
+    if (std::thread::hardware_concurrency() < 2) {
+        GTEST_SKIP() << "one processor takes one file at a time";
+    }
+    std::string const pipes[] = {_folder.file("first.bvh"), _folder.file("second.bvh")};
+    for (std::string const& pipe : pipes) {
+        ASSERT_EQ(::mkfifo(pipe.c_str(), 0600), 0);
+    }
+    auto const feed = [](std::string const& pipe) {
+        for (int tries = 0; tries < 2000; ++tries) {
+            // Without a reader there is nothing to open.
+            if (int const descriptor = ::open(pipe.c_str(), O_WRONLY | O_NONBLOCK); descriptor >= 0) {
+                EXPECT_GT(::write(descriptor, kSmallMotion.data(), kSmallMotion.size()), 0);
+                ::close(descriptor);
+                return true;
+            }
+            std::this_thread::sleep_for(std::chrono::milliseconds(10));
+        }
+        return false;
+    };
+    std::jthread const feeder([&] {
+        bool const wasOpen = feed(pipes[1]);
+        EXPECT_TRUE(wasOpen) << "the second waits for the first";
+        feed(pipes[0]);
+        wasOpen || feed(pipes[1]);
+    });
+    EXPECT_EQ(jsonOf({"info", pipes[0], pipes[1]}).size(), 2U);
 }
 
 TEST_F(ProgramTest, AWrongArgumentForOneOfSeveralFilesLeavesTheOthers) {

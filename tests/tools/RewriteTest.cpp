@@ -161,7 +161,8 @@ TEST_F(RewriteTest, OddTextsStayWithoutForce) {
                  "<min>5</min><max>3</max><preExtrapolation>5</preExtrapolation>"
                  "<keypoint enabled=\" 1 \"><time> 1/2 </time><value>nan</value></keypoint>"
                  "<keypoint><inputTangentTime>-0.5</inputTangentTime><value>1</value>"
-                 "<inputTangentValue>3</inputTangentValue></keypoint>"
+                 "<inputTangentValue>3</inputTangentValue><outputTangentTime>1</outputTangentTime>"
+                 "<outputTangentValue>nan</outputTangentValue></keypoint>"
                  "<keypoint><time>invalid~</time><value>1</value></keypoint>"
                  "<keypoint><time>5/0@2#0</time><value>1</value></keypoint><closed>2</closed>") +
           "</parameter>");
@@ -172,7 +173,7 @@ TEST_F(RewriteTest, OddTextsStayWithoutForce) {
          {"default=\"nan\" value=\"nan\"", "<min>5</min>", "<max>3</max>",
           "<preExtrapolation>5</preExtrapolation>", "<closed>1</closed>", "<value>nan</value>",
           "<time>1/2</time>", "<time>0/1</time>", "<time>invalid~</time>", "<time>5/0@2#0</time>",
-          "<inputTangentTime>-0.5</inputTangentTime>"}) {
+          "<inputTangentTime>-0.5</inputTangentTime>", "<outputTangentValue>nan</outputTangentValue>"}) {
         EXPECT_NE(text.find(kept), std::string::npos) << kept << text;
     }
 }

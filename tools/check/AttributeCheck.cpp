@@ -71,7 +71,7 @@ std::vector<Fault> faultsOfAttributes(std::string_view element, Attributes const
             continue;
         }
         // Curves store numbers out of their limits, and bring them within when they are read.
-        bool const isKept = attribute.text == TextKind::Number && isStorable(found->second);
+        bool const isKept = attribute.text == TextKind::Number && readNumberOrNan(found->second);
         faults.push_back({faultOfText(attribute, found->second, limits, countsFrames), isKept});
     }
     if (auto const version = attributes.find("version");
@@ -86,7 +86,7 @@ std::vector<Fault> faultsOfCurveInChannel(Attributes const& curve, Attributes co
     for (std::string_view const name : {"default", "value"}) {
         std::string_view const own = attributeOf(curve, name);
         std::string_view const other = attributeOf(channel, name);
-        if (isStorable(own) && isStorable(other) && readNumber(own) != readNumber(other)) {
+        if (readNumberOrNan(own) && readNumberOrNan(other) && readNumber(own) != readNumber(other)) {
             faults.push_back({"the attribute '" + std::string(name) + "' is " + std::string(own) +
                               ", which takes the place of that of the channel, " + std::string(other)});
         }

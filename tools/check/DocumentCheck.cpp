@@ -25,38 +25,12 @@ class Checker : public DocumentScanner {
 public:
     Checker() : _open(1) {}
 
-    std::vector<DocumentFinding> takeFindings() {
-        sortByPlace(_findings);
-        return std::move(_findings);
-    }
+    std::vector<DocumentFinding> takeFindings() { return _findings.sorted(); }
 
 private:
-    // --- Findings ---
-
-    // Nothing where there is nothing to tell.
-
-    void find(TextPlace const& place, std::string what) { tell({place, std::move(what)}); }
-    /// What a reader takes as it is.
-    void findKept(TextPlace const& place, std::string what) { tell({place, std::move(what), false}); }
-    void tell(DocumentFinding finding) {
-        if (!finding.what.empty()) {
-            _findings.push_back(std::move(finding));
-        }
+    void fault(TextPlace const& place, std::string_view what) override {
+        _findings.lost(place, std::string(what));
     }
-
-    void tell(TextPlace const& place, Fault const& fault) { tell({place, fault.what, !fault.isKept}); }
-    void tell(TextPlace const& place, std::vector<Fault> const& faults) {
-        for (Fault const& fault : faults) {
-            tell(place, fault);
-        }
-    }
-    void tell(std::vector<std::pair<TextPlace, Fault>> const& faults) {
-        for (auto const& [place, fault] : faults) {
-            tell(place, fault);
-        }
-    }
-
-    void fault(TextPlace const& place, std::string_view what) override { find(place, std::string(what)); }
 
     // --- Elements ---
 
@@ -90,21 +64,22 @@ private:
             return;
         }
         if (std::find(parts.begin(), parts.end(), element.word) != parts.end()) {
-            find(element.place,
-                 "the element '" + element.name + "' is here for the second time, where only one is kept");
+            _findings.lost(element.place, "the element '" + element.name +
+                                              "' is here for the second time, where only one is kept");
         }
         parts.push_back(element.word);
     }
 
     bool isTaken(OpenElement const& element) {
         if (element.word == nullptr) {
-            find(element.place, "the element '" + element.name + "' is unknown here: it is passed over");
+            _findings.lost(element.place,
+                           "the element '" + element.name + "' is unknown here: it is passed over");
             return false;
         }
         KFFactory* const factory = _open.back().factory;
         if (element.word->parent == "parameter" && factory != nullptr &&
             (element.word->classes & ownersOf(*factory)) == 0) {
-            find(element.place, faultOfOwner("element", element.name, *factory));
+            _findings.lost(element.place, faultOfOwner("element", element.name, *factory));
             return false;
         }
         return true;
@@ -118,18 +93,18 @@ private:
             KFReadVersion(attributeOf(attributes, "version"), major, minor);
             _countsFrames = major < firstWithTimes;
         } else if (element.name == "factory") {
-            tell(element.place, _classes.readFactory(attributes));
+            _findings.take(element.place, _classes.readFactory(attributes));
         } else if (element.name == "parameter") {
             return isSoundChannel(element, attributes);
         } else if (element.name == "curve") {
             element.curveClass = curveClassOf(_classes.of(_open.back().factory));
             element.limits = element.curveClass.limits;
         } else if (element.name == "timing" && !_countsFrames) {
-            tell(element.place, faultOfTiming(*_classes.of(_open.back().factory), attributes));
+            _findings.take(element.place, faultOfTiming(*_classes.of(_open.back().factory), attributes));
         } else if (element.name == "keypoint") {
             element.keypoint.emplace(attributes, _open.back().curveClass, _countsFrames);
-            tell({element.place, faultOfInterpolation(attributes),
-                  !readWhole(attributeOf(attributes, "interpolation"))});
+            _findings.take({element.place, faultOfInterpolation(attributes),
+                            !readWhole(attributeOf(attributes, "interpolation"))});
         }
         return true;
     }
@@ -137,10 +112,10 @@ private:
     void checkAttributes(OpenElement const& element, Attributes const& attributes) {
         CurveLimits const limits =
             element.name == "parameter" ? curveClassOf(_classes.of(element.factory)).limits : element.limits;
-        tell(element.place,
-             faultsOfAttributes(element.name, attributes, limits, element.factory, _countsFrames));
+        _findings.take(element.place,
+                       faultsOfAttributes(element.name, attributes, limits, element.factory, _countsFrames));
         if (element.name == "parameter" && _open.back().factory != nullptr) {
-            tell(element.place, faultsOfNearValues(attributes, _classes.of(element.factory)));
+            _findings.take(element.place, faultsOfNearValues(attributes, _classes.of(element.factory)));
         }
     }
 
@@ -150,19 +125,20 @@ private:
         std::string const name = "the channel '" + std::string(attributeOf(attributes, "name")) + "'";
         std::uint64_t const id = readWhole(attributeOf(attributes, "id")).value_or(0);
         if (isTop && !above.children.empty()) {
-            find(element.place, "a second channel: a document holds one, with all others inside it");
+            _findings.lost(element.place,
+                           "a second channel: a document holds one, with all others inside it");
             return false;
         }
         if (auto const before = above.children.find(id); before != above.children.end()) {
-            find(element.place,
-                 name + " has the ID " + std::to_string(id) + " of one before it: it is read into that one");
+            _findings.lost(element.place, name + " has the ID " + std::to_string(id) +
+                                              " of one before it: it is read into that one");
             element.factory = before->second;
         } else if (KFChannelBase const* const component = _classes.componentOf(above.factory, id)) {
             element.factory = component->getFactory();
-            find(element.place, _classes.faultOfComponent(*component, attributes));
+            _findings.lost(element.place, _classes.faultOfComponent(*component, attributes));
         } else if (std::string const fault = _classes.faultOfClass(attributes, isTop, &element.factory);
                    !fault.empty()) {
-            find(element.place, name + fault + ": it is passed over");
+            _findings.lost(element.place, name + fault + ": it is passed over");
             return false;
         }
         above.children[id] = element.factory;
@@ -187,8 +163,8 @@ private:
         } else if (std::size_t const blanks = more.find_first_not_of(" \t\r\n");
                    !element.isInStrayText && blanks != std::string_view::npos) {
             element.isInStrayText = true;
-            find({place.line, place.column + blanks},
-                 "text stands in the element '" + element.name + "': it is passed over");
+            _findings.lost({place.line, place.column + blanks},
+                           "text stands in the element '" + element.name + "': it is passed over");
         }
     }
 
@@ -202,14 +178,16 @@ private:
         OpenElement& above = _open.back();
         above.isInStrayText = false;
         bool const isReadable = canBeRead(element.text, element.word->text, _countsFrames);
+        bool const isKept =
+            isReadable || (KeypointCheck::keepsNan(element.name) && readNumberOrNan(element.text));
         if (!isReadable) {
-            bool const isKept = element.name == "value" && isStorable(element.text);
-            tell({element.place,
-                  quoted(element.text) + " is " + std::string(nameOfTextKind(element.word->text)), !isKept});
+            _findings.take({element.place,
+                            quoted(element.text) + " is " + std::string(nameOfTextKind(element.word->text)),
+                            !isKept});
         }
         if (above.keypoint) {
-            tell(element.place,
-                 above.keypoint->faultOfPart(element.place, element.name, element.text, isReadable));
+            _findings.take(element.place,
+                           above.keypoint->faultOfPart(element.place, element.name, element.text, isKept));
         }
         if (isReadable) {
             endReadable(element);
@@ -223,10 +201,10 @@ private:
             bool const hasRoom = readWhole(element.text) <= std::numeric_limits<std::uint32_t>::max();
             bool const isKept =
                 element.word->parent == "curve" && (hasRoom || element.name == "numberOfKeypoints");
-            tell({element.place,
-                  "the number " + element.text + " is out of the limits of '" + element.name + "', 0 to " +
-                      std::to_string(element.word->greatest),
-                  !isKept});
+            _findings.take({element.place,
+                            "the number " + element.text + " is out of the limits of '" + element.name +
+                                "', 0 to " + std::to_string(element.word->greatest),
+                            !isKept});
         } else if (element.word->parent == "curve") {
             endPartOfCurve(element);
         } else if (element.word->parent == "keypoint") {
@@ -234,7 +212,7 @@ private:
         } else if (element.name == "curve") {
             endCurve(element);
         } else if (element.name == "parameter") {
-            tell(element.flags->faultsAtEnd());
+            _findings.take(element.flags->faultsAtEnd());
         } else if (element.word->parent == "parameter") {
             endPartOfChannel(element);
         }
@@ -244,22 +222,23 @@ private:
         OpenElement& channel = _open.back();
         channel.flags->readElement(element.place, element.name, element.text);
         if (element.name == "foldFlags") {
-            tell(element.place, faultOfFoldFlags(*_classes.of(channel.factory), element.text));
+            _findings.take(element.place, faultOfFoldFlags(*_classes.of(channel.factory), element.text));
         } else if (element.word->text == TextKind::Length && *readTime(element.text) < kTempusZero) {
-            find(element.place, "the fade is below 0: it counts as 0");
+            _findings.lost(element.place, "the fade is below 0: it counts as 0");
         }
     }
 
     void endCurve(OpenElement const& curve) {
         Attributes const attributes = curve.attributeViews();
         checkAttributes(curve, attributes);
-        tell(curve.place, faultsOfCurveInChannel(attributes, _open.back().attributeViews()));
+        _findings.take(curve.place, faultsOfCurveInChannel(attributes, _open.back().attributeViews()));
         if (curve.hasKeypoints && readWhole(attributeOf(attributes, "type")).value_or(0) == 0) {
-            find(curve.place, "the curve is a constant: its keypoints are passed over");
+            _findings.lost(curve.place, "the curve is a constant: its keypoints are passed over");
         }
         if (curve.limits.low > curve.limits.high) {
-            findKept(curve.limitPlace, "the least value, " + shortestText(curve.limits.low) +
-                                           ", is above the greatest, " + shortestText(curve.limits.high));
+            _findings.kept(curve.limitPlace, "the least value, " + shortestText(curve.limits.low) +
+                                                 ", is above the greatest, " +
+                                                 shortestText(curve.limits.high));
         }
     }
 
@@ -269,26 +248,26 @@ private:
             double const limit = *readNumber(element.text);
             (element.name == "min" ? curve.limits.low : curve.limits.high) = limit;
             curve.limitPlace = element.place;
-            find(element.place, faultOfLimit(element.name, limit, curve.curveClass));
+            _findings.lost(element.place, faultOfLimit(element.name, limit, curve.curveClass));
         } else if (element.name == "keypoint") {
             curve.hasKeypoints = true;
             curve.canBeClosed = true;
-            tell(element.keypoint->faultsAtEnd(element.place));
+            _findings.take(element.keypoint->faultsAtEnd(element.place));
         } else if (element.name == "numberOfKeypoints") {
             curve.canBeClosed = true;
-            find(element.place,
-                 curve.hasKeypoints ? "the number stands behind keypoints, which it clears" : "");
+            _findings.lost(element.place,
+                           curve.hasKeypoints ? "the number stands behind keypoints, which it clears" : "");
         } else if (element.name == "closed" && !curve.canBeClosed && readBool(element.text) != false) {
-            find(element.place, "there are no keypoints yet that it would close");
+            _findings.lost(element.place, "there are no keypoints yet that it would close");
         }
     }
 
     void endPartOfKeypoint(OpenElement const& element) {
         if (element.name == "value") {
-            findKept(element.place, faultOfNumber(element.text, _open[_open.size() - 2].limits));
+            _findings.kept(element.place, faultOfNumber(element.text, _open[_open.size() - 2].limits));
         } else if (element.name == "time" && !_open.back().keypoint->hasValue()) {
-            findKept(element.place,
-                     faultOfOrder(element.text, _countsFrames, _open[_open.size() - 2].lastTime));
+            _findings.kept(element.place,
+                           faultOfOrder(element.text, _countsFrames, _open[_open.size() - 2].lastTime));
         }
     }
 
@@ -297,7 +276,7 @@ private:
     std::size_t _skipped = 0;
     std::vector<OpenElement> _open;
     DocumentClasses _classes;
-    std::vector<DocumentFinding> _findings;
+    DocumentFindings _findings;
 };
 
 } // namespace
@@ -312,13 +291,6 @@ std::vector<DocumentFinding> checkDocumentText(std::string_view text, ReadingPro
     Checker checker;
     checker.scanText(text, progress);
     return checker.takeFindings();
-}
-
-void sortByPlace(std::vector<DocumentFinding>& findings) {
-    std::stable_sort(
-        findings.begin(), findings.end(), [](DocumentFinding const& a, DocumentFinding const& b) {
-            return std::pair(a.place.line, a.place.column) < std::pair(b.place.line, b.place.column);
-        });
 }
 
 } // namespace lumenkey::tools

@@ -1,5 +1,6 @@
 #pragma once
 
+#include "tools/check/DocumentFindings.h"
 #include "tools/check/DocumentScanner.h"
 
 #include <string>
@@ -7,14 +8,6 @@
 #include <vector>
 
 namespace lumenkey::tools {
-
-/// Something about a document that its author should know, and where it stands.
-struct DocumentFinding {
-    TextPlace place;
-    std::string what;
-    /// Whether a document that is written anew would be without it.
-    bool isLoss = true;
-};
 
 /// Looks a document through without reading it into channels: text that is no XML, elements, attributes and
 /// classes that the library doesn't know and so passes over, channels without a class or with an ID that a
@@ -29,8 +22,5 @@ struct DocumentFinding {
 std::vector<DocumentFinding> checkDocument(std::string const& file, ReadingProgress const& progress);
 /// The same for the content of a file.
 std::vector<DocumentFinding> checkDocumentText(std::string_view text, ReadingProgress const& progress);
-
-/// Puts findings in the order of the text.
-void sortByPlace(std::vector<DocumentFinding>& findings);
 
 } // namespace lumenkey::tools

@@ -115,12 +115,14 @@ bool isBeyond(DocumentWord const& word, std::string_view text) {
     return readWhole(text).value_or(0) > word.greatest;
 }
 
-std::optional<double> readNumber(std::string_view text) {
-    std::optional<double> const number = readAs(text, &BXStreamElement::getAsDouble);
-    return number && std::isnan(*number) ? std::nullopt : number;
+std::optional<double> readNumberOrNan(std::string_view text) {
+    return readAs(text, &BXStreamElement::getAsDouble);
 }
 
-bool isStorable(std::string_view text) { return readAs(text, &BXStreamElement::getAsDouble).has_value(); }
+std::optional<double> readNumber(std::string_view text) {
+    std::optional<double> const number = readNumberOrNan(text);
+    return number && std::isnan(*number) ? std::nullopt : number;
+}
 
 std::optional<std::uint64_t> readWhole(std::string_view text) {
     return readAs(text, &BXStreamElement::getAsUInt64);

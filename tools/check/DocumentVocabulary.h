@@ -48,8 +48,8 @@ std::string_view nameOfTextKind(TextKind kind);
 
 /// Nothing for `nan` either, which lies within no limits.
 std::optional<double> readNumber(std::string_view text);
-/// Whether a curve takes it as a value: any number, and `nan`.
-bool isStorable(std::string_view text);
+/// Also `nan`, which curves and handles keep.
+std::optional<double> readNumberOrNan(std::string_view text);
 std::optional<std::uint64_t> readWhole(std::string_view text);
 std::optional<bool> readBool(std::string_view text);
 std::optional<BXUUID> readUUID(std::string_view text);

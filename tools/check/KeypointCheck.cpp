@@ -28,6 +28,10 @@ KeypointCheck::KeypointCheck(Attributes const& attributes, CurveClass const& cur
                                                  std::uint64_t{kKFInterpolationLinearToo}),
       _countsFrames(countsFrames), _isDisabled(readBool(attributeOf(attributes, "enabled")) == false) {}
 
+bool KeypointCheck::keepsNan(std::string_view part) {
+    return part == "value" || part.starts_with("input") || part.starts_with("output");
+}
+
 Fault KeypointCheck::faultOfPart(TextPlace const& place, std::string_view name, std::string_view text,
                                  bool canBeRead) {
     bool const wasDisabled = _isDisabled && _hasOutput;
@@ -52,7 +56,7 @@ Fault KeypointCheck::faultOfPart(TextPlace const& place, std::string_view name, 
     if (wasDisabled && name != "normal") {
         return {quoted + " stands behind the output handle, which disables the keypoint: it is passed over"};
     }
-    double const number = *readNumber(text);
+    double const number = *readNumberOrNan(text);
     if (isHandle) {
         return faultOfHandle(name, time, number);
     }
@@ -71,7 +75,7 @@ Fault KeypointCheck::faultOfTimeOrValue(bool isTime) {
 }
 
 Fault KeypointCheck::faultOfHandleTime(Handle& handle, TextPlace const& place, std::string_view text) {
-    double const time = *readNumber(text);
+    double const time = *readNumberOrNan(text);
     handle.time = time;
     handle.timePlace = place;
     bool const pointsBack = &handle == &_in ? time > 0 : time < 0;
@@ -87,9 +91,10 @@ Fault KeypointCheck::faultOfHandle(std::string_view name, double time, double va
     if (!_takesHandles) {
         return {"curves of this class have no handles: '" + std::string(name) + "' is passed over"};
     }
-    bool const isShort = std::fabs(time) < kLeastWritten && std::fabs(value) < kLeastWritten;
+    bool const isLong = std::fabs(time) >= kLeastWritten || std::fabs(value) >= kLeastWritten;
     // How short a handle in frames is depends on how long a frame is.
-    return isShort && !_countsFrames ? leftOut(name, value, "no handle") : Fault();
+    bool const isKnown = !_countsFrames || std::isnan(time) || std::isnan(value);
+    return isKnown && !isLong ? leftOut(name, value, "no handle") : Fault();
 }
 
 std::vector<std::pair<TextPlace, Fault>> KeypointCheck::faultsAtEnd(TextPlace const& place) const {

@@ -17,9 +17,12 @@ public:
     /// Of a keypoint with these attributes in a curve of this class.
     KeypointCheck(Attributes const& attributes, CurveClass const& curve, bool countsFrames);
 
+    /// Of values and handles.
+    static bool keepsNan(std::string_view part);
+
     bool hasValue() const { return _hasValue; }
 
-    /// A part of the keypoint that has ended, and whether its text can be read.
+    /// A part of the keypoint that has ended, and whether its text can be read, be it as nan.
     Fault faultOfPart(TextPlace const& place, std::string_view name, std::string_view text, bool canBeRead);
     /// What is at fault with the whole, where it stands.
     std::vector<std::pair<TextPlace, Fault>> faultsAtEnd(TextPlace const& place) const;

@@ -4,6 +4,7 @@
 #include "tools/cli/EditVerb.h"
 #include "tools/cli/Progress.h"
 #include "tools/compare/TreeDifference.h"
+#include "tools/export/ChannelFileWriter.h"
 #include "tools/output/JsonWriter.h"
 #include "tools/output/TextForms.h"
 
@@ -80,15 +81,25 @@ void writeJson(std::vector<NodeDifference> const& all, OutputSink& out) {
     json.finish();
 }
 
+bool isDocument(ChannelInput const& input) { return input.file().format == ChannelFormat::Document; }
+
+/// A file of another kind beside a document counts as the document that it converts to.
+void makeAlike(ChannelInput& input, ChannelInput const& other, std::string const& file) {
+    if (isDocument(other) && !isDocument(input)) {
+        input = ChannelInput(asDocument(input.file(), file + ".lumen"));
+    }
+}
+
 int runDiff(DiffOptions const& options, OutputSink& out) {
-    ChannelInput const before(options.before);
-    ChannelInput const after(InputOptions{options.after, options.before.frameRate});
+    ChannelInput before(options.before);
+    ChannelInput after(InputOptions{options.after, options.before.frameRate});
+    bool const areDocuments = isDocument(before) && isDocument(after);
+    makeAlike(before, after, options.before.file);
+    makeAlike(after, before, options.after);
     TimeSpan const span{TempusMinimum(before.file().firstTime, after.file().firstTime),
                         TempusMaximum(before.file().lastTime, after.file().lastTime)};
     Tempus const step = TempusMinimum(comparedStep(before.file(), span, std::nullopt),
                                       comparedStep(after.file(), span, std::nullopt));
-    bool const areDocuments =
-        before.file().format == ChannelFormat::Document && after.file().format == ChannelFormat::Document;
     std::vector<NodeDifference> const all = differencesBetween(before.tree(), after.tree(), areDocuments,
                                                                span, step, Progress("comparing").teller());
     if (options.json) {
@@ -107,7 +118,9 @@ Verb declareDiff(CLI::App& program) {
     auto const options = std::make_shared<DiffOptions>();
     CLI::App* const verb = program.add_subcommand("diff", "Tell how two files differ");
     verb->add_option("A", options->before.file, kFileHelp)->option_text(" ")->required();
-    verb->add_option("B", options->after, "Likewise; the two need not be of one kind")
+    verb->add_option("B", options->after,
+                     "Likewise; the two need not be of one kind: beside a document "
+                     "any other is taken as the document that it converts to")
         ->option_text(" ")
         ->required();
     options->before.addFrameRate(*verb);
