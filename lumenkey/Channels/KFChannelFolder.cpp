@@ -6,6 +6,7 @@
 #include "lumenkey/Channels/KFChildIndex.h"
 
 #include <algorithm>
+#include <new>
 
 namespace {
 
@@ -96,9 +97,9 @@ void KFChannelFolder::insertAt(std::size_t position, KFChannelBase* child) {
     allocateDescendants();
     _descendants->insert(_descendants->begin() + static_cast<std::ptrdiff_t>(position), child);
     if (_index) {
-        enterIndex(child, position);
+        tryOnIndex([=, this] { enterIndex(child, position); });
     } else if (_descendants->size() == kMostUnindexedChildren + 1) {
-        buildIndex();
+        tryOnIndex([this] { buildIndex(); });
     }
 }
 
@@ -193,6 +194,14 @@ void KFChannelFolder::buildIndex() {
     _index = std::move(index);
 }
 
+template <class Change> void KFChannelFolder::tryOnIndex(Change const& change) noexcept {
+    try {
+        change();
+    } catch (std::bad_alloc const&) {
+        _index.reset();
+    }
+}
+
 /// For a child that stands at `position` already.
 void KFChannelFolder::enterIndex(KFChannelBase* child, std::size_t position) {
     KFChildIndexEntry& entry = _index->insert({child, child->getID(), 0});
@@ -240,11 +249,13 @@ void KFChannelFolder::descendantIDChanged(KFChannelBase* child, unsigned int old
     }
     auto const count = static_cast<unsigned int>(entries);
     leaveIndex(child, oldID, count, isOnlyOne ? 0 : positionOf(child));
-    KFChildIndexEntry& entry = _index->insert({child, child->getID(), 0});
-    entry.count += count;
-    if (entry.first != child && comesFirst(child, entry.first)) {
-        entry.first = child;
-    }
+    tryOnIndex([=, this] {
+        KFChildIndexEntry& entry = _index->insert({child, child->getID(), 0});
+        entry.count += count;
+        if (entry.first != child && comesFirst(child, entry.first)) {
+            entry.first = child;
+        }
+    });
 }
 
 // Flags -----------------------------------------------------------------------------------------------------

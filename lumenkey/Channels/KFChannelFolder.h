@@ -188,6 +188,8 @@ private:
                                std::size_t position) const noexcept;
     bool comesFirst(KFChannelBase const* child, KFChannelBase const* other) const noexcept;
     void buildIndex();
+    /// Changes the index; without memory for that there is none, and the list is searched.
+    template <class Change> void tryOnIndex(Change const& change) noexcept;
     void enterIndex(KFChannelBase* child, std::size_t position);
     void leaveIndex(KFChannelBase const* child, unsigned int id, unsigned int count, std::size_t oldPosition);
     /// The other's children, if it is a folder with as many as this one; null else, and for folders without a

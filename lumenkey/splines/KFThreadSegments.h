@@ -103,7 +103,7 @@ private:
     KFSegmentCache* _current = _segments;
     /// The one to be prepared when another is needed.
     std::uint32_t _next = 0;
-    /// Those behind were never prepared, or for a version that doesn't come back.
+    /// Those behind aren't looked at.
     std::uint32_t _used = 0;
     /// The run of versions of the spline whose place it is, and of the one that missed it last.
     std::uint64_t _owner = 0;

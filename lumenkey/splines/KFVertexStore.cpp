@@ -180,12 +180,13 @@ bool KFVertexStore::contains(void const* handle) const {
     if (handle == nullptr || empty())
         return false;
     if (!_handles) {
-        _handles = std::make_unique<KFHandleSet>();
-        _handles->reserve(_size);
+        auto handles = std::make_unique<KFHandleSet>();
+        handles->reserve(_size);
         for (auto const& block : _blocks) {
             for (KFVertexEntry const& entry : block->entries)
-                _handles->insert(entry.vertex);
+                handles->insert(entry.vertex);
         }
+        _handles = std::move(handles);
     }
     return _handles->contains(handle);
 }
@@ -244,8 +245,12 @@ KFVertexStore::Place KFVertexStore::roomAt(Place place) {
 }
 
 void KFVertexStore::insertBlock(std::uint32_t index) {
+    auto block = std::make_unique<Block>();
+    // Without memory neither list grows.
+    if (_blocks.size() == _blocks.capacity())
+        _blocks.reserve(std::max<std::size_t>(2 * _blocks.size(), 1));
     _firstTicks.insert(_firstTicks.begin() + index, 0);
-    _blocks.insert(_blocks.begin() + index, std::make_unique<Block>());
+    _blocks.insert(_blocks.begin() + index, std::move(block));
 }
 
 void KFVertexStore::splitBlock(std::uint32_t index) {
