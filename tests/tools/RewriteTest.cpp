@@ -185,6 +185,8 @@ TEST_F(RewriteTest, TheTopHasItsAttributesToo) {
     Json const top = jsonOf({"tree", _file})["nodes"][0];
     EXPECT_EQ(top["default"], 1e-9);
     EXPECT_EQ(top["start"], 0.5);
+    EXPECT_EQ(jsonOf({"info", _file})["channelNames"][0], "P");
+    EXPECT_EQ(jsonOf({"sample", _file, "P", "--count", "1"})["series"][0]["channel"], "P");
     write("<parameter name=\"R\" id=\"1\" flags=\"4\"><parameter name=\"X\" id=\"1\" factoryID=\"3\" "
           "value=\"7\"/></parameter>");
     EXPECT_EQ(jsonOf({"tree", _file})["nodes"][1]["start"], 7.0);

@@ -23,7 +23,7 @@ std::map<Key, Node> nodesByName(ChannelTree const& tree) {
     std::map<std::string, std::size_t> counts;
     std::map<Key, Node> nodes;
     for (Node node = ChannelTree::kTop; node < tree.count(); ++node) {
-        std::string name = node == ChannelTree::kTop ? "./" : tree.dottedName(node);
+        std::string name = node == ChannelTree::kTop ? tree.path(node) : tree.dottedName(node);
         std::size_t const place = counts[name]++;
         nodes.emplace(Key{std::move(name), place}, node);
     }

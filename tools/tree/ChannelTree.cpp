@@ -10,6 +10,8 @@ namespace lumenkey::tools {
 
 namespace {
 
+constexpr std::string_view kTopPath = "./";
+
 /// How many children a folder's class makes for itself; an object of it tells.
 std::size_t componentCountOf(KFChannelFolder const& folder) {
     std::unique_ptr<KFChannelBase> const example = exampleOf(folder.getFactory());
@@ -177,6 +179,9 @@ std::optional<BXTimeRange> ChannelTree::keyedRange() const {
 // --- Names ---
 
 std::string ChannelTree::dottedName(Node node) const {
+    if (node == kTop) {
+        return std::string(isChannel(kTop) && !name(kTop).empty() ? name(kTop) : kTopPath);
+    }
     std::string text(_entries[node].nameLength, '.');
     // From the end of the text to its start.
     for (std::size_t end = text.size(); node != kTop; node = _entries[node].parent) {
@@ -202,7 +207,7 @@ std::string ChannelTree::trailingName(Node node, std::size_t parts, std::size_t 
 }
 
 std::string ChannelTree::path(Node node) const {
-    return node == kTop ? "./" : KFChannelRef(&base(node), &base(kTop)).str();
+    return node == kTop ? std::string(kTopPath) : KFChannelRef(&base(node), &base(kTop)).str();
 }
 
 std::optional<ChannelTree::Node> ChannelTree::atPath(std::string_view path) const {
@@ -216,6 +221,9 @@ std::optional<ChannelTree::Node> ChannelTree::atPath(std::string_view path) cons
 }
 
 ChannelTree::Naming ChannelTree::isCalled(Node node, std::string_view text) const {
+    if (node == kTop) {
+        return isChannel(kTop) && text == name(kTop) ? Naming::Whole : Naming::No;
+    }
     // From the node upwards, taking names off the end of the text.
     while (node != kTop) {
         std::string_view const part = name(node);
@@ -251,7 +259,7 @@ ChannelTree::Match ChannelTree::find(std::string_view text) const {
     }
     Match whole;
     Match byEnd;
-    for (Node node = kTop + 1; node < count(); ++node) {
+    for (Node node = kTop; node < count(); ++node) {
         Naming const naming = isCalled(node, text);
         if (naming == Naming::No) {
             continue;

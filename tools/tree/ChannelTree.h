@@ -93,6 +93,7 @@ public:
 
     // Names. Each costs as much as the name is long, or the node deep.
 
+    /// Of the top, which no other name begins with: its own name if it is a channel with one, else its path.
     std::string dottedName(Node node) const;
     /// The last `parts` names of the dotted name; empty where that has more than `mostBytes`.
     std::string trailingName(Node node, std::size_t parts, std::size_t mostBytes) const;
