@@ -47,12 +47,20 @@ void writeKeypoint(JsonWriter& json, Keypoint const& key) {
     json.endObject();
 }
 
-/// A channel may have no spline.
-std::vector<void*> handlesOf(KFSpline* spline) {
+/// Handles are those of curves and documents, whatever the interpolation makes of them.
+Keypoint keypointOf(KFCurve& curve, void* handle) {
+    Keypoint key = readKeypoint(*curve.getSpline(), handle);
+    curve.getKeypointInputHandles(handle, &key.in.seconds, &key.in.value);
+    curve.getKeypointOutputHandles(handle, &key.out.seconds, &key.out.value);
+    return key;
+}
+
+std::vector<void*> handlesOf(KFCurve& curve) {
+    KFSpline* const spline = curve.getSpline();
     return spline == nullptr ? std::vector<void*>() : everyKeypointHandle(*spline);
 }
 
-void writeJson(std::string const& channel, KFSpline* spline, OutputSink& out) {
+void writeJson(std::string const& channel, KFCurve& curve, OutputSink& out) {
     JsonWriter json(out);
     json.beginObject();
     json.key("channel");
@@ -60,9 +68,9 @@ void writeJson(std::string const& channel, KFSpline* spline, OutputSink& out) {
     json.key("keypoints");
     json.beginArray();
     Progress bar("writing", ProgressOf::Output);
-    std::vector<void*> const handles = handlesOf(spline);
+    std::vector<void*> const handles = handlesOf(curve);
     for (std::size_t i = 0; i < handles.size(); ++i) {
-        writeKeypoint(json, readKeypoint(*spline, handles[i]));
+        writeKeypoint(json, keypointOf(curve, handles[i]));
         bar.update(static_cast<double>(i) / static_cast<double>(handles.size()));
     }
     json.endArray();
@@ -95,8 +103,8 @@ std::string cellOf(Keypoint const& key, std::size_t column) {
     }
 }
 
-void writeTable(KFSpline* spline, std::string_view unit, OutputSink& out) {
-    std::vector<void*> const handles = handlesOf(spline);
+void writeTable(KFCurve& curve, std::string_view unit, OutputSink& out) {
+    std::vector<void*> const handles = handlesOf(curve);
     std::string const value = "value (" + std::string(unit) + ")";
     Table table;
     table.columns = {
@@ -106,7 +114,7 @@ void writeTable(KFSpline* spline, std::string_view unit, OutputSink& out) {
     Progress bar("writing", ProgressOf::Output);
     table.progress = bar.teller();
     table.cell = [&](std::size_t row, std::size_t column) {
-        return cellOf(readKeypoint(*spline, handles[row]), column);
+        return cellOf(keypointOf(curve, handles[row]), column);
     };
     table.write(out);
 }
@@ -114,11 +122,11 @@ void writeTable(KFSpline* spline, std::string_view unit, OutputSink& out) {
 void runKeys(KeysOptions const& options, OutputSink& out) {
     ChannelInput const input(options.input);
     ChannelTree::Node const channel = input.channelNamed(options.channel);
-    KFSpline* const spline = input.tree().spline(channel);
+    KFCurve& curve = input.tree().curve(channel);
     if (options.json) {
-        writeJson(input.tree().dottedName(channel), spline, out);
+        writeJson(input.tree().dottedName(channel), curve, out);
     } else {
-        writeTable(spline, input.tree().unit(channel), out);
+        writeTable(curve, input.tree().unit(channel), out);
     }
 }
 

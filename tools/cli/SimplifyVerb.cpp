@@ -1,6 +1,7 @@
 #include "tools/cli/EditVerb.h"
 
 #include "tools/cli/UsageError.h"
+#include "tools/curve/Keypoint.h"
 #include "tools/edit/CurveChange.h"
 
 #include <CLI/CLI.hpp>
@@ -19,7 +20,7 @@ public:
         words.description = "Draw curves by few keypoints, within a tolerance";
         words.usage = "--tolerance X [--step T]";
         words.notes = "Looked at at ten times in each frame or step, no curve goes off more than the "
-                      "tolerance. One that fewer\n"
+                      "tolerance in the stretch. One that\nfewer "
                       "keypoints can't draw so well stays as it is.\n";
         words.example = "lumenkey simplify walk.bvh --tolerance 0.01 -o few.csv --rows keypoints";
         words.keepsShape = true;
@@ -43,6 +44,7 @@ public:
 
     void prepare(ChannelFile const& file, TimeSpan const& span) override {
         _step.prepare(file, span);
+        _stretch = span;
         _comparedStep = comparedStep(file, span, _step.step());
     }
     std::optional<Tempus> sampleStep() const override { return _step.step(); }
@@ -54,12 +56,15 @@ public:
         KFCurve& curve = *channel.getCurveInterface();
         std::unique_ptr<KFCurveInterface> const copy(curve.cloneCurve());
         auto& before = static_cast<KFCurve&>(*copy);
+        TimeSpan const seen = seenOf(curve, span);
         for (std::uint32_t attempt = 0; attempt < kAttempts; ++attempt) {
             fit(curve, span, _step.step() / (1U << attempt), _tolerance * (1 - 0.05 * attempt));
             if (curve.getNumberOfKeypoints() >= before.getNumberOfKeypoints()) {
                 break;
             }
-            if (changeBetween(before, curve, span, _comparedStep).most <= _tolerance) {
+            CurveChange change = changeBetween(before, curve, seen, _comparedStep);
+            compareAtKeypoints(before, curve, change);
+            if (change.most <= _tolerance) {
                 return;
             }
             curve = before;
@@ -69,6 +74,15 @@ public:
 
 private:
     static constexpr std::uint32_t kAttempts = 6;
+
+    /// The stretch, also where the curve has no keypoints any more. Where it ends with the curve, something of
+    /// what lies beside: of several keypoints at one time that alone shows the last.
+    TimeSpan seenOf(KFCurve& curve, TimeSpan const& edited) const {
+        KeypointEnds const ends = *keypointEnds(curve.getSpline());
+        return {ends.first < edited.from ? _stretch.from
+                                         : TempusMinimum(_stretch.from, ends.first - _comparedStep),
+                ends.last > edited.to ? _stretch.to : TempusMaximum(_stretch.to, ends.last + _comparedStep)};
+    }
 
     static void fit(KFCurve& curve, TimeSpan const& span, Tempus const& step, double tolerance) {
         constexpr double hundredths = 100;
@@ -85,6 +99,7 @@ private:
 
     double _tolerance = 0;
     StepOption _step;
+    TimeSpan _stretch;
     Tempus _comparedStep{};
 };
 

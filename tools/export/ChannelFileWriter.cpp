@@ -25,10 +25,12 @@ using Node = ChannelTree::Node;
 
 constexpr double kNoValue = std::numeric_limits<double>::quiet_NaN();
 
-/// The keypoints of a channel, in the order of time.
+/// The keypoints of a channel that are seen, in the order of time, one at a time.
 struct KeypointColumn {
     std::vector<Tempus> times;
     std::vector<double> values;
+    /// Those that have no place in a column: behind a later one, or at the time of another.
+    std::vector<Tempus> others;
 };
 
 KeypointColumn keypointsOf(KFSpline* spline) {
@@ -36,8 +38,15 @@ KeypointColumn keypointsOf(KFSpline* spline) {
     if (spline == nullptr) {
         return column;
     }
-    for (void* const handle : keypointHandles(*spline)) {
+    for (void* const handle : everyKeypointHandle(*spline)) {
         Keypoint const key = readKeypoint(*spline, handle);
+        if (!key.enabled) {
+            continue;
+        }
+        if (!column.times.empty() && !(column.times.back() < key.time)) {
+            column.others.push_back(key.time);
+            continue;
+        }
         column.times.push_back(key.time);
         column.values.push_back(key.value);
     }
@@ -121,13 +130,19 @@ std::vector<Node> channelsOfTable(ChannelFile const& file) {
     return keyed.empty() ? all : keyed;
 }
 
-/// A table has times of one kind, and text.
+/// A table has times of one kind that ascend, and text.
 void requireReadable(FileToWrite const& wanted, std::string const& name, KeypointColumn const& column) {
-    for (Tempus const& time : column.times) {
-        if (!TempusIsNumeric(time) || time.epoch != 0) {
-            throw OutputError{wanted.target,
-                              "a table can't hold the time of a keypoint of '" + printableText(name) + "'"};
-        }
+    auto const isInTable = [](Tempus const& time) { return TempusIsNumeric(time) && time.epoch == 0; };
+    if (!std::all_of(column.times.begin(), column.times.end(), isInTable) ||
+        !std::all_of(column.others.begin(), column.others.end(), isInTable)) {
+        throw OutputError{wanted.target,
+                          "a table can't hold the time of a keypoint of '" + printableText(name) + "'"};
+    }
+    if (!column.others.empty() && !wanted.acceptsLoss) {
+        throw OutputError{wanted.target, "a table holds one keypoint at a time, in the order of time, and '" +
+                                             printableText(name) + "' has another at " +
+                                             timeText(column.others.front()) +
+                                             " s; --force writes it without"};
     }
     if (name.find('\0') != std::string::npos) {
         throw OutputError{wanted.target, "a table can't hold the name '" + printableText(name) + "'"};

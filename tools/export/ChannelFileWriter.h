@@ -30,7 +30,8 @@ struct FileToWrite {
     /// The channels whose keypoints needn't be those of the file any more.
     std::vector<ChannelTree::Node> edited;
     std::string target;
-    /// Write a document also without what the reader of another passed over.
+    /// Write a document also without what the reader of another passed over, and a table without keypoints
+    /// that have no place in it.
     bool acceptsLoss = false;
 };
 
