@@ -1,6 +1,9 @@
 // The scalar types: the constants of each class, and which of its records a form starts with.
 
 #include "lumenkey/Channels/KFChanObjectRef.h"
+#include "lumenkey/Channels/KFChannelObjectRootBase.h"
+#include "lumenkey/Channels/KFChannelSegmentVisitor.h"
+#include "lumenkey/curves/KFCurveNode.h"
 #include "lumenkey/curves/KFTypedCurves.h"
 #include "tests/splines/slots.h"
 
@@ -107,13 +110,47 @@ TEST(ScalarChannels, CarryTheirOwnFlagsAndFields) {
     KFChanObjectRef const reference("", nullptr, 1, 0);
     EXPECT_EQ(reference.getFlags(), 0x1000010010U);
     EXPECT_EQ(KFChanObjectRef(reference).getFlags(), 0x1000010010U) << "a blank copy too";
-#ifdef LUMENKEY_KNOWS_SLOTS
-    // What a derived class adds follows on the value channel's own operations, with nothing between.
-    EXPECT_EQ(slotOf(&KFChannel::parentWillBeModified), 88U);
-    EXPECT_EQ(slotOf(&KFChannel::moveKeyframe), 105U);
-    EXPECT_EQ(slotOf(&KFChanObjectRef::getObjectRef), 106U);
-#endif
 }
+
+#ifdef LUMENKEY_KNOWS_SLOTS
+/// A slot that moves is noticed by the ones at the beginning, in the middle and at the end of each table.
+TEST(ChannelSlots, AreWhereSubclassesInHostsHaveThem) {
+    using Root = KFChannelObjectRootBase;
+    using Node = KFCurveNode;
+    using Visitor = KFChannelSegmentVisitor;
+    double (Node::*const solvesOne)(Tempus const&, double, double) = &Node::solveNode;
+    std::pair<std::size_t, std::size_t> const slots[] = {
+        {slotOf(&Root::getInstanceID), 7},
+        {slotOf(&Root::finishInitializing), 10},
+        {slotOf(&Root::copy), 29},
+        {slotOf(&Root::getTimeOffset), 40},
+        {slotOf(&KFChannel::willBeModified), 58},
+        {slotOf(&Root::hasBeenModified), 59},
+        {slotOf(&Root::hasKeypoints), 69},
+        {slotOf(&Root::shouldIgnoreDynamicIDs), 87},
+        {slotOf(&Root::resetTimeIndependentFlagIfNeeded), 88},
+        {slotOf(&Root::getTimeExtent), 89},
+        {slotOf(&Root::willModifyChannel), 97},
+        {slotOf(&Root::checkSolo), 99},
+        {slotOf(&Root::getFrameDuration), 110},
+        {slotOf(&KFChannel::parentWillBeModified), 88},
+        {slotOf(&KFChannel::getSliderMax), 101},
+        {slotOf(&KFChannel::getNumberOfKeyframes), 104},
+        {slotOf(&KFChannel::moveKeyframe), 105},
+        {slotOf(&KFChanObjectRef::getObjectRef), 106},
+        {slotOf(solvesOne), 2},
+        {slotOf(&Node::getUForValue), 4},
+        {slotOf(&Node::compare), 17},
+        {slotOf(&Node::isPointToPoint), 22},
+        {slotOf(&Node::reset), 25},
+        {slotOf(&Visitor::visitConstant), 2},
+        {slotOf(&Visitor::visitEase), 8},
+        {slotOf(&Visitor::visitLogarithmic), 12},
+    };
+    for (auto const& [slot, expected] : slots)
+        EXPECT_EQ(slot, expected);
+}
+#endif
 
 TEST(ScalarChannels, ChronoCountsUnitsDownward) {
     std::tuple<Tempus, int, std::int64_t> const cases[] = {

@@ -37,7 +37,7 @@ fi
 "$cmake" --build "$scratch/by_cmake" >>"$scratch/by_cmake.log"
 "$scratch/by_cmake/host" >"$scratch/by_cmake.out"
 
-# A plug-in whose classes override the library's, in pinned slots.
+# A plug-in whose classes override the library's.
 "$cmake" -S "$here/plugin" -B "$scratch/plugin" -G Ninja -DCMAKE_BUILD_TYPE=Release \
     -DCMAKE_PREFIX_PATH="$prefix" -DCMAKE_CXX_COMPILER="$cxx" -DWANTED_VERSION="$version" >"$scratch/plugin.log"
 "$cmake" --build "$scratch/plugin" >>"$scratch/plugin.log"
