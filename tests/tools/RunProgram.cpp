@@ -13,33 +13,6 @@ extern char** environ;
 
 namespace lumenkey::tools {
 
-namespace {
-
-/// The environment of a child. The library that finds fonts keeps some of what it found until the process
-/// ends; where a leak checker is built into the program, it hears of that.
-std::vector<std::string> environmentWith(std::string const& suppressions) {
-    std::vector<std::string> variables;
-    for (char** variable = environ; *variable != nullptr; ++variable) {
-        if (!std::string_view(*variable).starts_with("LSAN_OPTIONS=")) {
-            variables.emplace_back(*variable);
-        }
-    }
-    variables.push_back("LSAN_OPTIONS=print_suppressions=0:suppressions=" + suppressions);
-    return variables;
-}
-
-/// As the system takes lists of words: pointers, and a null at the end.
-std::vector<char*> pointersTo(std::vector<std::string>& words) {
-    std::vector<char*> pointers;
-    for (std::string& word : words) {
-        pointers.push_back(word.data());
-    }
-    pointers.push_back(nullptr);
-    return pointers;
-}
-
-} // namespace
-
 std::string programPath() {
     char const* const path = std::getenv("LUMENKEY_PROGRAM");
     return path != nullptr ? path : LUMENKEY_PROGRAM;
@@ -56,14 +29,15 @@ Outcome runProgramFile(std::string const& program, std::vector<std::string> cons
     posix_spawn_file_actions_addopen(&actions, STDOUT_FILENO, out.c_str(), O_WRONLY | O_CREAT, 0600);
     posix_spawn_file_actions_addopen(&actions, STDERR_FILENO, err.c_str(), O_WRONLY | O_CREAT, 0600);
 
-    std::vector<std::string> words{program};
-    words.insert(words.end(), arguments.begin(), arguments.end());
-    std::vector<std::string> environment =
-        environmentWith(folder.write("suppressions", "leak:libfontconfig\n"));
+    // As the system takes lists of words: pointers, and a null at the end.
+    std::vector<char*> words{const_cast<char*>(program.c_str())};
+    for (std::string const& argument : arguments) {
+        words.push_back(const_cast<char*>(argument.c_str()));
+    }
+    words.push_back(nullptr);
     Outcome outcome;
     pid_t child = 0;
-    if (::posix_spawn(&child, program.c_str(), &actions, nullptr, pointersTo(words).data(),
-                      pointersTo(environment).data()) == 0) {
+    if (::posix_spawn(&child, program.c_str(), &actions, nullptr, words.data(), environ) == 0) {
         int status = 0;
         ::waitpid(child, &status, 0);
         outcome.exit = WIFEXITED(status) ? WEXITSTATUS(status) : -1;
