@@ -13,8 +13,6 @@
 
 namespace {
 
-using Announced = std::vector<std::pair<KFChannelBase*, unsigned>>;
-
 class Leaf : public KFChannelBase {
 public:
     explicit Leaf(char const* name = "Leaf", unsigned int id = 2, KFChannelFolder* parent = nullptr,
@@ -33,8 +31,6 @@ public:
     bool isCompound = false;
     bool ignoresIDs = false;
 };
-
-Tempus s(std::int64_t seconds) { return TempusMake(seconds, 1); }
 
 TEST(KFChannelBase, AnnouncesStateBitsOnlyAndBeforeItChangesThem) {
     std::set<int> const nonState{0, 3, 4, 5, 6, 12, 13, 16, 17, 19, 20, 22, 24, 25, 28, 33};

@@ -9,8 +9,6 @@
 
 namespace {
 
-Tempus s(double t) { return KFChronoForChannelSeconds(t, 600); }
-
 struct TakeRoot : RecordingRoot {
     void didBeginRecording(KFChannelBase* channel, Tempus const& t) override { log(channel, "begin", t); }
     void didEndRecording(KFChannelBase* channel, Tempus const& t) override { log(channel, "end", t); }

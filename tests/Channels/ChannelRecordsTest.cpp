@@ -12,7 +12,6 @@
 
 namespace {
 
-Tempus s(std::int64_t value) { return TempusMake(value, 1); }
 KFChannelImpl* shared() { return KFChannelDouble::createKFChannelDoubleImpl(); }
 KFChannelInfo* sharedInfo() { return KFChannelDouble::createKFChannelDoubleInfo(); }
 

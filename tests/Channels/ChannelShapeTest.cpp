@@ -11,8 +11,6 @@
 
 namespace {
 
-Tempus s(double t) { return KFChronoForChannelSeconds(t, 600); }
-
 struct AffectedRoot : RecordingRoot {
     bool isChannelAffectedByBehaviors(KFChannelBase const*, bool selectedOnly) const override {
         return affected && selectedOnly;

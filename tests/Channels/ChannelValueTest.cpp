@@ -17,10 +17,6 @@
 
 namespace {
 
-Tempus s(std::int64_t value, std::int32_t timescale = 1) { return TempusMake(value, timescale); }
-
-using Announced = std::vector<std::pair<KFChannelBase*, unsigned>>;
-
 /// A root with an offset of 2 s, a compound below it, and a component.
 struct Tree {
     RecordingRoot root;

@@ -11,8 +11,6 @@
 
 namespace {
 
-Tempus s(std::int64_t value) { return TempusMake(value, 1); }
-
 struct Point : KFCompoundChannel {
     explicit Point(KFChannelFolder* parent = nullptr, bool linked = false)
         : KFCompoundChannel(nullptr, "c", parent, 5, 0, false, 3) {

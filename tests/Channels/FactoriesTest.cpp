@@ -23,20 +23,16 @@ TEST(KFFactories, EveryClassIsMadeByItsFactoryAndComesFromTheBase) {
     BXUUID const base = KFChannelFactoryUUID("KFChannelBase");
     std::set<BXUUID> seen;
     for (KFChannelFactoryRow const& row : KFChannelFactoryTable()) {
-        EXPECT_TRUE(seen.insert(row.identity()).second) << row.className;
-        KFFactory* const found = registry().findFactory(row.identity());
-        if (row.getInstance == nullptr || !row.registered) {
-            EXPECT_EQ(found, nullptr) << row.className;
-            if (row.getInstance == nullptr) {
-                continue;
-            }
-        } else {
-            EXPECT_EQ(found, row.getInstance()) << row.className;
-        }
-        KFFactory& factory = *row.getInstance();
-        EXPECT_EQ(factory.uuid(), row.identity()) << row.className;
+        SCOPED_TRACE(row.className);
+        EXPECT_TRUE(seen.insert(row.identity()).second);
+        KFFactory* const instance = row.getInstance == nullptr ? nullptr : row.getInstance();
+        EXPECT_EQ(registry().findFactory(row.identity()), row.registered ? instance : nullptr);
+        if (instance == nullptr)
+            continue;
+        KFFactory& factory = *instance;
+        EXPECT_EQ(factory.uuid(), row.identity());
         EXPECT_TRUE(factory.isKindOfClass(row.identity()));
-        EXPECT_TRUE(factory.isKindOfClass(base)) << row.className;
+        EXPECT_TRUE(factory.isKindOfClass(base));
         EXPECT_FALSE(factory.isKindOfClass(BXUUID()));
 
         std::unique_ptr<KFFactoryBase> const made(factory.create("Name", 7));
@@ -44,7 +40,7 @@ TEST(KFFactories, EveryClassIsMadeByItsFactoryAndComesFromTheBase) {
             EXPECT_EQ(made, nullptr);
             continue;
         }
-        ASSERT_NE(made, nullptr) << row.className;
+        ASSERT_NE(made, nullptr);
         EXPECT_EQ(made->getFactory(), &factory);
         EXPECT_EQ(made->getInstanceID(), 7U);
         auto* const channel = dynamic_cast<KFChannelBase*>(made.get());
@@ -56,7 +52,7 @@ TEST(KFFactories, EveryClassIsMadeByItsFactoryAndComesFromTheBase) {
         EXPECT_EQ(copy->getFactory(), &factory);
         EXPECT_EQ(typeid(*copy.get()), typeid(*made.get()));
         std::unique_ptr<KFChannelBase> const clone(channel->clone());
-        ASSERT_NE(clone, nullptr) << row.className;
+        ASSERT_NE(clone, nullptr);
         EXPECT_EQ(typeid(*clone.get()), typeid(*channel));
     }
 }

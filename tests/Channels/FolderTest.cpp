@@ -16,8 +16,6 @@
 
 namespace {
 
-Tempus s(std::int64_t value, std::int32_t timescale = 1) { return TempusMake(value, timescale); }
-
 #define NOTES(operation, ...)                                                                                \
     void operation(__VA_ARGS__) override { reached[#operation] += getName().str(); }
 #define ANSWERS(question, ...)                                                                               \

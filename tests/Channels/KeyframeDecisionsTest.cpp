@@ -18,8 +18,6 @@
 
 namespace {
 
-Tempus s(double t) { return KFChronoForChannelSeconds(t, 600); }
-
 // The columns.
 enum Time { kNone, kCurve, kGlobal };
 enum Announced { kSilent, kFirst, kOnceLocal }; // kFirst: before the record is local

@@ -13,8 +13,6 @@
 
 namespace {
 
-Tempus s(std::int64_t value, std::int32_t timescale = 1) { return TempusMake(value, timescale); }
-
 /// A channel with a root that may have an offset; keypoints in curve time.
 struct Fixture {
     RecordingRoot root;

@@ -8,8 +8,6 @@
 
 namespace {
 
-Tempus s(std::int64_t value, std::int32_t timescale = 1) { return TempusMake(value, timescale); }
-
 class Faded : public KFChannelBase {
 public:
     explicit Faded(KFChannelFolder* parent) : KFChannelBase(nullptr, "faded", parent, 2, 0) {}

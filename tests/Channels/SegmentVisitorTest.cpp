@@ -23,8 +23,6 @@ namespace {
 using Time = Tempus const&;
 constexpr double kMost = std::numeric_limits<double>::max();
 
-Tempus s(std::int64_t value, std::int32_t timescale = 1) { return TempusMake(value, timescale); }
-
 struct Piece {
     std::uint32_t type;
     std::pair<double, double> (*minMax)(Piece const&);
