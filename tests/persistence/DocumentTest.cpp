@@ -43,39 +43,18 @@ std::string inHostsDocument(KFChannelBase& channel, bool full, bool children, bo
     return start == std::string::npos ? text : text.substr(start, end - start);
 }
 
-struct Group {
-    KFChannelFolder folder{"Group", nullptr, 7, 0, 0};
-    KFChannelDouble size{0.0, "Size", &folder, 1, 0};
-    KFChannelDouble blur{0.0, "Blur", &folder, 2, 0};
-
-    Group() {
-        KFCurve& curve = *blur.createLocalChannelImplementation()->getCurve();
-        for (double const t : {0.0, 1.0}) {
-            curve.appendKeypointNoTangents(s(t), 10 * t, true);
-            curve.setKeypointInterpolation(curve.getSpline()->getLastVertex(), kKFInterpolationBezier, true);
-        }
-        folder.finishInitializing();
-    }
-};
-/// Of a group's blur.
-constexpr char const* kBlurCurve = R"(      <curve type="1" default="0" value="0">
-        <numberOfKeypoints>2</numberOfKeypoints>
-        <keypoint flags="0">
-          <time>0/600</time>
-          <value>0</value>
-        </keypoint>
-        <keypoint flags="0">
-          <time>600/600</time>
-          <value>10</value>
-        </keypoint>
-      </curve>
-)";
-
 } // namespace
 
 TEST(Document, StandsAlone) {
-    Group group;
-    EXPECT_EQ(withoutDescriptions(documentOf(group.folder)),
+    KFChannelFolder folder("Group", nullptr, 7, 0, 0);
+    KFChannelDouble size(0.0, "Size", &folder, 1, 0);
+    KFChannelDouble blur(0.0, "Blur", &folder, 2, 0);
+    for (double const t : {0.0, 1.0}) {
+        blur.setKeyframe(s(t), 10 * t, false);
+        blur.setKeyframeInterpolation(blur.getKeyframe(s(t)), kKFInterpolationBezier);
+    }
+    folder.finishInitializing();
+    EXPECT_EQ(withoutDescriptions(documentOf(folder)),
               R"(<?xml version="1.0" encoding="UTF-8"?>
 <kfml version="5.13">
   <factory id="1" uuid="E7BF3809-2290-11D7-98E5-00039389B702">
@@ -96,25 +75,24 @@ TEST(Document, StandsAlone) {
     </parameter>
     <parameter name="Blur" id="2" factoryID="2">
       <flags>8589934608</flags>
-)" + std::string(kBlurCurve) +
-                  R"(    </parameter>
+      <curve type="1" default="0" value="0">
+        <numberOfKeypoints>2</numberOfKeypoints>
+        <keypoint flags="0">
+          <time>0/600</time>
+          <value>0</value>
+        </keypoint>
+        <keypoint flags="0">
+          <time>600/600</time>
+          <value>10</value>
+        </keypoint>
+      </curve>
+    </parameter>
   </parameter>
 </kfml>
 )");
-    std::string const self = documentOf(group.folder, false, false);
+    std::string const self = documentOf(folder, false, false);
     EXPECT_EQ(self.find("Size"), std::string::npos);
     EXPECT_NE(self.find("<flags>8589938704</flags>"), std::string::npos);
-}
-
-TEST(Document, StandsInsideAnother) {
-    Group group;
-    EXPECT_EQ(inHostsDocument(group.folder, false, true, false),
-              R"(  <parameter name="Group" id="7" flags="8589938704">
-    <parameter name="Blur" id="2" flags="8589934608">
-)" + std::string(kBlurCurve) +
-                  R"(    </parameter>
-  </parameter>
-)");
 }
 
 TEST(Document, IsNoDeeperThanDocumentsAreRead) {
@@ -137,37 +115,31 @@ TEST(Document, WritesOfAChannelWhatIsNotAsUsual) {
         std::string expected;
         std::function<void(KFChannelDouble&, KFCurve&)> change;
     };
-    auto const key = [](KFCurve& curve, unsigned type) {
+    std::string const head = "  <parameter name=\"V\" id=\"1\" flags=\"16\"";
+    // The handle of a keypoint of this type.
+    auto const bend = [](KFCurve& curve, unsigned type, bool derives) {
         curve.appendKeypointNoTangents(s(1), 2.0, true);
         void* const handle = curve.getSpline()->getLastVertex();
         curve.setKeypointInterpolation(handle, type, true);
-        return handle;
-    };
-    std::string const head = "  <parameter name=\"V\" id=\"1\" flags=\"16\"";
-    // A handle of a keypoint of this type.
-    auto const bend = [&](KFCurve& curve, unsigned type, bool derives) {
-        void* const handle = key(curve, type);
         curve.setKeypointOutputNormalizedTangents(handle, 0, 0.5, true);
+        curve.setKeypointBiasLinear(handle, 1.0000000001);
         curve.setCurveDeriveTangents(derives);
-        return handle;
     };
-    std::string const outputHandle = "        <outputTangentTime>0</outputTangentTime>\n"
-                                     "        <outputTangentValue>6</outputTangentValue>\n";
-    auto const keyed = [](std::string const& handles, std::string const& type = "",
-                          std::string const& value = "0", std::string const& limits = "") {
+    auto const keyed = [](std::string const& type, std::string const& handle) {
         return R"(>
-    <curve type="1" default="0" value=")" +
-               value + R"(">
+    <curve type="1" default="0" value="0">
       <numberOfKeypoints>1</numberOfKeypoints>
-)" + limits + "      <keypoint" +
+      <keypoint)" +
                type + R"( flags="128">
         <time>600/600</time>
         <value>2</value>
-)" + handles + R"(      </keypoint>
+)" + handle + R"(      </keypoint>
     </curve>
   </parameter>
 )";
     };
+    std::string const outputHandle = "        <outputTangentTime>0</outputTangentTime>\n"
+                                     "        <outputTangentValue>6</outputTangentValue>\n";
     Case const cases[] = {
         {" default=\"1\" value=\"2\"/>\n",
          [](auto&, KFCurve& curve) {
@@ -177,57 +149,26 @@ TEST(Document, WritesOfAChannelWhatIsNotAsUsual) {
         // A fade without a length is no reason for a curve, but its shape is kept.
         {" default=\"0\" value=\"0\">\n    <fadeInCurve>2</fadeInCurve>\n  </parameter>\n",
          [](KFChannelDouble& channel, auto&) { channel.setFadeInCurve(2); }},
-        {">\n    <fadeOutOffset>1200/600</fadeOutOffset>\n    <curve type=\"1\" default=\"0\" value=\"0\"/>\n"
-         "  </parameter>\n",
-         [](KFChannelDouble& channel, auto&) { channel.setFadeOutOffset(s(2), false); }},
-        {R"(>
-    <curve type="1" default="0" value="0" parametric="1" round="0" retimingExtrapolation="1">
-      <numberOfKeypoints>1</numberOfKeypoints>
-      <min>-5</min>
-      <max>5</max>
-      <preExtrapolation>3</preExtrapolation>
-      <postExtrapolation>2</postExtrapolation>
-      <closed>1</closed>
-      <keypoint interpolation="1" enabled="0" flags="17">
-        <time>600/600</time>
-        <value>2</value>
-        <bias>0.5</bias>
-        <normal>3</normal>
-      </keypoint>
-    </curve>
-  </parameter>
-)",
-         [&](auto&, KFCurve& curve) {
-             void* const handle = key(curve, 1);
-             curve.setKeypointBiasLinear(handle, 0.5);
-             curve.setKeypointNormal(handle, 3, true);
-             curve.setKeypointFlags(handle, 17, true);
-             curve.enableKeypoint(handle, false, true);
-             curve.closeCurve();
-             curve.setCurveParametric(true);
-             curve.setRoundingInUSpace(false);
-             curve.setRetimingExtrapolation(true);
-             curve.setAbsoluteMinValueV(-5);
-             curve.setAbsoluteMaxValueV(5);
-             curve.setCurveExtrapolation(3, 1);
-             curve.setCurveExtrapolation(2, 0);
+        // So are limits that have crossed.
+        {">\n    <fadeOutOffset>1200/600</fadeOutOffset>\n    <curve type=\"1\" default=\"0\" "
+         "value=\"inf\">\n"
+         "      <min>5</min>\n      <max>3</max>\n    </curve>\n  </parameter>\n",
+         [](KFChannelDouble& channel, KFCurve& curve) {
+             channel.setFadeOutOffset(s(2), false);
+             curve.setCurveInitialValue(std::numeric_limits<double>::infinity());
+             curve.setAbsoluteMinValueV(5);
+             curve.setAbsoluteMaxValueV(3);
          }},
         // Handles are twelve times what is stored; both parts of one, and only where tangents count.
-        {keyed(outputHandle),
-         [&](auto&, KFCurve& curve) { curve.setKeypointBiasLinear(bend(curve, 4, true), 1.0000000001); }},
-        {keyed(""), [&](auto&, KFCurve& curve) { bend(curve, 4, false); }},
-        // The value isn't what the limits let be seen of it, which may have crossed.
+        {keyed("", outputHandle), [&](auto&, KFCurve& curve) { bend(curve, 4, true); }},
+        {keyed("", ""), [&](auto&, KFCurve& curve) { bend(curve, 4, false); }},
+        {keyed(" interpolation=\"18\"", outputHandle),
+         [&](auto&, KFCurve& curve) { bend(curve, 18, false); }},
+        // The value isn't what the limits let be seen of it.
         {" default=\"0\" value=\"500\"/>\n",
          [](auto&, KFCurve& curve) {
              curve.setCurveInitialValue(500);
              curve.setAbsoluteMaxValueV(100);
-         }},
-        {keyed(outputHandle, " interpolation=\"18\"", "inf", "      <min>5</min>\n      <max>3</max>\n"),
-         [&](auto&, KFCurve& curve) {
-             bend(curve, 18, false);
-             curve.setCurveInitialValue(std::numeric_limits<double>::infinity());
-             curve.setAbsoluteMinValueV(5);
-             curve.setAbsoluteMaxValueV(3);
          }},
     };
     for (Case const& c : cases) {

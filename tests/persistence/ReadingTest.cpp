@@ -9,6 +9,7 @@
 #include "lumenkey/foundation/BXURL.h"
 #include "lumenkey/foundation/BXXMLReadStream.h"
 #include "lumenkey/persistence/ChannelParser.h"
+#include "tests/Channels/Keypoints.h"
 #include "tests/persistence/Victim.h"
 
 #include <gtest/gtest.h>
@@ -48,28 +49,10 @@ std::string keypoints(std::string const& number, std::string const& elements) {
     return "<numberOfKeypoints>" + number + "</numberOfKeypoints>" + elements;
 }
 
-/// The keypoints of a channel, by their order.
-struct Keys {
-    explicit Keys(KFChannelBase* channel) : curve(*dynamic_cast<KFChannel&>(*channel).getCurveInterface()) {
-        curve.getKeypointHandleList(all);
-    }
-    Tempus time(std::size_t i) {
-        Tempus at = kTempusInvalid;
-        curve.getKeypoint(all.at(i), &at, nullptr);
-        return at;
-    }
-    std::pair<double, double> out(std::size_t i) {
-        std::pair<double, double> handle;
-        curve.getKeypointOutputNormalizedTangents(all.at(i), &handle.first, &handle.second);
-        return handle;
-    }
-    bool isEnabled(std::size_t i) {
-        bool enabled = false;
-        return curve.isEnabledKeypoint(all.at(i), &enabled) && enabled;
-    }
-    KFCurve& curve;
-    std::vector<void*> all;
-};
+/// The output of a keypoint by its number, as it is stored.
+Handle out(KFChannel& channel, std::size_t i) {
+    return output(channel, channel.getKeyframes(false).at(i), false);
+}
 
 } // namespace
 
@@ -108,29 +91,27 @@ TEST_F(Reading, TakesKeypointsAsTheyStand) {
     read(curve(keypoints("4294967295", keypointElement("2/1", "1", handle("12", "24"), "flags='34'") +
                                            keypointElement("1/1", "5", "", disabled) +
                                            keypointElement("3/1", "6", handle("0", "0"), disabled))));
-    Keys keys(&child(1));
-    ASSERT_EQ(keys.all.size(), 3U);
-    EXPECT_EQ(keys.time(0), TempusMake(2, 1)) << "not sorted";
-    EXPECT_EQ(child(1).getKeyframeFlags(keys.all[0]) & 0x22, 2U)
+    EXPECT_EQ(timesOf(child(1)), (std::vector{TempusMake(2, 1), TempusMake(1, 1), TempusMake(3, 1)}));
+    auto const keys = child(1).getKeyframes(false);
+    ASSERT_EQ(keys.size(), 3U);
+    EXPECT_EQ(child(1).getKeyframeFlags(keys[0]) & 0x22, 2U)
         << "without the obsolete bit; set behind all else, or the handle would be refused";
-    EXPECT_EQ(keys.out(0), std::pair(1.0, 2.0));
-    EXPECT_EQ(child(1).getKeyframeInterpolation(keys.all[0]), 4U);
-    EXPECT_TRUE(keys.isEnabled(1)) << "without output handle";
-    EXPECT_FALSE(keys.isEnabled(2));
+    EXPECT_EQ(out(child(1), 0), Handle(1.0, 2.0));
+    EXPECT_EQ(child(1).getKeyframeInterpolation(keys[0]), 4U);
+    EXPECT_TRUE(child(1).getKeyframeEnabled(keys[1])) << "without output handle";
+    EXPECT_FALSE(child(1).getKeyframeEnabled(keys[2]));
 
     // Once more, with two lists: the second clears the first.
     read(curve(keypoints("1", keypointElement("1/1", "5")) + keypoints("1", keypointElement("4/1", "7"))));
-    EXPECT_EQ(child(1).getNumberOfKeyframes(), 1U);
-    EXPECT_TRUE(child(1).hasKeypointAt(TempusMake(4, 1), 0));
+    EXPECT_EQ(timesOf(child(1)), std::vector{TempusMake(4, 1)});
 
     // Where tangents don't count, only one type takes handles.
     child(1).getCurveInterface()->setCurveDeriveTangents(false);
     read(curve(keypoints("2", keypointElement("1/1", "5", handle("12", "24"), "interpolation='18'") +
                                   keypointElement("2/1", "5", handle("12", "24")))));
-    Keys plain(&child(1));
-    ASSERT_EQ(plain.all.size(), 2U);
-    EXPECT_EQ(plain.out(0), std::pair(1.0, 2.0));
-    EXPECT_EQ(plain.out(1), std::pair(0.0, 0.0));
+    ASSERT_EQ(child(1).getNumberOfKeyframes(), 2U);
+    EXPECT_EQ(out(child(1), 0), Handle(1.0, 2.0));
+    EXPECT_EQ(out(child(1), 1), Handle());
 }
 
 TEST_F(Reading, TakesAConstantAsItIs) {
@@ -292,6 +273,7 @@ std::uint32_t readFile(std::string const& name, KFChannelBase& top, Tempus const
 struct OldDocuments : testing::Test {
     OwnedTree top{new KFChannelObjectRootBase("Root", nullptr, 1, 0, 0)};
     KFChannelObjectRootBase& root = static_cast<KFChannelObjectRootBase&>(*top);
+    KFChannel& child(unsigned id) { return dynamic_cast<KFChannel&>(*top->getDescendant(id)); }
 
     void expectTiming(Tempus const& frame) {
         EXPECT_EQ(root.getTimeExtent().start, frame * 10);
@@ -306,11 +288,10 @@ TEST_F(OldDocuments, CountFrames) {
         SCOPED_TRACE(version);
         EXPECT_EQ(readFile("version" + std::to_string(version) + ".lumen", root, frame), version);
         expectTiming(frame);
-        Keys keys(root.getDescendant(1));
-        ASSERT_EQ(keys.all.size(), 2U);
-        EXPECT_EQ(keys.time(1), frame * 30);
-        EXPECT_NEAR(keys.out(0).first, 10 * 1001.0 / 30000.0 / 12, 1e-15);
-        EXPECT_NEAR(keys.out(0).second, 0.25, 1e-15);
+        ASSERT_EQ(child(1).getNumberOfKeyframes(), 2U);
+        EXPECT_EQ(timesOf(child(1))[1], frame * 30);
+        EXPECT_NEAR(out(child(1), 0).first, 10 * 1001.0 / 30000.0 / 12, 1e-15);
+        EXPECT_NEAR(out(child(1), 0).second, 0.25, 1e-15);
     }
 }
 
@@ -322,15 +303,14 @@ TEST_F(OldDocuments, HaveTimesFromVersion5On) {
         EXPECT_EQ(readFile(file, root, frame), 5U);
         EXPECT_EQ(root.getID(), 12U);
         expectTiming(frame);
-        Keys keys(root.getDescendant(1));
-        ASSERT_EQ(keys.all.size(), 2U);
-        EXPECT_EQ(keys.time(1), frame * 30);
-        EXPECT_EQ(keys.out(0), std::pair(0.5, 0.25));
-        auto& opacity = dynamic_cast<KFChannel&>(*root.getDescendant(1));
+        KFChannel& opacity = child(1);
+        ASSERT_EQ(opacity.getNumberOfKeyframes(), 2U);
+        EXPECT_EQ(timesOf(opacity)[1], frame * 30);
+        EXPECT_EQ(out(opacity, 0), Handle(0.5, 0.25));
         EXPECT_EQ(opacity.getInitialValue(), 0.5);
         EXPECT_EQ(opacity.getFadeInOffset(), TempusMake(1, 2));
         EXPECT_EQ(opacity.getFadeInCurve(), 2U);
-        auto& amount = dynamic_cast<KFChannel&>(*root.getDescendant(2));
+        KFChannel& amount = child(2);
         EXPECT_EQ(amount.getInitialValue(), 4);
         EXPECT_EQ(amount.getDefaultValue(), 3);
         EXPECT_TRUE(amount.testFlag(kChannelFlagHidden));
@@ -349,12 +329,10 @@ TEST_F(OldDocuments, MayBeOdd) {
     EXPECT_EQ(readFile("odd.lumen", root, TempusMake(1, 24)), 5U) << "without a version, today's";
     EXPECT_EQ(root.getID(), 12U);
     ASSERT_EQ(root.getNumberOfDescendants(), 2U);
-    Keys keys(root.getDescendant(1));
-    ASSERT_EQ(keys.all.size(), 2U);
-    EXPECT_EQ(keys.time(0), kTempusZero) << "its time comes behind its value, too late";
-    EXPECT_EQ(keys.out(0), std::pair(0.0, 0.0)) << "and its handle too early";
-    EXPECT_EQ(keys.time(1), TempusMake(1, 1));
-    auto& constant = dynamic_cast<KFChannel&>(*root.getDescendant(2));
+    // The time of the first comes behind its value, too late, and its handle too early.
+    ASSERT_EQ(timesOf(child(1)), (std::vector{kTempusZero, TempusMake(1, 1)}));
+    EXPECT_EQ(out(child(1), 0), Handle());
+    KFChannel& constant = child(2);
     EXPECT_FALSE(constant.isSpline()) << "without a type";
     EXPECT_EQ(constant.getInitialValue(), 7);
     EXPECT_EQ(constant.getDefaultValue(), 8);
