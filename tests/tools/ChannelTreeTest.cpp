@@ -151,6 +151,7 @@ TEST(SampleTimes, ReadsCurvesAtExactTimes) {
             EXPECT_EQ(blocks, values);
         }
     }
+    EXPECT_EQ(cases[2].times.at(0), TempusMake(1, 2'147'483'647));
     EXPECT_EQ(cases[2].times.at(999), TempusMake(1, 60));
     EXPECT_EQ(SampleTimes::spread(TempusMake(1, 3), TempusMake(1, 2), 1).at(0), TempusMake(1, 3));
 
