@@ -4,6 +4,7 @@
 #include "tests/tools/RunProgram.h"
 #include "tests/tools/TestFolder.h"
 
+#include <cmath>
 #include <gtest/gtest.h>
 
 namespace lumenkey::tools {
@@ -123,9 +124,8 @@ TEST_F(RewriteTest, LosesNothingUnlessForced) {
              std::vector<std::vector<std::string>>{{"upgrade", _file, "-o", out},
                                                    {"convert", _file, out},
                                                    {"add", _file, "./", "Double", "Z", "-o", out},
-                                                   {"set", _file, "X", "--value", "1", "-o", out},
-                                                   {"convert", _file, _folder.file("out.csv")}}) {
-            bool const isRefused = *each.loss != '\0' && arguments.back() == out;
+                                                   {"set", _file, "X", "--value", "1", "-o", out}}) {
+            bool const isRefused = *each.loss != '\0';
             Outcome const outcome = runLumenkey(arguments);
             EXPECT_EQ(outcome.exit, isRefused ? 1 : 0) << Json(arguments) << outcome.err;
             EXPECT_NE(outcome.err.find(isRefused ? each.loss : ""), std::string::npos) << outcome.err;
@@ -153,6 +153,48 @@ TEST_F(RewriteTest, LosesNothingUnlessForced) {
     Outcome const piped = runProgramFile("/bin/sh", {"-c", script});
     EXPECT_EQ(piped.exit, 1);
     EXPECT_NE(piped.err.find("/dev/stdin:4:43: the element 'shiny'"), std::string::npos) << piped.err;
+}
+
+TEST_F(RewriteTest, TablesMissNoKeypointThatIsSeen) {
+    std::string const table = _folder.file("out.csv");
+    std::string const first = keypoint("0/1", "1");
+    std::string const disabled = keypoint("1/1", "99", "enabled=\"0\"");
+    struct {
+        std::string keypoints;
+        char const* missed;
+        char const* rows;
+    } const cases[] = {{first + disabled + keypoint("2/1", "3") + "<shiny/>", "", "0/1,0,1\n2/1,2,3\n"},
+                       {first + keypoint("1/1", "2") + keypoint("2/2", "3"), "1/1", "0/1,0,1\n1/1,1,2\n"},
+                       {keypoint("1/1", "2") + first, "0/1", "1/1,1,2\n"}};
+    for (auto const& each : cases) {
+        write("<parameter id=\"1\"><parameter name=\"X\" id=\"1\" factoryID=\"3\"><curve type=\"1\">" +
+              each.keypoints + "</curve></parameter></parameter>");
+        if (*each.missed != '\0') {
+            EXPECT_NE(complaintOf({"convert", _file, table})
+                          .find(std::string("'X' has another at ") + each.missed + " s"),
+                      std::string::npos);
+        }
+        outputOf({"convert", _file, table, *each.missed != '\0' ? "--force" : "--frame-rate=30"});
+        EXPECT_EQ(contentOf(table), std::string("time,seconds,X\n") + each.rows);
+    }
+}
+
+TEST_F(RewriteTest, SimplifyKeepsToItsToleranceBesideTheKeypoints) {
+    // The last of several at one time shows behind them alone.
+    expectKeypointsAfter({{{"simplify", "--tolerance", "0.01"}, "0/1 0; 1/1 10; 1/1 20; "}},
+                         keypoint("0/1", "0") + keypoint("1/1", "10") + keypoint("1/1", "20"));
+
+    // A curve goes on as it ends, to the end of the stretch that another has.
+    std::string bow;
+    for (int i = 0; i <= 30; ++i) {
+        bow += keypoint((std::to_string(i) + "/30").c_str(), std::to_string(std::sin(i / 10.0)).c_str());
+    }
+    write("<parameter id=\"1\"><parameter id=\"1\" factoryID=\"3\"><curve type=\"1\">"
+          "<postExtrapolation>1</postExtrapolation>" +
+          bow + "</curve></parameter><parameter id=\"2\" factoryID=\"3\"><curve type=\"1\">" +
+          keypoint("20/1", "0") + "</curve></parameter></parameter>");
+    Json const edited = jsonOf({"simplify", _file, "./1", "--tolerance", "0.005", "--in-place"});
+    EXPECT_LE(edited["channels"][0]["worstError"], 0.005);
 }
 
 TEST_F(RewriteTest, OddTextsStayWithoutForce) {

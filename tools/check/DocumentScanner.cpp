@@ -1,5 +1,6 @@
 #include "tools/check/DocumentScanner.h"
 
+#include "lumenkey/foundation/BXDocumentDepth.h"
 #include "lumenkey/foundation/BXParserBlock.h"
 #include "tools/import/InputError.h"
 #include "tools/output/TextForms.h"
@@ -28,7 +29,7 @@ public:
             [](void* self, char const* name, char const** pairs) {
                 guard(self, [&](Run& run) { run.start(name, pairs); });
             },
-            [](void* self, char const*) { guard(self, [](Run& run) { run._scanner.end(); }); });
+            [](void* self, char const*) { guard(self, [](Run& run) { run.end(); }); });
         XML_SetCharacterDataHandler(_parser.get(), [](void* self, char const* text, int size) {
             guard(self, [&](Run& run) {
                 run._scanner.text(run.place(), {text, static_cast<std::size_t>(size)});
@@ -120,11 +121,21 @@ private:
     }
 
     void start(char const* name, char const** pairs) {
+        if (++_depth > kGreatestDepth) {
+            _scanner.fault(place(), BXTooDeepText());
+            stop();
+            return;
+        }
         Attributes attributes;
         for (char const** pair = pairs; *pair != nullptr; pair += 2) {
             attributes.emplace(pair[0], pair[1]);
         }
         _scanner.start(place(), name, attributes);
+    }
+
+    void end() {
+        --_depth;
+        _scanner.end();
     }
 
     void feedBlock(std::FILE& stream, std::string const& file, bool* isLast) {
@@ -144,6 +155,7 @@ private:
     std::unique_ptr<XML_ParserStruct, void (*)(XML_Parser)> _parser;
     std::uint64_t _block = kFirstParserBlock;
     std::uint64_t _fed = 0;
+    std::size_t _depth = 0;
     bool _isStopped = false;
     std::exception_ptr _thrown;
 };

@@ -93,12 +93,11 @@ SafeOutputFile::SafeOutputFile(std::string const& target) : _name(target) {
         _target = real.string();
         // Not made of the target's name, which may be as long as a name can be.
         _temporary = (directoryOf(real) / ".lumenkey-XXXXXX").string();
-        _descriptor = ::mkostemp(_temporary.data(), O_CLOEXEC);
+        _descriptor = _temporaryName.makeFile(_temporary);
         if (_descriptor < 0) {
             _temporary.clear();
             fail(errno);
         }
-        _temporaryName = TemporaryName(_temporary);
         if (int const error = takeOver(_descriptor, replaced)) {
             fail(error);
         }

@@ -5,6 +5,8 @@
 #include <climits>
 #include <csignal>
 #include <cstring>
+#include <fcntl.h>
+#include <poll.h>
 #include <unistd.h>
 #include <utility>
 
@@ -12,7 +14,7 @@ namespace lumenkey::tools {
 
 namespace {
 
-enum class Use { Free, Taken, Alive };
+enum class Use { Free, BeingMade, Alive };
 
 /// Names lie in static memory, so that a handler never follows a pointer that is being freed. At worst it
 /// finds a name whose file is gone, and nobody else gives that name to one.
@@ -23,10 +25,17 @@ struct Slot {
 
 constexpr std::size_t kSlots = 64;
 std::array<Slot, kSlots> slots;
+/// Whether a signal is ending the program: no more files are made then.
+std::atomic<bool> isEnding = false;
 static_assert(std::atomic<Use>::is_always_lock_free, "a handler may use nothing else");
 
 void removeAndEnd(int signal) {
+    isEnding = true;
     for (Slot const& slot : slots) {
+        // By another thread: one that makes a file holds signals up.
+        while (slot.use.load() == Use::BeingMade) {
+            ::poll(nullptr, 0, 1);
+        }
         if (slot.use.load(std::memory_order_acquire) == Use::Alive) {
             ::unlink(slot.name);
         }
@@ -35,6 +44,22 @@ void removeAndEnd(int signal) {
     std::signal(signal, SIG_DFL);
     ::raise(signal);
 }
+
+/// Keeps signals from this thread.
+class SignalsHeldUp {
+public:
+    SignalsHeldUp() {
+        sigset_t all;
+        ::sigfillset(&all);
+        ::pthread_sigmask(SIG_SETMASK, &all, &_before);
+    }
+    ~SignalsHeldUp() { ::pthread_sigmask(SIG_SETMASK, &_before, nullptr); }
+    SignalsHeldUp(SignalsHeldUp const&) = delete;
+    SignalsHeldUp& operator=(SignalsHeldUp const&) = delete;
+
+private:
+    sigset_t _before{};
+};
 
 } // namespace
 
@@ -49,15 +74,29 @@ void removeTemporariesOnSignals() {
     }
 }
 
-TemporaryName::TemporaryName(std::string const& name) {
-    for (std::size_t i = 0; i < kSlots && _slot == kNone && name.size() < PATH_MAX; ++i) {
+int TemporaryName::makeFile(std::string& pattern) {
+    SignalsHeldUp const held;
+    for (std::size_t i = 0; i < kSlots && _slot == kNone && pattern.size() < PATH_MAX; ++i) {
         Use free = Use::Free;
-        if (slots[i].use.compare_exchange_strong(free, Use::Taken)) {
-            std::memcpy(slots[i].name, name.c_str(), name.size() + 1);
-            slots[i].use.store(Use::Alive, std::memory_order_release);
-            _slot = i;
+        _slot = slots[i].use.compare_exchange_strong(free, Use::BeingMade) ? i : kNone;
+    }
+    if (_slot == kNone) {
+        return ::mkostemp(pattern.data(), O_CLOEXEC);
+    }
+    Slot& slot = slots[_slot];
+    if (isEnding) {
+        slot.use = Use::Free;
+        for (;;) {
+            ::pause(); // for the end
         }
     }
+    int const descriptor = ::mkostemp(pattern.data(), O_CLOEXEC);
+    if (descriptor >= 0) {
+        std::memcpy(slot.name, pattern.c_str(), pattern.size() + 1);
+    }
+    slot.use = descriptor >= 0 ? Use::Alive : Use::Free;
+    _slot = descriptor >= 0 ? _slot : kNone;
+    return descriptor;
 }
 
 TemporaryName::TemporaryName(TemporaryName&& other) noexcept : _slot(std::exchange(other._slot, kNone)) {}

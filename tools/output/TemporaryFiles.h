@@ -14,11 +14,13 @@ void removeTemporariesOnSignals();
 class TemporaryName {
 public:
     TemporaryName() = default;
-    /// Keeps a copy.
-    explicit TemporaryName(std::string const& name);
     TemporaryName(TemporaryName&& other) noexcept;
     TemporaryName& operator=(TemporaryName&& other) noexcept;
     ~TemporaryName();
+
+    /// Makes and opens a file, as `mkostemp` with `O_CLOEXEC` does, whose name `pattern` becomes: no signal
+    /// ends the program between that and its being known here. -1 on failure, with `errno`. To be called once.
+    int makeFile(std::string& pattern);
 
 private:
     static constexpr std::size_t kNone = static_cast<std::size_t>(-1);
