@@ -170,8 +170,8 @@ void Twins::mark() {
         vertex.setInterpolation(key.type);
         break;
     case 3: // slopes that no derivation gave
-        key.setIn(-0.5, 2.0);
-        key.setOut(0.25, -1.0);
+        key.setIn({-0.5, 2.0});
+        key.setOut({0.25, -1.0});
         setSides(vertex, {-0.5, 2.0, 0.25, -1.0});
         break;
     default:
@@ -191,7 +191,7 @@ void Twins::expectAgreement() {
         ASSERT_TRUE(_handles.count(&key) == 0 || _handles[&key] == &vertex)
             << "another vertex at index " << i;
         handles[&key] = &vertex;
-        Sides const sides{key.in[0], key.in[1], key.out[0], key.out[1]};
+        Sides const sides{key.in.u, key.in.v, key.out.u, key.out.v};
         ASSERT_EQ(TempusCompare(key.u, vertex.getValueU()), 0) << i;
         ASSERT_TRUE(agree(key.v, vertex.getValueV(kTempusZero))) << i;
         ASSERT_EQ(key.type, vertex.getInterpolation()) << i;

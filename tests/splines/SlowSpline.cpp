@@ -1,18 +1,13 @@
 #include "tests/splines/SlowSpline.h"
 
-#include <algorithm>
 #include <cmath>
 
 namespace {
 
 double seconds(Tempus const& t) { return TempusGetSeconds(t); }
 
-struct Line {
-    double u, v;
-};
-
 /// A thirty-sixth of the way from p to q.
-Line lineBetween(SlowKey const& p, SlowKey const& q) {
+SlowTangent between(SlowKey const& p, SlowKey const& q) {
     return {seconds(q.u - p.u) / 36.0, (q.v - p.v) / 36.0};
 }
 
@@ -20,29 +15,13 @@ void layFlat(SlowKey& neighbour, bool inputSide, SlowKey const& key) {
     if (std::fabs(neighbour.v - key.v) >= 1e-7) {
         return;
     }
-    inputSide ? neighbour.setIn(neighbour.in[0], 0.0) : neighbour.setOut(neighbour.out[0], 0.0);
-    if (std::fabs(inputSide ? neighbour.out[1] : neighbour.in[1]) >= 1e-7) {
+    inputSide ? neighbour.setIn({neighbour.in.u, 0.0}) : neighbour.setOut({neighbour.out.u, 0.0});
+    if (std::fabs(inputSide ? neighbour.out.v : neighbour.in.v) >= 1e-7) {
         neighbour.flags |= 0x1;
     }
 }
 
 } // namespace
-
-void SlowKey::setIn(double x, double y) {
-    if (locked() || !enabled) {
-        return;
-    }
-    in[0] = std::min(x, 0.0);
-    in[1] = y;
-}
-
-void SlowKey::setOut(double x, double y) {
-    if (locked() || !enabled) {
-        return;
-    }
-    out[0] = std::max(x, 0.0);
-    out[1] = y;
-}
 
 // --- Neighbours and values ---
 
@@ -59,9 +38,7 @@ std::vector<SlowSpline::Key> SlowSpline::valid() const {
 SlowSpline::Key SlowSpline::before(Tempus const& u) const {
     Key found = nullptr;
     for (Key key : valid()) {
-        if (key->u < u) {
-            found = key;
-        }
+        found = key->u < u ? key : found;
     }
     return found;
 }
@@ -91,8 +68,7 @@ SlowSpline::Key SlowSpline::nextOf(Key key) const {
 }
 
 double SlowSpline::valueAt(Tempus const& u) const {
-    auto const list = valid();
-    for (Key key : list) {
+    for (Key key : valid()) {
         if (key->u == u) {
             return key->v;
         }
@@ -100,8 +76,7 @@ double SlowSpline::valueAt(Tempus const& u) const {
     Key const a = before(u);
     Key const b = after(u);
     if (a == nullptr || b == nullptr) {
-        Key const end = a == nullptr ? b : a;
-        return end == nullptr ? 0.0 : end->v;
+        return a != nullptr ? a->v : b != nullptr ? b->v : 0.0;
     }
     return a->type == 0 ? a->v : a->v + (b->v - a->v) * (seconds(u - a->u) / seconds(b->u - a->u));
 }
@@ -115,40 +90,40 @@ std::size_t SlowSpline::placeOf(Tempus const& u) const {
     return i;
 }
 
+SlowSpline::Key SlowSpline::at(Tempus const& u) const {
+    std::size_t const i = placeOf(u);
+    return i < keys.size() && keys[i]->u == u ? keys[i].get() : nullptr;
+}
+
 // --- Adding ---
 
+SlowSpline::Key SlowSpline::insert(std::unique_ptr<SlowKey> key) {
+    auto const place = keys.begin() + static_cast<long>(placeOf(key->u));
+    return keys.insert(place, std::move(key))->get();
+}
+
 SlowSpline::Key SlowSpline::join(std::unique_ptr<SlowKey> key, bool replace, bool stateType) {
+    Key const there = at(key->u);
+    if (there != nullptr && replace) {
+        there->setValue(key->v);
+        return there;
+    }
     std::size_t const i = placeOf(key->u);
-    bool const taken = i < keys.size() && keys[i]->u == key->u;
-    if (taken && replace) {
-        if (!keys[i]->locked()) {
-            keys[i]->v = key->v;
-        }
-        return keys[i].get();
-    }
-    key->type = taken ? keys[i]->type : i > 0 ? keys[i - 1]->type : newType;
-    if (stateType && i == keys.size()) {
-        key->type = newType;
-    }
-    return keys.insert(keys.begin() + static_cast<long>(i), std::move(key))->get();
+    bool const ofState = i == 0 || (stateType && i == keys.size());
+    key->type = there != nullptr ? there->type : ofState ? newType : keys[i - 1]->type;
+    return insert(std::move(key));
 }
 
 SlowSpline::Key SlowSpline::add(Tempus const& u, double value, bool replace) {
-    auto made = std::make_unique<SlowKey>();
+    auto made = std::make_unique<SlowKey>(SlowKey{.u = u, .v = value});
     Key const key = made.get();
-    key->u = u;
-    key->v = value;
     auto list = valid();
-    bool atEnd = false;
-    bool behind = false;
-    if (!keys.empty()) {
-        Tempus const low = list.empty() ? kTempusZero : list.front()->u;
-        Tempus const high = list.empty() ? kTempusZero : list.back()->u;
-        behind = u > high && !(u < low);
-        atEnd = behind || u < low;
-        if (!atEnd) {
-            deriveKey(*key);
-        }
+    Tempus const low = list.empty() ? kTempusZero : list.front()->u;
+    Tempus const high = list.empty() ? kTempusZero : list.back()->u;
+    bool const behind = !keys.empty() && u > high && !(u < low);
+    bool const atEnd = behind || (!keys.empty() && u < low);
+    if (!keys.empty() && !atEnd) {
+        deriveKey(*key);
     }
     Key const result = join(std::move(made), replace, behind);
     if (result != key || !derive) {
@@ -158,26 +133,16 @@ SlowSpline::Key SlowSpline::add(Tempus const& u, double value, bool replace) {
     Key const previous = previousOf(key);
     Key const next = nextOf(key);
     if (previous != nullptr && previous == list.front() && list.size() == 2) {
-        Line const line = lineBetween(*previous, *key);
-        if (!previous->edited()) {
-            previous->setOut(line.u, line.v);
-        }
         deriveKey(*key);
-    } else if (key == list.front() && next != nullptr && !next->edited()) {
-        Line const line = lineBetween(*key, *next);
-        key->setOut(line.u, line.v);
-        next->setIn(-line.u, -line.v);
+    }
+    if (key == list.front() && next != nullptr && !next->edited()) {
+        key->setOut(between(*key, *next));
+        next->setIn(-between(*key, *next));
         layFlat(*next, true, *key);
     }
-    if (next != nullptr && next == list.back() && list.size() == 2) {
-        Line const line = lineBetween(*key, *next);
-        if (!next->edited()) {
-            next->setIn(-line.u, -line.v);
-        }
-    } else if (key == list.back() && previous != nullptr && !previous->edited()) {
-        Line const line = lineBetween(*previous, *key);
-        previous->setOut(line.u, line.v);
-        key->setIn(-line.u, -line.v);
+    if (key == list.back() && previous != nullptr && !previous->edited()) {
+        previous->setOut(between(*previous, *key));
+        key->setIn(-between(*previous, *key));
         layFlat(*previous, false, *key);
     }
     if (atEnd || keys.size() == 1) {
@@ -187,48 +152,29 @@ SlowSpline::Key SlowSpline::add(Tempus const& u, double value, bool replace) {
 }
 
 SlowSpline::Key SlowSpline::addNoTangents(Tempus const& u, double value, bool replace) {
-    auto made = std::make_unique<SlowKey>();
-    made->u = u;
-    made->v = value;
-    return join(std::move(made), replace, false);
+    return join(std::make_unique<SlowKey>(SlowKey{.u = u, .v = value}), replace, false);
 }
 
 // --- Setting and moving ---
 
 std::unique_ptr<SlowKey> SlowSpline::take(Key key) {
-    for (std::size_t i = 0; i < keys.size(); ++i) {
-        if (keys[i].get() == key) {
-            auto taken = std::move(keys[i]);
-            keys.erase(keys.begin() + static_cast<long>(i));
-            return taken;
-        }
-    }
-    return nullptr;
-}
-
-SlowSpline::Key SlowSpline::putBack(std::unique_ptr<SlowKey> key, double value) {
-    std::size_t const i = placeOf(key->u);
-    if (i < keys.size() && keys[i]->u == key->u) {
-        if (!keys[i]->locked()) {
-            keys[i]->v = value;
-        }
-        return nullptr;
-    }
-    return keys.insert(keys.begin() + static_cast<long>(i), std::move(key))->get();
+    auto const place =
+        std::find_if(keys.begin(), keys.end(), [key](auto const& each) { return each.get() == key; });
+    auto taken = std::move(*place);
+    keys.erase(place);
+    return taken;
 }
 
 SlowSpline::Key SlowSpline::set(Key key, Tempus const& u, double value) {
-    if (u != key->u) {
-        Key const kept = setNoTangents(key, u, value);
-        if (kept != nullptr && keys.size() == 1) {
-            deriveKey(*kept);
-        }
-        return kept;
+    if (u == key->u) {
+        key->setValue(value);
+        return key;
     }
-    if (!key->locked()) {
-        key->v = value;
+    Key const kept = setNoTangents(key, u, value);
+    if (kept != nullptr && keys.size() == 1) {
+        deriveKey(*kept);
     }
-    return key;
+    return kept;
 }
 
 SlowSpline::Key SlowSpline::setNoTangents(Key key, Tempus const& u, double value) {
@@ -236,9 +182,13 @@ SlowSpline::Key SlowSpline::setNoTangents(Key key, Tempus const& u, double value
         return key;
     }
     auto taken = take(key);
+    if (Key const there = at(u); there != nullptr) {
+        there->setValue(value);
+        return nullptr;
+    }
     taken->u = u;
     taken->v = value;
-    return putBack(std::move(taken), value);
+    return insert(std::move(taken));
 }
 
 SlowSpline::Key SlowSpline::move(Key key, Tempus const& newU, bool clone, bool replace, bool constrain) {
@@ -257,28 +207,25 @@ SlowSpline::Key SlowSpline::move(Key key, Tempus const& newU, bool clone, bool r
         moved = take(key);
         bool const below = previous != nullptr && newU <= previous->u;
         bool const above = next != nullptr && newU >= next->u;
-        if (below && constrain) {
-            targetU = previous->u + step;
-        } else if (above && constrain) {
-            targetU = next->u - step;
+        if (constrain && (below || above)) {
+            targetU = below ? previous->u + step : next->u - step;
         } else if (below || above) {
             moved->flags |= 0x100;
         }
     }
     moved->u = targetU;
-    std::size_t const i = placeOf(targetU);
-    bool const taken = i < keys.size() && keys[i]->u == targetU;
-    if (taken && replace) {
-        return keys[i].get();
+    Key const there = at(targetU);
+    if (there != nullptr && replace) {
+        return there;
     }
-    if (taken) {
-        keys[i]->flags |= 0x100;
+    if (there != nullptr) {
+        there->flags |= 0x100;
     }
     if (targetU != oldU) {
         growAround(targetU, oldU);
     }
-    Key const placed = keys.insert(keys.begin() + static_cast<long>(i), std::move(moved))->get();
-    if (!taken) {
+    Key const placed = insert(std::move(moved));
+    if (there == nullptr) {
         fitMoved(placed, targetU - oldU);
     }
     return placed;
@@ -297,10 +244,11 @@ bool SlowSpline::erase(Key key, bool scale) {
     return true;
 }
 
-bool SlowSpline::eraseAt(Tempus const& u, bool scale) {
+/// In their order.
+bool SlowSpline::eraseAll(std::function<bool(SlowKey const&)> const& holds, bool scale) {
     bool any = false;
     for (std::size_t i = 0; i < keys.size();) {
-        if (keys[i]->u == u && erase(keys[i].get(), scale)) {
+        if (holds(*keys[i]) && erase(keys[i].get(), scale)) {
             any = true;
         } else {
             ++i;
@@ -309,21 +257,20 @@ bool SlowSpline::eraseAt(Tempus const& u, bool scale) {
     return any;
 }
 
+bool SlowSpline::eraseAt(Tempus const& u, bool scale) {
+    return eraseAll([&](SlowKey const& key) { return key.u == u; }, scale);
+}
+
 bool SlowSpline::eraseBetween(Tempus const& from, Tempus const& to) {
-    bool any = false;
     bool pastFirstAtZero = false;
-    for (std::size_t i = 0; i < keys.size();) {
+    auto const isBetween = [&](SlowKey const& key) {
         // A second key exactly at zero counts as behind zero.
-        bool const atZero = from == kTempusZero && keys[i]->u == kTempusZero;
-        bool const behind = keys[i]->u > from || (atZero && pastFirstAtZero);
+        bool const atZero = from == kTempusZero && key.u == kTempusZero;
+        bool const behind = key.u > from || (atZero && pastFirstAtZero);
         pastFirstAtZero = pastFirstAtZero || atZero;
-        if (behind && keys[i]->u <= to && erase(keys[i].get(), true)) {
-            any = true;
-        } else {
-            ++i;
-        }
-    }
-    return any;
+        return behind && key.u <= to;
+    };
+    return eraseAll(isBetween, true);
 }
 
 // --- Tangents ---
@@ -335,36 +282,25 @@ void SlowSpline::deriveKey(SlowKey& key) {
     }
     Key const previous = before(key.u);
     Key const next = after(key.u);
-    if (next != nullptr && &key == list.front()) {
-        Line const line = lineBetween(key, *next);
-        key.setOut(line.u, line.v);
-        key.setIn(-line.u, -line.v);
-        layFlat(*next, true, key);
+    bool const first = next != nullptr && &key == list.front();
+    if (first || (previous != nullptr && &key == list.back())) {
+        SlowTangent const line = first ? between(key, *next) : between(*previous, key);
+        key.setIn(-line);
+        key.setOut(line);
+        layFlat(first ? *next : *previous, first, key);
         return;
     }
-    if (previous != nullptr && &key == list.back()) {
-        Line const line = lineBetween(*previous, key);
-        key.setIn(-line.u, -line.v);
-        key.setOut(line.u, line.v);
-        layFlat(*previous, false, key);
-        return;
-    }
-    double in[2];
-    double out[2];
-    derivePoint(key.u, in, out);
+    auto [in, out] = derivePoint(key.u);
     if (!(list.front()->u < key.u)) {
-        key.setOut(out[0], out[1]);
-        key.setIn(-out[0], -out[1]);
+        in = -out;
     } else if (!(list.back()->u > key.u)) {
-        key.setIn(in[0], in[1]);
-        key.setOut(-in[0], -in[1]);
-    } else {
-        key.setIn(in[0], in[1]);
-        key.setOut(out[0], out[1]);
+        out = -in;
     }
+    key.setIn(in);
+    key.setOut(out);
 }
 
-void SlowSpline::derivePoint(Tempus const& u, double* in, double* out) {
+std::pair<SlowTangent, SlowTangent> SlowSpline::derivePoint(Tempus const& u) {
     Key const p = before(u);
     Key const q = after(u);
     double const c = valueAt(u);
@@ -379,21 +315,18 @@ void SlowSpline::derivePoint(Tempus const& u, double* in, double* out) {
         q->scaleIn(seconds(q->u - u) / s);
     } else if (p != nullptr) {
         riseIn = (c - p->v) / seconds(u - p->u);
-        if (std::fabs(p->out[0]) >= 1e-7) {
-            p->scaleOut(std::fabs(seconds(u - p->u) / 36.0 / p->out[0]));
+        if (std::fabs(p->out.u) >= 1e-7) {
+            p->scaleOut(std::fabs(seconds(u - p->u) / 36.0 / p->out.u));
         }
     } else if (q != nullptr) {
         riseOut = (q->v - c) / seconds(q->u - u);
-        if (std::fabs(q->in[0]) >= 1e-7) {
-            q->scaleIn(std::fabs(seconds(u - q->u) / 36.0 / q->in[0]));
+        if (std::fabs(q->in.u) >= 1e-7) {
+            q->scaleIn(std::fabs(seconds(u - q->u) / 36.0 / q->in.u));
         }
     }
     double const scaleIn = p == nullptr ? 0.0 : seconds(u - p->u) / 36.0 / r;
     double const scaleOut = q == nullptr ? 0.0 : seconds(q->u - u) / 36.0 / r;
-    in[0] = -r * scaleIn;
-    in[1] = -riseIn * scaleIn;
-    out[0] = r * scaleOut;
-    out[1] = riseOut * scaleOut;
+    return {{-r * scaleIn, -riseIn * scaleIn}, {r * scaleOut, riseOut * scaleOut}};
 }
 
 void SlowSpline::growAround(Tempus const& newU, Tempus const& oldU) {
@@ -409,13 +342,13 @@ void SlowSpline::growAround(Tempus const& newU, Tempus const& oldU) {
     Key const q = after(oldU);
     if (q == nullptr) {
         if (Key const p = before(oldU); p != nullptr) {
-            p->scaleOut(growth(p->u, p->out[0]));
+            p->scaleOut(growth(p->u, p->out.u));
         }
         return;
     }
     Key const p = previousOf(q);
     if (p == nullptr) {
-        q->scaleIn(growth(q->u, q->in[0]));
+        q->scaleIn(growth(q->u, q->in.u));
     } else if (p->u != oldU) {
         double const s = seconds(q->u - p->u);
         p->scaleOut(std::fabs(s / seconds(oldU - p->u)));
@@ -456,10 +389,10 @@ void SlowSpline::fitMoved(Key key, Tempus const& delta) {
         return std::fabs(distance / 36.0 / x);
     };
     if (p != nullptr) {
-        key->scaleIn(factor(p, key->in[0]));
+        key->scaleIn(factor(p, key->in.u));
     }
     if (q != nullptr) {
-        key->scaleOut(factor(q, key->out[0]));
+        key->scaleOut(factor(q, key->out.u));
     }
 }
 
@@ -473,9 +406,9 @@ void SlowSpline::ungrow(Key key) {
         double const s = seconds(q->u - p->u);
         p->scaleOut(s / seconds(key->u - p->u));
         q->scaleIn(s / seconds(q->u - key->u));
-    } else if (p != nullptr && std::fabs(p->out[0]) >= 1e-7) {
-        p->scaleOut(std::fabs(36.0 * p->out[0] / seconds(key->u - p->u)));
-    } else if (q != nullptr && std::fabs(q->in[0]) >= 1e-7) {
-        q->scaleIn(std::fabs(36.0 * q->in[0] / seconds(key->u - q->u)));
+    } else if (p != nullptr && std::fabs(p->out.u) >= 1e-7) {
+        p->scaleOut(std::fabs(36.0 * p->out.u / seconds(key->u - p->u)));
+    } else if (q != nullptr && std::fabs(q->in.u) >= 1e-7) {
+        q->scaleIn(std::fabs(36.0 * q->in.u / seconds(key->u - q->u)));
     }
 }

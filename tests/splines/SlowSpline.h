@@ -4,9 +4,20 @@
 
 #include "lumenkey/foundation/Tempus.h"
 
+#include <algorithm>
 #include <cstdint>
+#include <functional>
 #include <memory>
+#include <utility>
 #include <vector>
+
+/// Of one side, as U and V.
+struct SlowTangent {
+    double u = 0.0, v = 0.0;
+
+    SlowTangent operator-() const { return {-u, -v}; }
+    SlowTangent operator*(double factor) const { return {u * factor, v * factor}; }
+};
 
 struct SlowKey {
     Tempus u;
@@ -14,15 +25,20 @@ struct SlowKey {
     std::uint32_t type = 1;
     std::uint32_t flags = 0;
     bool enabled = true;
-    double in[2] = {0.0, 0.0};
-    double out[2] = {0.0, 0.0};
+    SlowTangent in = {};
+    SlowTangent out = {};
 
     bool locked() const { return (flags & 0x2) != 0; }
     bool edited() const { return (flags & 0x80) != 0; }
-    void setIn(double x, double y);
-    void setOut(double x, double y);
-    void scaleIn(double factor) { setIn(in[0] * factor, in[1] * factor); }
-    void scaleOut(double factor) { setOut(out[0] * factor, out[1] * factor); }
+    void setValue(double value) { v = locked() ? v : value; }
+    void setIn(SlowTangent const& t) {
+        in = locked() || !enabled ? in : SlowTangent{std::min(t.u, 0.0), t.v};
+    }
+    void setOut(SlowTangent const& t) {
+        out = locked() || !enabled ? out : SlowTangent{std::max(t.u, 0.0), t.v};
+    }
+    void scaleIn(double factor) { setIn(in * factor); }
+    void scaleOut(double factor) { setOut(out * factor); }
 };
 
 /// A null key stands for "there is none" throughout, and for a refusal as a result.
@@ -53,11 +69,14 @@ private:
     Key previousOf(Key key) const;
     Key nextOf(Key key) const;
     std::size_t placeOf(Tempus const& u) const;
+    /// The first key there.
+    Key at(Tempus const& u) const;
+    Key insert(std::unique_ptr<SlowKey> key);
     Key join(std::unique_ptr<SlowKey> key, bool replace, bool stateType);
     std::unique_ptr<SlowKey> take(Key key);
-    Key putBack(std::unique_ptr<SlowKey> key, double value);
+    bool eraseAll(std::function<bool(SlowKey const&)> const& holds, bool scale);
     void deriveKey(SlowKey& key);
-    void derivePoint(Tempus const& u, double* in, double* out);
+    std::pair<SlowTangent, SlowTangent> derivePoint(Tempus const& u);
     void growAround(Tempus const& newU, Tempus const& oldU);
     void fitMoved(Key key, Tempus const& delta);
     void ungrow(Key key);
