@@ -34,9 +34,7 @@ template <class Property> void overMuseum(Property property) {
     } while (false)
 
 bool drawsAsOneCurve(MuseumSpline const& curve) {
-    std::uint32_t type = 0;
-    curve->getInterpolation(&type, nullptr, nullptr);
-    return isWholeCurveType(type) && curve.state->parametric;
+    return isWholeCurveType(curve.typeOfAll()) && curve.state->parametric;
 }
 
 /// The same instant in a timescale `factor` times as fine, where that can be written.

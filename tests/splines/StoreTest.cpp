@@ -385,9 +385,7 @@ TEST(KFSplineStore, FindsWhatDeletionsLeave) {
         ASSERT_TRUE(i % 9 == 0 || curve->deleteVertex(TempusMake(i, 1), false, kTempusZero));
     }
     for (KFVertex* const vertex : museumVertices(*curve)) {
-        void* found = nullptr;
-        ASSERT_TRUE(curve->getVertexHandle(vertex->getValueU(), &found, true));
-        ASSERT_EQ(found, vertex);
+        ASSERT_EQ(curve.vertexAt(vertex->getValueU()), vertex);
     }
 }
 

@@ -31,9 +31,9 @@ struct Curve : MuseumSpline {
     /// Searches find each vertex where it stands: the index of positions is up to date.
     void expectFindable() {
         for (KFVertex const* vertex : museumVertices(*spline)) {
-            void* found = nullptr;
-            ASSERT_TRUE(spline->getVertexHandle(vertex->getValueU(), &found, true));
-            EXPECT_EQ(vertex->getValueU(), static_cast<KFVertex*>(found)->getValueU());
+            KFVertex const* const found = vertexAt(vertex->getValueU());
+            ASSERT_NE(nullptr, found);
+            EXPECT_EQ(vertex->getValueU(), found->getValueU());
         }
     }
 };

@@ -93,22 +93,17 @@ TEST_F(KFSplineAccessTest, StepsAndRangesFollowTheState) {
 
 TEST_F(KFSplineAccessTest, TypesOfAllVertices) {
     add({1.0, 2.0, 3.0});
-    auto const typeOfAll = [&] {
-        std::uint32_t type = 0;
-        curve->getInterpolation(&type, nullptr, nullptr);
-        return type;
-    };
     keys[1]->setFlag(kKFVertexFlagLocked);
     curve->setInterpolation(4);
-    EXPECT_EQ(typeOfAll(), 100u) << "the locked one keeps its type";
+    EXPECT_EQ(curve.typeOfAll(), 100u) << "the locked one keeps its type";
     EXPECT_TRUE(curve->hasInterpolation(1));
     keys[0]->setInterpolation(7);
     EXPECT_FALSE(curve->hasInterpolation(7)) << "the first one isn't looked at";
     curve.state->parametric = true;
     curve->setInterpolation(10);
-    EXPECT_EQ(typeOfAll(), 10u) << "a parametric spline is of one type, locks or not";
+    EXPECT_EQ(curve.typeOfAll(), 10u) << "a parametric spline is of one type, locks or not";
     curve->setInterpolation(100);
-    EXPECT_EQ(typeOfAll(), 10u) << "mixed is no type to set";
+    EXPECT_EQ(curve.typeOfAll(), 10u) << "mixed is no type to set";
 }
 
 TEST_F(KFSplineAccessTest, SpeedsStandForTypes) {
@@ -195,8 +190,7 @@ TEST_F(KFSplineAccessTest, SuppressedRefreshKeepsTheListOfValidVertices) {
     }
     EXPECT_EQ(curve->getMaxValueU(kTempusZero, true), s(3));
     EXPECT_TRUE(curve->isValidHandle(behind));
-    void* handle = nullptr;
-    EXPECT_TRUE(curve->getVertexHandle(s(9), &handle, true));
+    EXPECT_NE(curve.vertexAt(s(9)), nullptr);
     curve->setDirty(true);
     EXPECT_EQ(validCount(), 4u);
     curve->deleteVertex(keys[2], false, kTempusZero);

@@ -35,6 +35,18 @@ struct MuseumSpline {
     double slopeAt(Tempus const& u, bool lock = true) const {
         return spline->getDerivativeValue(u, kTempusZero, lock);
     }
+    /// What all vertices have in common.
+    std::uint32_t typeOfAll() const {
+        std::uint32_t type = 0;
+        spline->getInterpolation(&type, nullptr, nullptr);
+        return type;
+    }
+    /// The first vertex there, or null.
+    KFVertex* vertexAt(Tempus const& u) const {
+        void* handle = nullptr;
+        spline->getVertexHandle(u, &handle, true);
+        return static_cast<KFVertex*>(handle);
+    }
     /// Puts a vertex behind the others.
     KFVertex* append(Tempus const& u, double value, std::uint32_t type = kKFInterpolationLinear) const;
     /// Of these types, at uneven distances, with tangents that are unlike on the two sides.
