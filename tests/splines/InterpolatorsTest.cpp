@@ -1,9 +1,9 @@
 // What the strategies do that need no tangents, besides drawing, which the frozen values hold.
 
 #include "lumenkey/splines/KFBasicInterpolators.h"
-#include "lumenkey/splines/KFSpline.h"
 #include "lumenkey/splines/KFSplineInterpolator.h"
 #include "lumenkey/splines/KFStaticVertex.h"
+#include "tests/splines/museum.h"
 
 #include <gtest/gtest.h>
 
@@ -11,35 +11,31 @@
 
 namespace {
 
-/// One segment, of a spline that leaves tangents alone.
-struct Segment {
-    KFSplineState state;
-    KFSpline spline{&state};
-    KFVertex* a = nullptr;
-    KFVertex* b = nullptr;
+struct Segment : MuseumSpline {
+    KFVertex* a;
+    KFVertex* b;
 
-    Segment(std::uint32_t type, Tempus const& u1, double valueA, Tempus const& u2, double valueB) {
-        state.deriveTangents = false;
-        state.interpolation = type;
-        a = static_cast<KFVertex*>(spline.appendVertexNoTangents(u1, valueA, kTempusZero));
-        b = static_cast<KFVertex*>(spline.appendVertexNoTangents(u2, valueB, kTempusZero));
-    }
+    Segment(std::uint32_t type, Tempus const& u1, double valueA, Tempus const& u2, double valueB)
+        : a(append(u1, valueA, type)), b(append(u2, valueB, type)) {}
 
-    KFInterpolator& strategy() { return *spline.getInterpolator(a->getInterpolation()); }
+    KFInterpolator& strategy() { return *spline->getInterpolator(a->getInterpolation()); }
 
-    double value(Tempus const& u) {
-        return strategy().interpolate(spline, kTempusZero, a, b, u, false, false);
-    }
-    double slope(Tempus const& u) {
-        return strategy().interpolate(spline, kTempusZero, a, b, u, false, true);
+    double value(Tempus const& u, bool slope = false) {
+        return strategy().interpolate(*spline, kTempusZero, a, b, u, false, slope);
     }
 
     std::vector<Tempus> positionsOf(double value) {
         std::vector<Tempus> out;
         bool const isKnown =
-            strategy().uForCurveValue(spline, a, b, a->getValueU(), b->getValueU(), value, out);
+            strategy().uForCurveValue(*spline, a, b, a->getValueU(), b->getValueU(), value, out);
         EXPECT_EQ(isKnown, !out.empty());
         return out;
+    }
+
+    template <class Strategy> std::pair<double, double> extremes(Tempus const& low, Tempus const& high) {
+        double min = 0.0, max = 0.0;
+        dynamic_cast<Strategy&>(strategy()).getMinMaxValues(*spline, a, b, low, high, &min, &max);
+        return {min, max};
     }
 };
 
@@ -63,14 +59,12 @@ TEST(BasicInterpolators, ASegmentOfNoLengthIsItsStart) {
         Segment segment(type, u, 2.0, u, 7.0);
         EXPECT_EQ(segment.value(u), 2.0) << type;
         segment.positionsOf(2.0);
-        double min = 0.0;
-        double max = 0.0;
-        if (auto* const bezier = dynamic_cast<KFBezierInterpolator*>(&segment.strategy())) {
-            bezier->getMinMaxValues(segment.spline, segment.a, segment.b, u, u, &min, &max);
+        if (dynamic_cast<KFBezierInterpolator*>(&segment.strategy()) != nullptr) {
+            auto const [min, max] = segment.extremes<KFBezierInterpolator>(u, u);
             EXPECT_TRUE(std::isfinite(min) && std::isfinite(max)) << type;
         }
     }
-    EXPECT_EQ(Segment(1, u, 2.0, u, 7.0).slope(u), 0.0);
+    EXPECT_EQ(Segment(1, u, 2.0, u, 7.0).value(u, true), 0.0);
     EXPECT_TRUE(Segment(13, u, 2.0, u, 7.0).positionsOf(2.0).empty());
 }
 
@@ -104,45 +98,31 @@ TEST(BasicInterpolators, FlatSegmentsHaveTheirValueAtTheStart) {
     }
 }
 
-namespace {
-
-template <class Strategy>
-std::pair<double, double> extremes(Segment& segment, Tempus const& low, Tempus const& high) {
-    double min = 0.0, max = 0.0;
-    auto& strategy = dynamic_cast<Strategy&>(segment.strategy());
-    strategy.getMinMaxValues(segment.spline, segment.a, segment.b, low, high, &min, &max);
-    return {min, max};
-}
-
-} // namespace
-
 TEST(BasicInterpolators, GiveTheExtremesBetweenTwoPositions) {
     Tempus const early = TempusMake(-5, 1), middle = TempusMake(2, 1), late = TempusMake(50, 1);
     Segment linear(1, TempusMake(1, 1), 8.0, TempusMake(3, 1), -2.0);
-    EXPECT_EQ(extremes<KFLinearInterpolator>(linear, TempusMake(3, 2), middle), std::pair(3.0, 5.5));
-    EXPECT_EQ(extremes<KFLinearInterpolator>(linear, early, late), std::pair(-2.0, 8.0));
+    EXPECT_EQ(linear.extremes<KFLinearInterpolator>(TempusMake(3, 2), middle), std::pair(3.0, 5.5));
+    EXPECT_EQ(linear.extremes<KFLinearInterpolator>(early, late), std::pair(-2.0, 8.0));
     Segment growing(14, TempusMake(1, 1), 8.0, TempusMake(3, 1), -2.0);
     double const value = growing.value(middle);
-    EXPECT_EQ(extremes<KFMonotonicInterpolator>(growing, early, middle), std::pair(value, 8.0));
-    EXPECT_EQ(extremes<KFMonotonicInterpolator>(growing, middle, late), std::pair(-2.0, value));
+    EXPECT_EQ(growing.extremes<KFMonotonicInterpolator>(early, middle), std::pair(value, 8.0));
+    EXPECT_EQ(growing.extremes<KFMonotonicInterpolator>(middle, late), std::pair(-2.0, value));
 }
 
 TEST(BasicInterpolators, SubdivideOnTheCurve) {
     Tempus const t = kTempusZero;
     Segment held(0, TempusMake(1, 1), 8.0, TempusMake(3, 1), -2.0);
-    held.strategy().subDivide(held.spline, t, held.a, held.b, nullptr);
-    void* middle = nullptr;
-    ASSERT_TRUE(held.spline.getVertexHandle(TempusMake(2, 1), &middle, false));
-    EXPECT_EQ(static_cast<KFVertex*>(middle)->getValueV(t), 8.0);
+    held.strategy().subDivide(*held, t, held.a, held.b, nullptr);
+    ASSERT_NE(held.vertexAt(TempusMake(2, 1)), nullptr);
+    EXPECT_EQ(held.vertexAt(TempusMake(2, 1))->getValueV(t), 8.0);
 
     for (std::uint32_t type : {1u, 7u, 13u, 16u, 19u}) {
         Segment segment(type, TempusMake(1, 1), 8.0, TempusMake(3, 1), -2.0);
         KFStaticVertex added(TempusMake(5, 4), 0.0);
-        segment.strategy().subDivide(segment.spline, t, segment.a, segment.b, &added);
+        segment.strategy().subDivide(*segment, t, segment.a, segment.b, &added);
         // A type that eases in time reads the spline, which eases again, at the eased time.
-        Tempus const read =
-            segment.strategy().easeTime(segment.spline, TempusMake(5, 4), segment.a, segment.b);
-        EXPECT_EQ(added.getValueV(t), segment.spline.getVertexValue(read, t, false)) << type;
+        Tempus const read = segment.strategy().easeTime(*segment, TempusMake(5, 4), segment.a, segment.b);
+        EXPECT_EQ(added.getValueV(t), segment.at(read, false)) << type;
         EXPECT_NE(added.getValueV(t), 0.0);
     }
 }

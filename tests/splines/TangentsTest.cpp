@@ -11,19 +11,10 @@ namespace {
 
 using Pair = std::array<double, 2>;
 
-Pair inputOf(KFVertex const* vertex) {
-    Sides const sides = sidesOf(*vertex);
-    return {sides[0], sides[1]};
-}
-
-Pair outputOf(KFVertex const* vertex) {
-    Sides const sides = sidesOf(*vertex);
-    return {sides[2], sides[3]};
-}
-
-void expectNear(Pair const& expected, Pair const& actual, double tolerance = 1e-12) {
-    EXPECT_NEAR(expected[0], actual[0], tolerance);
-    EXPECT_NEAR(expected[1], actual[1], tolerance);
+void expectSides(KFVertex const* vertex, Sides const& expected) {
+    for (std::size_t i = 0; i < 4; ++i) {
+        EXPECT_NEAR(expected[i], sidesOf(*vertex)[i], 1e-12) << i;
+    }
 }
 
 class KFSplineTangents : public testing::Test {
@@ -126,23 +117,21 @@ TEST_F(KFSplineInsertion, KeepsTheCurve) {
 // --- Derivation ---
 
 TEST_F(KFSplineTangents, ReadsDirectionsWithoutTouchingTheCurve) {
-    KFVertex* const first = add(0, 0.0);
-    KFVertex* const last = add(4, 3.0);
-    Pair const out = outputOf(first);
-    Pair const in = inputOf(last);
-    double x = 0.0;
-    double y = 0.0;
-    EXPECT_TRUE(spline.getPointInputTangents(TempusMake(1, 1), &x, &y, kTempusZero));
-    expectNear({-0.8, -0.6}, {x, y});
-    EXPECT_TRUE(spline.getPointOutputTangents(TempusMake(1, 1), &x, nullptr, kTempusZero));
-    EXPECT_TRUE(spline.getPointOutputTangents(TempusMake(1, 1), nullptr, &y, kTempusZero));
-    expectNear({0.8, 0.6}, {x, y});
-    spline.getNormals(TempusMake(1, 1), &x, &y, kTempusZero);
-    expectNear({-0.6, 0.8}, {x, y});
-    spline.derivePoint(TempusMake(1, 1), nullptr, nullptr, &x, nullptr, kTempusZero, true);
-    EXPECT_NEAR(x, 3.0 / 36.0, 1e-12);
-    EXPECT_EQ(out, outputOf(first));
-    EXPECT_EQ(in, inputOf(last));
+    KFVertex* const ends[] = {add(0, 0.0), add(4, 3.0)};
+    Sides const before[] = {sidesOf(*ends[0]), sidesOf(*ends[1])};
+    Tempus const u = TempusMake(1, 1);
+    double x[4] = {}, y[4] = {};
+    EXPECT_TRUE(spline.getPointInputTangents(u, &x[0], &y[0], kTempusZero));
+    EXPECT_TRUE(spline.getPointOutputTangents(u, &x[1], nullptr, kTempusZero));
+    EXPECT_TRUE(spline.getPointOutputTangents(u, nullptr, &y[1], kTempusZero));
+    spline.getNormals(u, &x[2], &y[2], kTempusZero);
+    spline.derivePoint(u, nullptr, nullptr, &x[3], nullptr, kTempusZero, true);
+    double const expectedX[] = {-0.8, 0.8, -0.6, 3.0 / 36.0}, expectedY[] = {-0.6, 0.6, 0.8, 0.0};
+    for (int i = 0; i < 4; ++i) {
+        EXPECT_NEAR(expectedX[i], x[i], 1e-12) << i;
+        EXPECT_NEAR(expectedY[i], y[i], 1e-12) << i;
+        EXPECT_EQ(before[i / 2], sidesOf(*ends[i / 2]));
+    }
 
     // Without derivation nothing is written, and no tangent follows.
     state.deriveTangents = false;
@@ -156,36 +145,29 @@ TEST_F(KFSplineTangents, ReadsDirectionsWithoutTouchingTheCurve) {
 // --- Handles ---
 
 TEST_F(KFSplineTangents, HandlesAreConvertedByTheirType) {
-    struct Case {
-        std::uint32_t type;
-        bool parametric;
-        double tangentOfHandle;
-    };
-    Case const cases[] = {{kKFInterpolationBezier, false, 1.0 / 12.0},
-                          {kKFInterpolationBezier, true, 3.0},
-                          {kKFInterpolationCatmullRom, false, 1.0},
-                          {kKFInterpolationCatmullRom, true, 1.0}};
-    for (Case const& it : cases) {
-        SCOPED_TRACE(testing::Message() << "type " << it.type << (it.parametric ? ", parametric" : ""));
-        state.parametric = it.parametric;
+    for (auto const& [type, parametric, factor] : {std::tuple{kKFInterpolationBezier, false, 1.0 / 12.0},
+                                                   {kKFInterpolationBezier, true, 3.0},
+                                                   {kKFInterpolationCatmullRom, false, 1.0},
+                                                   {kKFInterpolationCatmullRom, true, 1.0}}) {
+        SCOPED_TRACE(testing::Message() << "type " << type << (parametric ? ", parametric" : ""));
+        state.parametric = parametric;
         spline.deleteAllVertices();
         KFVertex* const vertex = add(0, 0.0);
-        vertex->setInterpolation(it.type);
+        vertex->setInterpolation(type);
         vertex->setFlag(kKFVertexFlagCrossedNeighbour);
-        double u = 0.0;
-        double v = 0.0;
         EXPECT_TRUE(spline.setVertexInputHandles(vertex, -1.5, 6.0, kTempusZero, true));
         EXPECT_EQ(vertex->getFlags(), kKFVertexFlagHandlesEdited);
-        expectNear({-1.5 * it.tangentOfHandle, 6.0 * it.tangentOfHandle}, inputOf(vertex));
-        EXPECT_TRUE(spline.getVertexInputHandles(vertex, &u, nullptr, kTempusZero, true));
-        EXPECT_TRUE(spline.getVertexInputHandles(vertex, nullptr, &v, kTempusZero, true));
-        expectNear({-1.5, 6.0}, {u, v});
         vertex->setFlags(kKFVertexFlagCrossedNeighbour);
         EXPECT_TRUE(spline.setVertexOutputHandles(vertex, 2.0, -4.0, kTempusZero, true));
         EXPECT_EQ(vertex->getFlags(), kKFVertexFlagHandlesEdited);
-        expectNear({2.0 * it.tangentOfHandle, -4.0 * it.tangentOfHandle}, outputOf(vertex));
+        expectSides(vertex, {-1.5 * factor, 6.0 * factor, 2.0 * factor, -4.0 * factor});
+        double u = 0.0, v = 0.0;
+        EXPECT_TRUE(spline.getVertexInputHandles(vertex, &u, nullptr, kTempusZero, true));
+        EXPECT_TRUE(spline.getVertexInputHandles(vertex, nullptr, &v, kTempusZero, true));
+        EXPECT_NEAR(-1.5, u, 1e-12);
+        EXPECT_NEAR(6.0, v, 1e-12);
         EXPECT_TRUE(spline.getVertexOutputHandles(vertex, &u, &v, kTempusZero, false));
-        expectNear(outputOf(vertex), {u, v});
+        expectSides(vertex, {-1.5 * factor, 6.0 * factor, u, v});
     }
 }
 
@@ -198,7 +180,7 @@ TEST_F(KFSplineTangents, SmoothAndFlatVertices) {
     EXPECT_TRUE(middle->isFlat());
     EXPECT_TRUE(spline.setVertexSmooth(middle, true, kTempusZero));
     EXPECT_EQ(middle->getInterpolation(), kKFInterpolationBezier);
-    EXPECT_NEAR(outputOf(middle)[0], 1.0 / 36.0, 1e-12);
+    EXPECT_NEAR(sidesOf(*middle)[2], 1.0 / 36.0, 1e-12);
 
     EXPECT_FALSE(spline.flattenHandles(nullptr, kTempusZero));
     middle->setFlag(kKFVertexFlagHandlesBroken);
