@@ -148,18 +148,6 @@ TEST(Recording, HoldsTheStartAndTheLastValueAndKeepsTheExtremes) {
     EXPECT_EQ(curve.keypoints(), kOld);
 }
 
-TEST(Recording, MakesTheHeadGuardLinear) {
-    Taken curve;
-    curve.setCurveInterpolation(kKFInterpolationBezier);
-    curve.begin(3, kKFRecordingScopeTouch);
-    curve.end(5);
-    void* guard = nullptr;
-    std::uint32_t type = 0;
-    ASSERT_TRUE(curve.getKeypointHandle(at(2.5), &guard));
-    curve.getKeypointInterpolation(guard, &type, nullptr);
-    EXPECT_EQ(type, static_cast<std::uint32_t>(kKFInterpolationLinear));
-}
-
 TEST(Recording, LeavesTheKeypointsOfATakeThatIsDropped) {
     for (std::uint32_t scope = 0; scope <= 3; ++scope) {
         Taken curve;

@@ -478,29 +478,6 @@ TEST(BXHashWriteStream, TellsNeighboursApart) {
         EXPECT_EQ(hashOf(kNan), hashOf(std::bit_cast<double>(bits))) << "as in a text";
 }
 
-TEST(BXHashWriteStream, TakesEndsWithoutStarts) {
-    BXHashWriteStream plain;
-    BXHashWriteStream withEnds;
-    for (BXHashWriteStream* stream : {&plain, &withEnds}) {
-        auto const maybeEnd = [&] {
-            if (stream == &withEnds) {
-                stream->endElement();
-                stream->endLine();
-            }
-        };
-        maybeEnd();
-        stream->startElement(1);
-        stream->pushScope(kRootScope);
-        maybeEnd(); // of a child that wrote nothing
-        stream->startElement(2);
-        stream->endElement();
-        stream->popScope();
-        stream->endElement();
-        maybeEnd();
-    }
-    EXPECT_EQ(plain.getHash(), withEnds.getHash());
-}
-
 TEST(BXHashWriteStream, DoesNotDependOnHowBytesAreCut) {
     // Asking in between cuts the input elsewhere; strings around the size of its block are what could go
     // wrong.

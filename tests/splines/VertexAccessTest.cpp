@@ -235,7 +235,9 @@ public:
 TEST_F(KFSplineAccessTest, ACustomInterpolatorDrawsWhereItIsActive) {
     add({0.0, 10.0, 20.0});
     curve->setNode(&owner);
-    EXPECT_EQ(curve.at(s(3, 2)), 15.0);
+    for (int i = 0; i < 3; ++i) { // from what is kept of it, too
+        EXPECT_EQ(curve.at(s(3, 2)), 15.0);
+    }
     Custom custom;
     BXSpinLock shared;
     custom.lock = &shared;

@@ -2,7 +2,6 @@
 
 #include "lumenkey/splines/KFBSplineInterpolator.h"
 #include "lumenkey/splines/KFInterpolator.h"
-#include "lumenkey/splines/KFStaticVertex.h"
 #include "tests/splines/museum.h"
 
 #include <gtest/gtest.h>
@@ -134,20 +133,6 @@ TEST(WholeCurves, FollowEditsWhicheverStrategyNoticedThem) {
     double const before = curve.read(u);
     curve->setVertexValue(first, -40.0, kTempusZero);
     EXPECT_EQ(copy.at(u), before);
-}
-
-// The type that all vertices share is kept between reads; it may be written past the spline.
-TEST(WholeCurves, FollowTypesThatAreSetOnAVertexItself) {
-    WholeCurve curve(10, controlsOf(9), false);
-    auto* const last = static_cast<KFVertex*>(curve->getLastVertex());
-    for (int round = 0; round < 2; ++round) {
-        last->setInterpolation(1);
-        EXPECT_EQ(curve.typeOfAll(), kKFInterpolationMixed);
-        last->setInterpolation(10);
-        EXPECT_EQ(curve.typeOfAll(), kKFInterpolationBSpline);
-    }
-    *static_cast<KFStaticVertex*>(curve->getFirstVertex()) = KFStaticVertex(kTempusZero, 1.0);
-    EXPECT_EQ(curve.typeOfAll(), kKFInterpolationMixed);
 }
 
 TEST(KFBSplineInterpolator, IsEqualWithAllControlPointsAndTheSameLastPosition) {
