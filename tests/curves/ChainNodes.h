@@ -53,27 +53,19 @@ public:
     KFCurveNode* cloneNode() const override { return new PassingGain(*this); }
 };
 
-/// Adds noise that is the same for the same seed at the same time: up to `amount`, new every quarter of a second.
-class Wiggle : public ChainNode {
+/// Adds the seconds of the time, times `amount`.
+class AddTime : public ChainNode {
 public:
-    Wiggle(double size, std::uint32_t startOfNoise) : ChainNode('W', size, nullptr), seed(startOfNoise) {}
-    double noise(Tempus const& t) const {
-        auto const step = static_cast<std::uint32_t>(TempusFloorQuotient(t, TempusMake(1, 4)));
-        std::uint32_t const bits = (step ^ seed) * 2654435761U;
-        return amount * ((bits >> 8) / 8388608.0 - 1.0);
+    explicit AddTime(double factor) : ChainNode('A', factor, nullptr) {}
+    double solveNode(Tempus const& t, double, double input) override {
+        return input + amount * TempusGetSeconds(t);
     }
-    double solveNode(Tempus const& t, double, double input) override { return input + noise(t); }
     void solveNode(KFCurveNodeParam& param) override {
-        Tempus t = param.outputStart;
-        for (std::uint32_t i = 0; i < param.outputCount; ++i, t += param.outputStep)
-            param.outputValues[i] = param.inputValues[i] + noise(t);
+        for (std::uint32_t i = 0; i < param.outputCount; ++i)
+            param.outputValues[i] =
+                solveNode(param.outputStart + param.outputStep * i, 0.0, param.inputValues[i]);
     }
-    bool compare(KFCurveNode const* other) const override {
-        return ChainNode::compare(other) && dynamic_cast<Wiggle const*>(other)->seed == seed;
-    }
-    KFCurveNode* cloneNode() const override { return new Wiggle(*this); }
-
-    std::uint32_t seed;
+    KFCurveNode* cloneNode() const override { return new AddTime(*this); }
 };
 
 /// Adds the caller's number.

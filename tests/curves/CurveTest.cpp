@@ -163,12 +163,10 @@ TEST(KFCurve, GivesTheSameAtOneTimeAndInARow) {
         KFCurveNode* node;
         Function value; ///< Behind the node.
     };
-    auto const noise = [](double t) { return Wiggle(3.0, 17).noise(at(t)); };
     std::vector<Step> const chains[] = {
-        {{new Wiggle(3.0, 17), [&](double t) { return ramp(t) + noise(t); }},
-         {new Delay(0.5), [&](double t) { return ramp(t - 0.5) + noise(t - 0.5); }},
-         {new SumOfThree(),
-          [&](double t) { return sums(t - 0.5) + noise(t - 1.5) + noise(t - 0.5) + noise(t + 0.5); }}},
+        {{new AddTime(3.0), [](double t) { return ramp(t) + 3 * t; }},
+         {new Delay(0.5), [](double t) { return ramp(t - 0.5) + 3 * (t - 0.5); }},
+         {new SumOfThree(), [&](double t) { return sums(t - 0.5) + 9 * (t - 0.5); }}},
         {{new Delay(0.5), [](double t) { return ramp(t - 0.5); }},
          {new Gain(2.0), [](double t) { return 2 * ramp(t - 0.5); }},
          {new Delay(0.5), [](double t) { return 2 * ramp(t - 1); }}},

@@ -78,28 +78,16 @@ private:
 
 std::string Twins::edit() {
     expectSame(nullptr, nullptr);
-    int const what = slow.keys.empty() ? pick(2) : pick(12);
-    std::string const names[] = {"add", "addNoTangents", "set", "setNoTangents", "move", "erase", "mark"};
+    std::pair<char const*, std::function<void()>> const edits[] = {
+        {"add", [this] { add(true); }},      {"addNoTangents", [this] { add(false); }},
+        {"set", [this] { relocate(true); }}, {"setNoTangents", [this] { relocate(false); }},
+        {"move", [this] { move(); }},        {"erase", [this] { erase(); }},
+        {"mark", [this] { mark(); }},
+    };
     int const kinds[] = {0, 1, 0, 2, 3, 4, 4, 4, 5, 5, 6, 6};
-    switch (kinds[what]) {
-    case 0:
-    case 1:
-        add(kinds[what] == 0);
-        break;
-    case 2:
-    case 3:
-        relocate(kinds[what] == 2);
-        break;
-    case 4:
-        move();
-        break;
-    case 5:
-        erase();
-        break;
-    default:
-        mark();
-    }
-    return names[kinds[what]];
+    auto const& [name, apply] = edits[kinds[slow.keys.empty() ? pick(2) : pick(12)]];
+    apply();
+    return name;
 }
 
 void Twins::add(bool tangents) {

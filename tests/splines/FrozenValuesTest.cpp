@@ -2,8 +2,7 @@
 // keypoints and not pictures, so a change of any of these is a change of every document that was ever saved:
 // when this test fails the code is at fault and never the table. Rows may be added, and none altered.
 
-#include "lumenkey/splines/KFSpline.h"
-#include "lumenkey/splines/KFStaticVertex.h"
+#include "tests/splines/museum.h"
 
 #include <gtest/gtest.h>
 
@@ -36,39 +35,38 @@ char const* nameOf(Scene scene) {
 
 struct Key {
     Tempus time;
-    double value, bias, inU, inV, outU, outV;
+    double value, bias;
+    Sides sides;
 };
 
 // Times of several timescales, both directions, a handle of every length: U is inverted by each method there
 // is.
 Key const kKeys[] = {
-    {TempusMake(0, 1), 1.5, 0.5, 0.0, 0.0, 0.03125, 0.25},
-    {TempusMake(1001, 1000), -2.25, 1.5, -0.0625, 0.125, 0.0625, -0.5},
-    {TempusMake(5, 2), 7.0, 0.0, -0.046875, 0.25, 0.125, 0.0},
-    {TempusMake(121, 30), 3.125, 1.25, -0.03125, -0.375, 0.015625, 0.0},
-    {TempusMake(5, 1), 3.5, 1.0, -0.02734375, 0.0, 0.02734375, 0.0},
+    {TempusMake(0, 1), 1.5, 0.5, {0.0, 0.0, 0.03125, 0.25}},
+    {TempusMake(1001, 1000), -2.25, 1.5, {-0.0625, 0.125, 0.0625, -0.5}},
+    {TempusMake(5, 2), 7.0, 0.0, {-0.046875, 0.25, 0.125, 0.0}},
+    {TempusMake(121, 30), 3.125, 1.25, {-0.03125, -0.375, 0.015625, 0.0}},
+    {TempusMake(5, 1), 3.5, 1.0, {-0.02734375, 0.0, 0.02734375, 0.0}},
 };
 
 constexpr double kRangeOfValues = 9.25;
 
 double valueNow(FrozenValue const& row) {
-    KFSplineState state;
-    state.deriveTangents = false;
-    state.interpolation = row.type;
-    state.parametric = row.scene == Scene::Parametric || row.scene == Scene::ParametricClosed;
-    KFSpline spline(&state);
-    std::int64_t index = 0;
-    for (Key const& key : kKeys) {
-        Tempus const u = state.parametric ? TempusMake(index++, 1) : key.time;
-        auto& vertex = *static_cast<KFVertex*>(spline.appendVertexNoTangents(u, key.value, kTempusZero));
-        double const longer = row.scene == Scene::Folding ? 3.0 : 1.0;
-        vertex.setBias(key.bias, kTempusZero);
-        vertex.setInputTangents(longer * key.inU, longer * key.inV, kTempusZero);
-        vertex.setOutputTangents(longer * key.outU, longer * key.outV, kTempusZero);
+    MuseumSpline curve;
+    curve.state->interpolation = row.type;
+    curve.state->parametric = row.scene == Scene::Parametric || row.scene == Scene::ParametricClosed;
+    for (std::int64_t index = 0; Key const& key : kKeys) {
+        Tempus const u = curve.state->parametric ? TempusMake(index++, 1) : key.time;
+        KFVertex* const vertex = curve.append(u, key.value, row.type);
+        Sides sides = key.sides;
+        for (double& side : sides) {
+            side *= row.scene == Scene::Folding ? 3.0 : 1.0;
+        }
+        vertex->setBias(key.bias, kTempusZero);
+        setSides(*vertex, sides);
     }
-    if (row.scene == Scene::Closed || row.scene == Scene::ParametricClosed)
-        spline.setClosed(true, nullptr);
-    return spline.getVertexValue(TempusMake(row.value, row.timescale), kTempusZero, true);
+    curve->setClosed(row.scene == Scene::Closed || row.scene == Scene::ParametricClosed, nullptr);
+    return curve.at(TempusMake(row.value, row.timescale));
 }
 
 /// What the mathematical functions of the platform may decide. The types that are products and sums are
