@@ -119,45 +119,13 @@ constexpr std::string_view kDeclaration = "<?xml version=\"1.0\" encoding=\"UTF-
 
 // Writing ---------------------------------------------------------------------------------------------------
 
-TEST(BXXMLWriteStream, WritesLinesAndAttributesInOrder) {
-    std::string const text = written([](BXXMLWriteStream& stream) {
-        stream.startElement(1);
-        stream.writeAttribute(12, std::uint32_t{7});
-        stream.writeAttribute(11, BXString("a \"b\"\n"));
-        stream.pushScope(kInnerScope);
-        stream.startElement(4);
-        stream.popScope(); // an element keeps its name
-        stream.startElement(2);
-        stream.writeValue(BXString("<x>\n"));
-        stream.endElement();
-        stream.startElement(2);
-        stream.writeAttribute(11, TempusMake(1, 24));
-        stream.writeValue(BXString());
-        stream.endElement();
-        stream.endElement();
-        stream.endLine();
-        stream.pushScope(kInnerScope);
-        stream.startElement(3); // the name of the inner scope
-        stream.writeValue(true);
-        stream.endElement();
-        stream.popScope();
-        stream.endElement();
-    });
-    EXPECT_EQ(text, std::string(kDeclaration) + "<kfml version=\"5.13\">\n"
-                                                "  <group id=\"7\" name=\"a &quot;b&quot;&#10;\">\n"
-                                                "    <deep>\n"
-                                                "      <leaf>&lt;x&gt;\n</leaf>\n"
-                                                "      <leaf name=\"1/24\"/>\n"
-                                                "    </deep>\n"
-                                                "    <leaf>1</leaf>\n"
-                                                "  </group>\n"
-                                                "</kfml>\n");
+TEST(BXXMLWriteStream, IndentsHoweverDeep) {
     std::string const deep = written([](BXXMLWriteStream& stream) {
-        for (int i = 0; i < 40; ++i) {
+        for (int i = 0; i < 200; ++i) {
             stream.startElement(2);
         }
     });
-    EXPECT_NE(deep.find("\n" + std::string(80, ' ') + "<leaf/>\n" + std::string(78, ' ') + "</leaf>\n"),
+    EXPECT_NE(deep.find("\n" + std::string(400, ' ') + "<leaf/>\n" + std::string(398, ' ') + "</leaf>\n"),
               std::string::npos);
     EXPECT_EQ(written([](BXXMLWriteStream&) {}), std::string(kDeclaration) + "<kfml version=\"5.13\"/>\n");
 }
@@ -270,19 +238,6 @@ TEST(BXXMLReadStream, EndsHandlersAndScopesWithTheirElement) {
     EXPECT_EQ(reading("<group><leaf/></group>",
                       [](BXSerializerReadStream&, BXStreamElement& element) { return element.tag() == 1; }),
               "( 1 2'' ) 1:15: a handler refused an element");
-}
-
-TEST(BXXMLReadStream, PassesOverWhatIsSkipped) {
-    std::string const document =
-        "<kfml><group><group><leaf/></group></group><leaf>a</leaf><leaf>b</leaf></kfml>";
-    EXPECT_EQ(reading(document,
-                      [](BXSerializerReadStream& stream, BXStreamElement& element) {
-                          if (element.tag() != 91) {
-                              stream.skipElement(); // at the end of a leaf there is nothing left to skip
-                          }
-                          return true;
-                      }),
-              "( 91 1 2'a' 2'b' ) ");
 }
 
 TEST(BXXMLReadStream, FindsAttributesByTheScopesOfTheMoment) {
