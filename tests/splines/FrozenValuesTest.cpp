@@ -57,7 +57,8 @@ double valueNow(FrozenValue const& row) {
     curve.state->parametric = row.scene == Scene::Parametric || row.scene == Scene::ParametricClosed;
     for (std::int64_t index = 0; Key const& key : kKeys) {
         Tempus const u = curve.state->parametric ? TempusMake(index++, 1) : key.time;
-        KFVertex* const vertex = curve.append(u, key.value, row.type);
+        // Which takes its type from the state, or from the vertex in front of it.
+        auto* const vertex = static_cast<KFVertex*>(curve->appendVertexNoTangents(u, key.value, kTempusZero));
         Sides sides = key.sides;
         for (double& side : sides) {
             side *= row.scene == Scene::Folding ? 3.0 : 1.0;
