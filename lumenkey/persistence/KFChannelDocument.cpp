@@ -52,7 +52,12 @@ void KFChannel::writeHeader(BXSerializerWriteStream& stream, bool full) {
     writeFlags(stream, kWriteFlagsAsAttribute);
     if (!stream.isHashStream())
         stream.writeAttribute(kDefaultAttribute, getDefaultValue());
-    stream.writeAttribute(kValueAttribute, curve().getRootNode()->getInitialValue());
+    double const stored = curve().getRootNode()->getInitialValue();
+    stream.writeAttribute(kValueAttribute, stored);
+    // Limits don't stand in this form, but a digest tells what they let be seen.
+    double seen = stored;
+    if (stream.isHashStream() && curve().getCurveInitialValue(&seen) && seen != stored)
+        stream.writeAttribute(kValueAttribute, seen);
     stream.popScope();
 }
 

@@ -180,11 +180,11 @@ void KFCurve::writeKeypoints(BXSerializerWriteStream& stream) {
         KFWriteElement(stream, kPreExtrapolationElement, mode);
     if (std::uint32_t const mode = settings().postExtrapolation; mode != 0)
         KFWriteElement(stream, kPostExtrapolationElement, mode);
+    if (spline == nullptr)
+        return; // and nothing that is closed, which a reader couldn't make
     bool closed = false;
     if (isClosedCurve(&closed) && closed)
         KFWriteElement(stream, kClosedElement, true);
-    if (spline == nullptr)
-        return;
     auto const writeAll = [&](std::span<KeypointRecord> room) {
         KeypointReader reader(*spline, room);
         bool const derives = isCurveDeriveTangents();

@@ -70,6 +70,11 @@ TEST(Digest, TellsEachChangeOfState) {
         [](Subject& x) { x.channel.setFadeInCurve(1); },
         [](Subject& x) { x.channel.setFadeOutCurve(1); },
         [](Subject& x) { x.plain.setInitialValue(1, true); },
+        // Seen through limits, which the short form hasn't.
+        [](Subject& x) {
+            x.plain.setInitialValue(1, true);
+            x.plain.createLocalChannelImplementation()->getCurve()->setAbsoluteMaxValueV(0.5);
+        },
         [](Subject& x) { x.curve->setCurveInitialValue(1); },
         [](Subject& x) { x.curve->setCurveType(0); },
         [](Subject& x) { x.curve->setCurveParametric(true); },

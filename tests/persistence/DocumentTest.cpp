@@ -159,6 +159,52 @@ TEST(Document, WritesOfAChannelWhatIsNotAsUsual) {
              curve.setAbsoluteMinValueV(5);
              curve.setAbsoluteMaxValueV(3);
          }},
+        {R"(>
+    <curve type="1" default="0" value="0" parametric="1" round="0" retimingExtrapolation="1">
+      <numberOfKeypoints>1</numberOfKeypoints>
+      <min>-5</min>
+      <max>5</max>
+      <preExtrapolation>3</preExtrapolation>
+      <postExtrapolation>2</postExtrapolation>
+      <closed>1</closed>
+      <keypoint interpolation="1" enabled="0" flags="17">
+        <time>600/600</time>
+        <value>2</value>
+        <bias>0.5</bias>
+        <normal>3</normal>
+      </keypoint>
+    </curve>
+  </parameter>
+)",
+         [](auto&, KFCurve& curve) {
+             curve.appendKeypointNoTangents(s(1), 2.0, true);
+             void* const handle = curve.getSpline()->getLastVertex();
+             curve.setKeypointInterpolation(handle, 1, true);
+             curve.setKeypointBiasLinear(handle, 0.5);
+             curve.setKeypointNormal(handle, 3, true);
+             curve.setKeypointFlags(handle, 17, true);
+             curve.enableKeypoint(handle, false, true);
+             curve.closeCurve();
+             curve.setCurveParametric(true);
+             curve.setRoundingInUSpace(false);
+             curve.setRetimingExtrapolation(true);
+             curve.setAbsoluteMinValueV(-5);
+             curve.setAbsoluteMaxValueV(5);
+             curve.setCurveExtrapolation(3, 1);
+             curve.setCurveExtrapolation(2, 0);
+         }},
+        // Nothing of keypoints that aren't seen, nor that they are closed.
+        {R"(>
+    <fadeOutOffset>1200/600</fadeOutOffset>
+    <curve type="0" default="0" value="2"/>
+  </parameter>
+)",
+         [](KFChannelDouble& channel, KFCurve& curve) {
+             channel.setFadeOutOffset(s(2), false);
+             curve.appendKeypointNoTangents(s(1), 2.0, true);
+             curve.closeCurve();
+             curve.setCurveType(0);
+         }},
         // Handles are twelve times what is stored; both parts of one, and only where tangents count.
         {keyed("", outputHandle), [&](auto&, KFCurve& curve) { bend(curve, 4, true); }},
         {keyed("", ""), [&](auto&, KFCurve& curve) { bend(curve, 4, false); }},
