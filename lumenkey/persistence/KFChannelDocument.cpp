@@ -5,6 +5,9 @@
 #include "lumenkey/curves/KFCurve.h"
 #include "lumenkey/persistence/KFDocumentElements.h"
 
+#include <algorithm>
+#include <limits>
+
 namespace {
 
 constexpr std::uint32_t kFadeShapes = 4;
@@ -32,6 +35,18 @@ void writeFades(BXSerializerWriteStream& stream, KFFadeBlock const& fades) {
         KFWriteElement(stream, kFadeOutCurveElement, fades.fadeOutCurve);
 }
 
+/// Limits don't stand in the short form, but a digest tells what they let be seen. It is blind for what no
+/// document tells: limits of boolean curves, and whether one is infinite or the greatest number.
+void writeSeenValue(BXSerializerWriteStream& stream, KFCurve& curve, double stored) {
+    constexpr double greatest = std::numeric_limits<double>::max();
+    double seen = stored;
+    if (curve.isCurveBoolean() || !curve.getCurveInitialValue(&seen))
+        return;
+    seen = std::clamp(seen, -greatest, greatest);
+    if (seen != stored)
+        stream.writeAttribute(kValueAttribute, seen);
+}
+
 } // namespace
 
 bool KFChannel::isLeftOutOf(BXSerializerWriteStream const& stream) const {
@@ -54,10 +69,8 @@ void KFChannel::writeHeader(BXSerializerWriteStream& stream, bool full) {
         stream.writeAttribute(kDefaultAttribute, getDefaultValue());
     double const stored = curve().getRootNode()->getInitialValue();
     stream.writeAttribute(kValueAttribute, stored);
-    // Limits don't stand in this form, but a digest tells what they let be seen.
-    double seen = stored;
-    if (stream.isHashStream() && curve().getCurveInitialValue(&seen) && seen != stored)
-        stream.writeAttribute(kValueAttribute, seen);
+    if (stream.isHashStream())
+        writeSeenValue(stream, curve(), stored);
     stream.popScope();
 }
 
