@@ -106,6 +106,9 @@ TEST_F(AuthorVerbsTest, RefusesWhatChannelsDoNotTake) {
     expectRefused({"add", "Body", "3D", "P", "--value", "1"}, "none or several");
     expectRefused({"add", "Body", "Percent", "P", "--value", "50"}, "values from 0 to 1");
     expectRefused({"add", "Body", "Progress", "P"}, "documents leave out");
+    std::string const completion = outputOf({"completion", "bash"});
+    EXPECT_NE(completion.find(" Percent "), std::string::npos);
+    EXPECT_EQ(completion.find(" Progress "), std::string::npos) << "it is offered";
     expectRefused({"set", "Height", "--value", "1"}, "say which with --at");
     expectRefused({"set", "Height", "--at", "1/3", "--delete"}, "has no keypoint at 1/3 s");
     expectRefused({"set", "Height", "--at", "0", "--value", "1", "--interpolation", "wavy"},
@@ -258,9 +261,9 @@ TEST_F(AuthorVerbsTest, DiffSeesPeaksOfAMomentOrderAndNames) {
     std::string const added = "<parameter name=\"New\" id=\"3\" factoryID=\"3\"/>";
     std::string const before =
         _folder.write("1.lumen", documentOf("<parameter name=\"A\">" + x + y + "</parameter>"));
-    std::string const after =
-        _folder.write("2.lumen", documentOf("<parameter name=\"B\">" + added + y + x + "</parameter>"));
-    EXPECT_EQ(outputOf({"diff", before, after}, 1), "changed ./: name A became B\n"
+    std::string const after = _folder.write(
+        "2.lumen", documentOf("<parameter name=\"\u009B\u202EB\">" + added + y + x + "</parameter>"));
+    EXPECT_EQ(outputOf({"diff", before, after}, 1), "changed ./: name A became \\xc2\\x9b\\xe2\\x80\\xaeB\n"
                                                     "added   New\n"
                                                     "changed Y: place among its siblings 2 became 1\n"
                                                     "changed X: place among its siblings 1 became 2\n");

@@ -118,8 +118,8 @@ TEST_F(CheckVerbTest, FindsWhatIsOddWithItsPlace) {
         {"<parameter id=\"1\" factoryID=\"3\" default=\"1\" value=\"2\" flags=\"6\">\n<flags>4160</flags>\n"
          "<fadeInOffset>-1/2</fadeInOffset><fadeOutOffset>indefinite</fadeOutOffset>\n"
          "<curve type=\"1\" default=\"1.0\" value=\"3\">\n<max>inf</max></curve></parameter>",
-         "4:1: 'flags' is 6, but the flags of the channel become 0\n"
-         "5:1: 'flags' is 4160, but the flags of the channel become 0\n"
+         "4:1: 'flags' is 6, but the flags of the channel become 16\n"
+         "5:1: 'flags' is 4160, but the flags of the channel become 16\n"
          "6:1: the fade is below 0: it counts as 0\n"
          "7:1: the attribute 'value' is 3, which takes the place of that of the channel, 2\n"
          "8:1: 'max' is inf, which isn't kept: it becomes that of the class, 1.7976931348623157e+308\n"},
@@ -175,9 +175,14 @@ TEST_F(CheckVerbTest, FindsWhatIsOddWithItsPlace) {
     for (auto const& each : cases) {
         EXPECT_EQ(findingsIn(documentOf("\n" + std::string(each.body))), each.findings);
     }
-    EXPECT_EQ(findingsIn("<kfml/>"), "1:1: the document holds no channel\n");
+    EXPECT_EQ(findingsIn("<kfml version=\"5.13\"/>"), "1:1: the document holds no channel\n");
     EXPECT_EQ(findingsIn("<kfml version=\"abc\"><parameter/></kfml>"),
-              "1:1: 'abc' is no version, such as 5.13\n");
+              "1:1: 'abc' is no version, such as 5.13: it is read as 5.13\n");
+    EXPECT_EQ(findingsIn("<kfml><parameter/></kfml>"),
+              "1:1: the document says no version: it is read as 5.13\n");
+    EXPECT_EQ(findingsIn("<kfml version=\"1.9\"><parameter/></kfml>"),
+              "1:1: the version 1.9 is older than 2.0: it is read as those of versions 2 to 4, with times in "
+              "frames\n");
     EXPECT_EQ(findingsIn("<kfml version=\"99.1\"><parameter/></kfml>"),
               "1:1: the version 99.1 is newer than 5.13\n");
     EXPECT_EQ(findingsIn("<!DOCTYPE kfml><kfml/>"), "1:15: a document type declaration, which is refused\n");
@@ -197,6 +202,59 @@ TEST_F(CheckVerbTest, FindsWhatIsOddWithItsPlace) {
     std::string const old = contentOf(LUMENKEY_TEST_SOURCE_DIR "/tests/persistence/data/version4.lumen");
     EXPECT_EQ(findingsIn(samples::replaced(old, "\"4.1\"", "\" 4.1\"")), "");
     EXPECT_EQ(jsonOf({"info", _folder.file("f.lumen")})["version"], "4.1");
+}
+
+TEST_F(CheckVerbTest, TellsWhatBecomesOfChannelsAsAWhole) {
+    struct {
+        char const* body;
+        char const* findings;
+    } const cases[] = {
+        // An object root that is locked locks the values below it, but for what is hidden, and no folders.
+        {"<parameter id=\"1\">\n<parameter name=\"A\" id=\"1\" factoryID=\"3\"/><locked>1</locked>\n"
+         "<parameter name=\"F\" id=\"2\" factoryID=\"1\"><parameter name=\"B\" id=\"1\" factoryID=\"3\">\n"
+         "<flags>16</flags></parameter></parameter><parameter name=\"C\" id=\"3\" factoryID=\"3\">"
+         "<flags>20</flags></parameter><parameter name=\"H\" id=\"4\" factoryID=\"1\"><flags>4114</flags>"
+         "<parameter name=\"D\" id=\"1\" factoryID=\"3\"/></parameter>\n"
+         "<parameter name=\"P\" id=\"5\" factoryID=\"5\"><parameter name=\"X\" "
+         "id=\"1\"/></parameter></parameter>",
+         "5:1: the channel isn't locked: the object root above it locks it\n"
+         "7:1: the channel isn't locked: the object root above it locks it\n"
+         "8:42: the channel isn't locked: the object root above it locks it\n"},
+        // A folder that is locked locks nothing below it. Of no flags nothing is written.
+        {"<parameter id=\"1\" factoryID=\"1\"><flags>4116</flags><parameter name=\"F\" id=\"1\" "
+         "factoryID=\"1\">"
+         "\n<foldFlags>16777216</foldFlags>\n<parameter name=\"A\" id=\"1\" factoryID=\"3\"><flags>24</flags>"
+         "</parameter></parameter>\n<parameter name=\"P\" id=\"2\" factoryID=\"4\"/>\n"
+         "<parameter name=\"Z\" id=\"3\" factoryID=\"3\"><flags>0</flags></parameter>"
+         "<parameter name=\"Y\" id=\"4\" factoryID=\"3\" flags=\"0\"/></parameter>",
+         "5:1: 'foldFlags' is 16777216, by which documents leave out the channels of the folder\n"
+         "6:42: documents leave out the channel 'F.A'\n"
+         "7:1: documents leave out the channel 'P'\n"
+         "8:42: 'flags' is 0, but the flags of the channel become 16\n"},
+        {"<parameter id=\"1\" factoryID=\"3\"><flags>24</flags></parameter>", ""},
+        {"<parameter id=\"1\" factoryID=\"5\">\n<parameter name=\"E\" id=\"9\" factoryID=\"3\"/>\n"
+         "<parameter name=\"Y\" id=\"2\"/>\n<parameter name=\"X\" id=\"1\"/></parameter>",
+         "5:1: the channel 'E' is put behind 'X', which its folder has in front of it\n"},
+        {"<parameter id=\"1\" factoryID=\"5\"><parameter name=\"Y\" id=\"2\"/>"
+         "<parameter name=\"E\" id=\"9\" factoryID=\"3\"/></parameter>",
+         ""},
+    };
+    std::string const rewritten = _folder.file("rewritten.lumen");
+    for (auto const& each : cases) {
+        EXPECT_EQ(findingsIn(documentOf("\n" + std::string(each.body))), each.findings);
+        outputOf({"upgrade", _folder.file("f.lumen"), "-o", rewritten, "--force"});
+        EXPECT_EQ(outputOf({"check", rewritten}), "") << contentOf(rewritten);
+    }
+    // A lock by an attribute reaches them when the rewritten document is read.
+    EXPECT_EQ(findingsIn(documentOf("\n<parameter id=\"1\" flags=\"4\">\n<parameter id=\"1\" "
+                                    "factoryID=\"3\"/></parameter>")),
+              "5:1: the channel isn't locked: the object root above it locks it\n");
+    // The order is no loss, and what is put behind stays of its class.
+    std::string const odd = _folder.write(
+        "f.lumen", documentOf("<parameter id=\"1\" factoryID=\"5\"><parameter name=\"E\" id=\"9\" "
+                              "factoryID=\"3\"/><parameter name=\"X\" id=\"1\"/></parameter>"));
+    outputOf({"upgrade", odd, "-o", rewritten});
+    EXPECT_EQ(outputOf({"diff", odd, rewritten}), "");
 }
 
 TEST_F(CheckVerbTest, EndsAtAnEndlessTag) {
@@ -237,11 +295,12 @@ TEST_F(CheckVerbTest, ChecksManyFilesInTheirOrder) {
         bool const isFaulty = i % 4 == 0;
         std::string const sound(samples::kSmallMotion);
         std::string const motion = isFaulty ? samples::replaced(sound, "91.5", "high") : sound;
-        std::string const document = isFaulty ? "<kfml>" : "<kfml><parameter/></kfml>";
+        std::string const document =
+            isFaulty ? "<kfml version=\"5.13\">" : "<kfml version=\"5.13\"><parameter/></kfml>";
         arguments.push_back(_folder.write(name, i % 3 == 0 ? motion : document));
         if (isFaulty) {
             expected += arguments.back() +
-                        (i % 3 == 0 ? ":20:3: 'high' is not a number\n" : ":1:7: no element found\n");
+                        (i % 3 == 0 ? ":20:3: 'high' is not a number\n" : ":1:22: no element found\n");
         }
     }
     Outcome const outcome = runLumenkey(arguments);

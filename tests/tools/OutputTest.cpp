@@ -44,6 +44,15 @@ TEST(TextForms, WritesTimesInLowestTerms) {
     EXPECT_EQ(timeText(kTempusInvalid), "invalid");
 }
 
+TEST(TextForms, ShowsWhatTerminalsActOn) {
+    EXPECT_EQ(printableText("\x1b\x7f\u0080\u009F|\u061C\u200E\u200F\u2028\u202E\u2066\u2069"),
+              "\\x1b\\x7f\\xc2\\x80\\xc2\\x9f|\\xd8\\x9c\\xe2\\x80\\x8e\\xe2\\x80\\x8f\\xe2\\x80\\xa8"
+              "\\xe2\\x80\\xae\\xe2\\x81\\xa6\\xe2\\x81\\xa9");
+    // Their neighbours, and what is cut.
+    std::string const shown = "\u00A0\u061B\u061D\u200D\u2010\u2027\u202F\u2065\u206A\xE2\x80";
+    EXPECT_EQ(printableText(shown), shown);
+}
+
 TEST(Table, AlignsColumnsByCharacters) {
     std::string const cells[2][2] = {{"H\u00FCfte", "1.5"}, {"a\tb", "-10.25"}};
     Table table;

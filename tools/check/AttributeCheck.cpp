@@ -1,6 +1,7 @@
 #include "tools/check/AttributeCheck.h"
 
 #include "lumenkey/Channels/KFChannel.h"
+#include "lumenkey/persistence/KFDocumentVersion.h"
 #include "tools/check/ClassExamples.h"
 #include "tools/check/DocumentVocabulary.h"
 #include "tools/import/DocumentFile.h"
@@ -14,6 +15,9 @@
 namespace lumenkey::tools {
 
 namespace {
+
+/// Documents of older versions aren't known.
+constexpr std::uint32_t kFirstMajor = 2;
 
 std::string faultOfText(DocumentWord const& attribute, std::string_view text, CurveLimits const& limits,
                         bool countsFrames) {
@@ -29,14 +33,26 @@ std::string faultOfText(DocumentWord const& attribute, std::string_view text, Cu
     return attribute.text == TextKind::Number ? faultOfNumber(text, limits) : "";
 }
 
-std::string faultOfVersion(std::string_view text) {
+std::string faultOfVersion(std::optional<std::string_view> given) {
+    std::uint32_t readMajor = kWrittenMajor;
+    std::uint32_t readMinor = kWrittenMinor;
+    std::string_view const text = given.value_or("");
+    KFReadVersion(text, readMajor, readMinor);
+    std::string const readAs = "it is read as " + std::to_string(readMajor) + "." + std::to_string(readMinor);
+    if (!given) {
+        return "the document says no version: " + readAs;
+    }
     std::size_t const point = text.find('.');
     std::optional<std::uint64_t> const major = readWhole(text.substr(0, point));
     std::optional<std::uint64_t> const minor =
         point == std::string_view::npos ? std::nullopt : readWhole(text.substr(point + 1));
     std::string const written = std::to_string(kWrittenMajor) + "." + std::to_string(kWrittenMinor);
     if (!major || !minor) {
-        return "'" + std::string(text) + "' is no version, such as " + written;
+        return "'" + std::string(text) + "' is no version, such as " + written + ": " + readAs;
+    }
+    if (*major < kFirstMajor) {
+        return "the version " + std::string(text) + " is older than " + std::to_string(kFirstMajor) +
+               ".0: it is read as those of versions 2 to 4, with times in frames";
     }
     bool const isNewer =
         std::pair(*major, *minor) > std::pair<std::uint64_t, std::uint64_t>(kWrittenMajor, kWrittenMinor);
@@ -74,9 +90,11 @@ std::vector<Fault> faultsOfAttributes(std::string_view element, Attributes const
         bool const isKept = attribute.text == TextKind::Number && readNumberOrNan(found->second);
         faults.push_back({faultOfText(attribute, found->second, limits, countsFrames), isKept});
     }
-    if (auto const version = attributes.find("version");
-        (element == "kfml" || element == "kfdoc") && version != attributes.end()) {
-        faults.push_back({faultOfVersion(version->second), true});
+    if (element == "kfml" || element == "kfdoc") {
+        auto const version = attributes.find("version");
+        faults.push_back(
+            {faultOfVersion(version == attributes.end() ? std::nullopt : std::optional(version->second)),
+             true});
     }
     return faults;
 }

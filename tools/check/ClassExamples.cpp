@@ -5,6 +5,8 @@
 #include "tools/check/DocumentVocabulary.h"
 #include "tools/tree/ChannelClass.h"
 
+#include <algorithm>
+
 namespace lumenkey::tools {
 
 unsigned ownersOf(KFFactory& factory) {
@@ -25,9 +27,18 @@ KFChannelBase* ClassExamples::of(KFFactory* factory) {
     return place->second.get();
 }
 
-KFChannelBase const* ClassExamples::componentOf(KFFactory* factory, std::uint64_t id) {
+KFChannelBase* ClassExamples::componentOf(KFFactory* factory, std::uint64_t id) {
     auto const* const folder = dynamic_cast<KFChannelFolder const*>(of(factory));
     return folder == nullptr ? nullptr : folder->getDescendant(static_cast<unsigned>(id));
+}
+
+std::optional<std::size_t> ClassExamples::placeOf(KFFactory* factory, std::uint64_t id) {
+    auto const* const folder = dynamic_cast<KFChannelFolder const*>(of(factory));
+    if (folder == nullptr || folder->getNumberOfDescendants() == 0) {
+        return std::nullopt;
+    }
+    auto const& components = *folder->getDescendants();
+    return std::find(components.begin(), components.end(), componentOf(factory, id)) - components.begin();
 }
 
 } // namespace lumenkey::tools

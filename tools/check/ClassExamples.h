@@ -6,6 +6,7 @@
 #include <cstdint>
 #include <map>
 #include <memory>
+#include <optional>
 
 namespace lumenkey::tools {
 
@@ -18,7 +19,10 @@ public:
     /// It lives as long as this; null for a class that makes none, and for null.
     KFChannelBase* of(KFFactory* factory);
     /// The child with that ID which a class makes for itself; null for none.
-    KFChannelBase const* componentOf(KFFactory* factory, std::uint64_t id);
+    KFChannelBase* componentOf(KFFactory* factory, std::uint64_t id);
+    /// The place of the child with that ID among those, behind which all others stand; nothing for a class that
+    /// makes none.
+    std::optional<std::size_t> placeOf(KFFactory* factory, std::uint64_t id);
 
 private:
     std::map<KFFactory*, std::unique_ptr<KFChannelBase>> _examples;

@@ -3,6 +3,7 @@
 #include "lumenkey/foundation/BXDocumentReader.h"
 #include "lumenkey/persistence/KFDocumentVersion.h"
 #include "tools/check/AttributeCheck.h"
+#include "tools/check/ChannelCheck.h"
 #include "tools/check/CurveCheck.h"
 #include "tools/check/DocumentClasses.h"
 #include "tools/check/DocumentVocabulary.h"
@@ -97,10 +98,10 @@ private:
         } else if (element.name == "parameter") {
             return isSoundChannel(element, attributes);
         } else if (element.name == "curve") {
-            element.curveClass = curveClassOf(_classes.of(_open.back().factory));
+            element.curveClass = curveClassOf(_open.back().example);
             element.limits = element.curveClass.limits;
         } else if (element.name == "timing" && !_countsFrames) {
-            _findings.take(element.place, faultOfTiming(*_classes.of(_open.back().factory), attributes));
+            _findings.take(element.place, faultOfTiming(*_open.back().example, attributes));
         } else if (element.name == "keypoint") {
             element.keypoint.emplace(attributes, _open.back().curveClass, _countsFrames);
             _findings.take({element.place, faultOfInterpolation(attributes),
@@ -111,11 +112,11 @@ private:
 
     void checkAttributes(OpenElement const& element, Attributes const& attributes) {
         CurveLimits const limits =
-            element.name == "parameter" ? curveClassOf(_classes.of(element.factory)).limits : element.limits;
+            element.name == "parameter" ? curveClassOf(element.example).limits : element.limits;
         _findings.take(element.place,
                        faultsOfAttributes(element.name, attributes, limits, element.factory, _countsFrames));
         if (element.name == "parameter" && _open.back().factory != nullptr) {
-            _findings.take(element.place, faultsOfNearValues(attributes, _classes.of(element.factory)));
+            _findings.take(element.place, faultsOfNearValues(attributes, element.example));
         }
     }
 
@@ -129,11 +130,12 @@ private:
                            "a second channel: a document holds one, with all others inside it");
             return false;
         }
+        KFChannelBase* const component = _classes.componentOf(above.factory, id);
         if (auto const before = above.children.find(id); before != above.children.end()) {
             _findings.lost(element.place, name + " has the ID " + std::to_string(id) +
                                               " of one before it: it is read into that one");
             element.factory = before->second;
-        } else if (KFChannelBase const* const component = _classes.componentOf(above.factory, id)) {
+        } else if (component != nullptr) {
             element.factory = component->getFactory();
             _findings.lost(element.place, _classes.faultOfComponent(*component, attributes));
         } else if (std::string const fault = _classes.faultOfClass(attributes, isTop, &element.factory);
@@ -141,8 +143,12 @@ private:
             _findings.lost(element.place, name + fault + ": it is passed over");
             return false;
         }
-        above.children[id] = element.factory;
-        element.flags.emplace(*_classes.of(element.factory));
+        element.example = component != nullptr ? component : _classes.of(element.factory);
+        std::optional<std::size_t> const rank = _classes.placeOf(above.factory, id);
+        if (above.children.insert_or_assign(id, element.factory).second && rank) {
+            above.folder.addRanked(element.place, nameOfChannel(element, attributes), *rank);
+        }
+        element.flags.emplace(*element.example, element.place);
         if (std::optional<std::uint64_t> const flags = readWhole(attributeOf(attributes, "flags"))) {
             element.flags->readAttribute(element.place, *flags);
         }
@@ -173,7 +179,7 @@ private:
             --_skipped;
             return;
         }
-        OpenElement const element = std::move(_open.back());
+        OpenElement element = std::move(_open.back());
         _open.pop_back();
         OpenElement& above = _open.back();
         above.isInStrayText = false;
@@ -194,7 +200,7 @@ private:
         }
     }
 
-    void endReadable(OpenElement const& element) {
+    void endReadable(OpenElement& element) {
         if (isBeyond(*element.word, element.text)) {
             // Curves keep such numbers as far as they have room for them; how many keypoints are promised
             // doesn't matter.
@@ -212,7 +218,7 @@ private:
         } else if (element.name == "curve") {
             endCurve(element);
         } else if (element.name == "parameter") {
-            _findings.take(element.flags->faultsAtEnd());
+            endChannel(element, _open, _findings);
         } else if (element.word->parent == "parameter") {
             endPartOfChannel(element);
         }
@@ -222,7 +228,9 @@ private:
         OpenElement& channel = _open.back();
         channel.flags->readElement(element.place, element.name, element.text);
         if (element.name == "foldFlags") {
-            _findings.take(element.place, faultOfFoldFlags(*_classes.of(channel.factory), element.text));
+            channel.folder.readFoldFlags(element.place,
+                                         static_cast<std::uint32_t>(readWhole(element.text).value_or(0)));
+            _findings.take(element.place, faultOfFoldFlags(*channel.example, element.text));
         } else if (element.word->text == TextKind::Length && *readTime(element.text) < kTempusZero) {
             _findings.lost(element.place, "the fade is below 0: it counts as 0");
         }

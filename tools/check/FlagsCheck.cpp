@@ -21,7 +21,8 @@ std::string saying(std::string_view name, std::string const& text) {
 
 } // namespace
 
-FlagsCheck::FlagsCheck(KFChannelBase const& example) : _flags(example.getFlags()) {}
+FlagsCheck::FlagsCheck(KFChannelBase const& example, TextPlace const& place)
+    : _place(place), _own(example.getFlags()), _flags(_own) {}
 
 void FlagsCheck::add(TextPlace const& place, std::string_view name, KFChannelFlags number, KFChannelFlags set,
                      KFChannelFlags clear) {
@@ -62,8 +63,19 @@ void FlagsCheck::readBaseFlags(TextPlace const& place, KFChannelFlags flags) {
         kLowWord & ~(flags | kNotOfBaseFlags | kChannelFlagNotSaved));
 }
 
+/// No flags aren't written: the channel has its own again when that is read.
+KFChannelFlags FlagsCheck::kept() const { return (read() & ~kUnstored) == 0 ? _own : read(); }
+
+TextPlace FlagsCheck::placeOf(KFChannelFlags flag) const {
+    TextPlace place = _place;
+    for (Source const& source : _sources) {
+        place = ((source.set | source.clear) & flag) != 0 ? source.place : place;
+    }
+    return place;
+}
+
 std::vector<std::pair<TextPlace, Fault>> FlagsCheck::faultsAtEnd() const {
-    KFChannelFlags const end = _flags | (_isLockedAtEnd ? kChannelFlagLocked : 0);
+    KFChannelFlags const end = kept();
     std::vector<std::pair<TextPlace, Fault>> faults;
     for (Source const& source : _sources) {
         if ((source.set & ~end) != 0 || (source.clear & end) != 0) {

@@ -16,8 +16,8 @@ namespace lumenkey::tools {
 /// change what was before it.
 class FlagsCheck {
 public:
-    /// `example` is of the channel's class, and not null.
-    explicit FlagsCheck(KFChannelBase const& example);
+    /// `example` is what a reader makes for the channel; `place` is the channel's.
+    FlagsCheck(KFChannelBase const& example, TextPlace const& place);
 
     void readAttribute(TextPlace const& place, KFChannelFlags flags);
     /// An element of the channel; others than those of flags don't matter. The text must be readable.
@@ -25,6 +25,10 @@ public:
 
     /// Of what says something else than what the flags become.
     std::vector<std::pair<TextPlace, Fault>> faultsAtEnd() const;
+    /// Whether the channel has one of the flags when it is read.
+    bool has(KFChannelFlags mask) const { return (read() & mask) != 0; }
+    /// What says of a flag last whether it is set; the channel's own where nothing does.
+    TextPlace placeOf(KFChannelFlags flag) const;
 
 private:
     /// What a place says: which bits are set, and which aren't.
@@ -40,6 +44,12 @@ private:
     void add(TextPlace const& place, std::string_view name, KFChannelFlags number, KFChannelFlags set,
              KFChannelFlags clear);
 
+    KFChannelFlags read() const { return _flags | (_isLockedAtEnd ? kChannelFlagLocked : 0); }
+    KFChannelFlags kept() const;
+
+    TextPlace _place;
+    /// Those that it is made with.
+    KFChannelFlags _own;
     KFChannelFlags _flags;
     bool _isLockedAtEnd = false;
     std::vector<Source> _sources;

@@ -5,6 +5,7 @@
 #include "tools/check/DocumentScanner.h"
 #include "tools/check/DocumentVocabulary.h"
 #include "tools/check/FlagsCheck.h"
+#include "tools/check/FolderCheck.h"
 #include "tools/check/KeypointCheck.h"
 
 #include <cstdint>
@@ -29,7 +30,10 @@ struct OpenElement {
     /// Of a channel: its class, or null; and those of its children so far, by ID.
     KFFactory* factory = nullptr;
     std::map<std::uint64_t, KFFactory*> children;
+    /// One like what a reader makes for it, before anything is read into it; null where there is none.
+    KFChannelBase* example = nullptr;
     std::optional<FlagsCheck> flags;
+    FolderCheck folder;
     /// Of a channel or a curve. What those of a curve may be is known at its end.
     std::vector<std::pair<std::string, std::string>> attributes;
     /// Of a curve.

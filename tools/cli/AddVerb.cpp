@@ -1,7 +1,6 @@
 #include "tools/cli/Verbs.h"
 
 #include "lumenkey/Channels/KFChannelFlags.h"
-#include "lumenkey/Channels/KFFactories.h"
 #include "lumenkey/Channels/KFFactory.h"
 #include "tools/cli/AuthorOptions.h"
 #include "tools/cli/NearMatch.h"
@@ -31,8 +30,8 @@ KFChannelFactory& requireMaker(std::string const& type) {
         return *maker;
     }
     NearMatch match(type);
-    for (auto const& [uuid, factory] : KFFactories::getInstance().factories()) {
-        match.offer(shortClassName(classNameOf(*factory)));
+    for (std::string const& name : storedClassNames()) {
+        match.offer(name);
     }
     throw UsageError{"there is no class '" + type + "'" +
                      (match.best().empty() ? "; lumenkey types lists them all"

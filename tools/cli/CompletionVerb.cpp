@@ -1,7 +1,5 @@
 #include "tools/cli/Verbs.h"
 
-#include "lumenkey/Channels/KFFactories.h"
-#include "lumenkey/Channels/KFFactory.h"
 #include "tools/curve/Keypoint.h"
 #include "tools/tree/ChannelClass.h"
 
@@ -37,8 +35,8 @@ std::string wordsOf(std::string names) {
 
 std::string classNames() {
     std::string names;
-    for (auto const& [uuid, factory] : KFFactories::getInstance().factories()) {
-        names += (names.empty() ? "" : " ") + shortClassName(classNameOf(*factory));
+    for (std::string const& name : storedClassNames()) {
+        names += (names.empty() ? "" : " ") + name;
     }
     return names;
 }

@@ -45,7 +45,7 @@ void writeLine(NodeDifference const& difference, OutputSink& out) {
         separator = "; ";
     }
     for (std::string const& detail : difference.details) {
-        text += separator + detail;
+        text += separator + printableText(detail);
         separator = "; ";
     }
     out.write(text + "\n");

@@ -20,6 +20,36 @@ std::string textOf(NumberBuffer const& buffer, std::to_chars_result result) {
 
 char lowerCase(char c) { return c >= 'A' && c <= 'Z' ? static_cast<char>(c - 'A' + 'a') : c; }
 
+/// In UTF-8, the first and the last of those that follow one another: controls, and what sets or parts lines
+/// without being seen.
+struct UnseenCharacters {
+    std::string_view first;
+    std::string_view last;
+};
+constexpr UnseenCharacters kUnseen[] = {
+    {"\xC2\x80", "\xC2\x9F"},         // U+0080 to U+009F, as terminals take them
+    {"\xD8\x9C", "\xD8\x9C"},         // U+061C, of a direction
+    {"\xE2\x80\x8E", "\xE2\x80\x8F"}, // U+200E and U+200F, likewise
+    {"\xE2\x80\xA8", "\xE2\x80\xAE"}, // U+2028 to U+202E: ends of lines, and stretches of a direction
+    {"\xE2\x81\xA6", "\xE2\x81\xA9"}, // U+2066 to U+2069, likewise
+};
+
+/// How many bytes at the front of a text, which isn't empty, are such a character; 0 for none.
+std::size_t unseenAtFront(std::string_view text) {
+    auto const byte = static_cast<unsigned char>(text.front());
+    if (byte < 0x20 || byte == 0x7F) {
+        return 1;
+    }
+    for (auto const& [first, last] : kUnseen) {
+        std::string_view const front = text.substr(0, first.size());
+        // Views compare bytes as unsigned.
+        if (first <= front && front <= last) {
+            return front.size();
+        }
+    }
+    return 0;
+}
+
 } // namespace
 
 std::string shortestText(double value) {
@@ -74,15 +104,18 @@ std::string timeText(Tempus const& time) {
 std::string printableText(std::string_view text) {
     constexpr std::string_view hexadecimal = "0123456789abcdef";
     std::string printable;
-    for (char const c : text) {
-        auto const byte = static_cast<unsigned char>(c);
-        if (byte >= 0x20 && byte != 0x7F) {
-            printable += c;
-            continue;
+    while (!text.empty()) {
+        std::size_t const unseen = unseenAtFront(text);
+        if (unseen == 0) {
+            printable += text.front();
         }
-        printable += "\\x";
-        printable += hexadecimal[byte >> 4];
-        printable += hexadecimal[byte & 0xF];
+        for (char const c : text.substr(0, unseen)) {
+            auto const byte = static_cast<unsigned char>(c);
+            printable += "\\x";
+            printable += hexadecimal[byte >> 4];
+            printable += hexadecimal[byte & 0xF];
+        }
+        text.remove_prefix(std::max<std::size_t>(unseen, 1));
     }
     return printable;
 }

@@ -1,6 +1,7 @@
 #include "tools/tree/ChannelClass.h"
 
 #include "lumenkey/Channels/KFChannelFactories.h"
+#include "lumenkey/Channels/KFChannelFolder.h"
 #include "lumenkey/Channels/KFFactories.h"
 #include "tools/output/TextForms.h"
 
@@ -62,9 +63,26 @@ KFFactory* factoryOfClass(std::string_view name) {
     return nullptr;
 }
 
+std::vector<std::string> storedClassNames() {
+    std::vector<std::string> names;
+    for (auto const& [uuid, factory] : KFFactories::getInstance().factories()) {
+        std::unique_ptr<KFChannelBase> const example = exampleOf(factory);
+        if (example != nullptr && !example->testFlag(kChannelFlagNotSaved)) {
+            names.push_back(shortClassName(classNameOf(*factory)));
+        }
+    }
+    return names;
+}
+
 std::unique_ptr<KFChannelBase> exampleOf(KFFactory* factory) {
     auto* const maker = dynamic_cast<KFChannelFactory*>(factory);
     return std::unique_ptr<KFChannelBase>(maker == nullptr ? nullptr : maker->createChannel("", 1));
+}
+
+std::size_t componentCountOf(KFChannelFolder const& folder) {
+    std::unique_ptr<KFChannelBase> const example = exampleOf(folder.getFactory());
+    auto const* const like = dynamic_cast<KFChannelFolder const*>(example.get());
+    return like == nullptr ? 0 : like->getNumberOfDescendants();
 }
 
 std::string_view unitOf(KFChannelBase const& channel) {

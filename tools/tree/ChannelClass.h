@@ -5,7 +5,9 @@
 #include <memory>
 #include <string>
 #include <string_view>
+#include <vector>
 
+class KFChannelFolder;
 class KFFactory;
 
 namespace lumenkey::tools {
@@ -22,9 +24,15 @@ std::string shortClassName(std::string_view className);
 /// The registered factory of a class by its short or long name, regardless of case; null for none.
 KFFactory* factoryOfClass(std::string_view name);
 
+/// The short names of the classes of which documents hold channels.
+std::vector<std::string> storedClassNames();
+
 /// A new channel of a class, to ask it what the class is like; null for a class that makes none, and for
 /// null.
 std::unique_ptr<KFChannelBase> exampleOf(KFFactory* factory);
+
+/// How many children a folder's class makes for itself; they stand in front of all others.
+std::size_t componentCountOf(KFChannelFolder const& folder);
 
 /// `rad` for angles, else `units`.
 std::string_view unitOf(KFChannelBase const& channel);

@@ -12,13 +12,6 @@ namespace {
 
 constexpr std::string_view kTopPath = "./";
 
-/// How many children a folder's class makes for itself; an object of it tells.
-std::size_t componentCountOf(KFChannelFolder const& folder) {
-    std::unique_ptr<KFChannelBase> const example = exampleOf(folder.getFactory());
-    auto const* const like = dynamic_cast<KFChannelFolder const*>(example.get());
-    return like == nullptr ? 0 : like->getNumberOfDescendants();
-}
-
 } // namespace
 
 // --- Building ---
