@@ -42,13 +42,17 @@ std::string headOf(CLI::Option const& option) {
     return argument.empty() || argument == " " ? head : head + " " + argument;
 }
 
+void writeOptions(CLI::App const& arguments, OutputSink& out) {
+    for (CLI::Option const* const option : arguments.get_options()) {
+        out.write(".TP\n.B " + pageText(headOf(*option)) + "\n" + pageText(option->get_description()) + "\n");
+    }
+}
+
 void writeVerb(Verb const& verb, OutputSink& out) {
     CLI::App const& arguments = *verb.arguments;
     out.write(".SS " + pageText(arguments.get_name()) + "\n" + pageText(arguments.get_description()) +
               ".\n.PP\n" + ".B " + pageText("lumenkey " + arguments.get_name() + " " + verb.usage) + "\n");
-    for (CLI::Option const* const option : arguments.get_options()) {
-        out.write(".TP\n.B " + pageText(headOf(*option)) + "\n" + pageText(option->get_description()) + "\n");
-    }
+    writeOptions(arguments, out);
     out.write(".PP\n" + pageParagraphs(arguments.get_footer()));
 }
 
@@ -57,6 +61,8 @@ void writeManual(CLI::App const& program, std::vector<Verb> const& verbs, Output
     out.write(".SH NAME\nlumenkey \\- " + pageText(program.get_description()) + "\n");
     out.write(".SH SYNOPSIS\n.B lumenkey\nVERB ...\n.SH DESCRIPTION\n" +
               pageParagraphs(program.get_footer()));
+    out.write(".SH OPTIONS\n");
+    writeOptions(program, out);
     out.write(".SH VERBS\n");
     for (Verb const& verb : verbs) {
         writeVerb(verb, out);
