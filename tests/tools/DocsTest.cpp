@@ -88,9 +88,19 @@ TEST_F(DocsTest, TheExampleOfADocumentIsOne) {
     Json const info = jsonOf({"info", file});
     EXPECT_EQ(info["channelNames"], Json({"Size", "Blur"}));
     EXPECT_EQ(info["keypoints"], 2);
-    Outcome const valid = runProgramFile(
-        "/usr/bin/xmllint", {"--noout", "--relaxng", LUMENKEY_TEST_SOURCE_DIR "/docs/document.rng", file});
-    EXPECT_EQ(valid.exit, 0) << valid.err;
+    // Each form of a time, as it is written.
+    std::string const written = _folder.file("written.lumen");
+    for (std::string const time : {"0/600", "-1/2@3", "1/3~", "5/0#7", "1/2@-1#9", "+infinity~", "-infinity~",
+                                   "invalid~", "indefinite~", "-infinity"}) {
+        std::string text = examples[0];
+        text.replace(text.find("0/600"), 5, time);
+        outputOf({"convert", _folder.write("example.lumen", text), written});
+        EXPECT_NE(contentOf(written).find("<time>" + time + "</time>"), std::string::npos) << time;
+        Outcome const valid = runProgramFile(
+            "/usr/bin/xmllint",
+            {"--huge", "--noout", "--relaxng", LUMENKEY_TEST_SOURCE_DIR "/docs/document.rng", file, written});
+        EXPECT_EQ(valid.exit, 0) << valid.err;
+    }
 }
 
 } // namespace
