@@ -7,7 +7,7 @@ class KFChannelBase;
 
 /// The outermost handler of a document: reads its version and its factories, and hands its node to a channel.
 ///
-/// The channel takes the ID of the node, and what stands inside it; its name, flags and factory stay.
+/// The channel takes the ID of the node, and what stands inside it, flags too; its name and factory stay.
 /// Factories that aren't registered are passed by. The version goes to the stream.
 class LUMENKEY_API ChannelParser : public BXSerializer {
 public:
