@@ -90,15 +90,15 @@ TEST_F(DocsTest, TheExampleOfADocumentIsOne) {
     EXPECT_EQ(info["keypoints"], 2);
     // Each form of a time, as it is written.
     std::string const written = _folder.file("written.lumen");
+    std::string const schema = LUMENKEY_TEST_SOURCE_DIR "/docs/document.rng";
     for (std::string const time : {"0/600", "-1/2@3", "1/3~", "5/0#7", "1/2@-1#9", "+infinity~", "-infinity~",
                                    "invalid~", "indefinite~", "-infinity"}) {
         std::string text = examples[0];
         text.replace(text.find("0/600"), 5, time);
         outputOf({"convert", _folder.write("example.lumen", text), written});
         EXPECT_NE(contentOf(written).find("<time>" + time + "</time>"), std::string::npos) << time;
-        Outcome const valid = runProgramFile(
-            "/usr/bin/xmllint",
-            {"--huge", "--noout", "--relaxng", LUMENKEY_TEST_SOURCE_DIR "/docs/document.rng", file, written});
+        Outcome const valid =
+            runProgramFile("/usr/bin/xmllint", {"--huge", "--noout", "--relaxng", schema, file, written});
         EXPECT_EQ(valid.exit, 0) << valid.err;
     }
 }

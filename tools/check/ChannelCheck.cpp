@@ -10,7 +10,7 @@ namespace {
 std::string dottedName(OpenElement const& channel, std::vector<OpenElement> const& open) {
     std::string name = nameOfChannel(channel, channel.attributeViews());
     for (std::size_t i = open.size() - 1; open[i - 1].name == "parameter"; --i) {
-        name = nameOfChannel(open[i], open[i].attributeViews()) + "." + name;
+        name.insert(0, nameOfChannel(open[i], open[i].attributeViews()) + ".");
     }
     return name;
 }
