@@ -302,7 +302,7 @@ TEST_F(AuthorVerbsTest, LockedChannelsStayAsTheyAre) {
 
 TEST_F(AuthorVerbsTest, UpgradeWritesOldDocumentsInTodaysVersion) {
     std::vector<std::string> files;
-    std::string const data = LUMENKEY_TEST_SOURCE_DIR "/tests/persistence/data/";
+    std::string const data = LUMENKEY_TEST_SOURCE_DIR "/tests/data/";
     for (char const* const name : {"version2.lumen", "version3.lumen", "version4.lumen"}) {
         files.push_back(_folder.write(name, contentOf(data + name)));
     }

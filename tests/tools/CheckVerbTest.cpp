@@ -193,13 +193,13 @@ TEST_F(CheckVerbTest, FindsWhatIsOddWithItsPlace) {
     std::string const found = findingsIn(documentOf(deep));
     EXPECT_LT(found.find("more than 990 elements deep"), found.find("more than 1000 deep"))
         << "not in the order of the text";
-    EXPECT_EQ(findingsIn(contentOf(LUMENKEY_TEST_SOURCE_DIR "/tests/persistence/data/version2.lumen")), "");
+    EXPECT_EQ(findingsIn(contentOf(LUMENKEY_TEST_SOURCE_DIR "/tests/data/version2.lumen")), "");
     EXPECT_EQ(findingsIn(documentOf("<parameter factoryID=\"3\"><fadeInOffset>1/2</fadeInOffset>\n"
                                     "<fadeOutOffset>3</fadeOutOffset></parameter>",
                                     "4.1")),
               "4:1: '3' is no time\n");
     // Old also where spaces stand in front of the version.
-    std::string const old = contentOf(LUMENKEY_TEST_SOURCE_DIR "/tests/persistence/data/version4.lumen");
+    std::string const old = contentOf(LUMENKEY_TEST_SOURCE_DIR "/tests/data/version4.lumen");
     EXPECT_EQ(findingsIn(samples::replaced(old, "\"4.1\"", "\" 4.1\"")), "");
     EXPECT_EQ(jsonOf({"info", _folder.file("f.lumen")})["version"], "4.1");
 }

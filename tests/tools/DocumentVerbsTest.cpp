@@ -14,7 +14,7 @@ namespace {
 using samples::documentOf;
 using samples::kSmallMotion;
 
-constexpr char const* kOldDocument = LUMENKEY_TEST_SOURCE_DIR "/tests/persistence/data/version3.lumen";
+constexpr char const* kOldDocument = LUMENKEY_TEST_SOURCE_DIR "/tests/data/version3.lumen";
 
 class DocumentVerbsTest : public ::testing::Test {
 protected:

@@ -88,8 +88,8 @@ TEST_F(ProgramTest, SeveralFilesAreOpenAtOnce) {
 }
 
 TEST_F(ProgramTest, AWrongArgumentForOneOfSeveralFilesLeavesTheOthers) {
-    std::string const old = _folder.write(
-        "old.lumen", contentOf(LUMENKEY_TEST_SOURCE_DIR "/tests/persistence/data/version3.lumen"));
+    std::string const old =
+        _folder.write("old.lumen", contentOf(LUMENKEY_TEST_SOURCE_DIR "/tests/data/version3.lumen"));
     Outcome const outcome = runLumenkey({"upgrade", _file, old, "--frame-rate", "24"});
     EXPECT_EQ(outcome.exit, 2);
     EXPECT_EQ(outcome.out, old + ": from version 3.1 to 5.13\n");
@@ -372,7 +372,7 @@ TEST_F(ProgramTest, EmptyTextsAreWrongArguments) {
 TEST_F(ProgramTest, EveryVerbHelpsWithAnExample) {
     // What the examples speak of.
     runProgramFile(LUMENKEY_MAKE_MOTION, {_folder.file("walk.bvh"), "--frames", "300"});
-    _folder.write("old.lumen", contentOf(LUMENKEY_TEST_SOURCE_DIR "/tests/persistence/data/version3.lumen"));
+    _folder.write("old.lumen", contentOf(LUMENKEY_TEST_SOURCE_DIR "/tests/data/version3.lumen"));
     outputOf({"convert", _folder.file("walk.bvh"), _folder.file("walk.lumen")});
     outputOf({"convert", _folder.file("walk.bvh"), _folder.file("edited.lumen")});
     // In this order one makes what another takes: `add` makes the height that `set` keys.
