@@ -29,9 +29,9 @@ constexpr KFChannelFlags KFFlagsOfElement(KFChannelFlags own, KFChannelFlags rea
     return (taken & ~kept) | (own & kept);
 }
 
-/// By the element `baseFlags` of a root.
+/// By the element `baseFlags` of a root, which stays one.
 constexpr KFChannelFlags KFFlagsOfBaseFlags(KFChannelFlags own, KFChannelFlags read) noexcept {
-    return (read & kLowWord & ~kNotOfBaseFlags) | (own & kNotOfBaseFlags);
+    return (read & kLowWord & ~kNotOfBaseFlags) | (own & kNotOfBaseFlags) | kChannelClassFlags;
 }
 
 constexpr std::uint32_t KFFoldFlagsOfElement(std::uint32_t own, std::uint32_t read) noexcept {

@@ -36,8 +36,8 @@ struct ProgressScreen {
 class ProgressPart;
 
 /// A bar on standard error while work lasts over a second, that before it counted too, and a person sits at
-/// the terminal; nothing otherwise, nor while another one lives: work that is a part of other work shows nothing of its own. It is
-/// wiped away at the end.
+/// the terminal; nothing otherwise, nor while another one lives: work that is a part of other work shows
+/// nothing of its own. It is wiped away at the end.
 ///
 /// A thread of its own draws it, so that it stands there whatever the work is busy with. Where nobody tells a
 /// share, a mark moves to and fro.

@@ -20,8 +20,8 @@ public:
         words.description = "Draw curves by few keypoints, within a tolerance";
         words.usage = "--tolerance X [--step T]";
         words.notes = "Looked at at ten times in each frame or step, no curve goes off more than the "
-                      "tolerance in the stretch. One that\nfewer "
-                      "keypoints can't draw so well stays as it is.\n";
+                      "tolerance in the stretch. One that\n"
+                      "fewer keypoints can't draw so well stays as it is.\n";
         words.example = "lumenkey simplify walk.bvh --tolerance 0.01 -o few.csv --rows keypoints";
         words.keepsShape = true;
         return words;

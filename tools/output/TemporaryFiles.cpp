@@ -33,10 +33,10 @@ void removeAndEnd(int signal) {
     isEnding = true;
     for (Slot const& slot : slots) {
         // By another thread: one that makes a file holds signals up.
-        while (slot.use.load() == Use::BeingMade) {
+        while (slot.use == Use::BeingMade) {
             ::poll(nullptr, 0, 1);
         }
-        if (slot.use.load(std::memory_order_acquire) == Use::Alive) {
+        if (slot.use == Use::Alive) {
             ::unlink(slot.name);
         }
     }
