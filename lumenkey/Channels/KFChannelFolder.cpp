@@ -6,6 +6,7 @@
 #include "lumenkey/Channels/KFChildIndex.h"
 
 #include <algorithm>
+#include <bit>
 #include <new>
 
 namespace {
@@ -98,8 +99,9 @@ void KFChannelFolder::insertAt(std::size_t position, KFChannelBase* child) {
     _descendants->insert(_descendants->begin() + static_cast<std::ptrdiff_t>(position), child);
     if (_index) {
         tryOnIndex([=, this] { enterIndex(child, position); });
-    } else if (_descendants->size() == kMostUnindexedChildren + 1) {
-        tryOnIndex([this] { buildIndex(); });
+    } else if (std::size_t const before = _descendants->size() - 1;
+               before >= kMostUnindexedChildren && std::has_single_bit(before)) {
+        tryOnIndex([this] { buildIndex(); }); // anew each time they doubled, where memory was out
     }
 }
 

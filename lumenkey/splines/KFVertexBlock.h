@@ -87,6 +87,8 @@ struct KFVertexEntry {
 /// A run of neighbouring vertices of a store, and the set of those that are valid. No block of a store is empty.
 struct KFVertexBlock {
     static constexpr std::uint32_t kCapacity = KFSlotSet::kCapacity;
+    /// Of entries, in one that holds any.
+    static constexpr std::uint32_t kLeastRoom = 8;
 
     std::vector<KFVertexEntry> entries;
     KFSlotSet valid;
@@ -119,7 +121,7 @@ private:
         if (entries.size() < entries.capacity())
             return;
         std::size_t const wanted =
-            std::min<std::size_t>(std::max<std::size_t>(8, 2 * entries.size()), kCapacity);
+            std::min<std::size_t>(std::max<std::size_t>(kLeastRoom, 2 * entries.size()), kCapacity);
         entries.reserve(wanted);
     }
 };

@@ -212,11 +212,12 @@ KFVertexStore::Place KFVertexStore::insert(Place place, KFVertex* vertex, bool s
     if (hasTicks() && !adoptPosition(vertex->getValueU(), &tick))
         _tickScale = 0;
     if (_handles)
-        _handles->insert(vertex);
-
+        _handles->reserve(_size + 1);
     place = roomAt(place);
     Block& block = *_blocks[place.block];
     block.insert(place.slot, vertex, tick, isValid);
+    if (_handles) // once nothing fails any more
+        _handles->insert(vertex);
     _firstTicks[place.block] = block.entries.front().tick;
     _size += 1;
     _validCount += isValid ? 1 : 0;
@@ -234,7 +235,7 @@ KFVertexStore::Place KFVertexStore::roomAt(Place place) {
     }
     if (place.block == _blocks.size() ||
         (place.slot == 0 && _blocks[place.block]->count() == kBlockCapacity)) {
-        insertBlock(place.block);
+        insertBlock(place.block, Block::kLeastRoom);
         return {place.block, 0};
     }
     if (_blocks[place.block]->count() < kBlockCapacity)
@@ -244,8 +245,9 @@ KFVertexStore::Place KFVertexStore::roomAt(Place place) {
     return place.slot <= kept ? place : Place{place.block + 1, place.slot - kept};
 }
 
-void KFVertexStore::insertBlock(std::uint32_t index) {
+void KFVertexStore::insertBlock(std::uint32_t index, std::uint32_t room) {
     auto block = std::make_unique<Block>();
+    block->entries.reserve(room); // the caller fills it, since none may stay empty
     // Without memory neither list grows.
     if (_blocks.size() == _blocks.capacity())
         _blocks.reserve(std::max<std::size_t>(2 * _blocks.size(), 1));
@@ -255,7 +257,7 @@ void KFVertexStore::insertBlock(std::uint32_t index) {
 
 void KFVertexStore::splitBlock(std::uint32_t index) {
     constexpr std::uint32_t half = kBlockCapacity / 2;
-    insertBlock(index + 1);
+    insertBlock(index + 1, half);
     Block& low = *_blocks[index];
     Block& high = *_blocks[index + 1];
     high.entries.assign(low.entries.begin() + half, low.entries.end());
@@ -368,13 +370,15 @@ void KFVertexStore::rotate(Place place) {
     };
     take(place, end());
     take(begin(), place);
-    _blocks.clear();
-    _firstTicks.clear();
+    std::vector<std::unique_ptr<Block>> blocks;
     for (std::size_t i = 0; i < vertices.size(); ++i) {
         if (i % kBlockCapacity == 0)
-            insertBlock(static_cast<std::uint32_t>(_blocks.size()));
-        _blocks.back()->insert(_blocks.back()->count(), vertices[i], 0, valid[i]);
+            blocks.push_back(std::make_unique<Block>());
+        blocks.back()->insert(blocks.back()->count(), vertices[i], 0, valid[i]);
     }
+    std::vector<std::int64_t> firstTicks(blocks.size());
+    _blocks.swap(blocks);
+    _firstTicks.swap(firstTicks);
     updateAllPositions();
     updateEnds();
 }

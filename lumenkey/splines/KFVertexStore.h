@@ -116,7 +116,7 @@ private:
 
     Place boundByComparison(Tempus const& u, bool strictly) const noexcept;
     Place roomAt(Place place);
-    void insertBlock(std::uint32_t index);
+    void insertBlock(std::uint32_t index, std::uint32_t room);
     void splitBlock(std::uint32_t index);
     void mergeWithNext(Place const& place);
     void updateEnds() noexcept;
