@@ -17,10 +17,6 @@ namespace {
 
 constexpr std::uint64_t kUsualSizeLimit = std::uint64_t{4} << 30;
 
-bool startsWithMark(std::string_view text) {
-    return text.starts_with("\xEF\xBB\xBF") || text.starts_with("\xFF\xFE") || text.starts_with("\xFE\xFF");
-}
-
 struct FreeParser {
     void operator()(XML_Parser parser) const noexcept { XML_ParserFree(parser); }
 };
@@ -87,7 +83,6 @@ private:
     std::unique_ptr<BXByteSource> _source;
     Parser _parser;
     std::uint64_t _fed = 0;
-    /// The parser takes a byte order mark for a character of the first line.
     bool _hasMark = false;
     std::exception_ptr _thrown;
     State _state = State::Fresh;
@@ -160,7 +155,7 @@ bool BXXMLReadStream::Reading::feed(std::uint64_t* size, bool* isLast) {
         return false;
     }
     if (_fed == 0) {
-        _hasMark = startsWithMark({static_cast<char const*>(room), *got});
+        _hasMark = BXStartsWithMark({static_cast<char const*>(room), *got});
     }
     _fed += *got;
     *isLast = *got < *size;
@@ -178,9 +173,7 @@ void BXXMLReadStream::Reading::failHere(std::string reason) {
     failure = BXReadFailure{0, 0, std::move(reason)};
     if (_parser) {
         failure->line = XML_GetCurrentLineNumber(_parser.get());
-        bool const countsMark = _hasMark && failure->line == 1;
-        std::uint64_t const before = XML_GetCurrentColumnNumber(_parser.get());
-        failure->column = before + (countsMark && before != 0 ? 0 : 1);
+        failure->column = BXParserColumn(failure->line, XML_GetCurrentColumnNumber(_parser.get()), _hasMark);
     }
 }
 

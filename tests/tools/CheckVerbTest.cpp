@@ -140,11 +140,19 @@ TEST_F(CheckVerbTest, FindsWhatIsOddWithItsPlace) {
          "8:1: the handle reaches to the wrong side of its keypoint: its time counts as 0\n"
          "9:1: the element 'outputTangentTime' is here for the second time, where only one is kept\n"
          "9:1: no 'outputTangentValue' stands behind 'outputTangentTime': it is passed over\n"
+         "10:1: the keypoint is disabled but keeps no output handle: it comes back enabled\n"
          "10:55: 'nan' is no number\n"
          "10:95: 'nan' is no number\n"
          "10:95: 'inputTangentValue' is nan, which is kept as no handle\n"
          "11:1: 'outputTangentValue' is 1e-09, which is kept as no handle\n"
          "12:1: 'bias' stands behind the output handle, which disables the keypoint: it is passed over\n"},
+        {"<parameter id=\"1\" factoryID=\"4294967299\">\n<curve type=\"1\">\n<min>3<shiny/></min>\n<value>5"
+         "</value>\n<numberOfKeypoints>few</numberOfKeypoints></curve></parameter>",
+         "4:1: the attribute 'factoryID' is 4294967299, which is out of the limits, 0 to 4294967295\n"
+         "6:1: another element stands in 'min': its text is passed over\n"
+         "6:7: the element 'shiny' is unknown here: it is passed over\n"
+         "7:1: the element 'value' doesn't belong here: what is in it isn't looked at\n"
+         "8:1: 'few' is no whole number\n"},
         {"<factory id=\"0\" uuid=\" FDC1944B-2291-11D7-B1C3-00039389B702 \"/>\n"
          "<factory id=\"6\" uuid=\"F112CFDE-0D76-11D7-83C8-000393670732\"/>\n"
          "<factory id=\"7\" uuid=\"4B723EA5-2443-11D7-9C75-00039366FB58\"/>"
@@ -176,6 +184,8 @@ TEST_F(CheckVerbTest, FindsWhatIsOddWithItsPlace) {
         EXPECT_EQ(findingsIn(documentOf("\n" + std::string(each.body))), each.findings);
     }
     EXPECT_EQ(findingsIn("<kfml version=\"5.13\"/>"), "1:1: the document holds no channel\n");
+    EXPECT_EQ(findingsIn("\xEF\xBB\xBF<kfml version=\"\\x35.13\"><parameter/><shiny/></kfml>"),
+              "1:37: the element 'shiny' is unknown here: it is passed over\n");
     EXPECT_EQ(findingsIn("<kfml version=\"abc\"><parameter/></kfml>"),
               "1:1: 'abc' is no version, such as 5.13: it is read as 5.13\n");
     EXPECT_EQ(findingsIn("<kfml><parameter/></kfml>"),

@@ -6,11 +6,16 @@ namespace lumenkey::tools {
 
 namespace {
 
-/// Of one that lies in those that are open.
+/// Of one that lies in those that are open. Names of folders far above are left out.
 std::string dottedName(OpenElement const& channel, std::vector<OpenElement> const& open) {
+    constexpr std::size_t longest = 200;
     std::string name = nameOfChannel(channel, channel.attributeViews());
     for (std::size_t i = open.size() - 1; open[i - 1].name == "parameter"; --i) {
-        name.insert(0, nameOfChannel(open[i], open[i].attributeViews()) + ".");
+        std::string const above = nameOfChannel(open[i], open[i].attributeViews());
+        if (name.size() + above.size() > longest) {
+            return "..." + name;
+        }
+        name.insert(0, above + ".");
     }
     return name;
 }

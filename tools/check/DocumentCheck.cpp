@@ -41,6 +41,7 @@ private:
             return;
         }
         _open.back().isInStrayText = false;
+        loseText(_open.back());
         OpenElement element;
         element.name = name;
         element.place = place;
@@ -59,6 +60,14 @@ private:
         _open.push_back(std::move(element));
     }
 
+    void loseText(OpenElement& above) {
+        if (above.word != nullptr && above.word->text != TextKind::None && !above.hasLostText) {
+            above.hasLostText = true;
+            _findings.lost(above.place,
+                           "another element stands in '" + above.name + "': its text is passed over");
+        }
+    }
+
     void findRepeated(OpenElement const& element) {
         std::vector<DocumentWord const*>& parts = _open.back().parts;
         if (element.word->isRepeated) {
@@ -73,8 +82,10 @@ private:
 
     bool isTaken(OpenElement const& element) {
         if (element.word == nullptr) {
-            _findings.lost(element.place,
-                           "the element '" + element.name + "' is unknown here: it is passed over");
+            _findings.lost(element.place, "the element '" + element.name +
+                                              (isDocumentElement(element.name)
+                                                   ? "' doesn't belong here: what is in it isn't looked at"
+                                                   : "' is unknown here: it is passed over"));
             return false;
         }
         KFFactory* const factory = _open.back().factory;
@@ -124,7 +135,7 @@ private:
         OpenElement& above = _open.back();
         bool const isTop = above.factory == nullptr;
         std::string const name = "the channel '" + std::string(attributeOf(attributes, "name")) + "'";
-        std::uint64_t const id = readWhole(attributeOf(attributes, "id")).value_or(0);
+        std::uint64_t const id = readWhole32(attributeOf(attributes, "id")).value_or(0);
         if (isTop && !above.children.empty()) {
             _findings.lost(element.place,
                            "a second channel: a document holds one, with all others inside it");
@@ -183,13 +194,14 @@ private:
         _open.pop_back();
         OpenElement& above = _open.back();
         above.isInStrayText = false;
-        bool const isReadable = canBeRead(element.text, element.word->text, _countsFrames);
-        bool const isKept =
-            isReadable || (KeypointCheck::keepsNan(element.name) && readNumberOrNan(element.text));
-        if (!isReadable) {
+        bool const isReadable =
+            !element.hasLostText && canBeRead(element.text, element.word->text, _countsFrames);
+        bool const isKept = isReadable || (!element.hasLostText && KeypointCheck::keepsNan(element.name) &&
+                                           readNumberOrNan(element.text));
+        if (!isReadable && !element.hasLostText) {
             _findings.take({element.place,
                             quoted(element.text) + " is " + std::string(nameOfTextKind(element.word->text)),
-                            !isKept});
+                            !isKept && element.name != "numberOfKeypoints"});
         }
         if (above.keypoint) {
             _findings.take(element.place,
@@ -240,8 +252,11 @@ private:
         Attributes const attributes = curve.attributeViews();
         checkAttributes(curve, attributes);
         _findings.take(curve.place, faultsOfCurveInChannel(attributes, _open.back().attributeViews()));
-        if (curve.hasKeypoints && readWhole(attributeOf(attributes, "type")).value_or(0) == 0) {
+        if (curve.hasKeypoints && readWhole32(attributeOf(attributes, "type")).value_or(0) == 0) {
             _findings.lost(curve.place, "the curve is a constant: its keypoints are passed over");
+        }
+        if (curve.closedPlace && !curve.hasKeypoints) {
+            _findings.lost(*curve.closedPlace, "there are no keypoints that it would close");
         }
         if (curve.limits.low > curve.limits.high) {
             _findings.kept(curve.limitPlace, "the least value, " + shortestText(curve.limits.low) +
@@ -265,8 +280,12 @@ private:
             curve.canBeClosed = true;
             _findings.lost(element.place,
                            curve.hasKeypoints ? "the number stands behind keypoints, which it clears" : "");
-        } else if (element.name == "closed" && !curve.canBeClosed && readBool(element.text) != false) {
-            _findings.lost(element.place, "there are no keypoints yet that it would close");
+        } else if (element.name == "closed" && readBool(element.text) != false) {
+            if (curve.canBeClosed) {
+                curve.closedPlace = element.place;
+            } else {
+                _findings.lost(element.place, "there are no keypoints yet that it would close");
+            }
         }
     }
 

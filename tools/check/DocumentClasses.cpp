@@ -5,23 +5,23 @@
 #include "tools/check/DocumentVocabulary.h"
 #include "tools/tree/ChannelClass.h"
 
-#include <limits>
 #include <optional>
 
 namespace lumenkey::tools {
 
 std::vector<Fault> DocumentClasses::readFactory(Attributes const& attributes) {
-    std::optional<std::uint64_t> const number = readWhole(attributeOf(attributes, "id"));
+    std::optional<std::uint32_t> const number = readWhole32(attributeOf(attributes, "id"));
     std::string const uuidText(attributeOf(attributes, "uuid"));
     std::optional<BXUUID> const uuid = readUUID(uuidText);
-    if (!number || *number > std::numeric_limits<std::uint32_t>::max() || !uuid) {
+    if (!number || !uuid) {
         return {{"a factory needs an 'id', which is a whole number, and a 'uuid'"}};
     }
     std::vector<Fault> faults;
     KFFactory* const factory = KFFactories::getInstance().findFactory(*uuid);
     if (auto const [before, isNew] = _factories.try_emplace(*number, factory); !isNew) {
         faults.push_back({"the factory has the id " + std::to_string(*number) + " of one before it" +
-                          (factory == nullptr ? "" : ", whose place it takes")});
+                              (factory == nullptr ? "" : ", whose place it takes"),
+                          before->second == factory});
         before->second = factory == nullptr ? before->second : factory;
     }
     if (factory == nullptr) {
@@ -35,10 +35,11 @@ std::string DocumentClasses::faultOfComponent(KFChannelBase const& component,
                                               Attributes const& attributes) const {
     std::string const name = component.getName().str();
     std::string const what = "the channel '" + name + "' is a part of its folder, which makes it";
-    if (auto const given = attributes.find("name"); given != attributes.end() && given->second != name) {
+    if (auto const given = attributes.find("name");
+        given != attributes.end() && readString(given->second) != name) {
         return what + ": the name '" + std::string(given->second) + "' is passed over";
     }
-    auto const given = _factories.find(readWhole(attributeOf(attributes, "factoryID")).value_or(0));
+    auto const given = _factories.find(readWhole32(attributeOf(attributes, "factoryID")).value_or(0));
     if (given != _factories.end() && given->second != nullptr && given->second != component.getFactory()) {
         return what + ": the class " + shortClassName(classNameOf(*given->second)) + " is passed over";
     }
@@ -46,7 +47,7 @@ std::string DocumentClasses::faultOfComponent(KFChannelBase const& component,
 }
 
 std::string DocumentClasses::faultOfClass(Attributes const& attributes, bool isTop, KFFactory** factory) {
-    std::optional<std::uint64_t> const number = readWhole(attributeOf(attributes, "factoryID"));
+    std::optional<std::uint32_t> const number = readWhole32(attributeOf(attributes, "factoryID"));
     if (!number) {
         *factory = &KFChannelObjectRootBase_Factory::getInstance();
         return isTop ? "" : " names no class";

@@ -67,6 +67,7 @@ public:
             std::string_view const part = text.substr(0, _block);
             text.remove_prefix(part.size());
             isLast = text.empty();
+            lookForMark(part);
             endBlock(XML_Parse(_parser.get(), part.data(), static_cast<int>(part.size()), isLast),
                      part.size());
             if (progress) {
@@ -117,7 +118,8 @@ private:
     }
 
     TextPlace place() const {
-        return {XML_GetCurrentLineNumber(_parser.get()), XML_GetCurrentColumnNumber(_parser.get()) + 1};
+        std::uint64_t const line = XML_GetCurrentLineNumber(_parser.get());
+        return {line, BXParserColumn(line, XML_GetCurrentColumnNumber(_parser.get()), _hasMark)};
     }
 
     void start(char const* name, char const** pairs) {
@@ -148,13 +150,17 @@ private:
             throw InputError{file, 1, 1, systemErrorText(errno)};
         }
         *isLast = got < _block;
+        lookForMark({static_cast<char const*>(room), got});
         endBlock(XML_ParseBuffer(_parser.get(), static_cast<int>(got), *isLast), got);
     }
+
+    void lookForMark(std::string_view block) { _hasMark = _fed == 0 ? BXStartsWithMark(block) : _hasMark; }
 
     DocumentScanner& _scanner;
     std::unique_ptr<XML_ParserStruct, void (*)(XML_Parser)> _parser;
     std::uint64_t _block = kFirstParserBlock;
     std::uint64_t _fed = 0;
+    bool _hasMark = false;
     std::size_t _depth = 0;
     bool _isStopped = false;
     std::exception_ptr _thrown;

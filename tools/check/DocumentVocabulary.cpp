@@ -2,6 +2,7 @@
 
 #include "lumenkey/foundation/BXSerializerStreams.h"
 
+#include <algorithm>
 #include <cmath>
 #include <limits>
 #include <memory>
@@ -55,7 +56,7 @@ constexpr DocumentWord kElements[] = {
 constexpr DocumentWord kAttributes[] = {
     {"kfml", "version", TextKind::Any},
     {"kfdoc", "version", TextKind::Any},
-    {"factory", "id", TextKind::Any},
+    {"factory", "id", TextKind::Any, kOfAll, kMost32},
     {"factory", "uuid", TextKind::Any},
     {"parameter", "name", TextKind::Any},
     {"parameter", "id", TextKind::Whole, kOfAll, kMost32},
@@ -109,6 +110,11 @@ DocumentWord const* documentElement(std::string_view parent, std::string_view na
     return nullptr;
 }
 
+bool isDocumentElement(std::string_view name) {
+    return std::any_of(std::begin(kElements), std::end(kElements),
+                       [name](DocumentWord const& word) { return word.name == name; });
+}
+
 std::span<DocumentWord const> documentAttributes() { return kAttributes; }
 
 bool isBeyond(DocumentWord const& word, std::string_view text) {
@@ -126,6 +132,14 @@ std::optional<double> readNumber(std::string_view text) {
 
 std::optional<std::uint64_t> readWhole(std::string_view text) {
     return readAs(text, &BXStreamElement::getAsUInt64);
+}
+
+std::optional<std::uint32_t> readWhole32(std::string_view text) {
+    return readAs(text, &BXStreamElement::getAsUInt32);
+}
+
+std::string readString(std::string_view text) {
+    return readAs(text, &BXStreamElement::getAsString).value_or(BXString()).str();
 }
 
 std::optional<bool> readBool(std::string_view text) { return readAs(text, &BXStreamElement::getAsBool); }

@@ -6,6 +6,7 @@
 #include <cstdint>
 #include <optional>
 #include <span>
+#include <string>
 #include <string_view>
 
 namespace lumenkey::tools {
@@ -32,6 +33,8 @@ struct DocumentWord {
 
 /// Null for an element that is unknown there.
 DocumentWord const* documentElement(std::string_view parent, std::string_view name);
+/// Whether it is known anywhere.
+bool isDocumentElement(std::string_view name);
 /// Those of all elements. One that isn't among them is unknown.
 std::span<DocumentWord const> documentAttributes();
 
@@ -51,6 +54,10 @@ std::optional<double> readNumber(std::string_view text);
 /// Also `nan`, which curves and handles keep.
 std::optional<double> readNumberOrNan(std::string_view text);
 std::optional<std::uint64_t> readWhole(std::string_view text);
+/// As an attribute or element of 32 bits: the lowest of a longer one.
+std::optional<std::uint32_t> readWhole32(std::string_view text);
+/// With the bytes that are written as escapes.
+std::string readString(std::string_view text);
 std::optional<bool> readBool(std::string_view text);
 std::optional<BXUUID> readUUID(std::string_view text);
 std::optional<Tempus> readTime(std::string_view text);

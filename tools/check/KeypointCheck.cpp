@@ -4,6 +4,7 @@
 #include "tools/check/DocumentVocabulary.h"
 #include "tools/output/TextForms.h"
 
+#include <algorithm>
 #include <cmath>
 
 namespace lumenkey::tools {
@@ -35,7 +36,7 @@ bool KeypointCheck::keepsNan(std::string_view part) {
 Fault KeypointCheck::faultOfPart(TextPlace const& place, std::string_view name, std::string_view text,
                                  bool canBeRead) {
     bool const wasDisabled = _isDisabled && _hasOutput;
-    _hasOutput |= name == _out.valueName;
+    _hasOutput |= _hasValue && name == _out.valueName;
     if (name == "time" || name == "value") {
         Fault const fault = faultOfTimeOrValue(name == "time");
         return canBeRead ? fault : Fault();
@@ -46,6 +47,10 @@ Fault KeypointCheck::faultOfPart(TextPlace const& place, std::string_view name, 
     }
     bool const isHandle = name == handle.valueName;
     double const time = isHandle ? std::exchange(handle.time, std::nullopt).value_or(0) : 0;
+    double const number = canBeRead ? *readNumberOrNan(text) : 0;
+    if (name == _out.valueName && _hasValue && !wasDisabled) {
+        _keepsOutput = _takesHandles && isKept(std::max(time, 0.0), number);
+    }
     if (!canBeRead) {
         return {};
     }
@@ -56,7 +61,6 @@ Fault KeypointCheck::faultOfPart(TextPlace const& place, std::string_view name, 
     if (wasDisabled && name != "normal") {
         return {quoted + " stands behind the output handle, which disables the keypoint: it is passed over"};
     }
-    double const number = *readNumberOrNan(text);
     if (isHandle) {
         return faultOfHandle(name, time, number);
     }
@@ -91,10 +95,18 @@ Fault KeypointCheck::faultOfHandle(std::string_view name, double time, double va
     if (!_takesHandles) {
         return {"curves of this class have no handles: '" + std::string(name) + "' is passed over"};
     }
+    if (isKept(time, value)) {
+        return {};
+    }
+    Handle const& handle = name == _in.valueName ? _in : _out;
+    return value == 0 ? leftOut(handle.timeName, time, "no handle") : leftOut(name, value, "no handle");
+}
+
+bool KeypointCheck::isKept(double time, double value) const {
     bool const isLong = std::fabs(time) >= kLeastWritten || std::fabs(value) >= kLeastWritten;
     // How short a handle in frames is depends on how long a frame is.
     bool const isKnown = !_countsFrames || std::isnan(time) || std::isnan(value);
-    return isKnown && !isLong ? leftOut(name, value, "no handle") : Fault();
+    return isLong || (!isKnown && (time != 0 || value != 0));
 }
 
 std::vector<std::pair<TextPlace, Fault>> KeypointCheck::faultsAtEnd(TextPlace const& place) const {
@@ -104,12 +116,13 @@ std::vector<std::pair<TextPlace, Fault>> KeypointCheck::faultsAtEnd(TextPlace co
     } else if (!_hasTime) {
         faults.push_back({place, {"the keypoint has no time: it counts as 0", true}});
     }
-    if (_isDisabled && _hasValue && !_hasOutput) {
-        faults.push_back(
-            {place, {"the keypoint is disabled but has no output handle: it comes back enabled"}});
+    if (_isDisabled && _hasValue && !_keepsOutput) {
+        faults.push_back({place,
+                          {"the keypoint is disabled but " + std::string(_hasOutput ? "keeps" : "has") +
+                           " no output handle: it comes back enabled"}});
     }
     for (Handle const* const handle : {&_in, &_out}) {
-        if (handle->time) {
+        if (handle->time.value_or(0) != 0) {
             faults.push_back({handle->timePlace,
                               {"no '" + std::string(handle->valueName) + "' stands behind '" +
                                std::string(handle->timeName) + "': it is passed over"}});

@@ -39,6 +39,8 @@ private:
     Fault faultOfTimeOrValue(bool isTime);
     Fault faultOfHandleTime(Handle& handle, TextPlace const& place, std::string_view text);
     Fault faultOfHandle(std::string_view name, double time, double value) const;
+    /// Of a handle that curves of the class have.
+    bool isKept(double time, double value) const;
 
     bool _takesHandles;
     bool _countsFrames;
@@ -46,6 +48,7 @@ private:
     bool _hasTime = false;
     bool _hasValue = false;
     bool _hasOutput = false;
+    bool _keepsOutput = false;
     Handle _in{"inputTangentTime", "inputTangentValue", {}, {}};
     Handle _out{"outputTangentTime", "outputTangentValue", {}, {}};
 };

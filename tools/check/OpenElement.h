@@ -23,6 +23,8 @@ struct OpenElement {
     DocumentWord const* word = nullptr;
     TextPlace place;
     std::string text;
+    /// Whether it has a text, which is lost because another element stands in it.
+    bool hasLostText = false;
     /// Its parts so far, but for those of which there may be several.
     std::vector<DocumentWord const*> parts;
     /// Whether text that is passed over has been told, and nothing has ended it.
@@ -42,6 +44,8 @@ struct OpenElement {
     bool hasKeypoints = false;
     /// As from the first keypoint on, or from their number.
     bool canBeClosed = false;
+    /// Where it says that it is closed.
+    std::optional<TextPlace> closedPlace;
     Tempus lastTime = kTempusInvalid;
     /// Where the last of the limits stands.
     TextPlace limitPlace;
