@@ -124,9 +124,12 @@ TEST_F(AuthorVerbsTest, SetRefusesWhatTheFileCanNotHold) {
     makeBall();
     outputOf({"convert", _folder.write("m.bvh", samples::kSmallMotion), _folder.file("m.lumen")});
     _folder.write("t.csv", "t,X,Y\n0,1,\n1,2,\n");
-    _folder.write("k.lumen", documentOf("<parameter id=\"1\"><parameter name=\"X\" id=\"1\" factoryID=\"3\">"
-                                        "<curve type=\"1\"><keypoint flags=\"2\"><time>0/1</time><value>1"
-                                        "</value></keypoint></curve></parameter></parameter>"));
+    _folder.write("k.lumen",
+                  documentOf("<parameter id=\"1\"><parameter name=\"X\" id=\"1\" factoryID=\"3\">"
+                             "<curve type=\"1\"><keypoint flags=\"2\"><time>0/1</time><value>1"
+                             "</value></keypoint><keypoint enabled=\"0\"><time>2/1</time><value>1"
+                             "</value><outputTangentTime>1</outputTangentTime><outputTangentValue>0"
+                             "</outputTangentValue></keypoint></curve></parameter></parameter>"));
     std::string const convert = "make a document of it with lumenkey convert";
     struct {
         std::string file;
@@ -153,6 +156,7 @@ TEST_F(AuthorVerbsTest, SetRefusesWhatTheFileCanNotHold) {
         {"k.lumen", {"X", "--at", "0", "--delete"}, "the keypoint at 0/1 s is locked"},
         {"k.lumen", {"X", "--at", "0", "--value", "2"}, "the keypoint at 0/1 s is locked"},
         {"k.lumen", {"X", "--at", "1", "--value", "2", "-o", _folder.file("o.lumen")}, ""},
+        {"k.lumen", {"X", "--at", "2", "--value", "2", "-o", _folder.file("o.csv")}, "keypoint is disabled"},
     };
     for (auto const& each : cases) {
         std::string const file = _folder.file(each.file);
@@ -243,6 +247,10 @@ TEST_F(AuthorVerbsTest, DiffSeesPeaksOfAMomentOrderAndNames) {
     EXPECT_TRUE(
         outputOf({"diff", linear, steps}, 1).starts_with("changed X: by up to 999.000000 units, at "));
 
+    std::string const nan = _folder.write(
+        "nan.lumen", samples::replaced(contentOf(linear), "<value>1000</value>", "<value>nan</value>"));
+    EXPECT_TRUE(outputOf({"diff", linear, nan}, 1).starts_with("changed X: by up to inf units, at "));
+
     std::vector<std::string> ages{"15", programPath(), "diff"};
     for (char const* const last : {"1", "2"}) {
         ages.push_back(_folder.write(
@@ -280,6 +288,17 @@ TEST_F(AuthorVerbsTest, OtherFilesBecomeDocuments) {
     std::string const table = _folder.write("t.csv", "time,X,Y\n0,1,2\n1,3,4\n");
     outputOf({"remove", table, "Y", "-o", out});
     EXPECT_EQ(outputOf({"diff", table, out}, 1), "removed Y\n");
+    EXPECT_NE(complaintOf({"remove", table, "Z", "-o", out}, 2).find("in " + table), std::string::npos);
+    std::string const frames = _folder.write(
+        "frames.lumen",
+        documentOf("<parameter id=\"1\"><parameter name=\"X\" id=\"1\" factoryID=\"3\"><curve type=\"1\">"
+                   "<keypoint interpolation=\"1\"><time>0</time><value>1</value></keypoint>"
+                   "<keypoint interpolation=\"1\"><time>24</time><value>3</value></keypoint>"
+                   "</curve></parameter></parameter>",
+                   "4.1"));
+    EXPECT_EQ(outputOf({"diff", frames, table, "--frame-rate", "24"}, 1).find("by up to"), std::string::npos);
+    EXPECT_NE(complaintOf({"diff", table, motion, "--frame-rate", "24"}, 2).find("neither file is one"),
+              std::string::npos);
     for (std::string const& file : {motion, table}) {
         EXPECT_NE(complaintOf({"remove", file, "./1", "--in-place"}, 2).find("write one with -o OUT.lumen"),
                   std::string::npos);

@@ -48,9 +48,14 @@ TEST(TextForms, ShowsWhatTerminalsActOn) {
     EXPECT_EQ(printableText("\x1b\x7f\u0080\u009F|\u061C\u200E\u200F\u2028\u202E\u2066\u2069"),
               "\\x1b\\x7f\\xc2\\x80\\xc2\\x9f|\\xd8\\x9c\\xe2\\x80\\x8e\\xe2\\x80\\x8f\\xe2\\x80\\xa8"
               "\\xe2\\x80\\xae\\xe2\\x81\\xa6\\xe2\\x81\\xa9");
-    // Their neighbours, and what is cut.
-    std::string const shown = "\u00A0\u061B\u061D\u200D\u2010\u2027\u202F\u2065\u206A\xE2\x80";
-    EXPECT_EQ(printableText(shown), shown);
+    std::string const neighbours =
+        "\u00A0\u061B\u061D\u200D\u2010\u2027\u202F\u2065\u206A\uD7FF\uE000\uFDCF\uFFFD\U0010FFFD";
+    EXPECT_EQ(printableText(neighbours), neighbours);
+    // What is no character: cut, overlong, a half of a pair, beyond the last, never to be one.
+    EXPECT_EQ(printableText("\xE2\x80|\x9B|\xC1\x81|\xE0\x9F\xBF|\xED\xA0\x80|\xF4\x90\x80\x80|\uFFFE"),
+              "\\xe2\\x80|\\x9b|\\xc1\\x81|\\xe0\\x9f\\xbf|\\xed\\xa0\\x80|\\xf4\\x90\\x80\\x80|"
+              "\\xef\\xbf\\xbe");
+    EXPECT_EQ(tools::quoted(std::string(39, 'a') + "\u00E9b"), "'" + std::string(39, 'a') + "...'");
 }
 
 TEST(Table, AlignsColumnsByCharacters) {

@@ -91,6 +91,8 @@ TEST_F(RewriteTest, LosesNothingUnlessForced) {
          "5:1: the attribute 'foo' is unknown"},
         {curved("type=\"1\"", "\n<closed>1</closed>" + keypoint("0/1", "1")),
          "5:1: there are no keypoints yet that it would close"},
+        {curved("type=\"1\"", "<numberOfKeypoints>0</numberOfKeypoints>\n<closed>1</closed>"),
+         "5:1: there are no keypoints that it would close"},
         {"<parameter name=\"P\" id=\"2\" factoryID=\"5\"><foldFlags>16777216</foldFlags></parameter>",
          "documents leave out the channel 'P.X'"},
         {"<parameter name=\"P\" id=\"2\" factoryID=\"5\"><parameter name=\"X\" id=\"1\" "
@@ -167,10 +169,13 @@ TEST_F(RewriteTest, TablesMissNoKeypointThatIsSeen) {
                        {keypoint("1/1", "2") + first, "0/1", "1/1,1,2\n"}};
     for (auto const& each : cases) {
         write("<parameter id=\"1\"><parameter name=\"X\" id=\"1\" factoryID=\"3\"><curve type=\"1\">" +
-              each.keypoints + "</curve></parameter></parameter>");
+              each.keypoints +
+              "</curve></parameter><parameter name=\"Y\" id=\"2\" factoryID=\"3\"><curve "
+              "type=\"1\">" +
+              disabled + "</curve></parameter></parameter>");
         if (*each.missed != '\0') {
             EXPECT_NE(complaintOf({"convert", _file, table})
-                          .find(std::string("'X' has another at ") + each.missed + " s"),
+                          .find(std::string("one of 'X' at ") + each.missed + " s has no place"),
                       std::string::npos);
         }
         outputOf({"convert", _file, table, *each.missed != '\0' ? "--force" : "--frame-rate=30"});
@@ -182,6 +187,9 @@ TEST_F(RewriteTest, SimplifyKeepsToItsToleranceBesideTheKeypoints) {
     // The last of several at one time shows behind them alone.
     expectKeypointsAfter({{{"simplify", "--tolerance", "0.01"}, "0/1 0; 1/1 10; 1/1 20; "}},
                          keypoint("0/1", "0") + keypoint("1/1", "10") + keypoint("1/1", "20"));
+    // No distance is within it beside what is no number.
+    expectKeypointsAfter({{{"simplify", "--tolerance", "9", "--force"}, "0/1 0; 1/1 null; 2/1 1; "}},
+                         keypoint("0/1", "0") + keypoint("1/1", "nan") + keypoint("2/1", "1"));
 
     // A curve goes on as it ends, to the end of the stretch that another has.
     std::string bow;
@@ -250,6 +258,9 @@ TEST_F(RewriteTest, EveryKeypointCounts) {
          {{"reverse", "--from", "1", "--to", "2"}, "0/1 1 off; 1/1 4; 2/1 3; 2/1 2; 4/1 5 off; "},
          {{"retime", "--factor", "2", "--to", "1"}, "0/1 1 off; 2/1 2; 2/1 3; 4/1 5 off; "}},
         body);
+    // What was sampled is seen.
+    expectKeypointsAfter({{{"bake", "--step", "1"}, "0/1 1; 1/1 1; 2/1 3; "}},
+                         keypoint("0/1", "5", "enabled=\"0\"") + keypoint("1/1", "1") + keypoint("2/1", "3"));
     // Of those that stand out of order too.
     expectKeypointsAfter({{{"offset", "--by", "1/2", "--from", "1", "--to", "2"},
                            "0/1 0; 3/2 2; 3/2 4; 5/2 1; 5/2 3; 4/1 5; "}},

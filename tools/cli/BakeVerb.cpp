@@ -52,9 +52,20 @@ public:
         double const scale = scaleOfFit(curve, stretch.step);
         curve.bakeCurve(nullptr, stretch.start, stretch.step, stretch.end, _tolerance * scale * hundredths,
                         scale);
+        enableFirst(curve, stretch.start);
     }
 
 private:
+    /// The first sample goes into the keypoint that is there.
+    static void enableFirst(KFCurve& curve, Tempus const& start) {
+        void* handle = nullptr;
+        bool isLocked = false;
+        if (curve.getKeypointHandle(start, &handle) && curve.isLockedKeypoint(handle, &isLocked) &&
+            !isLocked) {
+            curve.enableKeypoint(handle, true, true);
+        }
+    }
+
     /// Makes values small beside a step. The fit measures along the curve, and so it measures time: where
     /// values weigh more, handles between two samples come out too short or too long, and the curve swings.
     static double scaleOfFit(KFCurve& curve, Tempus const& step) {

@@ -25,7 +25,7 @@ ChannelFile openWithProgress(InputOptions const& options) {
     }
     Progress bar("reading");
     ChannelFile opened = openChannelFile(options.file, bar.teller(), frameDuration);
-    if (frameDuration && opened.format != ChannelFormat::Document) {
+    if (frameDuration && opened.format != ChannelFormat::Document && !options.isRateForDocumentsAlone) {
         throw UsageError{"--frame-rate is for documents: '" + options.file + "' has a rate of its own"};
     }
     return opened;
@@ -54,6 +54,9 @@ void ChannelInput::failForName(std::string const& text) const {
     // As much of each name is compared as the text has of its own.
     auto const parts = static_cast<std::size_t>(std::count(text.begin(), text.end(), '.')) + 1;
     NearMatch match(text);
+    if (tree().isChannel(ChannelTree::kTop)) {
+        match.offer(tree().dottedName(ChannelTree::kTop));
+    }
     for (ChannelTree::Node node = ChannelTree::kTop + 1; node < tree().count() && match.wantsMore(); ++node) {
         match.offer(tree().trailingName(node, parts, kLongestNearName));
     }

@@ -23,6 +23,8 @@ inline constexpr char const* kChannelHelp = "Channels or folders: names with dot
 struct InputOptions {
     std::string file;
     std::string frameRate;
+    /// Whether a file of another kind than a document passes over the rate.
+    bool isRateForDocumentsAlone = false;
 
     /// Declares FILE and `--frame-rate`.
     void add(CLI::App& verb);

@@ -53,9 +53,9 @@ void writeForBash(std::vector<Verb> const& verbs, OutputSink& out) {
               "    local word=\"${COMP_WORDS[COMP_CWORD]}\" options='' values=''\n"
               "    COMPREPLY=()\n"
               "    if [ \"$COMP_CWORD\" -eq 1 ]; then\n"
-              "        COMPREPLY=($(compgen -W '" +
+              "        mapfile -t COMPREPLY < <(compgen -W '" +
               names +
-              " --help --version' -- \"$word\"))\n"
+              " --help --version' -- \"$word\")\n"
               "        return\n"
               "    fi\n"
               "    case \"${COMP_WORDS[1]}\" in\n" +
@@ -74,12 +74,12 @@ void writeForBash(std::vector<Verb> const& verbs, OutputSink& out) {
               "       esac ;;\n"
               "    esac\n"
               "    if [ -n \"$values\" ]; then\n"
-              "        COMPREPLY=($(compgen -W \"$values\" -- \"$word\"))\n"
+              "        mapfile -t COMPREPLY < <(compgen -W \"$values\" -- \"$word\")\n"
               "        return\n"
               "    fi\n"
               "    case \"$word\" in\n"
-              "    -*) COMPREPLY=($(compgen -W \"$options\" -- \"$word\")) ;;\n"
-              "    *) local IFS=$'\\n'; COMPREPLY=($(compgen -f -- \"$word\")) ;;\n"
+              "    -*) mapfile -t COMPREPLY < <(compgen -W \"$options\" -- \"$word\") ;;\n"
+              "    *) mapfile -t COMPREPLY < <(compgen -f -- \"$word\") ;;\n"
               "    esac\n"
               "}\n"
               "complete -o filenames -F _lumenkey lumenkey\n");

@@ -3,6 +3,7 @@
 #include "tools/cli/ChannelInput.h"
 #include "tools/cli/EditVerb.h"
 #include "tools/cli/Progress.h"
+#include "tools/cli/UsageError.h"
 #include "tools/compare/TreeDifference.h"
 #include "tools/export/ChannelFileWriter.h"
 #include "tools/output/JsonWriter.h"
@@ -91,8 +92,12 @@ void makeAlike(ChannelInput& input, ChannelInput const& other, std::string const
 }
 
 int runDiff(DiffOptions const& options, OutputSink& out) {
-    ChannelInput before(options.before);
-    ChannelInput after(InputOptions{options.after, options.before.frameRate});
+    std::string const& rate = options.before.frameRate;
+    ChannelInput before(InputOptions{options.before.file, rate, true});
+    ChannelInput after(InputOptions{options.after, rate, true});
+    if (!rate.empty() && !isDocument(before) && !isDocument(after)) {
+        throw UsageError{"--frame-rate is for documents, and neither file is one"};
+    }
     bool const areDocuments = isDocument(before) && isDocument(after);
     makeAlike(before, after, options.before.file);
     makeAlike(after, before, options.after);

@@ -18,7 +18,8 @@ void OutputOptions::add(CLI::App& verb) {
 
 void addForceOption(CLI::App& verb, bool& force) {
     verb.add_flag("--force", force,
-                  "Write a document anew also without what lumenkey check says is passed over in it");
+                  "Write a document anew also without what lumenkey check says is passed over in it, and a "
+                  "table also without the keypoints that it can't hold");
 }
 
 std::optional<ChannelFormat> OutputOptions::check(std::string const& file) const {

@@ -96,6 +96,9 @@ private:
         if (isMotion && _at && isOffset(*file.tree, file.tree->parent(node))) {
             refuseFor(file, "an offset is the same in every frame");
         }
+        if (_at && !_options.remove && isDisabledAt(file, node)) {
+            refuseFor(file, "the keypoint is disabled, and " + such + " has what is seen");
+        }
         if (isMotion && _options.remove) {
             refuseFor(file, "a BVH has a value in every frame");
         }
@@ -107,6 +110,11 @@ private:
             refuseFor(file, "a BVH has values at its frames alone, which are " +
                                 timeText(file.frameDuration) + " s apart");
         }
+    }
+
+    bool isDisabledAt(ChannelFile const& file, ChannelTree::Node node) const {
+        void* const handle = keypointAt(file.tree->channel(node), _at->resolve(file.frameDuration));
+        return handle != nullptr && !readKeypoint(*file.tree->spline(node), handle).enabled;
     }
 
     static bool isFrame(Tempus const& time, Tempus const& duration) {

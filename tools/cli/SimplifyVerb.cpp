@@ -56,14 +56,15 @@ public:
         KFCurve& curve = *channel.getCurveInterface();
         std::unique_ptr<KFCurveInterface> const copy(curve.cloneCurve());
         auto& before = static_cast<KFCurve&>(*copy);
-        TimeSpan const seen = seenOf(curve, span);
+        std::vector<Tempus> const beside = timesBeside(curve, span);
         for (std::uint32_t attempt = 0; attempt < kAttempts; ++attempt) {
             fit(curve, span, _step.step() / (1U << attempt), _tolerance * (1 - 0.05 * attempt));
             if (curve.getNumberOfKeypoints() >= before.getNumberOfKeypoints()) {
                 break;
             }
-            CurveChange change = changeBetween(before, curve, seen, _comparedStep);
+            CurveChange change = changeBetween(before, curve, _stretch, _comparedStep);
             compareAtKeypoints(before, curve, change);
+            compareAtTimes(beside, before, curve, change);
             if (change.most <= _tolerance) {
                 return;
             }
@@ -75,13 +76,18 @@ public:
 private:
     static constexpr std::uint32_t kAttempts = 6;
 
-    /// The stretch, also where the curve has no keypoints any more. Where it ends with the curve, something of
-    /// what lies beside: of several keypoints at one time that alone shows the last.
-    TimeSpan seenOf(KFCurve& curve, TimeSpan const& edited) const {
+    /// Beside the curve where the stretch ends with it: of several keypoints at one time that alone shows the
+    /// last.
+    std::vector<Tempus> timesBeside(KFCurve& curve, TimeSpan const& edited) const {
         KeypointEnds const ends = *keypointEnds(curve.getSpline());
-        return {ends.first < edited.from ? _stretch.from
-                                         : TempusMinimum(_stretch.from, ends.first - _comparedStep),
-                ends.last > edited.to ? _stretch.to : TempusMaximum(_stretch.to, ends.last + _comparedStep)};
+        std::vector<Tempus> times;
+        if (!(ends.first < edited.from)) {
+            times.push_back(ends.first - _comparedStep);
+        }
+        if (!(edited.to < ends.last)) {
+            times.push_back(ends.last + _comparedStep);
+        }
+        return times;
     }
 
     static void fit(KFCurve& curve, TimeSpan const& span, Tempus const& step, double tolerance) {

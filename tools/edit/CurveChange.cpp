@@ -4,6 +4,7 @@
 
 #include <algorithm>
 #include <cmath>
+#include <limits>
 #include <utility>
 #include <vector>
 
@@ -13,6 +14,16 @@ namespace {
 
 constexpr std::size_t kValuesAtOnce = 65'536;
 
+/// Infinite where only one of them is a number, or they are different infinities.
+double distanceBetween(double old, double now) {
+    double const apart = std::abs(now - old);
+    if (!std::isnan(apart)) {
+        return apart;
+    }
+    bool const isSame = std::isnan(old) ? std::isnan(now) : old == now;
+    return isSame ? 0 : std::numeric_limits<double>::infinity();
+}
+
 void compareAt(SampleTimes const& times, KFCurve& before, KFCurve& after, CurveChange& change) {
     std::vector<double> old(std::min(times.count(), kValuesAtOnce));
     std::vector<double> now(old.size());
@@ -21,7 +32,7 @@ void compareAt(SampleTimes const& times, KFCurve& before, KFCurve& after, CurveC
         times.readValues(before, first, number, old.data());
         times.readValues(after, first, number, now.data());
         for (std::size_t i = 0; i < number; ++i) {
-            double const apart = std::abs(now[i] - old[i]);
+            double const apart = distanceBetween(old[i], now[i]);
             if (apart > change.most) {
                 change = {apart, times.at(first + i)};
             }
@@ -70,6 +81,10 @@ void compareAtKeypoints(KFCurve& before, KFCurve& after, CurveChange& change) {
         }
         times.push_back(keypoints[i]);
     }
+    compareAtTimes(std::move(times), before, after, change);
+}
+
+void compareAtTimes(std::vector<Tempus> times, KFCurve& before, KFCurve& after, CurveChange& change) {
     compareAt(SampleTimes::list(std::move(times)), before, after, change);
 }
 

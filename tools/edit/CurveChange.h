@@ -4,13 +4,14 @@
 #include "tools/edit/KeypointStretch.h"
 
 #include <cstdint>
+#include <vector>
 
 namespace lumenkey::tools {
 
 /// In each step of a sampled curve, curves are compared at so many times.
 inline constexpr std::int32_t kComparedPerStep = 10;
 
-/// Where two curves lie farthest apart.
+/// Where two curves lie farthest apart: infinitely where only one is a number.
 struct CurveChange {
     double most = 0;
     /// The first such time.
@@ -29,5 +30,7 @@ CurveChange changeBetween(KFCurve& before, KFCurve& after, TimeSpan const& span,
 /// Compares them too at all keypoints of both, and between and just beside these: there `changeBetween` may
 /// see nothing of a step or a peak that is narrower than its own.
 void compareAtKeypoints(KFCurve& before, KFCurve& after, CurveChange& change);
+/// Likewise at some times.
+void compareAtTimes(std::vector<Tempus> times, KFCurve& before, KFCurve& after, CurveChange& change);
 
 } // namespace lumenkey::tools

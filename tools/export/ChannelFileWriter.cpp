@@ -27,14 +27,15 @@ constexpr double kNoValue = std::numeric_limits<double>::quiet_NaN();
 
 /// The keypoints of a channel that are seen, in the order of time, one at a time.
 struct KeypointColumn {
+    Node channel;
     std::vector<Tempus> times;
     std::vector<double> values;
     /// Those that have no place in a column: behind a later one, or at the time of another.
     std::vector<Tempus> others;
 };
 
-KeypointColumn keypointsOf(KFSpline* spline) {
-    KeypointColumn column;
+KeypointColumn keypointsOf(Node channel, KFSpline* spline) {
+    KeypointColumn column{channel, {}, {}, {}};
     if (spline == nullptr) {
         return column;
     }
@@ -119,15 +120,17 @@ void writeRows(std::vector<std::vector<double>> const& columns, std::vector<Temp
     }
 }
 
-/// All channels; of a document only those with keypoints, if there are any: it has many others.
-std::vector<Node> channelsOfTable(ChannelFile const& file) {
-    std::vector<Node> all = file.tree->channelsBelow(ChannelTree::kTop);
-    if (file.format != ChannelFormat::Document) {
-        return all;
+/// All channels; of a document only those with keypoints that are seen, if there are any: it has many others.
+std::vector<KeypointColumn> columnsOfTable(ChannelFile const& file) {
+    std::vector<KeypointColumn> columns;
+    for (Node const channel : file.tree->channelsBelow(ChannelTree::kTop)) {
+        columns.push_back(keypointsOf(channel, file.tree->spline(channel)));
     }
-    std::vector<Node> keyed = all;
-    std::erase_if(keyed, [&](Node node) { return file.tree->curve(node).getNumberOfKeypoints() == 0; });
-    return keyed.empty() ? all : keyed;
+    auto const isEmpty = [](KeypointColumn const& column) { return column.times.empty(); };
+    if (file.format == ChannelFormat::Document && !std::all_of(columns.begin(), columns.end(), isEmpty)) {
+        std::erase_if(columns, isEmpty);
+    }
+    return columns;
 }
 
 /// A table has times of one kind that ascend, and text.
@@ -139,10 +142,10 @@ void requireReadable(FileToWrite const& wanted, std::string const& name, Keypoin
                           "a table can't hold the time of a keypoint of '" + printableText(name) + "'"};
     }
     if (!column.others.empty() && !wanted.acceptsLoss) {
-        throw OutputError{wanted.target, "a table holds one keypoint at a time, in the order of time, and '" +
-                                             printableText(name) + "' has another at " +
-                                             timeText(column.others.front()) +
-                                             " s; --force writes it without"};
+        throw OutputError{wanted.target,
+                          "a table holds one keypoint at a time, in the order of time: one of '" +
+                              printableText(name) + "' at " + timeText(column.others.front()) +
+                              " s has no place in it; --force writes it without"};
     }
     if (name.find('\0') != std::string::npos) {
         throw OutputError{wanted.target, "a table can't hold the name '" + printableText(name) + "'"};
@@ -151,34 +154,32 @@ void requireReadable(FileToWrite const& wanted, std::string const& name, Keypoin
 
 WrittenRows writeTable(FileToWrite const& wanted, OutputSink& out, ReadingProgress const& progress) {
     ChannelTree& tree = *wanted.file.tree;
-    std::vector<Node> const channels = channelsOfTable(wanted.file);
-    if (channels.empty()) {
+    std::vector<KeypointColumn> const keypoints = columnsOfTable(wanted.file);
+    if (keypoints.empty()) {
         throw OutputError{wanted.target, "it has no channels, of which a table must have one"};
     }
-    std::vector<KeypointColumn> keypoints;
     CsvWriter csv(out);
     csv.field("time");
     csv.field("seconds");
-    for (Node const channel : channels) {
-        std::string const name = tree.dottedName(channel);
-        keypoints.push_back(keypointsOf(tree.spline(channel)));
-        requireReadable(wanted, name, keypoints.back());
+    for (KeypointColumn const& column : keypoints) {
+        std::string const name = tree.dottedName(column.channel);
+        requireReadable(wanted, name, column);
         csv.name(name);
     }
     csv.endRow();
     bool const isByKeypoints =
         wanted.rows == RowsOf::Keypoints || wanted.file.format == ChannelFormat::Document;
     std::vector<Tempus> const times = isByKeypoints ? timesOfKeypoints(keypoints) : timesOfInput(wanted.file);
-    checkWrittenValues(wanted, times.size(), channels.size());
+    checkWrittenValues(wanted, times.size(), keypoints.size());
     std::vector<bool> isEdited(tree.count());
     for (Node const channel : wanted.edited) {
         isEdited[channel] = true;
     }
     std::vector<std::vector<double>> columns;
-    for (std::size_t i = 0; i < channels.size(); ++i) {
-        columns.push_back(isByKeypoints || !isEdited[channels[i]]
-                              ? cellsOfKeypoints(keypoints[i], times)
-                              : cellsOfCurve(keypoints[i], tree.curve(channels[i]), times));
+    for (KeypointColumn const& column : keypoints) {
+        columns.push_back(isByKeypoints || !isEdited[column.channel]
+                              ? cellsOfKeypoints(column, times)
+                              : cellsOfCurve(column, tree.curve(column.channel), times));
     }
     writeRows(columns, times, csv, progress);
     csv.finish();
@@ -276,6 +277,7 @@ ChannelFile asDocument(ChannelFile const& file, std::string const& name) {
     writeWholeDocument({file, ChannelFormat::Document, RowsOf::Input, {}, name}, document, {});
     ChannelFile opened = openChannelText(document.text(), name);
     opened.document.text = document.text();
+    opened.file = file.file;
     return opened;
 }
 

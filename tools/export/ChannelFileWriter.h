@@ -51,14 +51,15 @@ struct WrittenRows {
 ///
 /// A table has times, seconds, and a column for each channel. A cell is empty where its channel has nothing
 /// to say: with the rows of the keypoints where it has no keypoint; with those of the input, for an edited
-/// channel, outside its keypoints. Of a document only channels with keypoints have a column, unless none has
-/// any, and a row stands at each keypoint.
+/// channel, outside its keypoints. Of a document only channels with keypoints that aren't disabled have
+/// a column, unless none has any, and a row stands at each of these.
 ///
 /// A document holds the tree; that of a motion, its skeleton too (`SkeletonChannels`). One that comes from
 /// another document, in which something was passed over, isn't written: see `FileToWrite::acceptsLoss`.
 WrittenRows writeChannelFile(FileToWrite const& wanted, ReadingProgress const& progress = {});
 
-/// The file as it is once it is written as a document. `name` is that of the document, which ends as such do.
+/// The file as it is once it is written as a document. `name` is that of the document, which ends as such do;
+/// its own name stays, by which people know it.
 ChannelFile asDocument(ChannelFile const& file, std::string const& name);
 
 /// Throws `OutputError` for more than `kMostWrittenValues`.

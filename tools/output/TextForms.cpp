@@ -4,7 +4,9 @@
 #include <array>
 #include <charconv>
 #include <cmath>
+#include <cstdint>
 #include <cstring>
+#include <iterator>
 #include <numeric>
 
 namespace lumenkey::tools {
@@ -20,34 +22,57 @@ std::string textOf(NumberBuffer const& buffer, std::to_chars_result result) {
 
 char lowerCase(char c) { return c >= 'A' && c <= 'Z' ? static_cast<char>(c - 'A' + 'a') : c; }
 
-/// In UTF-8, the first and the last of those that follow one another: controls, and what sets or parts lines
-/// without being seen.
-struct UnseenCharacters {
-    std::string_view first;
-    std::string_view last;
-};
-constexpr UnseenCharacters kUnseen[] = {
-    {"\xC2\x80", "\xC2\x9F"},         // U+0080 to U+009F, as terminals take them
-    {"\xD8\x9C", "\xD8\x9C"},         // U+061C, of a direction
-    {"\xE2\x80\x8E", "\xE2\x80\x8F"}, // U+200E and U+200F, likewise
-    {"\xE2\x80\xA8", "\xE2\x80\xAE"}, // U+2028 to U+202E: ends of lines, and stretches of a direction
-    {"\xE2\x81\xA6", "\xE2\x81\xA9"}, // U+2066 to U+2069, likewise
+/// Of a character.
+struct Decoded {
+    /// 0 where the front of a text is no character.
+    std::size_t size;
+    std::uint32_t code;
 };
 
-/// How many bytes at the front of a text, which isn't empty, are such a character; 0 for none.
-std::size_t unseenAtFront(std::string_view text) {
-    auto const byte = static_cast<unsigned char>(text.front());
-    if (byte < 0x20 || byte == 0x7F) {
-        return 1;
+/// The character at the front of a text in UTF-8 that isn't empty.
+Decoded decodedFront(std::string_view text) {
+    auto const lead = static_cast<unsigned char>(text.front());
+    if (lead < 0x80) {
+        return {1, lead};
     }
-    for (auto const& [first, last] : kUnseen) {
-        std::string_view const front = text.substr(0, first.size());
-        // Views compare bytes as unsigned.
-        if (first <= front && front <= last) {
-            return front.size();
+    std::size_t const size = lead >= 0xF0 ? 4 : lead >= 0xE0 ? 3 : 2;
+    if (lead < 0xC2 || lead > 0xF4 || text.size() < size) {
+        return {0, 0};
+    }
+    std::uint32_t code = lead & (0x7Fu >> size);
+    for (char const c : text.substr(1, size - 1)) {
+        auto const next = static_cast<unsigned char>(c);
+        if ((next & 0xC0) != 0x80) {
+            return {0, 0};
         }
+        code = code << 6 | (next & 0x3Fu);
     }
-    return 0;
+    constexpr std::uint32_t least[] = {0x80, 0x800, 0x10000};
+    bool const isSurrogate = code >= 0xD800 && code <= 0xDFFF;
+    return code < least[size - 2] || isSurrogate || code > 0x10FFFF ? Decoded{0, 0} : Decoded{size, code};
+}
+
+/// The first and the last of those that follow one another: controls, what sets or parts lines without being
+/// seen, and what is no character.
+struct UnseenCharacters {
+    std::uint32_t first;
+    std::uint32_t last;
+};
+constexpr UnseenCharacters kUnseen[] = {
+    {0x00, 0x1F},     {0x7F, 0x9F}, // as terminals take them
+    {0x61C, 0x61C},                 // of a direction
+    {0x200E, 0x200F},               // likewise
+    {0x2028, 0x202E},               // ends of lines, and stretches of a direction
+    {0x2066, 0x2069},               // likewise
+    {0xFDD0, 0xFDEF},
+};
+
+bool isUnseen(std::uint32_t code) {
+    constexpr std::uint32_t noCharacter = 0xFFFE; // at the end of each plane, and the one behind it
+    return (code & noCharacter) == noCharacter ||
+           std::any_of(std::begin(kUnseen), std::end(kUnseen), [code](UnseenCharacters const& some) {
+               return some.first <= code && code <= some.last;
+           });
 }
 
 } // namespace
@@ -105,17 +130,19 @@ std::string printableText(std::string_view text) {
     constexpr std::string_view hexadecimal = "0123456789abcdef";
     std::string printable;
     while (!text.empty()) {
-        std::size_t const unseen = unseenAtFront(text);
-        if (unseen == 0) {
-            printable += text.front();
+        Decoded const front = decodedFront(text);
+        std::string_view const bytes = text.substr(0, std::max<std::size_t>(front.size, 1));
+        text.remove_prefix(bytes.size());
+        if (front.size != 0 && !isUnseen(front.code)) {
+            printable += bytes;
+            continue;
         }
-        for (char const c : text.substr(0, unseen)) {
+        for (char const c : bytes) {
             auto const byte = static_cast<unsigned char>(c);
             printable += "\\x";
             printable += hexadecimal[byte >> 4];
             printable += hexadecimal[byte & 0xF];
         }
-        text.remove_prefix(std::max<std::size_t>(unseen, 1));
     }
     return printable;
 }
@@ -124,7 +151,11 @@ std::string quoted(std::string_view text) {
     constexpr std::size_t longest = 40;
     bool const isLong = text.size() > longest;
     std::string result(1, '\'');
-    result.append(text.substr(0, longest)).append(isLong ? "...'" : "'");
+    std::size_t size = std::min(text.size(), longest);
+    while (isLong && size > 0 && (static_cast<unsigned char>(text[size]) & 0xC0) == 0x80) {
+        --size; // back to where a character begins
+    }
+    result.append(text.substr(0, size)).append(isLong ? "...'" : "'");
     return result;
 }
 

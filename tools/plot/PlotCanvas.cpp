@@ -22,29 +22,6 @@ constexpr char const* kFont = "DejaVu Sans";
 
 double reachable(double coordinate) { return std::clamp(coordinate, -kFarthest, kFarthest); }
 
-/// Cairo takes UTF-8 only and fails for good on anything else.
-std::string drawableText(std::string const& text) {
-    std::string drawable = printableText(text);
-    for (std::size_t i = 0; i < drawable.size();) {
-        auto const lead = static_cast<unsigned char>(drawable[i]);
-        std::size_t const length = lead < 0x80   ? 1
-                                   : lead < 0xC2 ? 0
-                                   : lead < 0xE0 ? 2
-                                   : lead < 0xF0 ? 3
-                                   : lead < 0xF5 ? 4
-                                                 : 0;
-        bool isSound = length != 0 && i + length <= drawable.size();
-        for (std::size_t j = 1; isSound && j < length; ++j) {
-            isSound = (static_cast<unsigned char>(drawable[i + j]) & 0xC0) == 0x80;
-        }
-        if (!isSound) {
-            drawable[i] = '?';
-        }
-        i += isSound ? length : 1;
-    }
-    return drawable;
-}
-
 } // namespace
 
 std::optional<PlotFormat> plotFormatOf(std::string_view file) {
@@ -196,7 +173,7 @@ void PlotCanvas::selectFont(PlotText const& style) {
 double PlotCanvas::textWidth(std::string const& text, PlotText const& style) {
     selectFont(style);
     cairo_text_extents_t extents;
-    cairo_text_extents(_context.get(), drawableText(text).c_str(), &extents);
+    cairo_text_extents(_context.get(), printableText(text).c_str(), &extents);
     return extents.x_advance;
 }
 
@@ -213,7 +190,7 @@ void PlotCanvas::text(PlotPoint at, std::string const& text, PlotText const& sty
     }
     cairo_move_to(context, -shift, 0);
     setColour(style.colour);
-    cairo_show_text(context, drawableText(text).c_str());
+    cairo_show_text(context, printableText(text).c_str());
     cairo_new_path(context);
     cairo_restore(context);
 }

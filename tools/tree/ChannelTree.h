@@ -24,7 +24,7 @@ enum class ValueType { Double, Angle };
 /// here, IDs count from 1 among the children of each folder, in the order in which they are added.
 ///
 /// The dotted name of a node is the names from the top's children down to it, with dots between them:
-/// `Hips.LeftLeg.Xrotation`. Names may hold dots themselves. The top has no dotted name.
+/// `Hips.LeftLeg.Xrotation`. Names may hold dots themselves. A top that is a folder has no dotted name.
 class ChannelTree {
 public:
     using Node = std::size_t;
