@@ -198,16 +198,20 @@ TEST_F(CheckVerbTest, FindsWhatIsOddWithItsPlace) {
     EXPECT_EQ(findingsIn("<!DOCTYPE kfml><kfml/>"), "1:15: a document type declaration, which is refused\n");
     std::string deep;
     for (int i = 0; i < 1'001; ++i) {
-        deep += "<parameter id=\"1\" factoryID=\"1\">";
+        deep += "<parameter id=\"1\" factoryID=\"1\">\n";
     }
-    std::string const found = findingsIn(documentOf(deep));
-    EXPECT_LT(found.find("more than 990 elements deep"), found.find("more than 1000 deep"))
-        << "not in the order of the text";
+    EXPECT_EQ(findingsIn(documentOf(deep)), "993:1: nodes lie more than 990 elements deep in each other\n"
+                                            "1002:1: elements lie more than 1000 deep in each other\n");
     EXPECT_EQ(findingsIn(contentOf(LUMENKEY_TEST_SOURCE_DIR "/tests/data/version2.lumen")), "");
-    EXPECT_EQ(findingsIn(documentOf("<parameter factoryID=\"3\"><fadeInOffset>1/2</fadeInOffset>\n"
-                                    "<fadeOutOffset>3</fadeOutOffset></parameter>",
-                                    "4.1")),
-              "4:1: '3' is no time\n");
+    EXPECT_EQ(
+        findingsIn(documentOf("<parameter factoryID=\"3\"><fadeInOffset>1/2</fadeInOffset>\n"
+                              "<fadeOutOffset>3</fadeOutOffset><curve type=\"1\"><keypoint><time>1</time>\n"
+                              "<value>1</value><inputTangentValue>nan</inputTangentValue></keypoint>"
+                              "</curve></parameter>",
+                              "4.1")),
+        "4:1: '3' is no time\n"
+        "5:17: 'nan' is no number\n"
+        "5:17: 'inputTangentValue' is nan, which is kept as no handle\n");
     // Old also where spaces stand in front of the version.
     std::string const old = contentOf(LUMENKEY_TEST_SOURCE_DIR "/tests/data/version4.lumen");
     EXPECT_EQ(findingsIn(samples::replaced(old, "\"4.1\"", "\" 4.1\"")), "");
@@ -245,9 +249,22 @@ TEST_F(CheckVerbTest, TellsWhatBecomesOfChannelsAsAWhole) {
         {"<parameter id=\"1\" factoryID=\"5\">\n<parameter name=\"E\" id=\"9\" factoryID=\"3\"/>\n"
          "<parameter name=\"Y\" id=\"2\"/>\n<parameter name=\"X\" id=\"1\"/></parameter>",
          "5:1: the channel 'E' is put behind 'X', which its folder has in front of it\n"},
+        // By the name that the class gives.
+        {"<parameter id=\"1\" factoryID=\"5\">\n<parameter name=\"E\" id=\"9\" factoryID=\"3\"/>\n"
+         "<parameter name=\"Odd\" id=\"1\"/></parameter>",
+         "5:1: the channel 'E' is put behind 'X', which its folder has in front of it\n"
+         "6:1: the channel 'X' is a part of its folder, which makes it: the name 'Odd' is passed over\n"},
         {"<parameter id=\"1\" factoryID=\"5\"><parameter name=\"Y\" id=\"2\"/>"
-         "<parameter name=\"E\" id=\"9\" factoryID=\"3\"/></parameter>",
-         ""},
+         "<parameter name=\"E\" id=\"9\" factoryID=\"3\"/><parameter name=\"F\" id=\"10\" factoryID=\"3\"/>\n"
+         "<parameter name=\"Y\" id=\"2\"/></parameter>",
+         "5:1: the channel 'Y' has the ID 2 of one before it: it is read into that one\n"},
+        // Two roots lock it, and the place is that of what says it.
+        {"<factory id=\"6\" uuid=\"F9D8D555-F368-43E8-8960-02C38CEFF6DF\"/><parameter id=\"1\">\n"
+         "<locked>1</locked><parameter name=\"R\" id=\"1\" factoryID=\"6\"><flags>28</flags>\n"
+         "<enabled>1</enabled><locked>1</locked>\n<parameter name=\"A\" id=\"1\" factoryID=\"3\"/>"
+         "</parameter></parameter>",
+         "5:60: documents leave out the channel 'R'\n"
+         "7:1: the channel isn't locked: the object root above it locks it\n"},
     };
     std::string const rewritten = _folder.file("rewritten.lumen");
     for (auto const& each : cases) {
