@@ -10,6 +10,7 @@
 #include <gtest/gtest.h>
 
 #include <functional>
+#include <limits>
 #include <set>
 
 namespace {
@@ -135,6 +136,19 @@ TEST(Digest, IsBlindForWhatIsNotState) {
         Subject changed;
         changes[i](changed);
         EXPECT_EQ(changed.root.getHash(), before) << "change " << i;
+    }
+}
+
+TEST(Digest, IsBlindForLimitsThatDocumentsDoNotKeep) {
+    constexpr double infinite = std::numeric_limits<double>::infinity();
+    KFChannelBool boolean(false, "Boolean", nullptr, 1, 0);
+    KFChannelDouble endless(0.0, "Endless", nullptr, 1, 0);
+    std::tuple<KFChannel*, double, double> const cases[] = {{&boolean, 1, 0}, {&endless, infinite, infinite}};
+    for (auto const& [channel, value, most] : cases) {
+        channel->setInitialValue(value, false);
+        Digest const before = channel->getHash();
+        channel->createLocalChannelImplementation()->getCurve()->setAbsoluteMaxValueV(most);
+        EXPECT_EQ(channel->getHash(), before) << value;
     }
 }
 

@@ -208,6 +208,7 @@ TEST_F(Reading, KeepsWhatStandsInDataOutOfTheFolder) {
 
 TEST_F(Reading, LocksARootBehindItsChildren) {
     OwnedTree const root(new KFChannelObjectRootBase("Root", nullptr, 1, 0, 0));
+    root->setFlags(0);
     ASSERT_TRUE(readDocument(
         *root, documentWith("<timing in='1/1' out='2/1' offset='3/1'/><baseFlags>4294967295</baseFlags>"
                             "<enabled>0</enabled><locked>1</locked><foldFlags>131072</foldFlags>"
@@ -218,6 +219,7 @@ TEST_F(Reading, LocksARootBehindItsChildren) {
     EXPECT_FALSE(root->isEnabled(false, false));
     EXPECT_EQ(root->getFoldFlags(), 131072U) << "a root takes the class's bits too";
     EXPECT_EQ(root->getFlags() >> 32, 0U);
+    EXPECT_TRUE(root->testFlag(kChannelFlagIsObjectRoot)) << "whatever its flags were";
     EXPECT_EQ(read.getTimeExtent().start, TempusMake(1, 1));
     EXPECT_EQ(read.getTimeExtent().duration, TempusMake(31, 30)) << "the last frame is one more";
     EXPECT_EQ(read.getTimeOffset(), TempusMake(3, 1));
