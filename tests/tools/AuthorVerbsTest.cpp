@@ -283,6 +283,7 @@ TEST_F(AuthorVerbsTest, OtherFilesBecomeDocuments) {
     std::string const converted = _folder.file("converted.lumen");
     outputOf({"convert", motion, converted});
     EXPECT_EQ(outputOf({"diff", motion, converted}), "") << "with the skeleton, which a motion's tree hasn't";
+    EXPECT_EQ(outputOf({"diff", converted, motion}), "");
     outputOf({"add", motion, "Hips", "Double", "Weight", "--value", "2", "-o", out});
     EXPECT_EQ(outputOf({"diff", converted, out}, 1), "added   Hips.Weight\n");
     std::string const table = _folder.write("t.csv", "time,X,Y\n0,1,2\n1,3,4\n");

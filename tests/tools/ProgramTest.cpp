@@ -408,7 +408,8 @@ TEST_F(ProgramTest, ManualAndCompletionAreMadeOfTheSameTexts) {
     std::string const script = _folder.write("completion", runLumenkey({"completion", "bash"}).out);
     EXPECT_TRUE(manual.starts_with(".TH LUMENKEY 1"));
     EXPECT_EQ(manual.find("\n'"), std::string::npos) << "a line that begins like a request of the formatter";
-    for (char const* const word : {"Tell how two files differ", "\\-\\-in\\-place", "lumenkey diff A B"}) {
+    for (char const* const word :
+         {"Tell how two files differ", "\\-\\-in\\-place", "lumenkey diff A B", "\\-\\-version"}) {
         EXPECT_NE(manual.find(word), std::string::npos) << word;
     }
     auto const completionsOf = [&](std::string const& words, int count) {

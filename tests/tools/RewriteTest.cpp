@@ -1,6 +1,7 @@
 // What a document keeps when the program writes it anew.
 
 #include "tests/tools/DocumentSamples.h"
+#include "tests/tools/MotionSamples.h"
 #include "tests/tools/RunProgram.h"
 #include "tests/tools/TestFolder.h"
 
@@ -181,6 +182,11 @@ TEST_F(RewriteTest, TablesMissNoKeypointThatIsSeen) {
         outputOf({"convert", _file, table, *each.missed != '\0' ? "--force" : "--frame-rate=30"});
         EXPECT_EQ(contentOf(table), std::string("time,seconds,X\n") + each.rows);
     }
+    // Where it isn't in a table at all, that matters also of one that would be missed.
+    write("<parameter id=\"1\"><parameter name=\"X\" id=\"1\" factoryID=\"3\"><curve type=\"1\">" + first +
+          keypoint("-infinity", "2") + "</curve></parameter></parameter>");
+    EXPECT_NE(complaintOf({"convert", _file, table, "--force"}).find("can't hold the time"),
+              std::string::npos);
 }
 
 TEST_F(RewriteTest, SimplifyKeepsToItsToleranceBesideTheKeypoints) {
@@ -191,17 +197,30 @@ TEST_F(RewriteTest, SimplifyKeepsToItsToleranceBesideTheKeypoints) {
     expectKeypointsAfter({{{"simplify", "--tolerance", "9", "--force"}, "0/1 0; 1/1 null; 2/1 1; "}},
                          keypoint("0/1", "0") + keypoint("1/1", "nan") + keypoint("2/1", "1"));
 
-    // A curve goes on as it ends, to the end of the stretch that another has.
-    std::string bow;
-    for (int i = 0; i <= 30; ++i) {
-        bow += keypoint((std::to_string(i) + "/30").c_str(), std::to_string(i * (60 - i)).c_str());
+    auto const frames = [](int first, int (*value)(int)) {
+        std::string all;
+        for (int i = first; i <= first + 30; ++i) {
+            all += keypoint((std::to_string(i) + "/30").c_str(), std::to_string(value(i)).c_str());
+        }
+        return all;
+    };
+    // A curve goes on as it ends, to both ends of the stretch that another has.
+    for (auto const& [bow, end] : {std::pair(frames(0, [](int i) { return i * (60 - i); }), "20/1"),
+                                   std::pair(frames(-30, [](int i) { return i * (60 + i); }), "-20/1")}) {
+        write("<parameter id=\"1\"><parameter id=\"1\" factoryID=\"3\"><curve type=\"1\">"
+              "<preExtrapolation>1</preExtrapolation><postExtrapolation>1</postExtrapolation>" +
+              bow + "</curve></parameter><parameter id=\"2\" factoryID=\"3\"><curve type=\"1\">" +
+              keypoint(end, "0") + "</curve></parameter></parameter>");
+        Json const edited = jsonOf({"simplify", _file, "./1", "--tolerance", "5", "--in-place"});
+        EXPECT_LE(edited["channels"][0]["worstError"], 5) << end;
     }
-    write("<parameter id=\"1\"><parameter id=\"1\" factoryID=\"3\"><curve type=\"1\">"
-          "<postExtrapolation>1</postExtrapolation>" +
-          bow + "</curve></parameter><parameter id=\"2\" factoryID=\"3\"><curve type=\"1\">" +
-          keypoint("20/1", "0") + "</curve></parameter></parameter>");
-    Json const edited = jsonOf({"simplify", _file, "./1", "--tolerance", "5", "--in-place"});
-    EXPECT_LE(edited["channels"][0]["worstError"], 5);
+
+    // A peak between the ten times in a frame.
+    auto const zero = [](int) { return 0; };
+    write("<parameter id=\"1\" factoryID=\"3\"><curve type=\"1\">" + frames(-30, zero) +
+          keypoint("1/1000", "50") + keypoint("2/1000", "0") + frames(1, zero) + "</curve></parameter>");
+    outputOf({"simplify", _file, "--tolerance", "0.01", "--in-place"});
+    EXPECT_NE(keypointsOf("./").find("1/1000 50; "), std::string::npos);
 }
 
 TEST_F(RewriteTest, OddTextsStayWithoutForce) {
@@ -236,10 +255,16 @@ TEST_F(RewriteTest, TheTopHasItsAttributesToo) {
     EXPECT_EQ(top["start"], 0.5);
     EXPECT_EQ(jsonOf({"info", _file})["channelNames"][0], "P");
     EXPECT_EQ(jsonOf({"sample", _file, "P", "--count", "1"})["series"][0]["channel"], "P");
-    write("<parameter name=\"R\" id=\"1\" flags=\"4\"><parameter name=\"X\" id=\"1\" factoryID=\"3\" "
+    std::string const other =
+        _folder.write("other.lumen", samples::replaced(contentOf(_file), "\"P\"", "\"Q\""));
+    EXPECT_EQ(outputOf({"diff", _file, other}, 1), "changed ./: name P became Q\n");
+    // A folder's name isn't that of a channel.
+    write("<parameter name=\"X\" id=\"1\" flags=\"4\"><parameter name=\"X\" id=\"1\" factoryID=\"3\" "
           "value=\"7\"/></parameter>");
     EXPECT_EQ(jsonOf({"tree", _file})["nodes"][1]["start"], 7.0);
     EXPECT_NE(runLumenkey({"set", _file, "X", "--value", "1"}).err.find("is locked"), std::string::npos);
+    write("<parameter id=\"1\" factoryID=\"3\"/>");
+    EXPECT_EQ(jsonOf({"info", _file})["channelNames"][0], "./");
 }
 
 TEST_F(RewriteTest, EveryKeypointCounts) {
