@@ -240,6 +240,17 @@ TEST(BXXMLReadStream, EndsHandlersAndScopesWithTheirElement) {
               "( 1 2'' ) 1:15: a handler refused an element");
 }
 
+TEST(BXXMLReadStream, HasNothingLeftToSkipAtAnEnd) {
+    EXPECT_EQ(reading("<kfml><group><leaf/></group><leaf>a</leaf><leaf>b</leaf></kfml>",
+                      [](BXSerializerReadStream& stream, BXStreamElement& element) {
+                          if (element.tag() != 91) {
+                              stream.skipElement();
+                          }
+                          return true;
+                      }),
+              "( 91 1 2'a' 2'b' ) ");
+}
+
 TEST(BXXMLReadStream, FindsAttributesByTheScopesOfTheMoment) {
     std::string found;
     auto const ask = [&](BXSerializerReadStream& stream, BXStreamElement& element) {

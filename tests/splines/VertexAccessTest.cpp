@@ -104,6 +104,8 @@ TEST_F(KFSplineAccessTest, TypesOfAllVertices) {
     EXPECT_EQ(curve.typeOfAll(), 10u) << "a parametric spline is of one type, locks or not";
     curve->setInterpolation(100);
     EXPECT_EQ(curve.typeOfAll(), 10u) << "mixed is no type to set";
+    *static_cast<KFStaticVertex*>(keys[2]) = KFStaticVertex(s(2), 1.0);
+    EXPECT_EQ(curve.typeOfAll(), 100u) << "a vertex that is assigned has another type";
 }
 
 TEST_F(KFSplineAccessTest, SpeedsStandForTypes) {
