@@ -4,10 +4,13 @@
 #include "lumenkey/Channels/KFCompoundChannel.h"
 #include "lumenkey/Channels/KFScalarChannels.h"
 #include "tests/Channels/RecordingRoot.h"
+#include "tests/curves/CountedMemory.h"
 
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <bit>
+#include <cstdint>
 #include <deque>
 #include <map>
 #include <memory>
@@ -235,6 +238,23 @@ TEST(KFChannelFolder, KeepsItsOrderAndFindsTheFirstChildOfAnID) {
                 ASSERT_EQ(folders[i].getDescendant(id), found != lists[i].end() ? *found : nullptr) << step;
             }
         }
+    }
+}
+
+TEST(KFChannelFolder, FindsItsChildrenWithoutMemoryForAnIndex) {
+    for (unsigned const indexed : {32U, 33U}) { // the index isn't made, or doesn't grow
+        KFChannelFolder folder("f", nullptr, 1, 0, 0);
+        std::deque<KFChannelDouble> children;
+        for (unsigned id = 1; id <= 300; ++id) {
+            KFChannelDouble& child = children.emplace_back(0.0, "c", nullptr, id, 0);
+            if (id > indexed)
+                refuseAllocationsAfter(std::has_single_bit(id - 1) ? 1 : 0); // what the list grows by
+            folder.push_back(&child);
+            refuseAllocationsAfter(SIZE_MAX);
+        }
+        for (KFChannelDouble& child : children)
+            EXPECT_EQ(folder.getDescendant(child.getID()), &child);
+        folder.removeAllDescendants(false);
     }
 }
 

@@ -3,19 +3,25 @@
 
 #include "tests/curves/CountedMemory.h"
 
+#include <cstdint>
 #include <cstdlib>
 #include <new>
 
 namespace {
 
 thread_local std::size_t allocations = 0;
+thread_local std::size_t given = SIZE_MAX; // blocks, before one is refused
 
 } // namespace
 
 std::size_t allocationsOfThisThread() noexcept { return allocations; }
+void refuseAllocationsAfter(std::size_t count) noexcept { given = count; }
 
 void* operator new(std::size_t size) {
     ++allocations;
+    if (given == 0)
+        throw std::bad_alloc();
+    given -= given == SIZE_MAX ? 0 : 1;
     if (void* const block = std::malloc(size == 0 ? 1 : size))
         return block;
     throw std::bad_alloc();

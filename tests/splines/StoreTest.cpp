@@ -1,6 +1,9 @@
 // What a spline finds among its vertices, against walks over all of them.
 
 #include "lumenkey/splines/KFHandleSet.h"
+#include "lumenkey/splines/KFStaticVertex.h"
+#include "lumenkey/splines/KFVertexStore.h"
+#include "tests/curves/CountedMemory.h"
 #include "tests/splines/museum.h"
 
 #include <gtest/gtest.h>
@@ -382,4 +385,16 @@ TEST(KFSplineStore, NeverFollowsADeadHandle) {
             EXPECT_FALSE(curve->findVertex(0, 300, handle));
         }
     }
+}
+
+TEST(KFVertexStore, KnowsItsHandlesOnceThereIsMemory) {
+    KFVertexStore store;
+    auto* const vertex = new KFStaticVertex(kTempusZero, 0.0);
+    store.append(vertex, false);
+    for (std::size_t const given : {0U, 1U}) {
+        refuseAllocationsAfter(given);
+        EXPECT_THROW(store.contains(vertex), std::bad_alloc);
+        refuseAllocationsAfter(SIZE_MAX);
+    }
+    EXPECT_TRUE(store.contains(vertex));
 }
