@@ -95,7 +95,7 @@ TEST_F(RewriteTest, LosesNothingUnlessForced) {
         {curved("type=\"1\"", "<numberOfKeypoints>0</numberOfKeypoints>\n<closed>1</closed>"),
          "5:1: there are no keypoints that it would close"},
         {"<parameter name=\"P\" id=\"2\" factoryID=\"5\"><foldFlags>16777216</foldFlags></parameter>",
-         "documents leave out the channel 'P.X'"},
+         "by which documents leave out the channels of the folder"},
         {"<parameter name=\"P\" id=\"2\" factoryID=\"5\"><parameter name=\"X\" id=\"1\" "
          "factoryID=\"3\"><flags>8</flags></parameter></parameter>",
          "documents leave out the channel 'P.X'"},

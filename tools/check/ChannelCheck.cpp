@@ -1,5 +1,6 @@
 #include "tools/check/ChannelCheck.h"
 
+#include "lumenkey/Channels/KFChannelFolder.h"
 #include "tools/check/ClassExamples.h"
 
 namespace lumenkey::tools {
@@ -32,7 +33,9 @@ void endChannel(OpenElement& channel, std::vector<OpenElement>& open, DocumentFi
     FlagsCheck const& flags = *channel.flags;
     bool const locks = flags.has(kChannelFlagIsObjectRoot) && flags.has(kChannelFlagLocked);
     findings.take(flags.faultsAtEnd());
-    findings.take(channel.folder.faultsAtEnd(locks, !channel.children.empty()));
+    auto const* const folder = dynamic_cast<KFChannelFolder const*>(channel.example);
+    bool const hasParts = folder != nullptr && folder->getNumberOfDescendants() > 0;
+    findings.take(channel.folder.faultsAtEnd(locks, hasParts || !channel.children.empty()));
     if (flags.has(kChannelFlagNotSaved) && above.name == "parameter") {
         findings.lost(flags.placeOf(kChannelFlagNotSaved),
                       "documents leave out the channel '" + dottedName(channel, open) + "'");

@@ -151,7 +151,8 @@ private:
             _findings.lost(element.place, _classes.faultOfComponent(*component, attributes));
         } else if (std::string const fault = _classes.faultOfClass(attributes, isTop, &element.factory);
                    !fault.empty()) {
-            _findings.lost(element.place, name + fault + ": it is passed over");
+            _findings.lost(element.place,
+                           name + fault + (isTop ? ": the document can't be read" : ": it is passed over"));
             return false;
         }
         element.example = component != nullptr ? component : _classes.of(element.factory);
