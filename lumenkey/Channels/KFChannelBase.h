@@ -152,10 +152,10 @@ public:
     /// A digest of what is seen at `t`; names, IDs and keypoints don't enter.
     virtual void calcHashForState(BXSerializerWriteStream& stream, Tempus const& t);
     /// Reads a document into this channel, which takes its ID; false where it is broken or holds no channel.
-    /// What was read until then stays. So do names of children that are there, whatever the document says, and
-    /// what it doesn't say, but for fades: children, keypoints where its curve has none, limits and ways to go on
-    /// that are as usual in it. Only in a channel made anew is all as it was written. The numbers that an earlier document gave to factories on
-    /// this thread are forgotten.
+    /// What was read until then stays. So do names of children, whatever the document says, and what it doesn't
+    /// say, but for fades: children, keypoints where its curve has none, limits and ways to go on that are as
+    /// usual in it. Only in a channel made anew is all as it was written. The numbers that an earlier document
+    /// gave to factories on this thread are forgotten.
     virtual bool configureWithState(BXData const& state);
 
     /// Announces a change before it is made, to the nearest object root; nothing without one.

@@ -25,6 +25,8 @@ public:
     void copy(KFChannelBase const* other, bool silent) override;
     bool compare(KFChannelBase const* other) const override;
     KFChannelBase* clone() const override;
+    /// Marks its own class alone, which makes its children. Those of others that it may have are marked by
+    /// `createChannelState`; who writes in another way marks them too, else they can't be read anew.
     void markFactoriesForSerialization(BXSerializerWriteStream& stream, bool all) override;
     void willBeModified(unsigned int kind) override;
     bool hasOnlyOneKeypointAt(Tempus const& t) const override;

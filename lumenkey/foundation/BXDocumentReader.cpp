@@ -82,6 +82,10 @@ void BXDocumentReader::start(char const* name, char const* const* attributes) {
         _skippedDepth = _depth;
         return;
     }
+    if (BXHasTooManyAttributes(attributes)) {
+        fail(BXTooManyAttributesText());
+        return;
+    }
     copyAttributes(attributes);
     _text.clear();
     _isPending = true;

@@ -8,8 +8,8 @@
 #include <string>
 #include <string_view>
 
-// How a parser of XML is fed, in blocks, and asked for places. It begins a token that a block cuts off anew with the next one. Blocks as
-// long as what is left over keep that linear, and none reaches past the longest token.
+// How a parser of XML is fed, in blocks, and asked for places. It begins a token that a block cuts off anew with the
+// next one. Blocks as long as what is left over keep that linear, and none reaches past the longest token.
 
 inline constexpr std::uint64_t kFirstParserBlock = 64 << 10;
 inline constexpr std::uint64_t kLongestToken = BXDocumentReader::kLongestText;

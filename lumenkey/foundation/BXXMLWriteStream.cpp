@@ -2,6 +2,7 @@
 
 #include "lumenkey/foundation/BXBlockWriter.h"
 #include "lumenkey/foundation/BXDocumentDepth.h"
+#include "lumenkey/foundation/BXDocumentReader.h"
 #include "lumenkey/foundation/BXTextForms.h"
 
 #include <algorithm>
@@ -17,6 +18,21 @@ constexpr std::string_view kSpaces = "                                ";
 /// What is written in one go: nearly everything.
 constexpr std::size_t kFastDepth = 64;
 constexpr std::size_t kFastName = 64;
+/// What a tag may hold beside its long strings.
+constexpr std::size_t kRoomForShort = std::size_t{64} << 10;
+constexpr std::size_t kShortString = std::size_t{1} << 10;
+
+/// As readers count it: in attributes as it is written, in content behind XML's own escapes.
+std::size_t sizeForReaders(std::string_view text, BXText::Place place) {
+    std::array<char, 8> one{};
+    std::size_t size = text.size();
+    for (std::size_t at = 0; (at = BXText::plainEnd(text, at, place)) != text.size(); ++at) {
+        char const* const end = BXText::escaped(one.data(), text, at);
+        bool const isUndone = place == BXText::Place::Content && one[0] == '&';
+        size += isUndone ? 0 : static_cast<std::size_t>(end - one.data()) - 1;
+    }
+    return size;
+}
 
 } // namespace
 
@@ -51,6 +67,7 @@ private:
     void endStartTag();
     void newLine();
     bool isNewAttribute(std::string_view name);
+    template <typename Value> bool isTooLong(Value const& value, BXText::Place place);
     void fail(std::string_view why);
 
     template <typename Value> void put(Value const& value, BXText::Place) {
@@ -72,6 +89,8 @@ private:
     /// The names of the innermost element's attributes, each behind a zero and followed by one.
     std::string _attributeNames;
     bool _isStartTagOpen = false;
+    /// Of the long strings in the innermost element's tag.
+    std::size_t _tagSize = 0;
     /// Open elements that are left out, the innermost ones.
     std::size_t _leftOutDepth = 0;
     std::string _failure;
@@ -138,6 +157,7 @@ void BXXMLWriteStream::Writer::open(std::uint32_t tag, std::string_view name) {
     }
     _open.push_back({tag, name, Holds::Nothing});
     _attributeNames.clear();
+    _tagSize = 0;
     _isStartTagOpen = true;
 }
 
@@ -220,8 +240,26 @@ bool BXXMLWriteStream::Writer::isNewAttribute(std::string_view name) {
     return false;
 }
 
+/// Of all values only strings can be longer than readers take.
+template <typename Value> bool BXXMLWriteStream::Writer::isTooLong(Value const& value, BXText::Place place) {
+    if constexpr (std::is_same_v<Value, BXString>) {
+        if (value.view().size() <= kShortString) {
+            return false;
+        }
+        std::size_t const size = sizeForReaders(value.view(), place);
+        bool const isContent = place == BXText::Place::Content;
+        std::size_t const most = BXDocumentReader::kLongestText - (isContent ? 0 : kRoomForShort + _tagSize);
+        if (size > most) {
+            fail("a text is longer than readers take");
+            return true;
+        }
+        _tagSize += isContent ? 0 : size;
+    }
+    return false;
+}
+
 template <typename Value> void BXXMLWriteStream::Writer::attribute(std::uint32_t tag, Value const& value) {
-    if (_leftOutDepth != 0) {
+    if (_leftOutDepth != 0 || isTooLong(value, BXText::Place::Attribute)) {
         return;
     }
     bool const hasPlace = _isStartTagOpen && _open.size() > 1;
@@ -247,7 +285,7 @@ template <typename Value> void BXXMLWriteStream::Writer::content(Value const& va
         return;
     }
     if constexpr (std::is_same_v<Value, BXString>) {
-        if (value.empty()) {
+        if (value.empty() || isTooLong(value, BXText::Place::Content)) {
             return;
         }
     }

@@ -7,6 +7,7 @@
 #include "lumenkey/foundation/BXXMLReadStream.h"
 #include "lumenkey/foundation/BXXMLWriteStream.h"
 #include "lumenkey/persistence/ChannelParser.h"
+#include "lumenkey/persistence/KFCompoundMarks.h"
 
 namespace {
 
@@ -27,6 +28,7 @@ BXData KFChannelBase::createChannelState(bool children, bool all) {
     BXBufferWriteStream buffer(kBufferSize, kBufferSize);
     BXXMLWriteStream stream(buffer, kMajorVersion, kMinorVersion);
     markFactoriesForSerialization(stream, false);
+    KFCompoundMarks(stream).markBelow(*this);
     KFFactories::getInstance().saveFactories(stream);
     writeHeader(stream, true);
     writeBody(stream, true, children, all);

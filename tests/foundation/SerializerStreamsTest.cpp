@@ -178,6 +178,31 @@ TEST(BXXMLWriteStream, LeavesOutWhatLiesTooDeepToBeRead) {
     }
 }
 
+TEST(BXXMLWriteStream, LeavesOutWhatIsTooLongToBeRead) {
+    constexpr std::size_t limit = std::size_t{64} << 20;
+    constexpr std::size_t beside = std::size_t{64} << 10; // in a tag
+    struct {
+        std::string attribute;
+        std::string content;
+        bool isWhole;
+    } const cases[] = {{std::string(limit - beside, 'x'), std::string(limit, 'x'), true},
+                       {std::string(limit - beside + 1, 'x'), "short", false},
+                       {"short", std::string(limit + 1, 'x'), false},
+                       {"short", std::string(limit / 4 + 1, '\1'), false},
+                       {"short", std::string(limit / 4 + 1, '<'), true}};
+    for (auto const& each : cases) {
+        BXBufferWriteStream buffer(1024, 1024);
+        BXXMLWriteStream stream(buffer, 5, 13);
+        stream.pushScope(kRootScope);
+        stream.startElement(2);
+        stream.writeAttribute(11, BXString(each.attribute));
+        stream.writeValue(BXString(each.content));
+        EXPECT_EQ(stream.close(), each.isWhole);
+        BXData const data = buffer.takeData();
+        EXPECT_TRUE(BXXMLReadStream(data).parse());
+    }
+}
+
 TEST(BXXMLWriteStream, RemembersThatTheSinkRefused) {
     for (std::size_t const room : {0u, 100u, 40000u, 150000u}) {
         FullSink sink(room);

@@ -154,7 +154,7 @@ void requireReadable(FileToWrite const& wanted, std::string const& name, Keypoin
 
 WrittenRows writeTable(FileToWrite const& wanted, OutputSink& out, ReadingProgress const& progress) {
     ChannelTree& tree = *wanted.file.tree;
-    std::vector<KeypointColumn> const keypoints = columnsOfTable(wanted.file);
+    std::vector<KeypointColumn> keypoints = columnsOfTable(wanted.file);
     if (keypoints.empty()) {
         throw OutputError{wanted.target, "it has no channels, of which a table must have one"};
     }
@@ -169,7 +169,14 @@ WrittenRows writeTable(FileToWrite const& wanted, OutputSink& out, ReadingProgre
     csv.endRow();
     bool const isByKeypoints =
         wanted.rows == RowsOf::Keypoints || wanted.file.format == ChannelFormat::Document;
-    std::vector<Tempus> const times = isByKeypoints ? timesOfKeypoints(keypoints) : timesOfInput(wanted.file);
+    std::vector<Tempus> times = isByKeypoints ? timesOfKeypoints(keypoints) : timesOfInput(wanted.file);
+    if (times.empty() && wanted.file.format == ChannelFormat::Document) {
+        times.push_back(kTempusZero);
+        for (KeypointColumn& column : keypoints) {
+            column.times = times;
+            column.values = {tree.curve(column.channel).getValue(kTempusZero, 0.0)};
+        }
+    }
     checkWrittenValues(wanted, times.size(), keypoints.size());
     std::vector<bool> isEdited(tree.count());
     for (Node const channel : wanted.edited) {
@@ -248,8 +255,8 @@ WrittenRows writeWholeDocument(FileToWrite const& wanted, OutputSink& out, Readi
     }
     writeDocument(tree.base(ChannelTree::kTop), out, tree.count() + keypoints,
                   isLookedThrough ? partOf(progress, 0.5, 1) : progress);
-    std::optional<BXTimeRange> const keyed = tree.keyedRange();
-    return {keypoints, keyed ? keyed->start : kTempusZero};
+    std::optional<KeypointEnds> const keyed = tree.keyedRange();
+    return {keypoints, keyed ? keyed->first : kTempusZero};
 }
 
 WrittenRows writeAs(FileToWrite const& wanted, OutputSink& out, ReadingProgress const& progress) {

@@ -52,7 +52,7 @@ struct WrittenRows {
 /// A table has times, seconds, and a column for each channel. A cell is empty where its channel has nothing
 /// to say: with the rows of the keypoints where it has no keypoint; with those of the input, for an edited
 /// channel, outside its keypoints. Of a document only channels with keypoints that aren't disabled have
-/// a column, unless none has any, and a row stands at each of these.
+/// a column, and a row stands at each of these; where none has any, all have, and one row is for time zero.
 ///
 /// A document holds the tree; that of a motion, its skeleton too (`SkeletonChannels`). One that comes from
 /// another document, in which something was passed over, isn't written: see `FileToWrite::acceptsLoss`.

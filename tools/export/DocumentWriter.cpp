@@ -1,12 +1,10 @@
 #include "tools/export/DocumentWriter.h"
 
-#include "lumenkey/Channels/KFChannelFolder.h"
 #include "lumenkey/Channels/KFFactories.h"
 #include "lumenkey/foundation/BXStream.h"
 #include "lumenkey/foundation/BXXMLWriteStream.h"
-#include "tools/tree/ChannelClass.h"
+#include "lumenkey/persistence/KFCompoundMarks.h"
 
-#include <cstdint>
 #include <exception>
 #include <string_view>
 
@@ -65,29 +63,13 @@ private:
     std::exception_ptr _thrown;
 };
 
-/// A compound marks the class of nothing below it. What its class doesn't make couldn't be read again so.
-void markBelowCompounds(KFChannelBase& channel, BXXMLWriteStream& stream) {
-    auto* const folder = dynamic_cast<KFChannelFolder*>(&channel);
-    if (folder == nullptr || folder->getDescendants() == nullptr) {
-        return;
-    }
-    std::size_t components = folder->isCompoundChannel() ? componentCountOf(*folder) : SIZE_MAX;
-    for (KFChannelBase* const child : *folder->getDescendants()) {
-        if (components == 0) {
-            child->markFactoriesForSerialization(stream, false);
-        }
-        components -= components == 0 ? 0 : 1;
-        markBelowCompounds(*child, stream);
-    }
-}
-
 } // namespace
 
 void writeDocument(KFChannelBase& top, OutputSink& out, std::size_t count, ReadingProgress const& progress) {
     SinkStream sink(out, count, progress);
     BXXMLWriteStream stream(sink, kWrittenMajor, kWrittenMinor);
     top.markFactoriesForSerialization(stream, false);
-    markBelowCompounds(top, stream);
+    KFCompoundMarks(stream).markBelow(top);
     KFFactories::getInstance().saveFactories(stream);
     top.writeHeader(stream, true);
     top.writeBody(stream, true, true, true);

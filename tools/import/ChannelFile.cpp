@@ -61,9 +61,9 @@ ChannelFile openDocument(DocumentFile document, std::string const& file,
     opened.frameDuration = frameDuration ? *frameDuration : frameDurationOf(*opened.tree);
     opened.firstTime = kTempusZero;
     opened.lastTime = kTempusZero;
-    if (std::optional<BXTimeRange> const keyed = opened.tree->keyedRange()) {
-        opened.firstTime = keyed->start;
-        opened.lastTime = TempusRangeGetEnd(*keyed);
+    if (std::optional<KeypointEnds> const keyed = opened.tree->keyedRange()) {
+        opened.firstTime = keyed->first;
+        opened.lastTime = keyed->last;
     }
     opened.duration = opened.lastTime - opened.firstTime;
     return opened;

@@ -1,7 +1,6 @@
 #include "tools/tree/ChannelClass.h"
 
 #include "lumenkey/Channels/KFChannelFactories.h"
-#include "lumenkey/Channels/KFChannelFolder.h"
 #include "lumenkey/Channels/KFFactories.h"
 #include "tools/output/TextForms.h"
 
@@ -77,12 +76,6 @@ std::vector<std::string> storedClassNames() {
 std::unique_ptr<KFChannelBase> exampleOf(KFFactory* factory) {
     auto* const maker = dynamic_cast<KFChannelFactory*>(factory);
     return std::unique_ptr<KFChannelBase>(maker == nullptr ? nullptr : maker->createChannel("", 1));
-}
-
-std::size_t componentCountOf(KFChannelFolder const& folder) {
-    std::unique_ptr<KFChannelBase> const example = exampleOf(folder.getFactory());
-    auto const* const like = dynamic_cast<KFChannelFolder const*>(example.get());
-    return like == nullptr ? 0 : like->getNumberOfDescendants();
 }
 
 std::string_view unitOf(KFChannelBase const& channel) {

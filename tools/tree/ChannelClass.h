@@ -7,7 +7,6 @@
 #include <string_view>
 #include <vector>
 
-class KFChannelFolder;
 class KFFactory;
 
 namespace lumenkey::tools {
@@ -30,9 +29,6 @@ std::vector<std::string> storedClassNames();
 /// A new channel of a class, to ask it what the class is like; null for a class that makes none, and for
 /// null.
 std::unique_ptr<KFChannelBase> exampleOf(KFFactory* factory);
-
-/// How many children a folder's class makes for itself; they stand in front of all others.
-std::size_t componentCountOf(KFChannelFolder const& folder);
 
 /// `rad` for angles, else `units`.
 std::string_view unitOf(KFChannelBase const& channel);

@@ -1,6 +1,6 @@
 #include "tools/tree/ChannelTree.h"
 
-#include "tools/curve/Keypoint.h"
+#include "lumenkey/persistence/KFCompoundMarks.h"
 #include "tools/tree/FileRoot.h"
 
 #include <algorithm>
@@ -61,7 +61,7 @@ void ChannelTree::adoptBelow(Node node) {
         return;
     }
     std::vector<KFChannelBase*> const children = *above->getDescendants();
-    std::size_t const components = componentCountOf(*above);
+    std::size_t const components = KFComponentCountOf(*above);
     for (std::size_t i = 0; i < children.size(); ++i) {
         std::unique_ptr<KFChannelBase> owned(i < components ? nullptr : children[i]);
         adoptBelow(add(node, children[i], std::move(owned)));
@@ -153,17 +153,16 @@ std::vector<ChannelTree::Node> ChannelTree::channelsBelow(Node node) const {
     return channels;
 }
 
-std::optional<BXTimeRange> ChannelTree::keyedRange() const {
-    std::optional<BXTimeRange> range;
-    Tempus last{};
+std::optional<KeypointEnds> ChannelTree::keyedRange() const {
+    std::optional<KeypointEnds> range;
     for (Node const node : channelsBelow(kTop)) {
         if (curve(node).getNumberOfKeypoints() == 0) {
             continue;
         }
         if (std::optional<KeypointEnds> const ends = keypointEnds(spline(node))) {
-            last = range ? TempusMaximum(last, ends->last) : ends->last;
-            Tempus const first = range ? TempusMinimum(range->start, ends->first) : ends->first;
-            range = BXTimeRange{first, last - first};
+            range = range ? KeypointEnds{TempusMinimum(range->first, ends->first),
+                                         TempusMaximum(range->last, ends->last)}
+                          : *ends;
         }
     }
     return range;

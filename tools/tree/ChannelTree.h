@@ -4,6 +4,7 @@
 #include "lumenkey/Channels/KFScalarChannels.h"
 #include "lumenkey/curves/KFCurve.h"
 #include "lumenkey/splines/KFSpline.h"
+#include "tools/curve/Keypoint.h"
 #include "tools/tree/ChannelClass.h"
 
 #include <cstddef>
@@ -89,7 +90,7 @@ public:
     std::string_view unit(Node node) const { return unitOf(base(node)); }
     /// The time of the first keypoint of all, and of the last, as their curves count time; nothing without
     /// any.
-    std::optional<BXTimeRange> keyedRange() const;
+    std::optional<KeypointEnds> keyedRange() const;
 
     // Names. Each costs as much as the name is long, or the node deep.
 
