@@ -144,8 +144,13 @@ TEST_F(CheckVerbTest, FindsWhatIsOddWithItsPlace) {
          "10:55: 'nan' is no number\n"
          "10:95: 'nan' is no number\n"
          "10:95: 'inputTangentValue' is nan, which is kept as no handle\n"
-         "11:1: 'outputTangentValue' is 1e-09, which is kept as no handle\n"
-         "12:1: 'bias' stands behind the output handle, which disables the keypoint: it is passed over\n"},
+         "11:1: 'outputTangentValue' is 1e-09, which is kept as no handle\n"},
+        {"<parameter id=\"1\" factoryID=\"3\"><curve type=\"1\">\n<keypoint enabled=\"0\"><time>0/1</time>"
+         "<value>1</value><outputTangentValue>2</outputTangentValue>\n<bias>2</bias></keypoint>\n"
+         "<numberOfKeypoints>99999999999</numberOfKeypoints></curve></parameter>",
+         "6:1: 'bias' stands behind the output handle, which disables the keypoint: it is passed over\n"
+         "7:1: the number 99999999999 is out of the limits of 'numberOfKeypoints', 0 to 4294967295\n"
+         "7:1: the number stands behind keypoints, which it clears\n"},
         {"<parameter id=\"1\" factoryID=\"4294967299\">\n<curve type=\"1\">\n<min>3<shiny/></min>\n<value>5"
          "</value>\n<numberOfKeypoints>few</numberOfKeypoints></curve></parameter>",
          "4:1: the attribute 'factoryID' is 4294967299, which is out of the limits, 0 to 4294967295\n"

@@ -283,6 +283,14 @@ TEST_F(RewriteTest, EveryKeypointCounts) {
          {{"reverse", "--from", "1", "--to", "2"}, "0/1 1 off; 1/1 4; 2/1 3; 2/1 2; 4/1 5 off; "},
          {{"retime", "--factor", "2", "--to", "1"}, "0/1 1 off; 2/1 2; 2/1 3; 4/1 5 off; "}},
         body);
+    write("<parameter name=\"X\" id=\"1\" factoryID=\"3\"><curve type=\"1\">" +
+          keypoint("1/2147483647", "0") + keypoint("1/2", "1") + "</curve></parameter>");
+    EXPECT_NE(
+        complaintOf({"offset", _file, "--by", "9223372036854775807/1", "--in-place"}, 2).find("no place"),
+        std::string::npos);
+    EXPECT_NE(complaintOf({"retime", _file, "--factor", "1/2147483647", "--in-place"}, 2).find("to one time"),
+              std::string::npos);
+    EXPECT_EQ(keypointsOf("./"), "1/2147483647 0; 1/2 1; ");
     // What was sampled is seen.
     expectKeypointsAfter({{{"bake", "--step", "1"}, "0/1 1; 1/1 1; 2/1 3; "}},
                          keypoint("0/1", "5", "enabled=\"0\"") + keypoint("1/1", "1") + keypoint("2/1", "3"));

@@ -63,8 +63,10 @@ private:
     void loseText(OpenElement& above) {
         if (above.word != nullptr && above.word->text != TextKind::None && !above.hasLostText) {
             above.hasLostText = true;
-            _findings.lost(above.place,
-                           "another element stands in '" + above.name + "': its text is passed over");
+            bool const isNeeded = above.word->parent != "factory" && above.name != "numberOfKeypoints";
+            _findings.take({above.place,
+                            "another element stands in '" + above.name + "': its text is passed over",
+                            isNeeded});
         }
     }
 
@@ -102,7 +104,7 @@ private:
             constexpr std::uint32_t firstWithTimes = 5;
             std::uint32_t major = firstWithTimes;
             std::uint32_t minor = 0;
-            KFReadVersion(attributeOf(attributes, "version"), major, minor);
+            KFReadVersion(readString(attributeOf(attributes, "version")), major, minor);
             _countsFrames = major < firstWithTimes;
         } else if (element.name == "factory") {
             _findings.take(element.place, _classes.readFactory(attributes));
@@ -114,7 +116,8 @@ private:
         } else if (element.name == "timing" && !_countsFrames) {
             _findings.take(element.place, faultOfTiming(*_open.back().example, attributes));
         } else if (element.name == "keypoint") {
-            element.keypoint.emplace(attributes, _open.back().curveClass, _countsFrames);
+            element.keypoint.emplace(attributes, _open.back().curveClass, _countsFrames,
+                                     _open.back().hasSeen);
             _findings.take({element.place, faultOfInterpolation(attributes),
                             !readWhole(attributeOf(attributes, "interpolation"))});
         }
@@ -224,7 +227,12 @@ private:
                             "the number " + element.text + " is out of the limits of '" + element.name +
                                 "', 0 to " + std::to_string(element.word->greatest),
                             !isKept});
-        } else if (element.word->parent == "curve") {
+        }
+        bool const isCount = element.name == "numberOfKeypoints"; // of which the low bits count
+        if (isBeyond(*element.word, element.text) && !isCount) {
+            return;
+        }
+        if (element.word->parent == "curve") {
             endPartOfCurve(element);
         } else if (element.word->parent == "keypoint") {
             endPartOfKeypoint(element);
@@ -275,6 +283,7 @@ private:
             _findings.lost(element.place, faultOfLimit(element.name, limit, curve.curveClass));
         } else if (element.name == "keypoint") {
             curve.hasKeypoints = true;
+            curve.hasSeen |= element.keypoint->isSeen();
             curve.canBeClosed = true;
             _findings.take(element.keypoint->faultsAtEnd(element.place));
         } else if (element.name == "numberOfKeypoints") {

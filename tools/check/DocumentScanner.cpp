@@ -123,8 +123,9 @@ private:
     }
 
     void start(char const* name, char const** pairs) {
-        if (++_depth > kGreatestDepth) {
-            _scanner.fault(place(), BXTooDeepText());
+        bool const isTooDeep = ++_depth > kGreatestDepth;
+        if (isTooDeep || BXHasTooManyAttributes(pairs)) {
+            _scanner.fault(place(), isTooDeep ? BXTooDeepText() : BXTooManyAttributesText());
             stop();
             return;
         }

@@ -24,10 +24,12 @@ Fault leftOut(std::string_view name, double number, std::string const& usual) {
 
 } // namespace
 
-KeypointCheck::KeypointCheck(Attributes const& attributes, CurveClass const& curve, bool countsFrames)
+KeypointCheck::KeypointCheck(Attributes const& attributes, CurveClass const& curve, bool countsFrames,
+                             bool isBehindSeen)
     : _takesHandles(curve.derivesTangents || readWhole(attributeOf(attributes, "interpolation")) ==
                                                  std::uint64_t{kKFInterpolationLinearToo}),
-      _countsFrames(countsFrames), _isDisabled(readBool(attributeOf(attributes, "enabled")) == false) {}
+      _countsFrames(countsFrames), _isDisabled(readBool(attributeOf(attributes, "enabled")) == false),
+      _isBehindSeen(isBehindSeen) {}
 
 bool KeypointCheck::keepsNan(std::string_view part) {
     return part == "value" || part.starts_with("input") || part.starts_with("output");
@@ -49,22 +51,26 @@ Fault KeypointCheck::faultOfPart(TextPlace const& place, std::string_view name, 
     double const time = isHandle ? std::exchange(handle.time, std::nullopt).value_or(0) : 0;
     double const number = canBeRead ? *readNumberOrNan(text) : 0;
     if (name == _out.valueName && _hasValue && !wasDisabled) {
-        _keepsOutput = _takesHandles && isKept(std::max(time, 0.0), number);
+        constexpr double framesInSecond = 1000; // more than there are in any
+        double const seconds = _countsFrames ? time / framesInSecond : time;
+        _keepsOutput = _takesHandles && isKept(std::max(seconds, 0.0), number, true);
     }
     if (!canBeRead) {
         return {};
     }
     std::string const quoted = "'" + std::string(name) + "'";
-    if (!_hasValue) {
+    double const usual = name == "bias" ? 1 : 0;
+    if (!_hasValue && (isHandle || number != usual)) {
         return {quoted + " stands in front of the value, where it comes too early"};
     }
-    if (wasDisabled && name != "normal") {
+    // The bias is taken unless nothing of the curve is seen.
+    bool const isTaken = name == "normal" || (name == "bias" && (_isBehindSeen || number == usual));
+    if (wasDisabled && !isTaken) {
         return {quoted + " stands behind the output handle, which disables the keypoint: it is passed over"};
     }
     if (isHandle) {
         return faultOfHandle(name, time, number);
     }
-    double const usual = name == "bias" ? 1 : 0;
     return isLeftOut(number, usual) ? leftOut(name, number, shortestText(usual)) : Fault();
 }
 
@@ -95,17 +101,17 @@ Fault KeypointCheck::faultOfHandle(std::string_view name, double time, double va
     if (!_takesHandles) {
         return {"curves of this class have no handles: '" + std::string(name) + "' is passed over"};
     }
-    if (isKept(time, value)) {
+    if (isKept(time, value, !_countsFrames)) {
         return {};
     }
     Handle const& handle = name == _in.valueName ? _in : _out;
     return value == 0 ? leftOut(handle.timeName, time, "no handle") : leftOut(name, value, "no handle");
 }
 
-bool KeypointCheck::isKept(double time, double value) const {
+bool KeypointCheck::isKept(double time, double value, bool isInSeconds) {
     bool const isLong = std::fabs(time) >= kLeastWritten || std::fabs(value) >= kLeastWritten;
     // How short a handle in frames is depends on how long a frame is.
-    bool const isKnown = !_countsFrames || std::isnan(time) || std::isnan(value);
+    bool const isKnown = isInSeconds || std::isnan(time) || std::isnan(value);
     return isLong || (!isKnown && (time != 0 || value != 0));
 }
 

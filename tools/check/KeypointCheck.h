@@ -14,13 +14,15 @@ namespace lumenkey::tools {
 /// Looks through the parts of a keypoint in their order, in which a reader acts on them.
 class KeypointCheck {
 public:
-    /// Of a keypoint with these attributes in a curve of this class.
-    KeypointCheck(Attributes const& attributes, CurveClass const& curve, bool countsFrames);
+    /// Of a keypoint with these attributes in a curve of this class, behind one that is seen or not.
+    KeypointCheck(Attributes const& attributes, CurveClass const& curve, bool countsFrames,
+                  bool isBehindSeen);
 
     /// Of values and handles.
     static bool keepsNan(std::string_view part);
 
     bool hasValue() const { return _hasValue; }
+    bool isSeen() const { return _hasValue && !(_isDisabled && _hasOutput); }
 
     /// A part of the keypoint that has ended, and whether its text can be read, be it as nan.
     Fault faultOfPart(TextPlace const& place, std::string_view name, std::string_view text, bool canBeRead);
@@ -39,12 +41,13 @@ private:
     Fault faultOfTimeOrValue(bool isTime);
     Fault faultOfHandleTime(Handle& handle, TextPlace const& place, std::string_view text);
     Fault faultOfHandle(std::string_view name, double time, double value) const;
-    /// Of a handle that curves of the class have.
-    bool isKept(double time, double value) const;
+    /// Of a handle that curves of the class have, unless it is known to be too short.
+    static bool isKept(double time, double value, bool isInSeconds);
 
     bool _takesHandles;
     bool _countsFrames;
     bool _isDisabled;
+    bool _isBehindSeen;
     bool _hasTime = false;
     bool _hasValue = false;
     bool _hasOutput = false;

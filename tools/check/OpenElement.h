@@ -42,6 +42,8 @@ struct OpenElement {
     CurveClass curveClass;
     CurveLimits limits;
     bool hasKeypoints = false;
+    /// Whether one of them is enabled.
+    bool hasSeen = false;
     /// As from the first keypoint on, or from their number.
     bool canBeClosed = false;
     /// Where it says that it is closed.

@@ -1,9 +1,11 @@
 #include "tools/cli/EditVerb.h"
 
 #include "tools/cli/UsageError.h"
+#include "tools/curve/Keypoint.h"
 
 #include <CLI/CLI.hpp>
 #include <cmath>
+#include <vector>
 
 namespace lumenkey::tools {
 
@@ -50,19 +52,21 @@ public:
         KFCurve& curve = *channel.getCurveInterface();
         OutsideKept const kept(curve, {stretch.start, stretch.last});
         double const scale = scaleOfFit(curve, stretch.step);
+        removeUnseenAt(curve, stretch.start);
         curve.bakeCurve(nullptr, stretch.start, stretch.step, stretch.end, _tolerance * scale * hundredths,
                         scale);
-        enableFirst(curve, stretch.start);
     }
 
 private:
-    /// The first sample goes into the keypoint that is there.
-    static void enableFirst(KFCurve& curve, Tempus const& start) {
-        void* handle = nullptr;
-        bool isLocked = false;
-        if (curve.getKeypointHandle(start, &handle) && curve.isLockedKeypoint(handle, &isLocked) &&
-            !isLocked) {
-            curve.enableKeypoint(handle, true, true);
+    /// What isn't seen changes no sample, and would be in the way of the keypoint for the first.
+    static void removeUnseenAt(KFCurve& curve, Tempus const& start) {
+        KFSpline* const spline = curve.getSpline();
+        for (void* const handle : spline == nullptr ? std::vector<void*>() : everyKeypointHandle(*spline)) {
+            Keypoint const key = readKeypoint(*spline, handle);
+            bool isLocked = false;
+            if (key.time == start && !key.enabled && curve.isLockedKeypoint(handle, &isLocked) && !isLocked) {
+                curve.delKeypoint(handle, true);
+            }
         }
     }
 

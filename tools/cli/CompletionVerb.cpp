@@ -48,7 +48,7 @@ void writeForBash(std::vector<Verb> const& verbs, OutputSink& out) {
         names += (names.empty() ? "" : " ") + verb.arguments->get_name();
         cases += "    " + verb.arguments->get_name() + ") options='" + optionsOf(*verb.arguments) + "' ;;\n";
     }
-    out.write("# Completion of lumenkey for bash: . <(lumenkey completion bash)\n"
+    out.write("# Completion of lumenkey for bash 4 and later: . <(lumenkey completion bash)\n"
               "_lumenkey() {\n"
               "    local word=\"${COMP_WORDS[COMP_CWORD]}\" options='' values=''\n"
               "    COMPREPLY=()\n"

@@ -16,7 +16,8 @@ public:
         words.name = "offset";
         words.description = "Move curves in time, in value, or in both";
         words.usage = "[--by T] [--value X]";
-        words.notes = "Keypoints of the stretch replace those that lie where they come to in time.\n";
+        words.notes = "Keypoints of the stretch replace those that lie where they come to in time. Values "
+                      "stay\nwithin the limits of the channel.\n";
         words.example = "lumenkey offset walk.bvh LeftArm --by -6f -o earlier.bvh";
         return words;
     }

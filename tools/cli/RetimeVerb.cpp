@@ -37,8 +37,10 @@ public:
     }
 
     void addOptions(CLI::App& verb) override {
-        verb.add_option("--factor", _factorText,
-                        "What times are multiplied with, exactly: a decimal, or a fraction such as 24/25")
+        verb.add_option(
+                "--factor", _factorText,
+                "What times are multiplied with, exactly where exact time can hold that: a decimal, or a "
+                "fraction such as 24/25")
             ->option_text("F")
             ->required();
         verb.add_option("--about", _aboutText, "The time that stays (else the first of the stretch)")

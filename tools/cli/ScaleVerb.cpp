@@ -16,6 +16,7 @@ public:
         words.name = "scale";
         words.description = "Multiply values";
         words.usage = "--factor X";
+        words.notes = "Values stay within the limits of the channel.\n";
         words.example = "lumenkey scale walk.bvh Hips.Yposition --factor 0.01 -o metres.bvh";
         return words;
     }

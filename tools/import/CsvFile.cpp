@@ -134,6 +134,13 @@ private:
         do {
             Cell const cell = _cells.cell();
             if (_columns == 0) {
+                bool const isNumber =
+                    timeFromFraction(cell.text).timescale > 0 || ExactDecimal::parse(cell.text);
+                if (isNumber && !cell.isQuoted) {
+                    _cells.places().fail(cell.position, quoted(cell.text) +
+                                                            " is a time, where the first line "
+                                                            "names the columns");
+                }
                 isTime = cell.text == "time";
             } else if (_columns == 1 && isTime && cell.text == "seconds") {
                 _skipped = 1;

@@ -6,12 +6,16 @@
 #include <cerrno>
 #include <cstdio>
 #include <cstdlib>
+#include <cstring>
 #include <fcntl.h>
 #include <filesystem>
 #include <optional>
+#include <string_view>
 #include <sys/stat.h>
+#include <sys/xattr.h>
 #include <system_error>
 #include <unistd.h>
+#include <vector>
 
 namespace lumenkey::tools {
 
@@ -41,8 +45,9 @@ mode_t permissionsOfNewFiles() {
     return 0666 & ~mask;
 }
 
-/// What the file at `path` is; nothing where there is none. Throws `std::system_error`.
-std::optional<struct stat> replacedFile(fs::path const& path) {
+/// What the file at `path` is; nothing where there is none. Throws `std::system_error`, and `OutputError` of
+/// `name` for what is none.
+std::optional<struct stat> replacedFile(fs::path const& path, std::string const& name) {
     struct stat status {};
     if (::stat(path.c_str(), &status) != 0) {
         if (errno == ENOENT) {
@@ -50,15 +55,47 @@ std::optional<struct stat> replacedFile(fs::path const& path) {
         }
         throw std::system_error(errno, std::generic_category());
     }
+    if (S_ISDIR(status.st_mode)) {
+        throw std::system_error(EISDIR, std::generic_category());
+    }
     if (!S_ISREG(status.st_mode)) {
-        throw std::system_error(S_ISDIR(status.st_mode) ? EISDIR : EINVAL, std::generic_category());
+        throw OutputError{name, "it is no plain file, which could be replaced as a whole"};
     }
     return status;
 }
 
+/// Of an attribute of a file; nothing where it has none such.
+std::optional<std::vector<char>> attributeOf(char const* file, char const* name) {
+    ssize_t const size = ::getxattr(file, name, nullptr, 0);
+    std::vector<char> value(size > 0 ? static_cast<std::size_t>(size) : 0);
+    if (size < 0 || ::getxattr(file, name, value.data(), value.size()) != size) {
+        return std::nullopt;
+    }
+    return value;
+}
+
+/// Gives a new file the extended attributes of the one that it replaces: all that may be set, and the list of
+/// those who may read and write it in any case, since without it the group would get more than it had. 0, or
+/// the number of the error.
+int takeOverAttributes(int descriptor, char const* replaced) {
+    ssize_t const size = ::listxattr(replaced, nullptr, 0);
+    std::vector<char> names(size > 0 ? static_cast<std::size_t>(size) : 0);
+    if (names.empty() || ::listxattr(replaced, names.data(), names.size()) != size) {
+        return 0;
+    }
+    for (char const* name = names.data(); name < names.data() + names.size(); name += std::strlen(name) + 1) {
+        std::optional<std::vector<char>> const value = attributeOf(replaced, name);
+        if (value && ::fsetxattr(descriptor, name, value->data(), value->size(), 0) != 0 &&
+            std::string_view(name) == "system.posix_acl_access") {
+            return errno;
+        }
+    }
+    return 0;
+}
+
 /// Gives a new file the owner, the group and the permissions of the one that it replaces. Where the owner or
 /// the group can't be had, what runs a file as them goes too. 0, or the number of the error.
-int takeOver(int descriptor, std::optional<struct stat> const& replaced) {
+int takeOver(int descriptor, std::optional<struct stat> const& replaced, fs::path const& file) {
     mode_t permissions = replaced ? replaced->st_mode & 07777 : permissionsOfNewFiles();
     if (replaced) {
         // Each for itself: a group of one's own can be given where the owner can't.
@@ -66,7 +103,10 @@ int takeOver(int descriptor, std::optional<struct stat> const& replaced) {
         bool const hasOwner = ::fchown(descriptor, replaced->st_uid, static_cast<gid_t>(-1)) == 0;
         permissions &= ~static_cast<mode_t>((hasOwner ? 0 : S_ISUID) | (hasGroup ? 0 : S_ISGID));
     }
-    return ::fchmod(descriptor, permissions) != 0 ? errno : 0;
+    if (::fchmod(descriptor, permissions) != 0) {
+        return errno;
+    }
+    return replaced ? takeOverAttributes(descriptor, file.c_str()) : 0;
 }
 
 int synchronizeDirectory(fs::path const& directory) {
@@ -89,7 +129,7 @@ fs::path directoryOf(fs::path const& path) {
 SafeOutputFile::SafeOutputFile(std::string const& target) : _name(target) {
     try {
         fs::path const real = followLinks(target);
-        std::optional<struct stat> const replaced = replacedFile(real);
+        std::optional<struct stat> const replaced = replacedFile(real, _name);
         _target = real.string();
         // Not made of the target's name, which may be as long as a name can be.
         _temporary = (directoryOf(real) / ".lumenkey-XXXXXX").string();
@@ -98,7 +138,7 @@ SafeOutputFile::SafeOutputFile(std::string const& target) : _name(target) {
             _temporary.clear();
             fail(errno);
         }
-        if (int const error = takeOver(_descriptor, replaced)) {
+        if (int const error = takeOver(_descriptor, replaced, real)) {
             fail(error);
         }
     } catch (std::system_error const& error) {

@@ -11,8 +11,9 @@ namespace lumenkey::tools {
 /// brings it to the disk and puts it in the target's place by a rename, `discard` and destruction throw it
 /// away.
 ///
-/// An existing file gives its permissions to the new one, and its owner and group where that is allowed (else
-/// without what runs it as them). A symbolic link stays, and the file it leads to is replaced. A target that
+/// An existing file gives its permissions to the new one, lists of who may do what and other attributes
+/// included, and its owner and group where that is allowed (else without what runs it as them). Whether it may
+/// be replaced is its directory's matter, also where it is write-protected itself. A symbolic link stays, and the file it leads to is replaced. A target that
 /// is neither missing nor a plain file is refused.
 ///
 /// Failures throw `OutputError`; the target is untouched then, and the temporary gone. Only a failure to

@@ -18,8 +18,9 @@ std::string tableText(double value);
 /// rounded; the words `invalid`, `indefinite`, `+infinity`, `-infinity` for what is no number.
 std::string timeText(Tempus const& time);
 
-/// UTF-8 that never breaks a line, moves the cursor or turns a direction: control characters, also those of C1,
-/// marks of lines and directions that aren't seen, and what is no character, as `\xNN` for each byte of theirs.
+/// UTF-8 that never breaks a line, moves the cursor or turns a direction: control characters, also those of
+/// C1, marks of lines and directions that aren't seen, and what is no character, as `\xNN` for each byte of
+/// theirs.
 std::string printableText(std::string_view text);
 
 /// In quotes, and shortened where it is long.
