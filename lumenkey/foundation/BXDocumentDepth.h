@@ -5,8 +5,8 @@
 #include <cstdint>
 #include <string>
 
-// How deep elements may lie in each other, the root counted, and how many attributes one may have. What is written stays
-// within what is read.
+// How deep elements may lie in each other, the root counted, and how many attributes one may have. What is
+// written stays within what is read.
 
 inline constexpr std::uint32_t kGreatestDepth = 1000;
 /// Of an element that something is made for. What that will write inside of such an element, which may be

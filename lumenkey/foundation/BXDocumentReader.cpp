@@ -70,8 +70,8 @@ void BXDocumentReader::start(char const* name, char const* const* attributes) {
     if (_isPending) {
         handOver(false);
     }
-    if (_depth == kGreatestDepth) {
-        fail(BXTooDeepText());
+    if (_depth == kGreatestDepth || BXHasTooManyAttributes(attributes)) {
+        fail(_depth == kGreatestDepth ? BXTooDeepText() : BXTooManyAttributesText());
         return;
     }
     ++_depth;
@@ -80,10 +80,6 @@ void BXDocumentReader::start(char const* name, char const* const* attributes) {
     }
     if (!_states.elementTag(_state, _states.name(name), &_tag)) {
         _skippedDepth = _depth;
-        return;
-    }
-    if (BXHasTooManyAttributes(attributes)) {
-        fail(BXTooManyAttributesText());
         return;
     }
     copyAttributes(attributes);

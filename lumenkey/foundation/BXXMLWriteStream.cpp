@@ -91,6 +91,7 @@ private:
     bool _isStartTagOpen = false;
     /// Of the long strings in the innermost element's tag.
     std::size_t _tagSize = 0;
+    std::size_t _attributeCount = 0;
     /// Open elements that are left out, the innermost ones.
     std::size_t _leftOutDepth = 0;
     std::string _failure;
@@ -158,6 +159,7 @@ void BXXMLWriteStream::Writer::open(std::uint32_t tag, std::string_view name) {
     _open.push_back({tag, name, Holds::Nothing});
     _attributeNames.clear();
     _tagSize = 0;
+    _attributeCount = 0;
     _isStartTagOpen = true;
 }
 
@@ -269,6 +271,11 @@ template <typename Value> void BXXMLWriteStream::Writer::attribute(std::uint32_t
         fail("an attribute has no name or no place");
         return;
     }
+    if (_attributeCount == kMostAttributes) {
+        fail(BXTooManyAttributesText());
+        return;
+    }
+    ++_attributeCount;
     _out.append(" ");
     _out.append(name);
     _out.append("=\"");

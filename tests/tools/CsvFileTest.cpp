@@ -57,7 +57,7 @@ TEST(CsvFile, ReadsTablesOfValuesOverTime) {
         {"time,seconds\n0,0\n",
          "f.csv:1:1: a table has a column of times and at least one of values, with commas between them"},
         {"0,1\n1,2\n", "f.csv:1:1: '0' is a time, where the first line names the columns"},
-        {"1/2,1\n", "f.csv:1:1: '1/2' is a time, where the first line names the columns"},
+        {"1/2~,1\n", "f.csv:1:1: '1/2~' is a time, where the first line names the columns"},
         {"\"0\",X\n0,1\n", "1 X: 0/1=1\n"},
         {"t,X,\n", "f.csv:1:5: the name of the column is missing"},
         {"t,X\n0,1\n0,2\n", "f.csv:3:1: '0' doesn't come after the time of the row before"},

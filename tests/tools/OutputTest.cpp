@@ -158,6 +158,13 @@ TEST_F(SafeOutputFileTest, KeepsPermissionsAndLinks) {
         std::vector<std::uint32_t> kept(list.size());
         EXPECT_EQ(::getxattr(_target.c_str(), access, kept.data(), size), static_cast<ssize_t>(size));
         EXPECT_EQ(kept, list);
+        // None, where the directory has one for new files.
+        ASSERT_EQ(::removexattr(_target.c_str(), access), 0);
+        ASSERT_EQ(::setxattr(_folder.path().c_str(), "system.posix_acl_default", list.data(), size, 0), 0);
+        bool const takesMarks = ::setxattr(_target.c_str(), "user.mark", "1", 1, 0) == 0;
+        EXPECT_EQ(faultOfWriting(_target), "");
+        EXPECT_EQ(::getxattr(_target.c_str(), access, nullptr, 0), -1);
+        EXPECT_EQ(::getxattr(_target.c_str(), "user.mark", nullptr, 0), takesMarks ? 1 : -1);
     } else {
         EXPECT_EQ(errno, EOPNOTSUPP);
     }

@@ -291,9 +291,19 @@ TEST_F(RewriteTest, EveryKeypointCounts) {
     EXPECT_NE(complaintOf({"retime", _file, "--factor", "1/2147483647", "--in-place"}, 2).find("to one time"),
               std::string::npos);
     EXPECT_EQ(keypointsOf("./"), "1/2147483647 0; 1/2 1; ");
-    // What was sampled is seen.
+    // What was sampled is seen, and nothing else of the curve changes, whatever the handles of what wasn't seen.
     expectKeypointsAfter({{{"bake", "--step", "1"}, "0/1 1; 1/1 1; 2/1 3; "}},
                          keypoint("0/1", "5", "enabled=\"0\"") + keypoint("1/1", "1") + keypoint("2/1", "3"));
+    write("<parameter name=\"X\" id=\"1\" factoryID=\"3\"><curve type=\"1\">" + keypoint("0/1", "0") +
+          "<keypoint enabled=\"0\"><time>1/1</time><value>5</value><inputTangentTime>-0.3</inputTangentTime>"
+          "<inputTangentValue>80</inputTangentValue><outputTangentTime>0.3</outputTangentTime>"
+          "<outputTangentValue>100</outputTangentValue></keypoint><keypoint><time>2/1</time><value>1</value>"
+          "<inputTangentTime>-0.5</inputTangentTime><inputTangentValue>-3</inputTangentValue></keypoint>"
+          "</curve></parameter>");
+    std::string const before = outputOf({"sample", _file, "--at", "1/4,1/2,3/4"});
+    Json const baked = jsonOf({"bake", _file, "--step", "1/10", "--from", "1", "--in-place"});
+    EXPECT_LT(baked["channels"][0]["worstError"], 0.1);
+    EXPECT_EQ(outputOf({"sample", _file, "--at", "1/4,1/2,3/4"}), before);
     // Of those that stand out of order too.
     expectKeypointsAfter({{{"offset", "--by", "1/2", "--from", "1", "--to", "2"},
                            "0/1 0; 3/2 2; 3/2 4; 5/2 1; 5/2 3; 4/1 5; "}},

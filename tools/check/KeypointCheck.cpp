@@ -51,7 +51,7 @@ Fault KeypointCheck::faultOfPart(TextPlace const& place, std::string_view name, 
     double const time = isHandle ? std::exchange(handle.time, std::nullopt).value_or(0) : 0;
     double const number = canBeRead ? *readNumberOrNan(text) : 0;
     if (name == _out.valueName && _hasValue && !wasDisabled) {
-        constexpr double framesInSecond = 1000; // more than there are in any
+        constexpr double framesInSecond = 1000; // or fewer: the rate of an old document isn't in it
         double const seconds = _countsFrames ? time / framesInSecond : time;
         _keepsOutput = _takesHandles && isKept(std::max(seconds, 0.0), number, true);
     }

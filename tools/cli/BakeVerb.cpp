@@ -1,11 +1,9 @@
 #include "tools/cli/EditVerb.h"
 
 #include "tools/cli/UsageError.h"
-#include "tools/curve/Keypoint.h"
 
 #include <CLI/CLI.hpp>
 #include <cmath>
-#include <vector>
 
 namespace lumenkey::tools {
 
@@ -52,24 +50,12 @@ public:
         KFCurve& curve = *channel.getCurveInterface();
         OutsideKept const kept(curve, {stretch.start, stretch.last});
         double const scale = scaleOfFit(curve, stretch.step);
-        removeUnseenAt(curve, stretch.start);
+        deleteDisabledAt(curve, stretch.start); // in the way of the keypoint for the first sample
         curve.bakeCurve(nullptr, stretch.start, stretch.step, stretch.end, _tolerance * scale * hundredths,
                         scale);
     }
 
 private:
-    /// What isn't seen changes no sample, and would be in the way of the keypoint for the first.
-    static void removeUnseenAt(KFCurve& curve, Tempus const& start) {
-        KFSpline* const spline = curve.getSpline();
-        for (void* const handle : spline == nullptr ? std::vector<void*>() : everyKeypointHandle(*spline)) {
-            Keypoint const key = readKeypoint(*spline, handle);
-            bool isLocked = false;
-            if (key.time == start && !key.enabled && curve.isLockedKeypoint(handle, &isLocked) && !isLocked) {
-                curve.delKeypoint(handle, true);
-            }
-        }
-    }
-
     /// Makes values small beside a step. The fit measures along the curve, and so it measures time: where
     /// values weigh more, handles between two samples come out too short or too long, and the curve swings.
     static double scaleOfFit(KFCurve& curve, Tempus const& step) {

@@ -135,7 +135,9 @@ private:
         TimeSpan const keyed = keyedSpan(tree.spline(node));
         if (edited.keypointsBefore > 0 && !(keyed.to < keyed.from) && !channel.isLocked(true)) {
             _verb.apply(channel, keyed);
-            requireTimes(before.getSpline(), tree.spline(node), edited.channel);
+            if (!_verb.sampleStep()) {
+                requireTimes(before.getSpline(), tree.spline(node), edited.channel);
+            }
         }
         edited.keypointsAfter = channel.getNumberOfKeyframes();
         edited.change = changeBetween(before, tree.curve(node), _span, step);
@@ -162,7 +164,7 @@ private:
         return lost;
     }
 
-    /// Keypoints neither leave the times that there are, nor come together where these are too few.
+    /// Keypoints that move neither leave the times that there are, nor come together where these are too few.
     static void requireTimes(KFSpline* before, KFSpline* after, std::string const& name) {
         if (before == nullptr || after == nullptr) {
             return;

@@ -159,6 +159,14 @@ std::vector<void*> keypointsWithin(KFCurve& curve, TimeSpan const& span) {
     return handles;
 }
 
+void deleteDisabledAt(KFCurve& curve, Tempus const& time) {
+    for (void* const handle : unlockedWithin(curve, {time, time})) {
+        if (!readKeypoint(*curve.getSpline(), handle).enabled) {
+            deleteKeypoint(curve, handle);
+        }
+    }
+}
+
 SampledStretch::SampledStretch(TimeSpan const& span, Tempus const& sampleStep)
     : start(span.from), step(sampleStep) {
     Tempus const steps = TempusMake(TempusFloorQuotient(span.to - span.from, step), 1);

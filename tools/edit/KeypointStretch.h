@@ -48,6 +48,9 @@ private:
     std::vector<void*> _locked;
 };
 
+/// Takes away those at a time that are neither enabled nor locked. Nothing else of the curve changes.
+void deleteDisabledAt(KFCurve& curve, Tempus const& time);
+
 /// Turns linear keypoints within the span into Bezier ones with handles of no length, which draw the same
 /// lines.
 void makeLinesBezier(KFCurve& curve, TimeSpan const& span);

@@ -135,7 +135,7 @@ private:
             Cell const cell = _cells.cell();
             if (_columns == 0) {
                 bool const isNumber =
-                    timeFromFraction(cell.text).timescale > 0 || ExactDecimal::parse(cell.text);
+                    timeFromFraction(withoutMark(cell.text)).timescale > 0 || ExactDecimal::parse(cell.text);
                 if (isNumber && !cell.isQuoted) {
                     _cells.places().fail(cell.position, quoted(cell.text) +
                                                             " is a time, where the first line "
@@ -182,6 +182,11 @@ private:
         _cells.places().fail(position, "a row has " + std::to_string(_columns) + " cells, but " + what);
     }
 
+    /// Of a time that was rounded.
+    static std::string_view withoutMark(std::string_view text) {
+        return text.substr(0, text.size() - (text.ends_with('~') ? 1 : 0));
+    }
+
     void readTime(Cell const& cell) {
         Tempus const time = timeOf(cell);
         if (!_table.times.empty() && time <= _table.times.back()) {
@@ -195,7 +200,7 @@ private:
         Tempus time = kTempusInvalid;
         if (cell.text.find('/') != std::string_view::npos) {
             bool const wasRounded = cell.text.ends_with('~');
-            time = timeFromFraction(cell.text.substr(0, cell.text.size() - (wasRounded ? 1 : 0)));
+            time = timeFromFraction(withoutMark(cell.text));
             time.flags |= wasRounded && TempusIsNumeric(time) ? kTempusFlagHasBeenRounded : 0;
         } else if (std::optional<ExactDecimal> const number = ExactDecimal::parse(cell.text)) {
             time = number->toTempus();

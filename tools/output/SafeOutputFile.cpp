@@ -74,39 +74,50 @@ std::optional<std::vector<char>> attributeOf(char const* file, char const* name)
     return value;
 }
 
-/// Gives a new file the extended attributes of the one that it replaces: all that may be set, and the list of
-/// those who may read and write it in any case, since without it the group would get more than it had. 0, or
-/// the number of the error.
-int takeOverAttributes(int descriptor, char const* replaced) {
+/// The list of those who may read and write a file.
+constexpr char const* kAccessList = "system.posix_acl_access";
+
+/// Gives a new file those extended attributes of the one that it replaces that may be set.
+void takeOverAttributes(int descriptor, char const* replaced) {
     ssize_t const size = ::listxattr(replaced, nullptr, 0);
     std::vector<char> names(size > 0 ? static_cast<std::size_t>(size) : 0);
     if (names.empty() || ::listxattr(replaced, names.data(), names.size()) != size) {
-        return 0;
+        return;
     }
     for (char const* name = names.data(); name < names.data() + names.size(); name += std::strlen(name) + 1) {
-        std::optional<std::vector<char>> const value = attributeOf(replaced, name);
-        if (value && ::fsetxattr(descriptor, name, value->data(), value->size(), 0) != 0 &&
-            std::string_view(name) == "system.posix_acl_access") {
-            return errno;
+        if (std::string_view(name) == kAccessList) {
+            continue;
+        }
+        if (std::optional<std::vector<char>> const value = attributeOf(replaced, name)) {
+            static_cast<void>(::fsetxattr(descriptor, name, value->data(), value->size(), 0));
         }
     }
-    return 0;
+}
+
+/// Gives a new file the permissions of the one that it replaces, with its list or without any, also where the
+/// directory has one for new files: either way others than before could read and write it. 0, or the number of
+/// the error.
+int takeOverAccess(int descriptor, mode_t permissions, char const* replaced) {
+    static_cast<void>(::fremovexattr(descriptor, kAccessList));
+    if (::fchmod(descriptor, permissions) != 0) {
+        return errno;
+    }
+    std::optional<std::vector<char>> const list = attributeOf(replaced, kAccessList);
+    return list && ::fsetxattr(descriptor, kAccessList, list->data(), list->size(), 0) != 0 ? errno : 0;
 }
 
 /// Gives a new file the owner, the group and the permissions of the one that it replaces. Where the owner or
 /// the group can't be had, what runs a file as them goes too. 0, or the number of the error.
 int takeOver(int descriptor, std::optional<struct stat> const& replaced, fs::path const& file) {
-    mode_t permissions = replaced ? replaced->st_mode & 07777 : permissionsOfNewFiles();
-    if (replaced) {
-        // Each for itself: a group of one's own can be given where the owner can't.
-        bool const hasGroup = ::fchown(descriptor, static_cast<uid_t>(-1), replaced->st_gid) == 0;
-        bool const hasOwner = ::fchown(descriptor, replaced->st_uid, static_cast<gid_t>(-1)) == 0;
-        permissions &= ~static_cast<mode_t>((hasOwner ? 0 : S_ISUID) | (hasGroup ? 0 : S_ISGID));
+    if (!replaced) {
+        return ::fchmod(descriptor, permissionsOfNewFiles()) != 0 ? errno : 0;
     }
-    if (::fchmod(descriptor, permissions) != 0) {
-        return errno;
-    }
-    return replaced ? takeOverAttributes(descriptor, file.c_str()) : 0;
+    takeOverAttributes(descriptor, file.c_str());
+    // Each for itself: a group of one's own can be given where the owner can't.
+    bool const hasGroup = ::fchown(descriptor, static_cast<uid_t>(-1), replaced->st_gid) == 0;
+    bool const hasOwner = ::fchown(descriptor, replaced->st_uid, static_cast<gid_t>(-1)) == 0;
+    auto const kept = ~static_cast<mode_t>((hasOwner ? 0 : S_ISUID) | (hasGroup ? 0 : S_ISGID));
+    return takeOverAccess(descriptor, replaced->st_mode & 07777 & kept, file.c_str());
 }
 
 int synchronizeDirectory(fs::path const& directory) {
