@@ -4,15 +4,16 @@
 #include "lumenkey/Channels/KFChannelFactories.h"
 #include "lumenkey/Channels/KFChannelFolder.h"
 
-#include <cstddef>
 #include <memory>
 
-/// How many children a folder's class makes for itself; they stand in front of all others.
-inline std::size_t KFComponentCountOf(KFChannelFolder const& folder) {
+/// A new folder of the same class, which has the children that the class makes; null for a class that makes none.
+inline std::unique_ptr<KFChannelFolder> KFExampleOf(KFChannelFolder const& folder) {
     auto* const maker = dynamic_cast<KFChannelFactory*>(folder.getFactory());
-    std::unique_ptr<KFChannelBase> const example(maker == nullptr ? nullptr : maker->createChannel("", 1));
-    auto const* const like = dynamic_cast<KFChannelFolder const*>(example.get());
-    return like == nullptr ? 0 : like->getNumberOfDescendants();
+    std::unique_ptr<KFChannelBase> made(maker == nullptr ? nullptr : maker->createChannel("", 1));
+    auto* const like = dynamic_cast<KFChannelFolder*>(made.get());
+    if (like != nullptr)
+        static_cast<void>(made.release());
+    return std::unique_ptr<KFChannelFolder>(like);
 }
 
 /// Marks what compounds leave unmarked, which mark no class below them but their own: classes of children that
@@ -26,26 +27,25 @@ public:
         if (folder == nullptr || folder->getDescendants() == nullptr)
             return;
         bool const isCompound = folder->isCompoundChannel();
-        std::size_t const made = isCompound ? countOf(*folder) : 0;
-        std::size_t position = 0;
         for (KFChannelBase* const child : *folder->getDescendants()) {
-            if (isCompound && position++ >= made)
+            if (isCompound && !isMadeBy(*folder, *child))
                 child->markFactoriesForSerialization(_stream, false);
             markBelow(*child);
         }
     }
 
 private:
-    /// Trees have many compounds of few classes.
-    std::size_t countOf(KFChannelFolder const& folder) {
-        if (_factory != folder.getFactory()) {
+    /// As readers look for it, wherever it stands.
+    bool isMadeBy(KFChannelFolder const& folder, KFChannelBase const& child) {
+        if (_factory != folder.getFactory()) { // trees have many compounds of few classes
             _factory = folder.getFactory();
-            _count = KFComponentCountOf(folder);
+            _example = KFExampleOf(folder);
         }
-        return _count;
+        KFChannelBase const* const like = _example ? _example->getDescendant(child.getID()) : nullptr;
+        return like != nullptr && like->getFactory() == child.getFactory();
     }
 
     BXSerializerWriteStream& _stream;
     KFFactory* _factory = nullptr;
-    std::size_t _count = 0;
+    std::unique_ptr<KFChannelFolder> _example;
 };

@@ -113,14 +113,15 @@ TEST(Document, IsNoDeeperThanDocumentsAreRead) {
 TEST(Document, KeepsWhatCompoundsHaveBesideTheirParts) {
     OwnedTree const top(new KFChannelFolder("Top", nullptr, 9, 0, 0));
     auto* const place = new KFChannel2D("Place", top.get(), 1, 0);
-    KFChannelPercent const more(0.5, "More", place, 7, 0);
+    KFChannelPercent more(0.5, "More", nullptr, 7, 0);
+    place->insertDescendantBefore((*place->getDescendants())[0], &more);
     BXData const state = top->createChannelState(true, true);
     OwnedTree const read(new KFChannelFolder("Top", nullptr, 9, 0, 0));
     ASSERT_TRUE(read->configureWithState(state));
-    EXPECT_EQ(read->createChannelState(true, true), state);
     auto const* const placeRead = static_cast<KFChannelFolder*>(read->getDescendant(1));
     std::unique_ptr<KFChannelBase> const moreRead(placeRead->getDescendant(7));
-    EXPECT_EQ(placeRead->getNumberOfDescendants(), 3U);
+    ASSERT_EQ(placeRead->getNumberOfDescendants(), 3U);
+    EXPECT_EQ(static_cast<KFChannel*>(moreRead.get())->getInitialValue(), 0.5);
     // No class is told that makes only what its compound makes.
     EXPECT_EQ(documentOf(*top).find("FDC1944B-2291-11D7-B1C3-00039389B702"), std::string::npos);
 }

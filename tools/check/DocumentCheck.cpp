@@ -117,7 +117,7 @@ private:
             _findings.take(element.place, faultOfTiming(*_open.back().example, attributes));
         } else if (element.name == "keypoint") {
             element.keypoint.emplace(attributes, _open.back().curveClass, _countsFrames,
-                                     _open.back().hasSeen);
+                                     _open.back().takesBias);
             _findings.take({element.place, faultOfInterpolation(attributes),
                             !readWhole(attributeOf(attributes, "interpolation"))});
         }
@@ -283,16 +283,18 @@ private:
             _findings.lost(element.place, faultOfLimit(element.name, limit, curve.curveClass));
         } else if (element.name == "keypoint") {
             curve.hasKeypoints = true;
-            curve.hasSeen |= element.keypoint->isSeen();
+            curve.takesBias |= element.keypoint->isSeen();
             curve.canBeClosed = true;
             _findings.take(element.keypoint->faultsAtEnd(element.place));
         } else if (element.name == "numberOfKeypoints") {
             curve.canBeClosed = true;
+            curve.takesBias = true;
             _findings.lost(element.place,
                            curve.hasKeypoints ? "the number stands behind keypoints, which it clears" : "");
         } else if (element.name == "closed" && readBool(element.text) != false) {
             if (curve.canBeClosed) {
                 curve.closedPlace = element.place;
+                curve.takesBias = true;
             } else {
                 _findings.lost(element.place, "there are no keypoints yet that it would close");
             }

@@ -25,11 +25,11 @@ Fault leftOut(std::string_view name, double number, std::string const& usual) {
 } // namespace
 
 KeypointCheck::KeypointCheck(Attributes const& attributes, CurveClass const& curve, bool countsFrames,
-                             bool isBehindSeen)
+                             bool takesBias)
     : _takesHandles(curve.derivesTangents || readWhole(attributeOf(attributes, "interpolation")) ==
                                                  std::uint64_t{kKFInterpolationLinearToo}),
       _countsFrames(countsFrames), _isDisabled(readBool(attributeOf(attributes, "enabled")) == false),
-      _isBehindSeen(isBehindSeen) {}
+      _takesBias(takesBias) {}
 
 bool KeypointCheck::keepsNan(std::string_view part) {
     return part == "value" || part.starts_with("input") || part.starts_with("output");
@@ -63,8 +63,7 @@ Fault KeypointCheck::faultOfPart(TextPlace const& place, std::string_view name, 
     if (!_hasValue && (isHandle || number != usual)) {
         return {quoted + " stands in front of the value, where it comes too early"};
     }
-    // The bias is taken unless nothing of the curve is seen.
-    bool const isTaken = name == "normal" || (name == "bias" && (_isBehindSeen || number == usual));
+    bool const isTaken = name == "normal" || (name == "bias" && (_takesBias || number == usual));
     if (wasDisabled && !isTaken) {
         return {quoted + " stands behind the output handle, which disables the keypoint: it is passed over"};
     }
@@ -124,8 +123,11 @@ std::vector<std::pair<TextPlace, Fault>> KeypointCheck::faultsAtEnd(TextPlace co
     }
     if (_isDisabled && _hasValue && !_keepsOutput) {
         faults.push_back({place,
-                          {"the keypoint is disabled but " + std::string(_hasOutput ? "keeps" : "has") +
-                           " no output handle: it comes back enabled"}});
+                          {"the keypoint is disabled but " +
+                           std::string(!_hasOutput     ? "has no output handle: it comes"
+                                       : _countsFrames ? "may keep no output handle: it may come"
+                                                       : "keeps no output handle: it comes") +
+                           " back enabled"}});
     }
     for (Handle const* const handle : {&_in, &_out}) {
         if (handle->time.value_or(0) != 0) {

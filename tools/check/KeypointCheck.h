@@ -14,9 +14,9 @@ namespace lumenkey::tools {
 /// Looks through the parts of a keypoint in their order, in which a reader acts on them.
 class KeypointCheck {
 public:
-    /// Of a keypoint with these attributes in a curve of this class, behind one that is seen or not.
-    KeypointCheck(Attributes const& attributes, CurveClass const& curve, bool countsFrames,
-                  bool isBehindSeen);
+    /// Of a keypoint with these attributes in a curve of this class, which takes the bias of a disabled one or
+    /// not.
+    KeypointCheck(Attributes const& attributes, CurveClass const& curve, bool countsFrames, bool takesBias);
 
     /// Of values and handles.
     static bool keepsNan(std::string_view part);
@@ -47,7 +47,7 @@ private:
     bool _takesHandles;
     bool _countsFrames;
     bool _isDisabled;
-    bool _isBehindSeen;
+    bool _takesBias;
     bool _hasTime = false;
     bool _hasValue = false;
     bool _hasOutput = false;

@@ -42,8 +42,8 @@ struct OpenElement {
     CurveClass curveClass;
     CurveLimits limits;
     bool hasKeypoints = false;
-    /// Whether one of them is enabled.
-    bool hasSeen = false;
+    /// Also of a disabled keypoint: behind one that is seen, or before it is known that there is none.
+    bool takesBias = false;
     /// As from the first keypoint on, or from their number.
     bool canBeClosed = false;
     /// Where it says that it is closed.

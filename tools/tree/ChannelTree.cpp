@@ -61,7 +61,8 @@ void ChannelTree::adoptBelow(Node node) {
         return;
     }
     std::vector<KFChannelBase*> const children = *above->getDescendants();
-    std::size_t const components = KFComponentCountOf(*above);
+    std::unique_ptr<KFChannelFolder> const example = KFExampleOf(*above);
+    std::size_t const components = example ? example->getNumberOfDescendants() : 0;
     for (std::size_t i = 0; i < children.size(); ++i) {
         std::unique_ptr<KFChannelBase> owned(i < components ? nullptr : children[i]);
         adoptBelow(add(node, children[i], std::move(owned)));
