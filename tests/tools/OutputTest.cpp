@@ -164,6 +164,9 @@ TEST_F(SafeOutputFileTest, KeepsPermissionsAndLinks) {
         bool const takesMarks = ::setxattr(_target.c_str(), "user.mark", "1", 1, 0) == 0;
         EXPECT_EQ(faultOfWriting(_target), "");
         EXPECT_EQ(::getxattr(_target.c_str(), access, nullptr, 0), -1);
+        EXPECT_EQ(faultOfWriting(_folder.file("listed.txt")), "");
+        EXPECT_EQ(static_cast<unsigned>(fs::status(_folder.file("listed.txt")).permissions()), 0660U);
+        ASSERT_EQ(::removexattr(_folder.path().c_str(), "system.posix_acl_default"), 0);
         EXPECT_EQ(::getxattr(_target.c_str(), "user.mark", nullptr, 0), takesMarks ? 1 : -1);
     } else {
         EXPECT_EQ(errno, EOPNOTSUPP);

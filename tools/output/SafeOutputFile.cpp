@@ -9,6 +9,7 @@
 #include <cstring>
 #include <fcntl.h>
 #include <filesystem>
+#include <iterator>
 #include <optional>
 #include <string_view>
 #include <sys/stat.h>
@@ -38,8 +39,47 @@ fs::path followLinks(fs::path path) {
     throw std::system_error(ELOOP, std::generic_category());
 }
 
+fs::path directoryOf(fs::path const& path) {
+    return path.has_parent_path() ? path.parent_path() : fs::path(".");
+}
+
+/// Of an attribute of a file; nothing where it has none such.
+std::optional<std::vector<char>> attributeOf(char const* file, char const* name) {
+    ssize_t const size = ::getxattr(file, name, nullptr, 0);
+    std::vector<char> value(size > 0 ? static_cast<std::size_t>(size) : 0);
+    if (size < 0 || ::getxattr(file, name, value.data(), value.size()) != size) {
+        return std::nullopt;
+    }
+    return value;
+}
+
+/// What a directory with a list for new files gives to one that anybody might read and write: of the owner, of
+/// the group or the mask over it, of others. Nothing without such a list, which consists of a number of four
+/// bytes, and eight bytes for each entry: what it is of, what it allows, and for whom.
+std::optional<mode_t> permissionsByList(fs::path const& directory) {
+    constexpr std::size_t start = 4;
+    constexpr std::size_t entry = 8;
+    std::optional<std::vector<char>> const list = attributeOf(directory.c_str(), "system.posix_acl_default");
+    if (!list) {
+        return std::nullopt;
+    }
+    mode_t byKind[0x21] = {};
+    bool hasMask = false;
+    for (std::size_t at = start; at + entry <= list->size(); at += entry) {
+        auto const kind = static_cast<unsigned char>((*list)[at]);
+        if (kind < std::size(byKind)) {
+            byKind[kind] = static_cast<mode_t>((*list)[at + 2] & 06);
+            hasMask |= kind == 0x10;
+        }
+    }
+    return byKind[0x01] << 6 | byKind[hasMask ? 0x10 : 0x04] << 3 | byKind[0x20];
+}
+
 /// What a new file gets: nothing else tells it but setting it, so this is for one thread.
-mode_t permissionsOfNewFiles() {
+mode_t permissionsOfNewFiles(fs::path const& directory) {
+    if (std::optional<mode_t> const byList = permissionsByList(directory)) {
+        return *byList;
+    }
     mode_t const mask = ::umask(0);
     ::umask(mask);
     return 0666 & ~mask;
@@ -62,16 +102,6 @@ std::optional<struct stat> replacedFile(fs::path const& path, std::string const&
         throw OutputError{name, "it is no plain file, which could be replaced as a whole"};
     }
     return status;
-}
-
-/// Of an attribute of a file; nothing where it has none such.
-std::optional<std::vector<char>> attributeOf(char const* file, char const* name) {
-    ssize_t const size = ::getxattr(file, name, nullptr, 0);
-    std::vector<char> value(size > 0 ? static_cast<std::size_t>(size) : 0);
-    if (size < 0 || ::getxattr(file, name, value.data(), value.size()) != size) {
-        return std::nullopt;
-    }
-    return value;
 }
 
 /// The list of those who may read and write a file.
@@ -110,7 +140,7 @@ int takeOverAccess(int descriptor, mode_t permissions, char const* replaced) {
 /// the group can't be had, what runs a file as them goes too. 0, or the number of the error.
 int takeOver(int descriptor, std::optional<struct stat> const& replaced, fs::path const& file) {
     if (!replaced) {
-        return ::fchmod(descriptor, permissionsOfNewFiles()) != 0 ? errno : 0;
+        return ::fchmod(descriptor, permissionsOfNewFiles(directoryOf(file))) != 0 ? errno : 0;
     }
     takeOverAttributes(descriptor, file.c_str());
     // Each for itself: a group of one's own can be given where the owner can't.
@@ -129,10 +159,6 @@ int synchronizeDirectory(fs::path const& directory) {
     int const error = ::fsync(descriptor) != 0 && errno != EINVAL ? errno : 0;
     ::close(descriptor);
     return error;
-}
-
-fs::path directoryOf(fs::path const& path) {
-    return path.has_parent_path() ? path.parent_path() : fs::path(".");
 }
 
 } // namespace
