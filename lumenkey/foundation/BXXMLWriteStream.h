@@ -32,9 +32,9 @@
 /// scopes in force, with all inside it; an attribute without a name, behind content, or that its element has
 /// already; a value outside any element or behind a child; anything behind `close`. An `endElement` too many
 /// does nothing. An element holds either children or a value: readers give nobody the value in front of a
-/// child. What `BXXMLReadStream` would refuse is left out too: elements for their depth, nodes (`allowsNode`),
-/// attributes beyond the thousandth, and strings that are too long, one by itself or those of a tag together
-/// (64 MiB).
+/// child. What `BXXMLReadStream` would refuse is left out too: elements for their depth, nodes
+/// (`allowsNode`), attributes beyond the thousandth, and strings that are too long, one by itself or those of
+/// a tag together (64 MiB).
 ///
 /// One object belongs to one thread at a time.
 class LUMENKEY_API BXXMLWriteStream final : public BXSerializerWriteStream {

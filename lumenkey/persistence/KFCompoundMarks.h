@@ -6,7 +6,7 @@
 
 #include <memory>
 
-/// A new folder of the same class, which has the children that the class makes; null for a class that makes none.
+/// A new folder of the same class, with the children that the class makes; null where it makes no folder.
 inline std::unique_ptr<KFChannelFolder> KFExampleOf(KFChannelFolder const& folder) {
     auto* const maker = dynamic_cast<KFChannelFactory*>(folder.getFactory());
     std::unique_ptr<KFChannelBase> made(maker == nullptr ? nullptr : maker->createChannel("", 1));
@@ -16,8 +16,8 @@ inline std::unique_ptr<KFChannelFolder> KFExampleOf(KFChannelFolder const& folde
     return std::unique_ptr<KFChannelFolder>(like);
 }
 
-/// Marks what compounds leave unmarked, which mark no class below them but their own: classes of children that
-/// theirs don't make, and that couldn't be read again without.
+/// Marks what compounds leave unmarked, which mark no class below them but their own: classes of children
+/// that theirs don't make, and that couldn't be read again without.
 class KFCompoundMarks {
 public:
     explicit KFCompoundMarks(BXSerializerWriteStream& stream) noexcept : _stream(stream) {}

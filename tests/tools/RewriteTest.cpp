@@ -291,7 +291,7 @@ TEST_F(RewriteTest, EveryKeypointCounts) {
     EXPECT_NE(complaintOf({"retime", _file, "--factor", "1/2147483647", "--in-place"}, 2).find("to one time"),
               std::string::npos);
     EXPECT_EQ(keypointsOf("./"), "1/2147483647 0; 1/2 1; ");
-    // What was sampled is seen, and nothing else of the curve changes, whatever the handles of what wasn't seen.
+    // What was sampled is seen, and nothing in front of it changes, whatever the handles of what wasn't seen.
     expectKeypointsAfter({{{"bake", "--step", "1"}, "0/1 1; 1/1 1; 2/1 3; "}},
                          keypoint("0/1", "5", "enabled=\"0\"") + keypoint("1/1", "1") + keypoint("2/1", "3"));
     write("<parameter name=\"X\" id=\"1\" factoryID=\"3\"><curve type=\"1\">" + keypoint("0/1", "0") +

@@ -14,8 +14,8 @@ namespace lumenkey::tools {
 /// Looks through the parts of a keypoint in their order, in which a reader acts on them.
 class KeypointCheck {
 public:
-    /// Of a keypoint with these attributes in a curve of this class, which takes the bias of a disabled one or
-    /// not.
+    /// Of a keypoint with these attributes in a curve of this class, which takes the bias of a disabled one
+    /// or not.
     KeypointCheck(Attributes const& attributes, CurveClass const& curve, bool countsFrames, bool takesBias);
 
     /// Of values and handles.

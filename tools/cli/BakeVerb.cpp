@@ -16,7 +16,8 @@ public:
         words.name = "bake";
         words.description = "Replace keypoints by those of a smooth curve through samples";
         words.usage = "[--step T] [--tolerance X]";
-        words.notes = "The last sample is that of the last whole step; keypoints behind it stay.\n";
+        words.notes = "The last sample is that of the last whole step; keypoints behind it stay. Beside the "
+                      "stretch the\ncurve can change too, up to the next keypoint.\n";
         words.example = "lumenkey bake walk.bvh Hips --step 1/24 -o baked.bvh";
         words.keepsShape = true;
         return words;

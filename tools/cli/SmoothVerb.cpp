@@ -14,7 +14,7 @@ public:
         words.notes = "Each step gets a keypoint, as high as a parabola through seven samples is there "
                       "(Savitzky and Golay 1964): the longer\n"
                       "the step, the smoother. The last one is that of the last whole step; keypoints behind "
-                      "it stay.\n";
+                      "it stay.\nBeside the stretch the curve can change too, up to the next keypoint.\n";
         words.example =
             "lumenkey smooth walk.bvh Spine.Xrotation --from 1 --to 2 -o smooth.bvh --plot smooth.svg";
         return words;

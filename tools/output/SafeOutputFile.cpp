@@ -53,8 +53,8 @@ std::optional<std::vector<char>> attributeOf(char const* file, char const* name)
     return value;
 }
 
-/// What a directory with a list for new files gives to one that anybody might read and write: of the owner, of
-/// the group or the mask over it, of others. Nothing without such a list, which consists of a number of four
+/// What a directory with a list for new files gives to one that anybody might read and write: of the owner,
+/// of the group or the mask over it, of others. Nothing without such a list, which consists of a number of four
 /// bytes, and eight bytes for each entry: what it is of, what it allows, and for whom.
 std::optional<mode_t> permissionsByList(fs::path const& directory) {
     constexpr std::size_t start = 4;
@@ -125,11 +125,12 @@ void takeOverAttributes(int descriptor, char const* replaced) {
 }
 
 /// Gives a new file the permissions of the one that it replaces, with its list or without any, also where the
-/// directory has one for new files: either way others than before could read and write it. 0, or the number of
-/// the error.
+/// directory has one for new files: either way others than before could read and write it. 0, or the number
+/// of the error.
 int takeOverAccess(int descriptor, mode_t permissions, char const* replaced) {
-    static_cast<void>(::fremovexattr(descriptor, kAccessList));
-    if (::fchmod(descriptor, permissions) != 0) {
+    bool const hasNone =
+        ::fremovexattr(descriptor, kAccessList) == 0 || errno == ENODATA || errno == EOPNOTSUPP;
+    if (!hasNone || ::fchmod(descriptor, permissions) != 0) {
         return errno;
     }
     std::optional<std::vector<char>> const list = attributeOf(replaced, kAccessList);

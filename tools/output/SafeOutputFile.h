@@ -12,9 +12,9 @@ namespace lumenkey::tools {
 /// away.
 ///
 /// An existing file gives its permissions to the new one, lists of who may do what and other attributes
-/// included, and its owner and group where that is allowed (else without what runs it as them). Whether it may
-/// be replaced is its directory's matter, also where it is write-protected itself. A symbolic link stays, and
-/// the file it leads to is replaced. A target that is neither missing nor a plain file is refused.
+/// included, and its owner and group where that is allowed (else without what runs it as them). Whether it
+/// may be replaced is its directory's matter, also where it is write-protected itself. A symbolic link stays,
+/// and the file it leads to is replaced. A target that is neither missing nor a plain file is refused.
 ///
 /// Failures throw `OutputError`; the target is untouched then, and the temporary gone. Only a failure to
 /// bring the renamed entry itself to the disk is told after the replacement. The temporary is a
