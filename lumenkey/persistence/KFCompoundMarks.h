@@ -6,14 +6,10 @@
 
 #include <memory>
 
-/// A new folder of the same class, with the children that the class makes; null where it makes no folder.
-inline std::unique_ptr<KFChannelFolder> KFExampleOf(KFChannelFolder const& folder) {
-    auto* const maker = dynamic_cast<KFChannelFactory*>(folder.getFactory());
-    std::unique_ptr<KFChannelBase> made(maker == nullptr ? nullptr : maker->createChannel("", 1));
-    auto* const like = dynamic_cast<KFChannelFolder*>(made.get());
-    if (like != nullptr)
-        static_cast<void>(made.release());
-    return std::unique_ptr<KFChannelFolder>(like);
+/// A new channel of a class; null for a class that makes none, and for null.
+inline std::unique_ptr<KFChannelBase> KFExampleOf(KFFactory* factory) {
+    auto* const maker = dynamic_cast<KFChannelFactory*>(factory);
+    return std::unique_ptr<KFChannelBase>(maker == nullptr ? nullptr : maker->createChannel("", 1));
 }
 
 /// Marks what compounds leave unmarked, which mark no class below them but their own: classes of children
@@ -39,13 +35,15 @@ private:
     bool isMadeBy(KFChannelFolder const& folder, KFChannelBase const& child) {
         if (_factory != folder.getFactory()) { // trees have many compounds of few classes
             _factory = folder.getFactory();
-            _example = KFExampleOf(folder);
+            _example = KFExampleOf(_factory);
         }
-        KFChannelBase const* const like = _example ? _example->getDescendant(child.getID()) : nullptr;
+        auto const* const example = dynamic_cast<KFChannelFolder const*>(_example.get());
+        KFChannelBase const* const like =
+            example == nullptr ? nullptr : example->getDescendant(child.getID());
         return like != nullptr && like->getFactory() == child.getFactory();
     }
 
     BXSerializerWriteStream& _stream;
     KFFactory* _factory = nullptr;
-    std::unique_ptr<KFChannelFolder> _example;
+    std::unique_ptr<KFChannelBase> _example;
 };

@@ -34,30 +34,37 @@ std::string faultOfText(DocumentWord const& attribute, std::string_view text, Cu
     return attribute.text == TextKind::Number ? faultOfNumber(text, limits) : "";
 }
 
+/// Of 32 bits, as it is read.
+std::optional<std::uint64_t> partOfVersion(std::string_view text) {
+    std::optional<std::uint64_t> const number = readWhole(text);
+    return number <= std::numeric_limits<std::uint32_t>::max() ? number : std::nullopt;
+}
+
 std::string faultOfVersion(std::optional<std::string_view> given) {
     std::uint32_t readMajor = kWrittenMajor;
     std::uint32_t readMinor = kWrittenMinor;
-    std::string const text = readString(given.value_or(""));
+    std::string const unescaped = readString(given.value_or(""));
+    std::string_view const text = unescaped;
     KFReadVersion(text, readMajor, readMinor);
     std::string const readAs = "it is read as " + std::to_string(readMajor) + "." + std::to_string(readMinor);
     if (!given) {
         return "the document says no version: " + readAs;
     }
-    std::size_t const point = std::min(text.find('.'), text.size());
-    std::optional<std::uint64_t> const major = readWhole(text.substr(0, point));
-    std::optional<std::uint64_t> const minor = readWhole(text.substr(std::min(point + 1, text.size())));
+    std::size_t const point = text.find('.');
+    std::optional<std::uint64_t> const major = partOfVersion(text.substr(0, point));
+    std::optional<std::uint64_t> const minor =
+        point == std::string_view::npos ? std::nullopt : partOfVersion(text.substr(point + 1));
     std::string const written = std::to_string(kWrittenMajor) + "." + std::to_string(kWrittenMinor);
-    constexpr std::uint64_t most = std::numeric_limits<std::uint32_t>::max();
-    if (!major || !minor || *major > most || *minor > most) {
-        return "'" + text + "' is no version, such as " + written + ": " + readAs;
+    if (!major || !minor) {
+        return "'" + std::string(text) + "' is no version, such as " + written + ": " + readAs;
     }
     if (*major < kFirstMajor) {
-        return "the version " + text + " is older than " + std::to_string(kFirstMajor) +
+        return "the version " + std::string(text) + " is older than " + std::to_string(kFirstMajor) +
                ".0: it is read as those of versions 2 to 4, with times in frames";
     }
     bool const isNewer =
         std::pair(*major, *minor) > std::pair<std::uint64_t, std::uint64_t>(kWrittenMajor, kWrittenMinor);
-    return isNewer ? "the version " + text + " is newer than " + written : "";
+    return isNewer ? "the version " + std::string(text) + " is newer than " + written : "";
 }
 
 bool isKnown(std::string_view element, std::string_view name) {

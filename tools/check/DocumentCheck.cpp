@@ -219,18 +219,17 @@ private:
     void endReadable(OpenElement& element) {
         if (isBeyond(*element.word, element.text)) {
             // Curves keep such numbers as far as they have room for them; how many keypoints are promised
-            // doesn't matter.
+            // doesn't matter, but that they are.
+            bool const isPromise = element.name == "numberOfKeypoints";
             bool const hasRoom = readWhole(element.text) <= std::numeric_limits<std::uint32_t>::max();
-            bool const isKept =
-                element.word->parent == "curve" && (hasRoom || element.name == "numberOfKeypoints");
+            bool const isKept = element.word->parent == "curve" && (hasRoom || isPromise);
             _findings.take({element.place,
                             "the number " + element.text + " is out of the limits of '" + element.name +
                                 "', 0 to " + std::to_string(element.word->greatest),
                             !isKept});
-        }
-        bool const isCount = element.name == "numberOfKeypoints"; // of which the low bits count
-        if (isBeyond(*element.word, element.text) && !isCount) {
-            return;
+            if (!isPromise) {
+                return;
+            }
         }
         if (element.word->parent == "curve") {
             endPartOfCurve(element);

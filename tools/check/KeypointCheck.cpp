@@ -38,7 +38,6 @@ bool KeypointCheck::keepsNan(std::string_view part) {
 Fault KeypointCheck::faultOfPart(TextPlace const& place, std::string_view name, std::string_view text,
                                  bool canBeRead) {
     bool const wasDisabled = _isDisabled && _hasOutput;
-    _hasOutput |= _hasValue && name == _out.valueName;
     if (name == "time" || name == "value") {
         Fault const fault = faultOfTimeOrValue(name == "time");
         return canBeRead ? fault : Fault();
@@ -50,10 +49,8 @@ Fault KeypointCheck::faultOfPart(TextPlace const& place, std::string_view name, 
     bool const isHandle = name == handle.valueName;
     double const time = isHandle ? std::exchange(handle.time, std::nullopt).value_or(0) : 0;
     double const number = canBeRead ? *readNumberOrNan(text) : 0;
-    if (name == _out.valueName && _hasValue && !wasDisabled) {
-        constexpr double framesInSecond = 1000; // or fewer: the rate of an old document isn't in it
-        double const seconds = _countsFrames ? time / framesInSecond : time;
-        _keepsOutput = _takesHandles && isKept(std::max(seconds, 0.0), number, true);
+    if (name == _out.valueName && !wasDisabled) {
+        endOutput(time, number);
     }
     if (!canBeRead) {
         return {};
@@ -105,6 +102,13 @@ Fault KeypointCheck::faultOfHandle(std::string_view name, double time, double va
     }
     Handle const& handle = name == _in.valueName ? _in : _out;
     return value == 0 ? leftOut(handle.timeName, time, "no handle") : leftOut(name, value, "no handle");
+}
+
+void KeypointCheck::endOutput(double time, double value) {
+    constexpr double framesInSecond = 1000; // or fewer: the rate of an old document isn't in it
+    double const seconds = _countsFrames ? time / framesInSecond : time;
+    _hasOutput = _hasValue;
+    _keepsOutput = _hasValue && _takesHandles && isKept(std::max(seconds, 0.0), value, true);
 }
 
 bool KeypointCheck::isKept(double time, double value, bool isInSeconds) {

@@ -41,6 +41,8 @@ private:
     Fault faultOfTimeOrValue(bool isTime);
     Fault faultOfHandleTime(Handle& handle, TextPlace const& place, std::string_view text);
     Fault faultOfHandle(std::string_view name, double time, double value) const;
+    /// The output handle, unless it stands behind one that disabled the keypoint.
+    void endOutput(double time, double value);
     /// Of a handle that curves of the class have, unless it is known to be too short.
     static bool isKept(double time, double value, bool isInSeconds);
 

@@ -135,8 +135,9 @@ private:
         TimeSpan const keyed = keyedSpan(tree.spline(node));
         if (edited.keypointsBefore > 0 && !(keyed.to < keyed.from) && !channel.isLocked(true)) {
             _verb.apply(channel, keyed);
-            if (!_verb.sampleStep()) {
-                requireTimes(before.getSpline(), tree.spline(node), edited.channel);
+            std::string const fault = _verb.sampleStep() ? "" : faultOfTimes(before, tree.curve(node));
+            if (!fault.empty()) {
+                throw UsageError{"keypoints of '" + edited.channel + "' would come to " + fault};
             }
         }
         edited.keypointsAfter = channel.getNumberOfKeyframes();
@@ -145,39 +146,6 @@ private:
             addToPicture(tree, node, before, edited);
         }
         return edited;
-    }
-
-    struct LostTimes {
-        std::size_t outside = 0;
-        std::size_t shared = 0;
-    };
-
-    static LostTimes lostTimesOf(KFSpline& spline) {
-        std::vector<Tempus> times;
-        for (void* const handle : everyKeypointHandle(spline)) {
-            times.push_back(readKeypoint(spline, handle).time);
-        }
-        LostTimes lost;
-        lost.outside = std::erase_if(times, [](Tempus const& time) { return !TempusIsNumeric(time); });
-        std::sort(times.begin(), times.end());
-        lost.shared = static_cast<std::size_t>(times.end() - std::unique(times.begin(), times.end()));
-        return lost;
-    }
-
-    /// Keypoints that move neither leave the times that there are, nor come together where these are too few.
-    static void requireTimes(KFSpline* before, KFSpline* after, std::string const& name) {
-        if (before == nullptr || after == nullptr) {
-            return;
-        }
-        LostTimes const old = lostTimesOf(*before);
-        LostTimes const now = lostTimesOf(*after);
-        if (now.outside > old.outside) {
-            throw UsageError{"a keypoint of '" + name + "' would come to no place in time"};
-        }
-        if (now.shared > old.shared) {
-            throw UsageError{"keypoints of '" + name +
-                             "' would come to one time, between which there is none"};
-        }
     }
 
     WrittenRows writeFile(ChannelInput const& input, std::vector<Node> const& channels) const {

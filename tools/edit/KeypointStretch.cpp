@@ -6,6 +6,7 @@
 #include "tools/curve/Keypoint.h"
 
 #include <algorithm>
+#include <cstddef>
 #include <cstdint>
 #include <memory>
 
@@ -45,6 +46,23 @@ std::vector<Tempus> timesOfLocked(KFCurve& curve) {
     }
     std::sort(times.begin(), times.end());
     return times;
+}
+
+struct LostTimes {
+    std::size_t outside = 0;
+    std::size_t shared = 0;
+};
+
+LostTimes lostTimesOf(KFCurve& curve) {
+    std::vector<Tempus> times;
+    for (void* const handle : allKeypoints(curve)) {
+        times.push_back(timeOf(curve, handle));
+    }
+    LostTimes lost;
+    lost.outside = std::erase_if(times, [](Tempus const& time) { return !TempusIsNumeric(time); });
+    std::sort(times.begin(), times.end());
+    lost.shared = static_cast<std::size_t>(times.end() - std::unique(times.begin(), times.end()));
+    return lost;
 }
 
 /// Others keep their handles, unlike where a user deletes one.
@@ -157,6 +175,15 @@ std::vector<void*> keypointsWithin(KFCurve& curve, TimeSpan const& span) {
     std::vector<void*> handles = allKeypoints(curve);
     std::erase_if(handles, [&](void* handle) { return !span.holds(timeOf(curve, handle)); });
     return handles;
+}
+
+std::string faultOfTimes(KFCurve& before, KFCurve& after) {
+    LostTimes const old = lostTimesOf(before);
+    LostTimes const now = lostTimesOf(after);
+    if (now.outside > old.outside) {
+        return "no place in time";
+    }
+    return now.shared > old.shared ? "one time, between which there is none" : "";
 }
 
 void deleteDisabledAt(KFCurve& curve, Tempus const& time) {

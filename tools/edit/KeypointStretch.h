@@ -4,6 +4,7 @@
 #include "lumenkey/curves/KFCurve.h"
 
 #include <functional>
+#include <string>
 #include <vector>
 
 namespace lumenkey::tools {
@@ -47,6 +48,10 @@ private:
     KFCurve& _curve;
     std::vector<void*> _locked;
 };
+
+/// Where keypoints that were moved can't be: outside the times that there are, or several at one where these
+/// are too few. Empty for nowhere.
+std::string faultOfTimes(KFCurve& before, KFCurve& after);
 
 /// Takes away those at a time that are neither enabled nor locked. Nothing else of the curve changes.
 void deleteDisabledAt(KFCurve& curve, Tempus const& time);

@@ -120,15 +120,24 @@ void writeRows(std::vector<std::vector<double>> const& columns, std::vector<Temp
     }
 }
 
-/// All channels; of a document only those with keypoints that are seen, if there are any: it has many others.
+/// All channels; of a document only those with keypoints that are seen: it has many others. If there are none,
+/// all as they are at time zero.
 std::vector<KeypointColumn> columnsOfTable(ChannelFile const& file) {
     std::vector<KeypointColumn> columns;
     for (Node const channel : file.tree->channelsBelow(ChannelTree::kTop)) {
         columns.push_back(keypointsOf(channel, file.tree->spline(channel)));
     }
+    if (file.format != ChannelFormat::Document) {
+        return columns;
+    }
     auto const isEmpty = [](KeypointColumn const& column) { return column.times.empty(); };
-    if (file.format == ChannelFormat::Document && !std::all_of(columns.begin(), columns.end(), isEmpty)) {
+    if (!std::all_of(columns.begin(), columns.end(), isEmpty)) {
         std::erase_if(columns, isEmpty);
+        return columns;
+    }
+    for (KeypointColumn& column : columns) {
+        column.times = {kTempusZero};
+        column.values = {file.tree->curve(column.channel).getValue(kTempusZero, 0.0)};
     }
     return columns;
 }
@@ -154,7 +163,7 @@ void requireReadable(FileToWrite const& wanted, std::string const& name, Keypoin
 
 WrittenRows writeTable(FileToWrite const& wanted, OutputSink& out, ReadingProgress const& progress) {
     ChannelTree& tree = *wanted.file.tree;
-    std::vector<KeypointColumn> keypoints = columnsOfTable(wanted.file);
+    std::vector<KeypointColumn> const keypoints = columnsOfTable(wanted.file);
     if (keypoints.empty()) {
         throw OutputError{wanted.target, "it has no channels, of which a table must have one"};
     }
@@ -169,14 +178,7 @@ WrittenRows writeTable(FileToWrite const& wanted, OutputSink& out, ReadingProgre
     csv.endRow();
     bool const isByKeypoints =
         wanted.rows == RowsOf::Keypoints || wanted.file.format == ChannelFormat::Document;
-    std::vector<Tempus> times = isByKeypoints ? timesOfKeypoints(keypoints) : timesOfInput(wanted.file);
-    if (times.empty() && wanted.file.format == ChannelFormat::Document) {
-        times.push_back(kTempusZero);
-        for (KeypointColumn& column : keypoints) {
-            column.times = times;
-            column.values = {tree.curve(column.channel).getValue(kTempusZero, 0.0)};
-        }
-    }
+    std::vector<Tempus> const times = isByKeypoints ? timesOfKeypoints(keypoints) : timesOfInput(wanted.file);
     checkWrittenValues(wanted, times.size(), keypoints.size());
     std::vector<bool> isEdited(tree.count());
     for (Node const channel : wanted.edited) {

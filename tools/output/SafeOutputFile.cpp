@@ -181,6 +181,9 @@ SafeOutputFile::SafeOutputFile(std::string const& target) : _name(target) {
         }
     } catch (std::system_error const& error) {
         fail(error.code().value());
+    } catch (...) { // without memory, when the temporary may be there
+        discard();
+        throw;
     }
 }
 

@@ -8,6 +8,7 @@
 #include <cstring>
 #include <iterator>
 #include <numeric>
+#include <utf8proc.h>
 
 namespace lumenkey::tools {
 
@@ -22,41 +23,11 @@ std::string textOf(NumberBuffer const& buffer, std::to_chars_result result) {
 
 char lowerCase(char c) { return c >= 'A' && c <= 'Z' ? static_cast<char>(c - 'A' + 'a') : c; }
 
-/// Of a character.
-struct Decoded {
-    /// 0 where the front of a text is no character.
-    std::size_t size;
-    std::uint32_t code;
-};
-
-/// The character at the front of a text in UTF-8 that isn't empty.
-Decoded decodedFront(std::string_view text) {
-    auto const lead = static_cast<unsigned char>(text.front());
-    if (lead < 0x80) {
-        return {1, lead};
-    }
-    std::size_t const size = lead >= 0xF0 ? 4 : lead >= 0xE0 ? 3 : 2;
-    if (lead < 0xC2 || lead > 0xF4 || text.size() < size) {
-        return {0, 0};
-    }
-    std::uint32_t code = lead & (0x7Fu >> size);
-    for (char const c : text.substr(1, size - 1)) {
-        auto const next = static_cast<unsigned char>(c);
-        if ((next & 0xC0) != 0x80) {
-            return {0, 0};
-        }
-        code = code << 6 | (next & 0x3Fu);
-    }
-    constexpr std::uint32_t least[] = {0x80, 0x800, 0x10000};
-    bool const isSurrogate = code >= 0xD800 && code <= 0xDFFF;
-    return code < least[size - 2] || isSurrogate || code > 0x10FFFF ? Decoded{0, 0} : Decoded{size, code};
-}
-
 /// The first and the last of those that follow one another: controls, what sets or parts lines without being
 /// seen, and what is no character.
 struct UnseenCharacters {
-    std::uint32_t first;
-    std::uint32_t last;
+    std::int32_t first;
+    std::int32_t last;
 };
 constexpr UnseenCharacters kUnseen[] = {
     {0x00, 0x1F},     {0x7F, 0x9F}, // as terminals take them
@@ -67,8 +38,8 @@ constexpr UnseenCharacters kUnseen[] = {
     {0xFDD0, 0xFDEF},
 };
 
-bool isUnseen(std::uint32_t code) {
-    constexpr std::uint32_t noCharacter = 0xFFFE; // at the end of each plane, and the one behind it
+bool isUnseen(std::int32_t code) {
+    constexpr std::int32_t noCharacter = 0xFFFE; // at the end of each plane, and the one behind it
     return (code & noCharacter) == noCharacter ||
            std::any_of(std::begin(kUnseen), std::end(kUnseen), [code](UnseenCharacters const& some) {
                return some.first <= code && code <= some.last;
@@ -130,10 +101,14 @@ std::string printableText(std::string_view text) {
     constexpr std::string_view hexadecimal = "0123456789abcdef";
     std::string printable;
     while (!text.empty()) {
-        Decoded const front = decodedFront(text);
-        std::string_view const bytes = text.substr(0, std::max<std::size_t>(front.size, 1));
+        utf8proc_int32_t code = 0;
+        utf8proc_ssize_t const size =
+            utf8proc_iterate(reinterpret_cast<utf8proc_uint8_t const*>(text.data()),
+                             static_cast<utf8proc_ssize_t>(text.size()), &code); // below 0 for no character
+        std::string_view const bytes =
+            text.substr(0, static_cast<std::size_t>(std::max<utf8proc_ssize_t>(size, 1)));
         text.remove_prefix(bytes.size());
-        if (front.size != 0 && !isUnseen(front.code)) {
+        if (size > 0 && !isUnseen(code)) {
             printable += bytes;
             continue;
         }

@@ -173,6 +173,7 @@ void PlotCanvas::selectFont(PlotText const& style) {
 double PlotCanvas::textWidth(std::string const& text, PlotText const& style) {
     selectFont(style);
     cairo_text_extents_t extents;
+    // Cairo takes UTF-8 only and fails for good on anything else.
     cairo_text_extents(_context.get(), printableText(text).c_str(), &extents);
     return extents.x_advance;
 }

@@ -2,6 +2,7 @@
 
 #include "lumenkey/Channels/KFChannelFactories.h"
 #include "lumenkey/Channels/KFFactories.h"
+#include "lumenkey/persistence/KFCompoundMarks.h"
 #include "tools/output/TextForms.h"
 
 #include <cstdlib>
@@ -73,10 +74,7 @@ std::vector<std::string> storedClassNames() {
     return names;
 }
 
-std::unique_ptr<KFChannelBase> exampleOf(KFFactory* factory) {
-    auto* const maker = dynamic_cast<KFChannelFactory*>(factory);
-    return std::unique_ptr<KFChannelBase>(maker == nullptr ? nullptr : maker->createChannel("", 1));
-}
+std::unique_ptr<KFChannelBase> exampleOf(KFFactory* factory) { return KFExampleOf(factory); }
 
 std::string_view unitOf(KFChannelBase const& channel) {
     KFFactory const* const factory = channel.getFactory();

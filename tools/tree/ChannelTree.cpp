@@ -1,6 +1,5 @@
 #include "tools/tree/ChannelTree.h"
 
-#include "lumenkey/persistence/KFCompoundMarks.h"
 #include "tools/tree/FileRoot.h"
 
 #include <algorithm>
@@ -61,8 +60,9 @@ void ChannelTree::adoptBelow(Node node) {
         return;
     }
     std::vector<KFChannelBase*> const children = *above->getDescendants();
-    std::unique_ptr<KFChannelFolder> const example = KFExampleOf(*above);
-    std::size_t const components = example ? example->getNumberOfDescendants() : 0;
+    std::unique_ptr<KFChannelBase> const made = exampleOf(above->getFactory());
+    auto const* const example = dynamic_cast<KFChannelFolder const*>(made.get());
+    std::size_t const components = example == nullptr ? 0 : example->getNumberOfDescendants();
     for (std::size_t i = 0; i < children.size(); ++i) {
         std::unique_ptr<KFChannelBase> owned(i < components ? nullptr : children[i]);
         adoptBelow(add(node, children[i], std::move(owned)));
